@@ -1,0 +1,51 @@
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <functional>
+#include <memory>
+#include <string>
+#include <string_view>
+
+namespace vexa {
+
+/// A WebSocket server (RFC 6455) on one port of 127.0.0.1. One WebSocket message is one message: text or binary
+/// comes in, text goes out. Only processes of this account get in, with a loopback name in `Host` and without an
+/// `Origin`; everyone else gets HTTP 403.
+///
+/// Two threads serve a server. One runs the input and output of all clients while the other is in the handler:
+/// a slow handler holds up neither the writing of queued messages nor the reading of others. They change roles
+/// with each message, so that an answer need not wait for a thread to wake up.
+class IpcWebSocketServer {
+public:
+    using ClientId = std::uint64_t;
+
+    /// Called with one message at a time, in order of arrival over all clients. The text is valid during the
+    /// call.
+    using Handler = std::function<void(ClientId client, std::string_view message)>;
+
+    static constexpr std::size_t kMaxMessage = std::size_t{1} << 20;
+    static constexpr std::size_t kMaxQueued = std::size_t{4} << 20;
+
+    /// Null if `port` is not a free port from 1 to 65535. Serves at once.
+    static std::unique_ptr<IpcWebSocketServer> create(std::int32_t port, Handler handler);
+
+    /// Drops all clients. Returns after the last call of the handler has.
+    ~IpcWebSocketServer();
+    IpcWebSocketServer(const IpcWebSocketServer&) = delete;
+    IpcWebSocketServer& operator=(const IpcWebSocketServer&) = delete;
+
+    /// Queues a message for every client. Never blocks; any thread. False if there is no client to take it. A
+    /// client with more than kMaxQueued bytes waiting is dropped with close code 1008.
+    bool sendToAll(std::string message);
+
+    /// Queues a message for one client, dropped if he has left.
+    void sendTo(ClientId client, std::string message);
+
+private:
+    class Impl;
+    explicit IpcWebSocketServer(std::shared_ptr<Impl> impl);
+    std::shared_ptr<Impl> m_impl;
+};
+
+}  // namespace vexa
