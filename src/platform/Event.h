@@ -13,7 +13,8 @@ enum class Reset { Auto, Manual };
 /// reset(). Any thread may call anything at any time. Starts unset.
 class Event {
 public:
-    explicit Event(Reset reset);
+    /// The name shows in reports of threads that wait for ever; it must outlive the event.
+    explicit Event(Reset reset, const char* name = "an event");
     ~Event();
     Event(const Event&) = delete;
     Event& operator=(const Event&) = delete;

@@ -9,7 +9,8 @@ namespace vexa::platform {
 /// Mutual exclusion between threads. Not re-entrant: locking it twice on one thread is an error.
 class CAPABILITY("mutex") Mutex {
 public:
-    Mutex();
+    /// The name shows in reports of threads that wait for ever; it must outlive the mutex.
+    explicit Mutex(const char* name = "a mutex");
     ~Mutex();
     Mutex(const Mutex&) = delete;
     Mutex& operator=(const Mutex&) = delete;
@@ -25,7 +26,7 @@ private:
 /// The same, re-entrant: a thread that holds it may take it again and must release it as often.
 class CAPABILITY("mutex") RecursiveMutex {
 public:
-    RecursiveMutex();
+    explicit RecursiveMutex(const char* name = "a recursive mutex");
     ~RecursiveMutex();
     RecursiveMutex(const RecursiveMutex&) = delete;
     RecursiveMutex& operator=(const RecursiveMutex&) = delete;

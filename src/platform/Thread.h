@@ -45,14 +45,9 @@ public:
     ForeignWait& operator=(const ForeignWait&) = delete;
 };
 
-/// Work under way on a thread that the platform did not start, so that the clock knows that the process does
-/// not rest. Owned by the work item: it counts from its construction, on whatever thread, to its destruction.
-class ForeignWork {
-public:
-    ForeignWork();
-    ~ForeignWork();
-    ForeignWork(const ForeignWork&) = delete;
-    ForeignWork& operator=(const ForeignWork&) = delete;
-};
+/// Work under way on threads that the platform did not start, so that the clock knows that the process does not
+/// rest: from begin to end, whichever threads call them. Such a thread may wait for platform events in between.
+void beginForeignWork();
+void endForeignWork();
 
 }  // namespace vexa::platform

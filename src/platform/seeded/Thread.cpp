@@ -1,0 +1,43 @@
+#include "platform/Thread.h"
+
+#include <utility>
+
+#include "platform/seeded/Scheduler.h"
+
+namespace vexa::platform {
+
+struct Thread::State {
+    std::shared_ptr<Task> task = nullptr;
+    Event ended{Reset::Manual, "the end of a thread"};
+    bool isJoined = false;
+};
+
+Thread::~Thread() {
+    if (m_state && !m_state->isJoined) join();
+}
+
+bool Thread::start(std::string name, std::function<void()> body) {
+    m_state = std::make_shared<State>();
+    m_state->task = Scheduler::get().start(std::move(name), [state = m_state, body = std::move(body)] {
+        body();
+        state->ended.set();
+    });
+    return true;
+}
+
+bool Thread::isCurrent() const { return m_state && m_state->task.get() == Scheduler::current(); }
+
+bool Thread::join(Timeout limit) {
+    m_state->isJoined = m_state->ended.wait(limit);
+    return m_state->isJoined;
+}
+
+void Thread::detach() { m_state.reset(); }
+
+// Every thread of the seeded world is known to its scheduler.
+ForeignWait::ForeignWait() = default;
+ForeignWait::~ForeignWait() = default;
+void beginForeignWork() {}
+void endForeignWork() {}
+
+}  // namespace vexa::platform
