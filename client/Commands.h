@@ -1,0 +1,19 @@
+#pragma once
+
+namespace CLI {
+class App;
+}
+
+namespace vexa::client {
+
+// Each adds its subcommand and the options of it to the parser. When the parser has selected it, its callback
+// runs it and stores the exit code; what ends it early is thrown as ClientError.
+
+void addStartCommand(CLI::App& app, int& exitCode);
+void addDemoCommand(CLI::App& app, int& exitCode);
+void addScanCommand(CLI::App& app, int& exitCode);
+void addChannelsCommand(CLI::App& app, int& exitCode);
+void addSendCommand(CLI::App& app, int& exitCode);
+void addListenCommand(CLI::App& app, int& exitCode);
+
+}  // namespace vexa::client

@@ -1,0 +1,25 @@
+#include "client/Event.h"
+
+#include <json/value.h>
+
+#include "client/JsonLine.h"
+
+namespace vexa::client {
+
+std::optional<Event> parseEvent(std::string_view text) {
+    const auto envelope = parseJsonObject(text);
+    if (!envelope) return std::nullopt;
+    const Json::Value& id = (*envelope)["EventId"];
+    const Json::Value& data = (*envelope)["Data"];
+    if (!id.isString() || !(data.isString() || data.isNull())) return std::nullopt;
+    return Event{id.asString(), data.asString()};
+}
+
+std::string commandText(const std::string& id, const std::optional<std::string>& data) {
+    Json::Value command(Json::objectValue);
+    command["CommandId"] = id;
+    if (data) command["Data"] = *data;
+    return jsonLine(command);
+}
+
+}  // namespace vexa::client

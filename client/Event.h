@@ -1,0 +1,21 @@
+#pragma once
+
+#include <optional>
+#include <string>
+#include <string_view>
+
+namespace vexa::client {
+
+/// What the service tells, taken out of its envelope. Without a payload `data` is empty.
+struct Event {
+    std::string id;
+    std::string data;
+};
+
+/// Nothing if the text is no event.
+std::optional<Event> parseEvent(std::string_view text);
+
+/// The text of a command; `data` goes along as it is given.
+std::string commandText(const std::string& id, const std::optional<std::string>& data = std::nullopt);
+
+}  // namespace vexa::client

@@ -1,0 +1,42 @@
+#pragma once
+
+#include <filesystem>
+#include <string>
+
+namespace vexa::client {
+
+/// The folder of a simulated machine, as far as the client has to do with it.
+class MachineFolder {
+public:
+    /// `path` empty: the machine of the environment, or the user's default one.
+    explicit MachineFolder(const std::string& path);
+
+    /// A new folder below the temporary one, for the owner only.
+    static MachineFolder makeTemporary();
+
+    const std::filesystem::path& path() const { return m_path; }
+    std::filesystem::path portsFile() const { return m_path / "ports.json"; }
+    std::filesystem::path outputFile() const { return m_path / "stdout.log"; }
+
+    /// Makes the folder, and those above it that are missing, for the owner only. Throws ClientError.
+    void create() const;
+
+private:
+    std::filesystem::path m_path;
+};
+
+/// Removes the folder with all that is in it when it goes.
+class TemporaryMachine {
+public:
+    TemporaryMachine();
+    ~TemporaryMachine();
+    TemporaryMachine(const TemporaryMachine&) = delete;
+    TemporaryMachine& operator=(const TemporaryMachine&) = delete;
+
+    const std::filesystem::path& path() const { return m_folder.path(); }
+
+private:
+    MachineFolder m_folder;
+};
+
+}  // namespace vexa::client

@@ -1,0 +1,98 @@
+#include "client/SpectrumOutput.h"
+
+#include <csignal>
+#include <iomanip>
+#include <iostream>
+#include <sstream>
+
+#include "client/JsonLine.h"
+#include "client/Signals.h"
+#include "client/SpectralPicture.h"
+#include "client/SpectralText.h"
+
+namespace vexa::client {
+
+using std::chrono::milliseconds;
+using std::chrono::steady_clock;
+
+namespace {
+
+constexpr milliseconds kBetweenDrawings{100};
+
+std::string secondsSince(steady_clock::time_point start) {
+    std::ostringstream out;
+    out << std::fixed << std::setprecision(2) << std::setw(7)
+        << std::chrono::duration<double>(steady_clock::now() - start).count() << " s";
+    return out.str();
+}
+
+}  // namespace
+
+SpectrumOutput::SpectrumOutput(Form form)
+    : m_form(form), m_start(steady_clock::now()), m_nextDrawing(m_start) {
+    if (form == Form::Readable && TerminalScreen::isUsable()) m_screen.emplace();
+}
+
+void SpectrumOutput::show(const std::vector<SpectralScan::Told>& told, const SpectralView& view) {
+    if (told.empty()) return;
+    m_changed = true;
+    if (m_screen) return;
+    for (const auto& event : told)
+        printLine(event, view);
+    std::cout << std::flush;
+}
+
+void SpectrumOutput::printLine(const SpectralScan::Told& told, const SpectralView& view) const {
+    if (m_form == Form::Json) {
+        std::cout << jsonLine(parseJson(told.text).value_or(Json::Value())) << '\n';
+    } else {
+        std::cout << secondsSince(m_start) << "  " << describeEvent(told.event, told.update, view) << '\n';
+    }
+}
+
+std::optional<milliseconds> SpectrumOutput::refresh(const SpectralView& view) {
+    if (!m_screen || !m_changed) return std::nullopt;
+    const auto now = steady_clock::now();
+    if (now < m_nextDrawing) return std::chrono::ceil<milliseconds>(m_nextDrawing - now);
+    auto lines = picture(view);
+    lines.emplace_back("q or Ctrl-C ends");
+    m_screen->draw(lines);
+    m_changed = false;
+    m_nextDrawing = now + kBetweenDrawings;
+    return std::nullopt;
+}
+
+void SpectrumOutput::finish(const SpectralView& view) {
+    if (m_screen) {
+        const auto lines = picture(view);
+        m_screen.reset();
+        for (const auto& line : lines)
+            std::cout << line << '\n';
+    }
+    std::cout << (m_form == Form::Json ? summaryJson(view) : summaryText(view)) << std::endl;
+}
+
+std::vector<std::string> SpectrumOutput::picture(const SpectralView& view) const {
+    return drawSpectrum(view, {m_screen->columns(), TerminalScreen::wantsColour(), TerminalScreen::isUtf8()});
+}
+
+void SpectrumOutput::handleSignal(int signal) {
+    if (signal == SIGTSTP) {
+        if (m_screen) m_screen->leave();
+        Signals::suspend();
+        if (m_screen) m_screen->enter();
+    }
+    if (signal == SIGWINCH && m_screen) m_screen->resized();
+    m_changed = true;
+}
+
+bool SpectrumOutput::isQuitKey() {
+    const auto key = m_screen->takeKey();
+    return key && (*key == 'q' || *key == 'Q');
+}
+
+bool SpectrumOutput::isGone() const {
+    return !std::cout;
+}
+
+}  // namespace vexa::client

@@ -1,0 +1,17 @@
+#pragma once
+
+#include <chrono>
+#include <optional>
+
+#include "client/Signals.h"
+#include "client/SpectralScan.h"
+#include "client/SpectrumOutput.h"
+
+namespace vexa::client {
+
+/// Scans and shows what is told until the user has had enough, or for as long as `limit` says; then the scan
+/// is stopped and the last word printed. Throws ClientError when the connection is lost.
+void watchSpectrum(SpectralScan& scan, Signals& signals, SpectrumOutput::Form form,
+                   std::optional<std::chrono::milliseconds> limit);
+
+}  // namespace vexa::client
