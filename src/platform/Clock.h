@@ -6,7 +6,8 @@
 
 namespace vexa::platform {
 
-/// All waits, deadlines and periods. Machine time: on a simulated machine it may run faster than the wall clock.
+/// All waits, deadlines and periods. Machine time: on a simulated machine it may run faster than the wall
+/// clock.
 using Duration = std::chrono::microseconds;
 
 /// The time since the process (or the simulated machine) started. Never goes back.

@@ -5,8 +5,8 @@
 
 namespace vexa::platform {
 
-/// A mutex that processes of one machine find by name. It exists while a process has it open; the death of its
-/// owner releases it.
+/// A mutex that processes of one machine find by name. It exists while a process has it open; the death of
+/// its owner releases it.
 class NamedMutex {
 public:
     enum class Owner { Yes, No };

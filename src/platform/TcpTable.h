@@ -4,8 +4,8 @@
 
 namespace vexa::platform {
 
-/// One TCP endpoint of the machine, IPv4. Addresses and ports are in network byte order; of a port only the low
-/// 16 bits count.
+/// One TCP endpoint of the machine, IPv4. Addresses and ports are in network byte order; of a port only the
+/// low 16 bits count.
 struct TcpRow {
     std::uint32_t state;
     std::uint32_t localAddress;

@@ -35,8 +35,8 @@ private:
     std::shared_ptr<State> m_state;
 };
 
-/// Around a wait that the platform does not see (a lock on a file, a socket), so that the clock knows that this
-/// thread rests.
+/// Around a wait that the platform does not see (a lock on a file, a socket), so that the clock knows that
+/// this thread rests.
 class ForeignWait {
 public:
     ForeignWait();
@@ -45,8 +45,9 @@ public:
     ForeignWait& operator=(const ForeignWait&) = delete;
 };
 
-/// Work under way on threads that the platform did not start, so that the clock knows that the process does not
-/// rest: from begin to end, whichever threads call them. Such a thread may wait for platform events in between.
+/// Work under way on threads that the platform did not start, so that the clock knows that the process does
+/// not rest: from begin to end, whichever threads call them. Such a thread may wait for platform events in
+/// between.
 void beginForeignWork();
 void endForeignWork();
 

@@ -10,8 +10,8 @@ namespace vexa {
 /// Names a server; 0 is no server. A closed handle is not used again.
 using IpcHandle = std::uint64_t;
 
-/// One message of a client. The bytes are valid during the call and need not end in NUL. Called on a thread of
-/// the server, one message at a time, in order of arrival.
+/// One message of a client. The bytes are valid during the call and need not end in NUL. Called on a thread
+/// of the server, one message at a time, in order of arrival.
 using IpcReceiveCallback = void (*)(const char* bytes, std::uint32_t length, void* context);
 
 /// Serves `port` of the loopback address in the background. 0 if the port is not free or not from 1 to 65535.
@@ -19,8 +19,8 @@ using IpcReceiveCallback = void (*)(const char* bytes, std::uint32_t length, voi
 IpcHandle IpcCreateServer(std::int32_t kind, std::int32_t options, IpcReceiveCallback callback, void* context,
                           std::int32_t port);
 
-/// Queues one message for every client; never blocks, any thread. 1 if at least one client took it; 0 if there
-/// is none, for handle 0 and for a closed handle.
+/// Queues one message for every client; never blocks, any thread. 1 if at least one client took it; 0 if
+/// there is none, for handle 0 and for a closed handle.
 std::uint32_t IpcSend(IpcHandle handle, const void* bytes, std::uint32_t length);
 
 /// Drops the clients and closes the port. Returns after the last callback has returned. REQUIRES: not called

@@ -9,13 +9,13 @@
 
 namespace vexa {
 
-/// A WebSocket server (RFC 6455) on one port of 127.0.0.1. One WebSocket message is one message: text or binary
-/// comes in, text goes out. Only processes of this account get in, with a loopback name in `Host` and without an
-/// `Origin`; everyone else gets HTTP 403.
+/// A WebSocket server (RFC 6455) on one port of 127.0.0.1. One WebSocket message is one message: text or
+/// binary comes in, text goes out. Only processes of this account get in, with a loopback name in `Host` and
+/// without an `Origin`; everyone else gets HTTP 403.
 ///
-/// Two threads serve a server. One runs the input and output of all clients while the other is in the handler:
-/// a slow handler holds up neither the writing of queued messages nor the reading of others. They change roles
-/// with each message, so that an answer need not wait for a thread to wake up.
+/// Two threads serve a server. One runs the input and output of all clients while the other is in the
+/// handler: a slow handler holds up neither the writing of queued messages nor the reading of others. They
+/// change roles with each message, so that an answer need not wait for a thread to wake up.
 class IpcWebSocketServer {
 public:
     using ClientId = std::uint64_t;
@@ -27,10 +27,15 @@ public:
     static constexpr std::size_t kMaxMessage = std::size_t{1} << 20;
     static constexpr std::size_t kMaxQueued = std::size_t{4} << 20;
 
-    /// Null if `port` is not a free port from 1 to 65535. Serves at once.
-    static std::unique_ptr<IpcWebSocketServer> create(std::int32_t port, Handler handler);
+    class Impl;
 
-    /// Drops all clients. Returns after the last call of the handler has.
+    /// Null if `port` is not a free port from 1 to 65535. Serves at once.
+    static std::shared_ptr<IpcWebSocketServer> create(std::int32_t port, Handler handler);
+
+    /// For create().
+    explicit IpcWebSocketServer(std::unique_ptr<Impl> impl);
+
+    /// Stops.
     ~IpcWebSocketServer();
     IpcWebSocketServer(const IpcWebSocketServer&) = delete;
     IpcWebSocketServer& operator=(const IpcWebSocketServer&) = delete;
@@ -42,10 +47,13 @@ public:
     /// Queues a message for one client, dropped if he has left.
     void sendTo(ClientId client, std::string message);
 
+    /// Sends what is queued, for half a second at most, and drops all clients with close code 1001. Returns
+    /// after the last call of the handler has; sends give false from now on. REQUIRES: not called by the
+    /// handler, and no lock held that it takes.
+    void stop();
+
 private:
-    class Impl;
-    explicit IpcWebSocketServer(std::shared_ptr<Impl> impl);
-    std::shared_ptr<Impl> m_impl;
+    const std::unique_ptr<Impl> m_impl;
 };
 
 }  // namespace vexa

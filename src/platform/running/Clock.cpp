@@ -13,7 +13,9 @@ std::atomic<Duration::rep> g_shift{0};
 
 }  // namespace
 
-Duration now() { return Scheduler::get().now(); }
+Duration now() {
+    return Scheduler::get().now();
+}
 
 Duration wallTime() {
     const auto real = std::chrono::system_clock::now().time_since_epoch();
@@ -33,14 +35,24 @@ std::tm localTime() {
     return local;
 }
 
-void sleepFor(Duration duration) { waitForAny({}, duration); }
+void sleepFor(Duration duration) {
+    waitForAny({}, duration);
+}
 
-void setClockSpeed(double speed) { Scheduler::get().setSpeed(speed); }
+void setClockSpeed(double speed) {
+    Scheduler::get().setSpeed(speed);
+}
 
-bool advance(Duration span) { return Scheduler::get().advance(span); }
+bool advance(Duration span) {
+    return Scheduler::get().advance(span);
+}
 
-void requestAdvance(Duration span) { Scheduler::get().requestAdvance(span); }
+void requestAdvance(Duration span) {
+    Scheduler::get().requestAdvance(span);
+}
 
-void shiftWallTime(Duration span) { g_shift += span.count(); }
+void shiftWallTime(Duration span) {
+    g_shift += span.count();
+}
 
 }  // namespace vexa::platform

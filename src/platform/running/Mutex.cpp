@@ -14,9 +14,13 @@ Mutex::Mutex(const char* /*name*/) : m_state(std::make_unique<State>()) {}
 
 Mutex::~Mutex() = default;
 
-void Mutex::lock() NO_THREAD_SAFETY_ANALYSIS { m_state->mutex.lock(); }
+void Mutex::lock() NO_THREAD_SAFETY_ANALYSIS {
+    m_state->mutex.lock();
+}
 
-void Mutex::unlock() NO_THREAD_SAFETY_ANALYSIS { m_state->mutex.unlock(); }
+void Mutex::unlock() NO_THREAD_SAFETY_ANALYSIS {
+    m_state->mutex.unlock();
+}
 
 struct RecursiveMutex::State {
     std::recursive_mutex mutex;
@@ -38,6 +42,8 @@ void RecursiveMutex::unlock() NO_THREAD_SAFETY_ANALYSIS {
     m_state->mutex.unlock();
 }
 
-bool RecursiveMutex::isHeldByThisThread() const { return m_state->owner == std::this_thread::get_id(); }
+bool RecursiveMutex::isHeldByThisThread() const {
+    return m_state->owner == std::this_thread::get_id();
+}
 
 }  // namespace vexa::platform

@@ -42,7 +42,8 @@ int Scheduler::wait(std::span<Event::State* const> events, Timeout deadline) {
 
 void Scheduler::enlist(Waiter& waiter) {
     waiter.sequence = ++m_nextSequence;
-    for (Event::State* event : waiter.events) event->waiters.push_back(&waiter);
+    for (Event::State* event : waiter.events)
+        event->waiters.push_back(&waiter);
     if (waiter.deadline) m_deadlines.emplace(DeadlineKey{*waiter.deadline, waiter.sequence}, &waiter);
 }
 
@@ -59,7 +60,8 @@ void Scheduler::sleepUntilReleased(Lock& lock, Waiter& waiter) {
 }
 
 void Scheduler::release(Waiter& waiter, int outcome) {
-    for (Event::State* event : waiter.events) eraseValue(event->waiters, &waiter);
+    for (Event::State* event : waiter.events)
+        eraseValue(event->waiters, &waiter);
     if (waiter.deadline) m_deadlines.erase({*waiter.deadline, waiter.sequence});
     waiter.isReleased = true;
     waiter.outcome = outcome;
@@ -79,7 +81,8 @@ void Scheduler::set(Event::State& event) {
         return;
     }
     event.isSet = true;
-    while (!event.waiters.empty()) releaseFor(*event.waiters.front(), event);
+    while (!event.waiters.empty())
+        releaseFor(*event.waiters.front(), event);
 }
 
 void Scheduler::reset(Event::State& event) {
@@ -150,8 +153,7 @@ Duration Scheduler::now() {
 }
 
 Duration Scheduler::nowLocked() const {
-    const std::chrono::duration<double, std::micro> real =
-        std::chrono::steady_clock::now() - m_realReference;
+    const std::chrono::duration<double, std::micro> real = std::chrono::steady_clock::now() - m_realReference;
     return m_reference + Duration(static_cast<Duration::rep>(real.count() * m_speed));
 }
 
@@ -162,8 +164,8 @@ Duration Scheduler::leadOverWallClock() {
 
 // Rounded up, so that a wait that ends by the wall clock has reached its deadline.
 Scheduler::RealTime Scheduler::realTimeOf(Duration instant) const {
-    const std::chrono::duration<double, std::micro> real(static_cast<double>((instant - m_reference).count()) /
-                                                         m_speed);
+    const std::chrono::duration<double, std::micro> real(
+        static_cast<double>((instant - m_reference).count()) / m_speed);
     constexpr std::chrono::hours kFar{24 * 365};
     if (real > kFar) return m_realReference + kFar;
     return m_realReference + std::chrono::ceil<std::chrono::microseconds>(real);
@@ -184,7 +186,8 @@ void Scheduler::setSpeed(double speed) {
 }
 
 void Scheduler::wakeTimedWaiters() {
-    for (const auto& [key, waiter] : m_deadlines) waiter->wake.notify_one();
+    for (const auto& [key, waiter] : m_deadlines)
+        waiter->wake.notify_one();
 }
 
 namespace {

@@ -30,9 +30,9 @@ struct Waiter {
     std::condition_variable wake = {};
 };
 
-/// All waits of the process, and the clock. A thread that ends another's wait releases it on the spot, so that
-/// the count of threads that are at work is exact at every moment: the clock of a simulated machine moves on
-/// only when it is 0.
+/// All waits of the process, and the clock. A thread that ends another's wait releases it on the spot, so
+/// that the count of threads that are at work is exact at every moment: the clock of a simulated machine
+/// moves on only when it is 0.
 class Scheduler {
 public:
     static Scheduler& get();

@@ -35,7 +35,9 @@ bool Thread::start(std::string /*name*/, std::function<void()> body) {
     return true;
 }
 
-bool Thread::isCurrent() const { return m_state && m_state->thread.get_id() == std::this_thread::get_id(); }
+bool Thread::isCurrent() const {
+    return m_state && m_state->thread.get_id() == std::this_thread::get_id();
+}
 
 bool Thread::join(Timeout limit) {
     if (!m_state->ended.wait(limit)) return false;
@@ -48,12 +50,20 @@ void Thread::detach() {
     m_state.reset();
 }
 
-ForeignWait::ForeignWait() { Scheduler::get().endWork(); }
+ForeignWait::ForeignWait() {
+    Scheduler::get().endWork();
+}
 
-ForeignWait::~ForeignWait() { Scheduler::get().beginWork(); }
+ForeignWait::~ForeignWait() {
+    Scheduler::get().beginWork();
+}
 
-void beginForeignWork() { Scheduler::get().beginWork(); }
+void beginForeignWork() {
+    Scheduler::get().beginWork();
+}
 
-void endForeignWork() { Scheduler::get().endWork(); }
+void endForeignWork() {
+    Scheduler::get().endWork();
+}
 
 }  // namespace vexa::platform

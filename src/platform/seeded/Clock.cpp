@@ -13,9 +13,13 @@ Duration g_shift{0};
 
 }  // namespace
 
-Duration now() { return Scheduler::get().now(); }
+Duration now() {
+    return Scheduler::get().now();
+}
 
-Duration wallTime() { return kEpoch + now() + g_shift; }
+Duration wallTime() {
+    return kEpoch + now() + g_shift;
+}
 
 std::tm localTime() {
     const auto seconds =
@@ -25,7 +29,9 @@ std::tm localTime() {
     return utc;
 }
 
-void sleepFor(Duration duration) { waitForAny({}, duration); }
+void sleepFor(Duration duration) {
+    waitForAny({}, duration);
+}
 
 // Time belongs to the seed: it jumps by itself when all threads wait.
 void setClockSpeed(double /*speed*/) {}
@@ -37,6 +43,8 @@ bool advance(Duration span) {
 
 void requestAdvance(Duration /*span*/) {}
 
-void shiftWallTime(Duration span) { g_shift += span; }
+void shiftWallTime(Duration span) {
+    g_shift += span;
+}
 
 }  // namespace vexa::platform

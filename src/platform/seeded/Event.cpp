@@ -17,9 +17,13 @@ Event::Event(Reset reset, const char* name) : m_state(std::make_unique<State>(St
 
 Event::~Event() = default;
 
-void Event::set() { Scheduler::get().set(*m_state); }
+void Event::set() {
+    Scheduler::get().set(*m_state);
+}
 
-void Event::reset() { m_state->isSet = false; }
+void Event::reset() {
+    m_state->isSet = false;
+}
 
 bool Event::wait(Timeout limit) {
     Event* const self = this;
@@ -33,7 +37,8 @@ int waitForAny(std::span<Event* const> events, Timeout limit) {
 int waitForAnyUntil(std::span<Event* const> events, Timeout deadline) {
     assert(events.size() <= kMaxEvents);
     std::array<Event::State*, kMaxEvents> states{};
-    for (std::size_t i = 0; i < events.size(); ++i) states[i] = events[i]->m_state.get();
+    for (std::size_t i = 0; i < events.size(); ++i)
+        states[i] = events[i]->m_state.get();
     return Scheduler::get().wait({states.data(), events.size()}, deadline);
 }
 

@@ -18,7 +18,8 @@ struct Ownership {
         if (self == nullptr) return;
         Scheduler& scheduler = Scheduler::get();
         scheduler.handOver();
-        while (owner != nullptr) scheduler.waitForLock(this, name);
+        while (owner != nullptr)
+            scheduler.waitForLock(this, name);
         owner = self;
         depth = 1;
     }
@@ -45,9 +46,13 @@ Mutex::Mutex(const char* name) : m_state(std::make_unique<State>(State{{name}}))
 
 Mutex::~Mutex() = default;
 
-void Mutex::lock() NO_THREAD_SAFETY_ANALYSIS { m_state->take(); }
+void Mutex::lock() NO_THREAD_SAFETY_ANALYSIS {
+    m_state->take();
+}
 
-void Mutex::unlock() NO_THREAD_SAFETY_ANALYSIS { m_state->release(); }
+void Mutex::unlock() NO_THREAD_SAFETY_ANALYSIS {
+    m_state->release();
+}
 
 struct RecursiveMutex::State : Ownership {};
 
@@ -55,9 +60,13 @@ RecursiveMutex::RecursiveMutex(const char* name) : m_state(std::make_unique<Stat
 
 RecursiveMutex::~RecursiveMutex() = default;
 
-void RecursiveMutex::lock() NO_THREAD_SAFETY_ANALYSIS { m_state->takeAgain(); }
+void RecursiveMutex::lock() NO_THREAD_SAFETY_ANALYSIS {
+    m_state->takeAgain();
+}
 
-void RecursiveMutex::unlock() NO_THREAD_SAFETY_ANALYSIS { m_state->release(); }
+void RecursiveMutex::unlock() NO_THREAD_SAFETY_ANALYSIS {
+    m_state->release();
+}
 
 bool RecursiveMutex::isHeldByThisThread() const {
     return m_state->owner != nullptr && m_state->owner == Scheduler::current();

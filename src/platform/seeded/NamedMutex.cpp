@@ -36,17 +36,26 @@ NamedMutex::NamedMutex(const std::string& name, Owner initialOwner) : m_state(st
         m_state->isOwned = m_state->shared->isOwned = true;
 }
 
-NamedMutex::~NamedMutex() { release(); }
+NamedMutex::~NamedMutex() {
+    release();
+}
 
-bool NamedMutex::isValid() const { return true; }
+bool NamedMutex::isValid() const {
+    return true;
+}
 
-bool NamedMutex::existedBefore() const { return m_state->existedBefore; }
+bool NamedMutex::existedBefore() const {
+    return m_state->existedBefore;
+}
 
-bool NamedMutex::isOwned() const { return m_state->isOwned; }
+bool NamedMutex::isOwned() const {
+    return m_state->isOwned;
+}
 
 void NamedMutex::wait() {
     if (m_state->isOwned) return;
-    while (m_state->shared->isOwned) m_state->shared->released.wait();
+    while (m_state->shared->isOwned)
+        m_state->shared->released.wait();
     m_state->isOwned = m_state->shared->isOwned = true;
 }
 

@@ -18,7 +18,8 @@ constexpr std::uint64_t kHandOverOdds = 80;
 
 std::string describeWait(const Task& task) {
     std::string text;
-    for (const Event::State* event : task.events) text += (text.empty() ? "" : " or ") + std::string(event->name);
+    for (const Event::State* event : task.events)
+        text += (text.empty() ? "" : " or ") + std::string(event->name);
     if (task.wantedLockName != nullptr) text = task.wantedLockName;
     return text.empty() ? "nothing" : text;
 }
@@ -34,7 +35,9 @@ Scheduler& Scheduler::get() {
     return scheduler;
 }
 
-Task* Scheduler::current() { return t_current; }
+Task* Scheduler::current() {
+    return t_current;
+}
 
 void Scheduler::run(std::uint64_t seed, std::function<void()> story) {
     m_seed = seed;
@@ -51,7 +54,7 @@ void Scheduler::run(std::uint64_t seed, std::function<void()> story) {
 }
 
 std::shared_ptr<Task> Scheduler::start(std::string name, std::function<void()> body) {
-    auto task = std::shared_ptr<Task>(new Task{m_nextId++, std::move(name)});
+    auto task = std::make_shared<Task>(m_nextId++, std::move(name));
     {
         const Lock lock(m_mutex);
         m_tasks.push_back(task);
@@ -94,9 +97,8 @@ void Scheduler::giveTurn(Lock& lock) {
 Task* Scheduler::chooseNext() {
     std::vector<Task*> ready = readyTasks();
     while (ready.empty()) {
-        const bool allEnded = std::all_of(m_tasks.begin(), m_tasks.end(), [](const auto& task) {
-            return task->phase == Task::Phase::Ended;
-        });
+        const bool allEnded = std::all_of(m_tasks.begin(), m_tasks.end(),
+                                          [](const auto& task) { return task->phase == Task::Phase::Ended; });
         if (allEnded) return nullptr;
         if (!jumpToNextDeadline()) reportDeadlock();
         ready = readyTasks();

@@ -9,6 +9,7 @@
 #include <span>
 #include <string>
 #include <thread>
+#include <utility>
 #include <vector>
 
 #include "platform/Event.h"
@@ -24,6 +25,8 @@ struct Event::State {
 /// One thread of the seeded world.
 struct Task {
     enum class Phase { Ready, Waiting, Ended };
+
+    Task(std::uint64_t taskId, std::string taskName) : id(taskId), name(std::move(taskName)) {}
 
     const std::uint64_t id;
     const std::string name;

@@ -25,14 +25,18 @@ bool Thread::start(std::string name, std::function<void()> body) {
     return true;
 }
 
-bool Thread::isCurrent() const { return m_state && m_state->task.get() == Scheduler::current(); }
+bool Thread::isCurrent() const {
+    return m_state && m_state->task.get() == Scheduler::current();
+}
 
 bool Thread::join(Timeout limit) {
     m_state->isJoined = m_state->ended.wait(limit);
     return m_state->isJoined;
 }
 
-void Thread::detach() { m_state.reset(); }
+void Thread::detach() {
+    m_state.reset();
+}
 
 // Every thread of the seeded world is known to its scheduler.
 ForeignWait::ForeignWait() = default;

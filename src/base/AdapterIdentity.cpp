@@ -1,0 +1,96 @@
+#include "base/AdapterIdentity.h"
+
+#include <array>
+#include <cstdio>
+#include <cstring>
+#include <optional>
+
+#include "base/TextConversion.h"
+#include "base/WlanMemory.h"
+#include "platform/Registry.h"
+
+namespace vexa {
+
+namespace {
+
+using platform::RegistryKey;
+using platform::RegistryRoot;
+
+constexpr std::size_t kRegistryBuffer = 256;
+constexpr const char* kNetworkAdapterClass =
+    "SYSTEM\\CurrentControlSet\\Control\\Class\\{4D36E972-E325-11CE-BFC1-08002BE10318}";
+constexpr std::array<std::string_view, 2> kVendorPrefixes = {"pci\\ven_1f5d", "usb\\vid_2b7e"};
+constexpr std::size_t kPrefixLength = kVendorPrefixes[0].size();
+static_assert(kVendorPrefixes[1].size() == kPrefixLength);
+
+bool isVendorHardware(std::string_view hardwareId) {
+    if (hardwareId.size() < kPrefixLength) return false;
+    for (const std::string_view prefix : kVendorPrefixes)
+        if (compareNoCase(hardwareId.substr(0, kPrefixLength), prefix) == 0) return true;
+    return false;
+}
+
+bool isVendorInstance(const std::string& path, const GUID& guid) {
+    const auto key = RegistryKey::open(RegistryRoot::LocalMachine, path);
+    if (!key) return false;
+    const auto instanceId = key->value("NetCfgInstanceId", kRegistryBuffer);
+    if (!instanceId || compareGuidText(*instanceId, guid) != 0) return false;
+    const auto hardwareId = key->value("MatchingDeviceId", kRegistryBuffer);
+    return hardwareId && isVendorHardware(*hardwareId);
+}
+
+}  // namespace
+
+bool isAdapterPresent(HANDLE hWlan, GUID& interfaceGuid) {
+    if (hWlan == nullptr || hWlan == INVALID_HANDLE_VALUE) return false;
+    PWLAN_INTERFACE_INFO_LIST interfaces = nullptr;
+    if (WlanEnumInterfaces(hWlan, nullptr, &interfaces) != ERROR_SUCCESS) return false;
+    const WlanMemory<WLAN_INTERFACE_INFO_LIST> owner(interfaces);
+    const WLAN_INTERFACE_INFO* const first = interfaces->InterfaceInfo;
+    for (DWORD i = 0; i < interfaces->dwNumberOfItems; ++i) {
+        if (!isVendorInterface(first[i].InterfaceGuid)) continue;
+        interfaceGuid = first[i].InterfaceGuid;
+        return true;
+    }
+    return false;
+}
+
+std::optional<GUID> presentAdapter() {
+    HANDLE handle = nullptr;
+    DWORD negotiated = 0;
+    if (WlanOpenHandle(kWlanClientVersion, nullptr, &negotiated, &handle) != ERROR_SUCCESS)
+        return std::nullopt;
+    GUID guid{};
+    const bool isPresent = isAdapterPresent(handle, guid);
+    WlanCloseHandle(handle, nullptr);
+    return isPresent ? std::optional(guid) : std::nullopt;
+}
+
+bool isVendorInterface(const GUID& guid) {
+    const auto classKey = RegistryKey::open(RegistryRoot::LocalMachine, kNetworkAdapterClass);
+    if (!classKey) return false;
+    for (std::uint32_t index = 0;; ++index) {
+        const auto name = classKey->subkeyName(index, kRegistryBuffer);
+        if (!name) return false;
+        if (isVendorInstance(std::string(kNetworkAdapterClass) + "\\" + *name, guid)) return true;
+    }
+}
+
+std::string guidToString(const GUID& guid) {
+    char text[39];
+    const auto& d = guid.Data4;
+    std::snprintf(text, sizeof text, "{%08X-%04X-%04X-%02X%02X-%02X%02X%02X%02X%02X%02X}",
+                  static_cast<unsigned>(guid.Data1), static_cast<unsigned>(guid.Data2),
+                  static_cast<unsigned>(guid.Data3), d[0], d[1], d[2], d[3], d[4], d[5], d[6], d[7]);
+    return text;
+}
+
+int compareGuidText(std::string_view text, const GUID& guid) {
+    return compareNoCase(text, guidToString(guid));
+}
+
+bool areGuidsEqual(const GUID& a, const GUID& b) {
+    return std::memcmp(&a, &b, sizeof(GUID)) == 0;
+}
+
+}  // namespace vexa

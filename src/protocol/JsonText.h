@@ -1,0 +1,23 @@
+#pragma once
+
+#include <json/value.h>
+
+#include <optional>
+#include <string>
+#include <string_view>
+
+namespace vexa {
+
+/// The form in which every JSON text leaves this process: members sorted, indented by 3, a line end at the
+/// end.
+std::string toStyledText(const Json::Value& value);
+
+/// Reads text up to its first NUL. Comments are allowed and the root may be anything. Errors are not told:
+/// what was read before the error stays, text that isn't JSON and text nested too deeply give null.
+Json::Value parseJsonText(std::string_view text);
+
+/// A member as text: a string as it stands, a boolean as true or false, null or no member as empty. Nothing
+/// for other types.
+std::optional<std::string> readText(const Json::Value& object, const char* member);
+
+}  // namespace vexa

@@ -1,0 +1,65 @@
+#include "service/Service.h"
+
+#include <optional>
+
+#include "base/DiagnosticLog.h"
+#include "base/NeverDestroyed.h"
+#include "base/ScopeGuard.h"
+#include "connection/SupplicantMgr.h"
+#include "platform/NamedMutex.h"
+#include "service/CommandLine.h"
+#include "service/IpcServers.h"
+
+namespace vexa {
+
+namespace {
+
+using platform::NamedMutex;
+
+constexpr const char* kInstanceMutex = "{EB028547-0B5C-4BFF-A23E-78656D726C04}";
+constexpr const char* kStopMutex = "{39EAA3ED-1A26-46B7-90A7-AAFFECE80392}";
+
+constexpr int kExitNormal = 0;
+constexpr int kExitFailed = 1;
+
+// The process ends owning the mutex: a parent that waits for it learns of the end by the abandoned mutex.
+void waitForStop() {
+    static NeverDestroyed<NamedMutex> stopMutex(kStopMutex, NamedMutex::Owner::No);
+    stopMutex.get().wait();
+}
+
+}  // namespace
+
+int runService(const std::wstring* commandLine) {
+    std::optional<NamedMutex> instanceMutex(std::in_place, kInstanceMutex, NamedMutex::Owner::Yes);
+    const ScopeGuard releaseInstance([&] { instanceMutex.reset(); });
+    if (instanceMutex->existedBefore()) return kExitNormal;
+
+    SupplicantMgr& manager = SupplicantMgr::instance();
+    if (manager.init() != 0) {
+        Log(4, "Initialize SupplicantMgr failed.");
+        return kExitFailed;
+    }
+    if (commandLine == nullptr || commandLine->empty()) {
+        Log(4, "No command line arguments, exit.");
+        return kExitFailed;
+    }
+    std::wstring arguments = *commandLine;
+    std::uint32_t saPort = 0;
+    std::uint32_t hs20Port = 0;
+    if (!parseCommandLine(arguments, saPort, hs20Port)) {
+        Log(4, "Checking command line arguments failed.");
+        return kExitFailed;
+    }
+    Log(4, "Check command line arguments succeeded, saPort=%d, hs20Port=%d", static_cast<int>(saPort),
+        static_cast<int>(hs20Port));
+
+    createIpcServers(static_cast<std::int32_t>(saPort), hs20Port);
+    manager.addSupplicantIfInterfaceExists();
+    waitForStop();
+
+    destroySpectralServer();
+    return kExitNormal;
+}
+
+}  // namespace vexa

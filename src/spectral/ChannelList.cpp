@@ -1,0 +1,50 @@
+#include <algorithm>
+
+#include "protocol/Envelope.h"
+#include "protocol/JsonText.h"
+#include "spectral/SAPortlink.h"
+
+namespace vexa {
+
+namespace {
+
+using platform::LockGuard;
+
+}  // namespace
+
+// An adapter that is gone or a module that fails leaves the channels as they were known.
+void SAPortlink::QueryChannelList() {
+    const LockGuard lock(m_cs);
+    updateCardState();
+    if (!m_bCardIn || m_hClientHandle == nullptr) return;
+
+    std::vector<std::byte> buffer = channelListRequest();
+    const auto size = static_cast<DWORD>(buffer.size());
+    const GUID guid = m_interfaceGuid.get();
+    DWORD returned = 0;
+    if (WlanIhvControl(m_hWlan, &guid, wlan_ihv_control_type_driver, size, buffer.data(), size, buffer.data(),
+                       &returned) != ERROR_SUCCESS)
+        return;
+
+    buffer.resize(std::min<std::size_t>(returned, buffer.size()));
+    m_channelOrder = orderChannels(parseChannelList(buffer));
+    for (std::vector<int>* table : {&m_congestion, &m_noise, &m_lastCongestion, &m_lastNoise})
+        table->assign(m_channelOrder.size(), 0);
+}
+
+void SAPortlink::SendChannelList() {
+    QueryChannelList();
+    Json::Value channels;
+    {
+        const LockGuard lock(m_cs);
+        for (const auto& [channel, order] : m_channelOrder) {
+            Json::Value entry;
+            entry["Channel"] = channel;
+            entry["Order"] = order;
+            channels.append(entry);
+        }
+    }
+    Send(buildEnvelope("SPECTRAL_ANALYSER_CHANNEL_LIST_DATA_2G5G", kSpectralSource, toStyledText(channels)));
+}
+
+}  // namespace vexa
