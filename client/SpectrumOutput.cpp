@@ -55,7 +55,7 @@ std::optional<milliseconds> SpectrumOutput::refresh(const SpectralView& view) {
     const auto now = steady_clock::now();
     if (now < m_nextDrawing) return std::chrono::ceil<milliseconds>(m_nextDrawing - now);
     auto lines = picture(view);
-    lines.emplace_back("q or Ctrl-C ends");
+    lines.front() += "   (q or Ctrl-C ends)";
     m_screen->draw(lines);
     m_changed = false;
     m_nextDrawing = now + kBetweenDrawings;
