@@ -1,0 +1,28 @@
+#pragma once
+
+#include "simulation/ActionTable.h"
+
+namespace vexa::simulation {
+
+// What the actions do. Each is given an action whose members have been checked.
+
+Ticket runRadio(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runPullAdapter(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runInsertAdapter(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runSetSession(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runConnection(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runRoam(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runSetDns(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runSetRegistry(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runSet(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runInterfaceState(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runFail(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runReply(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runLevels(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runNotify(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runIhv(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runAdvance(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runShiftTime(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runClearCalls(Machine& machine, const Json::Value& action, Asker asker);
+
+}  // namespace vexa::simulation

@@ -1,0 +1,36 @@
+#pragma once
+
+#include <cstdint>
+#include <optional>
+#include <span>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace vexa::simulation {
+
+// Conversions between the text of scenarios, which is UTF-8, and that of the machine.
+
+using Bytes = std::vector<std::uint8_t>;
+
+/// The code points of UTF-8 text. A byte that belongs to no valid sequence stands for itself.
+std::u32string codePoints(std::string_view utf8);
+
+std::u16string utf16(std::string_view utf8);
+
+/// One byte for each code point, "?" for those above U+00FF.
+std::string latin1(std::string_view utf8);
+
+std::string utf8(std::u32string_view codePoints);
+
+/// Lower case, without separators.
+std::string hexText(std::span<const std::uint8_t> bytes);
+
+/// Reads either case; nothing if it is no even number of hex digits.
+std::optional<Bytes> bytesFromHex(std::string_view hex);
+
+/// ASCII letters count as equal in either case.
+bool equalsNoCase(std::string_view a, std::string_view b);
+bool startsWithNoCase(std::string_view text, std::string_view prefix);
+
+}  // namespace vexa::simulation

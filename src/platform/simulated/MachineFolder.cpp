@@ -1,0 +1,25 @@
+#include "platform/simulated/MachineFolder.h"
+
+#include <cstdlib>
+
+namespace vexa::platform {
+
+namespace {
+
+const char* environment(const char* name) {
+    const char* const value = std::getenv(name);  // NOLINT(concurrency-mt-unsafe): nothing here sets any
+    return value && *value ? value : nullptr;
+}
+
+}  // namespace
+
+std::filesystem::path machineFolder() {
+    if (const char* const machine = environment("VEXA_MACHINE")) return machine;
+    if (const char* const state = environment("XDG_STATE_HOME")) {
+        return std::filesystem::path(state) / "vexa" / "machine";
+    }
+    const char* const home = environment("HOME");
+    return std::filesystem::path(home ? home : "/") / ".local" / "state" / "vexa" / "machine";
+}
+
+}  // namespace vexa::platform

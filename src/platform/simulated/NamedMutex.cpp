@@ -1,0 +1,105 @@
+#include "platform/NamedMutex.h"
+
+#include <fcntl.h>
+#include <sys/file.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cerrno>
+#include <filesystem>
+#include <utility>
+
+#include "platform/Thread.h"
+#include "platform/simulated/MachineFolder.h"
+#include "simulation/OwnerFiles.h"
+
+namespace vexa::platform {
+
+namespace {
+
+/// An open file whose locks other processes see. The kernel drops them with the last descriptor.
+class LockFile {
+public:
+    explicit LockFile(const std::filesystem::path& path)
+        : m_descriptor(::open(path.c_str(), O_RDWR | O_CREAT | O_CLOEXEC, 0600)) {}
+    ~LockFile() {
+        if (m_descriptor >= 0) ::close(m_descriptor);
+    }
+    LockFile(const LockFile&) = delete;
+    LockFile& operator=(const LockFile&) = delete;
+
+    bool isOpen() const { return m_descriptor >= 0; }
+
+    /// One of the operations of flock.
+    bool lock(int operation) {
+        int result = 0;
+        do {
+            result = ::flock(m_descriptor, operation);
+        } while (result != 0 && errno == EINTR);
+        return result == 0;
+    }
+
+private:
+    const int m_descriptor;
+};
+
+std::filesystem::path fileOf(std::string name, const char* suffix) {
+    std::replace(name.begin(), name.end(), '/', '_');
+    return machineFolder() / "mutexes" / (name + suffix);
+}
+
+}  // namespace
+
+// Who has `presence` locked, shared, has the mutex open; who has `ownership` locked owns it.
+struct NamedMutex::State {
+    explicit State(const std::string& name) : presence(fileOf(name, ".open")), ownership(fileOf(name, "")) {}
+
+    LockFile presence;
+    LockFile ownership;
+    bool isValid = false;
+    bool existedBefore = false;
+    bool isOwned = false;
+};
+
+NamedMutex::NamedMutex(const std::string& name, Owner initialOwner) {
+    simulation::createOwnerFolder(machineFolder() / "mutexes");
+    m_state = std::make_unique<State>(name);
+    State& state = *m_state;
+
+    // Two processes that start at once must not both find that nobody has it open.
+    LockFile guard(fileOf(name, ".guard"));
+    if (!guard.isOpen() || !state.presence.isOpen() || !state.ownership.isOpen()) return;
+    if (!guard.lock(LOCK_EX)) return;
+    state.existedBefore = !state.presence.lock(LOCK_EX | LOCK_NB);
+    if (!state.presence.lock(LOCK_SH)) return;
+    state.isValid = true;
+    state.isOwned = initialOwner == Owner::Yes && state.ownership.lock(LOCK_EX | LOCK_NB);
+}
+
+NamedMutex::~NamedMutex() = default;
+
+bool NamedMutex::isValid() const {
+    return m_state->isValid;
+}
+
+bool NamedMutex::existedBefore() const {
+    return m_state->existedBefore;
+}
+
+bool NamedMutex::isOwned() const {
+    return m_state->isOwned;
+}
+
+void NamedMutex::wait() {
+    if (!m_state->isValid || m_state->isOwned) return;
+    const ForeignWait waiting;
+    m_state->isOwned = m_state->ownership.lock(LOCK_EX);
+}
+
+void NamedMutex::release() {
+    if (!m_state->isOwned) return;
+    m_state->isOwned = false;
+    m_state->ownership.lock(LOCK_UN);
+}
+
+}  // namespace vexa::platform

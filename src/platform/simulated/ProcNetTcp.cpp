@@ -1,0 +1,46 @@
+#include "platform/simulated/ProcNetTcp.h"
+
+#include <fstream>
+#include <sstream>
+
+namespace vexa::platform {
+
+namespace {
+
+// "0100007F:1F90"
+bool readEndpoint(std::istream& line, std::string& address, std::uint16_t& port) {
+    std::string text;
+    line >> text;
+    const auto colon = text.find(':');
+    if (colon == std::string::npos) return false;
+    address = text.substr(0, colon);
+    std::istringstream digits(text.substr(colon + 1));
+    return static_cast<bool>(digits >> std::hex >> port);
+}
+
+// slot, local, remote, state, queues, timer, retransmissions, uid, and more
+bool readRow(const std::string& text, ProcNetTcpRow& row) {
+    std::istringstream line(text);
+    std::string skipped;
+    line >> skipped;
+    if (!readEndpoint(line, row.localAddress, row.localPort)) return false;
+    if (!readEndpoint(line, row.remoteAddress, row.remotePort)) return false;
+    line >> std::hex >> row.state >> skipped >> skipped >> skipped >> std::dec >> row.uid;
+    return static_cast<bool>(line);
+}
+
+}  // namespace
+
+bool readProcNetTcp(const char* path, std::vector<ProcNetTcpRow>& rows) {
+    std::ifstream table(path);
+    std::string line;
+    if (!std::getline(table, line)) return false;  // the headings
+    rows.clear();
+    while (std::getline(table, line)) {
+        ProcNetTcpRow row;
+        if (readRow(line, row)) rows.push_back(std::move(row));
+    }
+    return !table.bad();
+}
+
+}  // namespace vexa::platform

@@ -1,0 +1,22 @@
+#pragma once
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+namespace vexa::platform {
+
+/// A row of the kernel's table of TCP sockets. Addresses are in network byte order, ports in host byte order.
+struct ProcNetTcpRow {
+    std::string localAddress;  ///< Hex digits as the kernel prints them: 8 for IPv4, 32 for IPv6.
+    std::string remoteAddress;
+    std::uint16_t localPort = 0;
+    std::uint16_t remotePort = 0;
+    std::uint32_t state = 0;
+    std::uint32_t uid = 0;
+};
+
+/// The rows of such a table. False if it can't be read.
+bool readProcNetTcp(const char* path, std::vector<ProcNetTcpRow>& rows);
+
+}  // namespace vexa::platform
