@@ -20,8 +20,8 @@ struct DemoOptions {
 };
 
 int runDemo(const DemoOptions& options) {
-    const TemporaryMachine machine;
     Signals signals;
+    const TemporaryMachine machine;
     StopSource stop(signals, false);
     StartRequest request;
     request.machine = machine.path().string();

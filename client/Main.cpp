@@ -12,14 +12,18 @@ using namespace vexa::client;
 constexpr std::array kCommands{&addStartCommand,    &addDemoCommand, &addScanCommand,
                                &addChannelsCommand, &addSendCommand, &addListenCommand};
 
-int wrongUse(const CLI::ParseError& error) {
-    std::cerr << "vexa: " << error.what() << "\nvexa: --help tells how to use it\n";
+int report(const std::exception& error, int exitCode) {
+    std::cerr << "vexa: " << error.what() << '\n';
+    return exitCode;
+}
+
+int reportWrongUse(const CLI::ParseError& error) {
+    report(error, kExitWrongUse);
+    std::cerr << "vexa: --help tells how to use it\n";
     return kExitWrongUse;
 }
 
-}  // namespace
-
-int main(int argc, char** argv) {
+int run(int argc, char** argv) {
     CLI::App app("The Vexa wireless service: start it, look at the spectrum, talk to its ports.", "vexa");
     app.require_subcommand(1);
     int exitCode = kExitOk;
@@ -29,14 +33,20 @@ int main(int argc, char** argv) {
         app.parse(argc, argv);
     } catch (const CLI::Success& help) {
         return app.exit(help);
-    } catch (const CLI::ParseError& error) {
-        return wrongUse(error);
-    } catch (const ClientError& error) {
-        std::cerr << "vexa: " << error.what() << '\n';
-        return error.exitCode();
-    } catch (const std::exception& error) {
-        std::cerr << "vexa: " << error.what() << '\n';
-        return kExitFailed;
     }
     return exitCode;
+}
+
+}  // namespace
+
+int main(int argc, char** argv) {
+    try {
+        return run(argc, argv);
+    } catch (const CLI::ParseError& error) {
+        return reportWrongUse(error);
+    } catch (const ClientError& error) {
+        return report(error, error.exitCode());
+    } catch (const std::exception& error) {
+        return report(error, kExitFailed);
+    }
 }

@@ -58,7 +58,10 @@ ServiceParent::ServiceParent(const StartRequest& request, StopSource& stop)
 }
 
 ServiceParent::~ServiceParent() {
-    if (m_process && !m_process->exitCode()) stop();
+    try {
+        if (m_process && !m_process->exitCode()) stop();
+    } catch (const std::exception&) {  // the process kills what still runs when it goes
+    }
 }
 
 void ServiceParent::takeMutex() {

@@ -27,7 +27,7 @@ sigset_t handledSignals() {
 
 }  // namespace
 
-Signals::Signals() : m_before{} {
+Signals::Signals() {
     const sigset_t handled = handledSignals();
     sigprocmask(SIG_BLOCK, &handled, &m_before);
     // A reader of our output that has gone shows as a failed write.

@@ -28,7 +28,7 @@ public:
     static void suspend();
 
 private:
-    sigset_t m_before;
+    sigset_t m_before{};
     Descriptor m_descriptor;
 };
 

@@ -134,7 +134,10 @@ private:
 
 WebSocketClient::WebSocketClient(std::uint16_t port) : m_impl(std::make_unique<Impl>(port)) {}
 WebSocketClient::~WebSocketClient() {
-    m_impl->close(kGoodbyeLimit);
+    try {
+        m_impl->close(kGoodbyeLimit);
+    } catch (const std::exception&) {  // a peer that has gone needs no goodbye
+    }
 }
 
 int WebSocketClient::descriptor() const {

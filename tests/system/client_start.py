@@ -198,7 +198,7 @@ class ServiceThatDoesNotCome(unittest.TestCase):
 
     def test_it_inherits_neither_the_input_nor_the_mutex(self):
         seen = self.folder / "open"
-        parent = self.start("--service", self.stand_in(f'readlink /proc/$$/fd/* >"{seen}"\nexit 9\n'))
+        parent = self.start("--service", self.stand_in(f'open=$(readlink /proc/$$/fd/*)\necho "$open" >"{seen}"\nexit 9\n'))
         self.assertEqual(parent.wait(), 9)
         targets = seen.read_text().splitlines()
         self.assertEqual(targets[0], "/dev/null")

@@ -92,15 +92,25 @@ class Refused(Exception):
 class WebSocket:
     """One client of one port. A thread collects what comes in, so that a test that does not look holds up nobody."""
 
-    def __init__(self, port, host=None, headers=(), timeout=PATIENCE):
+    def __init__(self, port, host=None, headers=(), timeout=PATIENCE, reads=True, receive_buffer=None):
         self.received = collections.deque()
         self.close_code = None
         self._arrival = threading.Condition()
         self._sending = threading.Lock()
-        self._socket = socket.create_connection(("127.0.0.1", port), timeout=timeout)
+        self._socket = socket.socket()
+        if receive_buffer:
+            self._socket.setsockopt(socket.SOL_SOCKET, socket.SO_RCVBUF, receive_buffer)
+        self._socket.settimeout(timeout)
+        self._socket.connect(("127.0.0.1", port))
         self._input = self._socket.makefile("rb")
         self._handshake(host or f"127.0.0.1:{port}", headers)
         self._socket.settimeout(None)
+        self._reader = None
+        if reads:
+            self.start_reading()
+
+    def start_reading(self):
+        """For a client that was made with reads=False, and until now left all in its socket."""
         self._reader = threading.Thread(target=self._read_all, daemon=True)
         self._reader.start()
 
@@ -211,7 +221,8 @@ class WebSocket:
             self._socket.shutdown(socket.SHUT_RDWR)
         except OSError:
             pass
-        self._reader.join()
+        if self._reader:
+            self._reader.join()
         self._input.close()
         self._socket.close()
 

@@ -1,0 +1,74 @@
+#include <arpa/inet.h>
+#include <gtest/gtest.h>
+#include <sys/socket.h>
+
+#include <fstream>
+
+#include "client/ClientError.h"
+#include "client/Descriptor.h"
+#include "client/MachineFolder.h"
+#include "client/TcpPorts.h"
+
+namespace vexa::client {
+namespace {
+
+constexpr const char* kTable =
+    "  sl  local_address rem_address   st tx_queue rx_queue tr tm->when retrnsmt   uid  timeout inode\n"
+    "   0: 0100007F:1F41 00000000:0000 0A 00000000:00000000 00:00000000 00000000     0        0 111 1 0 100 "
+    "0\n"
+    "   1: 0200007F:1F41 00000000:0000 0A 00000000:00000000 00:00000000 00000000     0        0 112 1 0 100 "
+    "0\n"
+    "   2: 0100007F:1F42 0100007F:C350 06 00000000:00000000 03:00000123 00000000     0        0 0 3 0\n"
+    "   3: 0100007F:C350 0100007F:1F43 01 00000000:00000000 00:00000000 00000000     0        0 113 1 0 20 "
+    "4\n";
+
+TcpPorts fromText(const std::string& text) {
+    const TemporaryMachine folder;
+    const auto file = folder.path() / "tcp";
+    std::ofstream(file) << text;
+    return TcpPorts::read(file.string());
+}
+
+TEST(TcpPorts, ARowOfAnyStateMakesItsLocalPortBusy) {
+    const TcpPorts ports = fromText(kTable);
+    EXPECT_TRUE(ports.isBusy(8001));
+    EXPECT_TRUE(ports.isBusy(8002));
+    EXPECT_TRUE(ports.isBusy(50000));
+    EXPECT_FALSE(ports.isBusy(8003)) << "a remote port";
+}
+
+TEST(TcpPorts, ListenersAreTheSocketsThatListen) {
+    const TcpPorts ports = fromText(kTable);
+    EXPECT_EQ(ports.listeners(8001), (std::set<std::uint64_t>{111, 112}));
+    EXPECT_TRUE(ports.listeners(8002).empty());
+    EXPECT_TRUE(ports.listeners(50000).empty());
+}
+
+TEST(TcpPorts, ATableThatIsNotThereIsAnError) {
+    EXPECT_THROW(TcpPorts::read("/nonexistent/tcp"), ClientError);
+}
+
+TEST(TcpPorts, APickedPortCanBeBoundAndIsNotTaken) {
+    const TcpPorts ports = TcpPorts::read();
+    std::set<std::uint16_t> taken;
+    for (int i = 0; i < 50; ++i) {
+        const std::uint16_t port = ports.pickFree(taken);
+        EXPECT_FALSE(ports.isBusy(port));
+        EXPECT_TRUE(taken.insert(port).second);
+    }
+}
+
+TEST(TcpPorts, AListenerOfThisMomentIsSeen) {
+    const Descriptor socket(::socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC, 0));
+    sockaddr_in address{};
+    address.sin_family = AF_INET;
+    address.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
+    socklen_t size = sizeof address;
+    ASSERT_EQ(::bind(socket.get(), reinterpret_cast<sockaddr*>(&address), size), 0);
+    ASSERT_EQ(::listen(socket.get(), 1), 0);
+    ASSERT_EQ(::getsockname(socket.get(), reinterpret_cast<sockaddr*>(&address), &size), 0);
+    EXPECT_EQ(TcpPorts::read().listeners(ntohs(address.sin_port)).size(), 1U);
+}
+
+}  // namespace
+}  // namespace vexa::client
