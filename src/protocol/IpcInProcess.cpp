@@ -128,7 +128,7 @@ std::unique_ptr<InProcessClient> InProcessClient::connect(std::int32_t port) {
     auto state = std::make_shared<State>();
     state->server = server;
     server->add(state);
-    return std::unique_ptr<InProcessClient>(new InProcessClient(std::move(state)));
+    return std::make_unique<InProcessClient>(std::move(state));
 }
 
 InProcessClient::InProcessClient(std::shared_ptr<State> state) : m_state(std::move(state)) {}

@@ -11,8 +11,12 @@ namespace vexa {
 /// engine tests, which own all threads.
 class InProcessClient {
 public:
+    struct State;
+
     /// Null if nothing serves this port.
     static std::unique_ptr<InProcessClient> connect(std::int32_t port);
+    /// For connect().
+    explicit InProcessClient(std::shared_ptr<State> state);
     ~InProcessClient();
     InProcessClient(const InProcessClient&) = delete;
     InProcessClient& operator=(const InProcessClient&) = delete;
@@ -22,10 +26,7 @@ public:
     /// What has come since the last call, oldest first.
     std::vector<std::string> receive();
 
-    struct State;
-
 private:
-    explicit InProcessClient(std::shared_ptr<State> state);
     std::shared_ptr<State> m_state;
 };
 

@@ -1,5 +1,6 @@
 #include "platform/Thread.h"
 
+#include <atomic>
 #include <system_error>
 #include <thread>
 #include <utility>
@@ -11,6 +12,7 @@ namespace vexa::platform {
 
 struct Thread::State {
     std::thread thread = {};
+    std::atomic<std::thread::id> id = {};
     Event ended{Reset::Manual};
 };
 
@@ -19,24 +21,25 @@ Thread::~Thread() {
 }
 
 bool Thread::start(std::string /*name*/, std::function<void()> body) {
-    auto state = std::make_shared<State>();
+    m_state = std::make_shared<State>();
     Scheduler::get().beginWork();
     try {
-        state->thread = std::thread([state, body = std::move(body)] {
+        m_state->thread = std::thread([state = m_state, body = std::move(body)] {
+            state->id = std::this_thread::get_id();
             body();
             state->ended.set();
             Scheduler::get().endWork();
         });
     } catch (const std::system_error&) {
         Scheduler::get().endWork();
+        m_state.reset();
         return false;
     }
-    m_state = std::move(state);
     return true;
 }
 
 bool Thread::isCurrent() const {
-    return m_state && m_state->thread.get_id() == std::this_thread::get_id();
+    return m_state && m_state->id == std::this_thread::get_id();
 }
 
 bool Thread::join(Timeout limit) {

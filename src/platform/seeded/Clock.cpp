@@ -38,6 +38,7 @@ void setClockSpeed(double /*speed*/) {}
 
 bool advance(Duration span) {
     sleepFor(span);
+    Scheduler::get().waitForRest();
     return true;
 }
 

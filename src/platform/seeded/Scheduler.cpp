@@ -14,7 +14,7 @@ namespace {
 thread_local Task* t_current = nullptr;
 
 // How often, out of 256, an operation that could go on hands the turn to somebody else.
-constexpr std::uint64_t kHandOverOdds = 80;
+constexpr std::uint64_t kHandOverOdds = 40;
 
 std::string describeWait(const Task& task) {
     std::string text;
@@ -60,7 +60,6 @@ std::shared_ptr<Task> Scheduler::start(std::string name, std::function<void()> b
         m_tasks.push_back(task);
     }
     task->thread = std::thread([this, task, body = std::move(body)] { runTask(task, body); });
-    handOver();
     return task;
 }
 
@@ -100,7 +99,7 @@ Task* Scheduler::chooseNext() {
         const bool allEnded = std::all_of(m_tasks.begin(), m_tasks.end(),
                                           [](const auto& task) { return task->phase == Task::Phase::Ended; });
         if (allEnded) return nullptr;
-        if (!jumpToNextDeadline()) reportDeadlock();
+        if (!releaseWhoWantsRest() && !jumpToNextDeadline()) reportDeadlock();
         ready = readyTasks();
     }
     return ready[m_random() % ready.size()];
@@ -111,6 +110,15 @@ std::vector<Task*> Scheduler::readyTasks() const {
     for (const auto& task : m_tasks)
         if (task->phase == Task::Phase::Ready) ready.push_back(task.get());
     return ready;
+}
+
+bool Scheduler::releaseWhoWantsRest() {
+    const auto found = std::find_if(m_tasks.begin(), m_tasks.end(), [](const auto& task) {
+        return task->phase == Task::Phase::Waiting && task->wantsRest;
+    });
+    if (found == m_tasks.end()) return false;
+    release(**found, kTimedOut);
+    return true;
 }
 
 bool Scheduler::jumpToNextDeadline() {
@@ -132,6 +140,7 @@ void Scheduler::release(Task& task, int outcome) {
     task.deadline = std::nullopt;
     task.wantedLock = nullptr;
     task.wantedLockName = nullptr;
+    task.wantsRest = false;
     task.outcome = outcome;
 }
 
@@ -165,6 +174,13 @@ void Scheduler::set(Event::State& event) {
         }
     }
     handOver();
+}
+
+void Scheduler::waitForRest() {
+    Lock lock(m_mutex);
+    t_current->phase = Task::Phase::Waiting;
+    t_current->wantsRest = true;
+    giveTurn(lock);
 }
 
 void Scheduler::waitForLock(const void* wanted, const char* name) {

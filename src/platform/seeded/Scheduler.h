@@ -36,6 +36,7 @@ struct Task {
     const char* wantedLockName = nullptr;
     Timeout deadline = std::nullopt;
     int outcome = kTimedOut;
+    bool wantsRest = false;
     std::condition_variable turn = {};
     std::thread thread = {};
 };
@@ -58,6 +59,9 @@ public:
     int wait(std::span<Event::State* const> events, Timeout deadline);
     void set(Event::State& event);
 
+    /// Until no other task can run at this moment.
+    void waitForRest();
+
     /// Until somebody announces that this lock is free.
     void waitForLock(const void* lock, const char* name);
     void announceFreeLock(const void* lock);
@@ -71,6 +75,7 @@ private:
     void giveTurn(Lock& lock);
     Task* chooseNext();
     std::vector<Task*> readyTasks() const;
+    bool releaseWhoWantsRest();
     bool jumpToNextDeadline();
     void release(Task& task, int outcome);
     [[noreturn]] void reportDeadlock() const;

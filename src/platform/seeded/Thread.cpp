@@ -22,6 +22,7 @@ bool Thread::start(std::string name, std::function<void()> body) {
         body();
         state->ended.set();
     });
+    Scheduler::get().handOver();
     return true;
 }
 

@@ -1,0 +1,136 @@
+#include "engine/World.h"
+
+#include <json/reader.h>
+#include <json/writer.h>
+
+#include <fstream>
+#include <sstream>
+#include <stdexcept>
+
+#include "base/DiagnosticLog.h"
+#include "platform/ClockControl.h"
+#include "protocol/SAHotSpotPortlink.h"
+#include "service/CommandLine.h"
+#include "service/Service.h"
+#include "simulation/Scenario.h"
+
+namespace vexa::test {
+
+namespace {
+
+using namespace std::chrono_literals;
+
+Json::Value parse(const std::string& text) {
+    Json::Value value;
+    std::string errors;
+    std::istringstream stream(text);
+    Json::CharReaderBuilder builder;
+    if (!text.empty() && !Json::parseFromStream(builder, stream, &value, &errors))
+        return Json::Value::nullSingleton();
+    return value;
+}
+
+std::string oneLine(const Json::Value& value) {
+    Json::StreamWriterBuilder builder;
+    builder["indentation"] = "";
+    return Json::writeString(builder, value);
+}
+
+std::string contentOf(const std::filesystem::path& file) {
+    const std::ifstream stream(file, std::ios::binary);
+    std::ostringstream content;
+    content << stream.rdbuf();
+    return content.str();
+}
+
+// Nobody binds these: it is the check of the command line that wants ports which no row of the host's table
+// has.
+std::int32_t unusedPort(std::int32_t from) {
+    for (std::int32_t port = from;; ++port) {
+        bool isFree = false;
+        if (isTcpPortFree(isFree, static_cast<std::uint16_t>(port)) && isFree) return port;
+    }
+}
+
+}  // namespace
+
+Client::Client(std::int32_t port) : m_client(InProcessClient::connect(port)) {
+    for (int tries = 0; !m_client; ++tries) {
+        if (tries == 1000) throw std::runtime_error("nothing serves port " + std::to_string(port));
+        platform::sleepFor(1ms);
+        m_client = InProcessClient::connect(port);
+    }
+}
+
+void Client::send(const std::string& command, const std::string& data) {
+    Json::Value message;
+    message["CommandId"] = command;
+    if (!data.empty()) message["Data"] = data;
+    m_client->send(oneLine(message));
+}
+
+std::vector<ClientEvent> Client::events() {
+    std::vector<ClientEvent> events;
+    for (const std::string& text : m_client->receive()) {
+        m_transcript += text;
+        const Json::Value event = parse(text);
+        const std::string data = event.get("Data", "").asString();
+        events.push_back({event["EventId"].asString(), event["Source"].asString(), event.isMember("Data"),
+                          data, parse(data)});
+    }
+    return events;
+}
+
+std::string Client::ids() {
+    std::string ids;
+    for (const ClientEvent& event : events())
+        ids += (ids.empty() ? "" : " ") + event.id;
+    return ids;
+}
+
+World::World(const std::string& scenario, const std::filesystem::path& folder)
+    : m_folder(folder),
+      m_machine(simulation::parseScenario(scenario), folder),
+      m_stopMutex(std::make_unique<platform::NamedMutex>("{39EAA3ED-1A26-46B7-90A7-AAFFECE80392}",
+                                                         platform::NamedMutex::Owner::Yes)) {
+    DiagnosticLog::instance().setEnableDump(true);
+    DiagnosticLog::instance().start((m_folder / "log.txt").string());
+    const std::int32_t saPort = unusedPort(21000);
+    const std::int32_t hs20Port = unusedPort(saPort + 1);
+    m_service.start("main", [this, commandLine = std::to_wstring(saPort) + L" " + std::to_wstring(hs20Port)] {
+        m_exitCode = runService(&commandLine);
+    });
+    m_hotspot = std::make_unique<Client>(hs20Port);
+    m_spectral = std::make_unique<Client>(saPort);
+    advance(0ms);
+}
+
+Json::Value World::perform(const std::string& message) {
+    Json::Value answer = m_machine.perform(parse(message));
+    if (!answer["ok"].asBool()) throw std::runtime_error(message + ": " + oneLine(answer));
+    return answer["result"];
+}
+
+void World::advance(platform::Duration span) {
+    platform::advance(span);
+}
+
+std::string World::log() {
+    DiagnosticLog::instance().flushToFile();
+    return contentOf(m_folder / "log.txt");
+}
+
+std::string World::debugLog() const {
+    return contentOf(m_folder / "debug.log");
+}
+
+int World::stop() {
+    m_stopMutex->release();
+    m_service.join();
+    SAHotSpotPortlink::instance().close();
+    DiagnosticLog::instance().stop();
+    m_machine.stop();
+    return m_exitCode;
+}
+
+}  // namespace vexa::test

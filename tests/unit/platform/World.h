@@ -1,0 +1,12 @@
+#pragma once
+
+#include <functional>
+
+namespace vexa::test {
+
+/// Runs a test's body where the implementation under test wants it: on the test's own thread with a clock
+/// that stands still, or as the first thread of a seeded world. Either way time moves by platform::advance()
+/// alone, apart from waits for which nothing else is left to do.
+void inWorld(const std::function<void()>& body);
+
+}  // namespace vexa::test

@@ -1,0 +1,74 @@
+#include <gtest/gtest.h>
+
+#include <atomic>
+#include <memory>
+
+#include "platform/ClockControl.h"
+#include "platform/NamedMutex.h"
+#include "platform/Thread.h"
+#include "unit/platform/World.h"
+
+namespace vexa::platform {
+namespace {
+
+using namespace std::chrono_literals;
+using test::inWorld;
+using Owner = NamedMutex::Owner;
+
+TEST(NamedMutex, ExistsWhileSomebodyHasItOpen) {
+    inWorld([] {
+        {
+            const NamedMutex first("{existence}", Owner::No);
+            EXPECT_TRUE(first.isValid());
+            EXPECT_FALSE(first.existedBefore());
+            EXPECT_TRUE(NamedMutex("{existence}", Owner::No).existedBefore());
+            EXPECT_FALSE(NamedMutex("{another}", Owner::No).existedBefore());
+        }
+        EXPECT_FALSE(NamedMutex("{existence}", Owner::No).existedBefore());
+    });
+}
+
+TEST(NamedMutex, OwnershipIsTakenOnlyIfNobodyHasIt) {
+    inWorld([] {
+        NamedMutex first("{ownership}", Owner::Yes);
+        EXPECT_TRUE(first.isOwned());
+        EXPECT_FALSE(NamedMutex("{ownership}", Owner::Yes).isOwned());
+        first.release();
+        EXPECT_TRUE(NamedMutex("{ownership}", Owner::Yes).isOwned());
+    });
+}
+
+TEST(NamedMutex, AWaitEndsWhenTheOwnerReleasesOrCloses) {
+    inWorld([] {
+        for (const bool closes : {false, true}) {
+            auto owner = std::make_unique<NamedMutex>("{wait}", Owner::Yes);
+            std::atomic<bool> isOver{false};
+            Thread waiter;
+            waiter.start("waiter", [&] {
+                NamedMutex mutex("{wait}", Owner::No);
+                EXPECT_TRUE(mutex.existedBefore());
+                mutex.wait();
+                isOver = mutex.isOwned();
+            });
+            ASSERT_TRUE(advance(10ms));
+            EXPECT_FALSE(isOver);
+            if (closes)
+                owner.reset();
+            else
+                owner->release();
+            waiter.join();
+            EXPECT_TRUE(isOver);
+        }
+    });
+}
+
+TEST(NamedMutex, AWaitForAMutexThatNobodyHasEndsAtOnce) {
+    inWorld([] {
+        NamedMutex mutex("{free}", Owner::No);
+        mutex.wait();
+        EXPECT_TRUE(mutex.isOwned());
+    });
+}
+
+}  // namespace
+}  // namespace vexa::platform
