@@ -1,0 +1,26 @@
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <memory>
+#include <string_view>
+
+namespace vexa::bench {
+
+/// A WebSocket client that blocks. Throws where a connection fails.
+class BenchClient {
+public:
+    explicit BenchClient(std::uint16_t port);
+    ~BenchClient();
+    BenchClient(BenchClient&&) noexcept;
+
+    void send(std::string_view message);
+    /// Waits for one message and gives its size.
+    std::size_t receive();
+
+private:
+    struct Connection;
+    std::unique_ptr<Connection> m_connection;
+};
+
+}  // namespace vexa::bench
