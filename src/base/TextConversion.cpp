@@ -2,12 +2,98 @@
 
 #include <algorithm>
 #include <limits>
+#include <type_traits>
 
 namespace vexa {
 
 namespace {
 
 constexpr std::wstring_view kWhiteSpace = L" \t\n\v\f\r";
+
+constexpr char32_t kReplacement = 0xFFFD;
+constexpr bool kIsUtf16 = sizeof(wchar_t) == 2;
+
+bool isHighSurrogate(char32_t unit) {
+    return unit >= 0xD800 && unit < 0xDC00;
+}
+bool isLowSurrogate(char32_t unit) {
+    return unit >= 0xDC00 && unit < 0xE000;
+}
+
+char32_t unitAt(std::wstring_view text, std::size_t index) {
+    return static_cast<std::make_unsigned_t<wchar_t>>(text[index]);
+}
+
+/// One character of wide text and how many wchar_t it takes.
+struct WideCharacter {
+    char32_t codePoint;
+    std::size_t length;
+};
+
+WideCharacter characterAt(std::wstring_view text, std::size_t index) {
+    const char32_t unit = unitAt(text, index);
+    if (kIsUtf16 && isHighSurrogate(unit) && index + 1 < text.size()) {
+        const char32_t low = unitAt(text, index + 1);
+        if (isLowSurrogate(low)) return {0x10000 + ((unit - 0xD800) << 10) + (low - 0xDC00), 2};
+    }
+    return {unit, 1};
+}
+
+void appendUtf8(std::string& text, char32_t c) {
+    if (c > 0x10FFFF || isHighSurrogate(c) || isLowSurrogate(c)) c = kReplacement;
+    const auto byte = [&](char32_t bits) { text += static_cast<char>(static_cast<unsigned char>(bits)); };
+    if (c < 0x80) return byte(c);
+    if (c < 0x800) {
+        byte(0xC0 | c >> 6);
+    } else {
+        if (c < 0x10000) {
+            byte(0xE0 | c >> 12);
+        } else {
+            byte(0xF0 | c >> 18);
+            byte(0x80 | (c >> 12 & 0x3F));
+        }
+        byte(0x80 | (c >> 6 & 0x3F));
+    }
+    byte(0x80 | (c & 0x3F));
+}
+
+void appendWide(std::wstring& text, char32_t c) {
+    if (kIsUtf16 && c >= 0x10000) {
+        text += static_cast<wchar_t>(0xD800 + ((c - 0x10000) >> 10));
+        text += static_cast<wchar_t>(0xDC00 + ((c - 0x10000) & 0x3FF));
+    } else {
+        text += static_cast<wchar_t>(c);
+    }
+}
+
+// How many bytes a sequence has that begins with this one; 0: none does.
+std::size_t sequenceLength(unsigned char first) {
+    if (first < 0x80) return 1;
+    if (first >= 0xC2 && first < 0xE0) return 2;
+    if (first >= 0xE0 && first < 0xF0) return 3;
+    if (first >= 0xF0 && first < 0xF5) return 4;
+    return 0;
+}
+
+// Overlong forms, surrogates and numbers past the last code point are no characters.
+bool isCodePointOfLength(char32_t c, std::size_t length) {
+    constexpr char32_t kLeast[] = {0, 0, 0x80, 0x800, 0x10000};
+    return c >= kLeast[length] && c <= 0x10FFFF && !isHighSurrogate(c) && !isLowSurrogate(c);
+}
+
+// The character at the beginning of the text, or one byte of what is none.
+WideCharacter decodeUtf8(std::string_view text) {
+    const auto byteAt = [&](std::size_t i) { return static_cast<unsigned char>(text[i]); };
+    const std::size_t length = sequenceLength(byteAt(0));
+    if (length == 1) return {byteAt(0), 1};
+    if (length == 0 || length > text.size()) return {kReplacement, 1};
+    char32_t c = byteAt(0) & (0xFFU >> (length + 1));
+    for (std::size_t i = 1; i < length; ++i) {
+        if ((byteAt(i) & 0xC0) != 0x80) return {kReplacement, 1};
+        c = c << 6 | (byteAt(i) & 0x3FU);
+    }
+    return isCodePointOfLength(c, length) ? WideCharacter{c, length} : WideCharacter{kReplacement, 1};
+}
 
 template <class Char>
 Char foldCase(Char c) {
@@ -25,11 +111,48 @@ int compareFolded(std::basic_string_view<Char> a, std::basic_string_view<Char> b
 
 }  // namespace
 
+std::string utf8FromWide(std::wstring_view text) {
+    std::string utf8;
+    for (std::size_t i = 0; i < text.size();) {
+        const WideCharacter character = characterAt(text, i);
+        appendUtf8(utf8, character.codePoint);
+        i += character.length;
+    }
+    return utf8;
+}
+
+std::wstring wideFromUtf8(std::string_view text) {
+    std::wstring wide;
+    while (!text.empty()) {
+        const WideCharacter character = decodeUtf8(text);
+        appendWide(wide, character.codePoint);
+        text.remove_prefix(character.length);
+    }
+    return wide;
+}
+
+std::wstring cutToUtf16Units(std::wstring_view text, std::size_t units) {
+    std::size_t end = 0;
+    while (end < text.size()) {
+        const WideCharacter character = characterAt(text, end);
+        const std::size_t needed = character.codePoint >= 0x10000 ? 2 : 1;
+        if (needed > units) break;
+        units -= needed;
+        end += character.length;
+    }
+    return std::wstring(text.substr(0, end));
+}
+
 std::string narrowFromWide(std::wstring_view text) {
-    std::string narrow(text.size(), '\0');
-    std::transform(text.begin(), text.end(), narrow.begin(), [](wchar_t unit) {
-        return static_cast<char>(static_cast<unsigned char>(static_cast<std::uint32_t>(unit) & 0xFF));
-    });
+    std::string narrow;
+    const auto append = [&](char32_t unit) {
+        narrow += static_cast<char>(static_cast<unsigned char>(unit & 0xFF));
+    };
+    for (std::size_t i = 0; i < text.size(); ++i) {
+        const char32_t unit = unitAt(text, i);
+        if (unit >= 0x10000) append((unit - 0x10000) >> 10);
+        append(unit);
+    }
     return narrow;
 }
 

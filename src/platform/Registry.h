@@ -27,6 +27,9 @@ public:
     /// `capacity` bytes with its terminator.
     std::optional<std::string> value(const std::string& name, std::size_t capacity) const;
 
+    /// The same in wide characters; `capacity` is in bytes of 16-bit characters.
+    std::optional<std::wstring> wideValue(const std::string& name, std::size_t capacity) const;
+
 private:
     struct State;
     explicit RegistryKey(std::unique_ptr<State> state);

@@ -1,41 +1,146 @@
 #include "platform/Files.h"
 
 #include <fcntl.h>
+#include <sys/stat.h>
 #include <unistd.h>
+
+#include <array>
+#include <cerrno>
+#include <cstdio>
+#include <filesystem>
+#include <utility>
+
+#include "base/TextConversion.h"
+#include "platform/simulated/HostPath.h"
 
 namespace vexa::platform {
 
 namespace {
 
-constexpr mode_t kOwnerOnly = 0600;
+namespace fs = std::filesystem;
 
-// Narrow file names are Latin-1, those of the host UTF-8.
-std::string hostPath(const std::string& narrowPath) {
-    std::string path;
-    for (const char c : narrowPath) {
-        const auto byte = static_cast<unsigned char>(c);
-        if (byte < 0x80) {
-            path += c;
-        } else {
-            path += static_cast<char>(0xC0 | (byte >> 6));
-            path += static_cast<char>(0x80 | (byte & 0x3F));
-        }
+constexpr mode_t kOwnerOnlyFile = 0600;
+constexpr mode_t kOwnerOnlyFolder = 0700;
+constexpr std::uint32_t kErrorSharingViolation = 32;
+
+/// A descriptor that is closed at the end of its scope.
+class Descriptor {
+public:
+    explicit Descriptor(int descriptor) : m_descriptor(descriptor) {}
+    ~Descriptor() {
+        if (m_descriptor >= 0) close(m_descriptor);
     }
-    return path;
+    Descriptor(Descriptor&& other) noexcept : m_descriptor(std::exchange(other.m_descriptor, -1)) {}
+    Descriptor& operator=(Descriptor&& other) noexcept {
+        std::swap(m_descriptor, other.m_descriptor);
+        return *this;
+    }
+
+    bool isOpen() const { return m_descriptor >= 0; }
+    int get() const { return m_descriptor; }
+
+private:
+    int m_descriptor;
+};
+
+Descriptor openFile(const fs::path& path, int flags) {
+    if (fileFault("open", path)) return Descriptor(-1);
+    return Descriptor(::open(path.c_str(), flags | O_CLOEXEC, kOwnerOnlyFile));
+}
+
+bool writeAll(const Descriptor& file, std::string_view content) {
+    while (!content.empty()) {
+        const ssize_t written = ::write(file.get(), content.data(), content.size());
+        if (written < 0 && errno == EINTR) continue;
+        if (written <= 0) return false;
+        content.remove_prefix(static_cast<std::size_t>(written));
+    }
+    return true;
 }
 
 }  // namespace
 
-bool appendToFile(const std::string& narrowPath, std::string_view text) {
-    const int file =
-        open(hostPath(narrowPath).c_str(), O_WRONLY | O_CREAT | O_APPEND | O_CLOEXEC, kOwnerOnly);
-    if (file < 0) return false;
-    while (!text.empty()) {
-        const ssize_t written = write(file, text.data(), text.size());
-        if (written <= 0) break;
-        text.remove_prefix(static_cast<std::size_t>(written));
+bool canOpenFile(const std::wstring& path) {
+    return openFile(hostPath(path), O_RDONLY).isOpen();
+}
+
+std::optional<std::string> readFile(const std::wstring& path) {
+    const Descriptor file = openFile(hostPath(path), O_RDONLY);
+    if (!file.isOpen()) return std::nullopt;
+    std::string content;
+    std::array<char, 65536> buffer{};
+    for (;;) {
+        const ssize_t count = ::read(file.get(), buffer.data(), buffer.size());
+        if (count < 0 && errno == EINTR) continue;
+        if (count < 0) return std::nullopt;
+        if (count == 0) return content;
+        content.append(buffer.data(), static_cast<std::size_t>(count));
     }
-    close(file);
+}
+
+bool createFolder(const std::wstring& path) {
+    const fs::path folder = hostPath(path);
+    if (fileFault("CreateDirectory", folder)) return false;
+    std::error_code ignored;
+    fs::create_directories(folder.parent_path(), ignored);
+    return ::mkdir(folder.c_str(), kOwnerOnlyFolder) == 0 || errno == EEXIST;
+}
+
+std::vector<std::wstring> filesIn(const std::wstring& folder) {
+    std::vector<std::wstring> names;
+    std::error_code error;
+    for (fs::directory_iterator entry(hostPath(folder), error), end; !error && entry != end;
+         entry.increment(error))
+        names.push_back(wideFromUtf8(entry->path().filename().string()));
+    return names;
+}
+
+struct NewFile::State {
+    fs::path path;
+    Descriptor file;
+};
+
+std::optional<NewFile> NewFile::create(const std::wstring& path) {
+    fs::path host = hostPath(path);
+    Descriptor file = openFile(host, O_WRONLY | O_CREAT | O_EXCL);
+    if (!file.isOpen()) return std::nullopt;
+    return NewFile(std::make_unique<State>(State{std::move(host), std::move(file)}));
+}
+
+NewFile::NewFile(std::unique_ptr<State> state) : m_state(std::move(state)) {}
+NewFile::~NewFile() = default;
+NewFile::NewFile(NewFile&&) noexcept = default;
+NewFile& NewFile::operator=(NewFile&&) noexcept = default;
+
+bool NewFile::write(std::string_view content) {
+    return !fileFault("write", m_state->path) && writeAll(m_state->file, content);
+}
+
+bool NewFile::flush() {
+    return !fileFault("sync", m_state->path) && ::fsync(m_state->file.get()) == 0;
+}
+
+RenameResult renameFile(const std::wstring& from, const std::wstring& to, Existing existing) {
+    const fs::path source = hostPath(from);
+    const fs::path target = hostPath(to);
+    if (const auto error = fileFault("rename", target))
+        return *error == kErrorSharingViolation ? RenameResult::InUse : RenameResult::Failed;
+    if (existing == Existing::Replace)
+        return ::rename(source.c_str(), target.c_str()) == 0 ? RenameResult::Done : RenameResult::Failed;
+    if (::link(source.c_str(), target.c_str()) != 0) return RenameResult::Failed;
+    ::unlink(source.c_str());
+    return RenameResult::Done;
+}
+
+void removeFile(const std::wstring& path) {
+    ::unlink(hostPath(path).c_str());
+}
+
+bool appendToFile(const std::string& narrowPath, std::string_view text) {
+    const fs::path path = hostPath(narrowPath);
+    const Descriptor file = openFile(path, O_WRONLY | O_CREAT | O_APPEND);
+    if (!file.isOpen()) return false;
+    if (!fileFault("write", path)) writeAll(file, text);
     return true;
 }
 

@@ -1,5 +1,6 @@
 #include "platform/Registry.h"
 
+#include "base/TextConversion.h"
 #include "simulation/Machine.h"
 
 namespace vexa::platform {
@@ -31,6 +32,14 @@ std::optional<std::string> RegistryKey::value(const std::string& name, std::size
     auto content = m_state->registry.value(m_state->root, m_state->path, name);
     if (!content || content->size() >= capacity) return std::nullopt;
     return content->substr(0, content->find('\0'));
+}
+
+std::optional<std::wstring> RegistryKey::wideValue(const std::string& name, std::size_t capacity) const {
+    const auto content = m_state->registry.value(m_state->root, m_state->path, name);
+    if (!content) return std::nullopt;
+    const std::wstring text = wideFromNarrow(*content);
+    if ((text.size() + 1) * sizeof(char16_t) > capacity) return std::nullopt;
+    return text.substr(0, text.find(L'\0'));
 }
 
 }  // namespace vexa::platform
