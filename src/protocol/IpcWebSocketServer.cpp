@@ -19,7 +19,10 @@
 #include <deque>
 #include <map>
 #include <mutex>
+#include <optional>
+#include <system_error>
 #include <thread>
+#include <type_traits>
 #include <utility>
 #include <vector>
 
@@ -46,24 +49,38 @@ constexpr std::chrono::seconds kRefusedLinger{2};
 constexpr std::chrono::milliseconds kFarewellLimit{500};
 constexpr std::chrono::milliseconds kAcceptPause{100};
 
+// With POSIX sockets this gives a restarted server its port back while old connections linger, and no port
+// that is listened on; with Windows' it would let two servers share one.
+constexpr bool kMayReuseAddress = std::is_same_v<tcp::acceptor::native_handle_type, int>;
+
 // What one client may have waiting for the handler before his further messages stay in his socket.
 constexpr std::size_t kMaxUnhandledMessages = 256;
 constexpr std::size_t kMaxUnhandledBytes = IpcWebSocketServer::kMaxMessage;
 
+constexpr std::size_t kMaxIdleBuffer = std::size_t{16} << 10;
+
 constexpr std::string_view kForbidden =
     "HTTP/1.1 403 Forbidden\r\nConnection: close\r\nContent-Length: 0\r\n\r\n";
 
+bool isPortOrNothing(std::string_view text) {
+    if (text.empty()) return true;
+    return text.front() == ':' &&
+           std::all_of(text.begin() + 1, text.end(), [](char c) { return c >= '0' && c <= '9'; });
+}
+
+// A name that merely begins like this machine's may lead anywhere: nothing but a port stands behind it.
 bool isLoopbackHost(std::string_view host) {
+    error_code ec;
     if (!host.empty() && host.front() == '[') {
         const std::size_t end = host.find(']');
-        if (end == std::string_view::npos) return false;
-        error_code ec;
+        if (end == std::string_view::npos || !isPortOrNothing(host.substr(end + 1))) return false;
         const auto address = asio::ip::make_address_v6(std::string(host.substr(1, end - 1)), ec);
         return !ec && address.is_loopback();
     }
-    const std::string name(host.substr(0, host.find(':')));
+    const std::size_t end = std::min(host.find(':'), host.size());
+    if (!isPortOrNothing(host.substr(end))) return false;
+    const std::string name(host.substr(0, end));
     if (beast::iequals(name, "localhost")) return true;
-    error_code ec;
     const auto address = asio::ip::make_address_v4(name, ec);
     return !ec && address.is_loopback();
 }
@@ -85,7 +102,7 @@ public:
     explicit Impl(Handler handler) : m_handler(std::move(handler)) {}
 
     bool open(std::int32_t port);
-    void start();
+    bool start();
     void stop();
 
     bool sendToAll(std::string message);
@@ -139,7 +156,7 @@ public:
     void start();
     void send(const Text& text);
     void close(websocket::close_code code);
-    void abandon();
+    void leave();
     void messageHandled(std::size_t size);
 
 private:
@@ -153,22 +170,23 @@ private:
     void read();
     void onMessage(error_code ec);
     bool isBehind() const;
-    void write();
+    void resume();
+    void writeNext();
     void onWritten(error_code ec);
     void sendClose();
     void limitLife(std::chrono::seconds limit);
-    void leave();
 
     IpcWebSocketServer::Impl& m_server;
     const ClientId m_id;
     asio::steady_timer m_linger;
-    websocket::stream<beast::tcp_stream> m_stream;
+    websocket::stream<beast::tcp_stream, false> m_stream;
     beast::flat_buffer m_buffer;
-    http::request_parser<http::empty_body> m_request;
+    std::optional<http::request_parser<http::empty_body>> m_request;
     std::deque<Text> m_queue;
     std::size_t m_queuedBytes = 0;
     bool m_isOpen = false;
-    bool m_isPaused = false;
+    bool m_isWriting = false;
+    std::atomic<bool> m_isPaused{false};
     websocket::close_code m_closeCode = websocket::close_code::none;
     std::atomic<std::size_t> m_unhandledMessages{0};
     std::atomic<std::size_t> m_unhandledBytes{0};
@@ -181,15 +199,22 @@ bool IpcWebSocketServer::Impl::open(std::int32_t port) {
     const tcp::endpoint endpoint(asio::ip::address_v4::loopback(), static_cast<std::uint16_t>(port));
     error_code ec;
     m_acceptor.open(endpoint.protocol(), ec);
+    if (kMayReuseAddress && !ec) m_acceptor.set_option(asio::socket_base::reuse_address(true), ec);
     if (!ec) m_acceptor.bind(endpoint, ec);
     if (!ec) m_acceptor.listen(asio::socket_base::max_listen_connections, ec);
     return !ec;
 }
 
-void IpcWebSocketServer::Impl::start() {
+bool IpcWebSocketServer::Impl::start() {
     asio::post(m_inout, [this] { accept(); });
-    for (std::thread& thread : m_threads)
-        thread = std::thread([this] { m_io.run(); });
+    try {
+        for (std::thread& thread : m_threads)
+            thread = std::thread([this] { m_io.run(); });
+        return true;
+    } catch (const std::system_error&) {
+        stop();
+        return false;
+    }
 }
 
 void IpcWebSocketServer::Impl::accept() {
@@ -287,7 +312,7 @@ void IpcWebSocketServer::Impl::sayFarewell() {
     m_pause.cancel();
     if (m_sessions.empty()) return m_io.stop();
     for (const auto& [id, session] : std::map(m_sessions))
-        m_clients.contains(id) ? session->close(websocket::close_code::going_away) : session->abandon();
+        m_clients.contains(id) ? session->close(websocket::close_code::going_away) : session->leave();
     m_pause.expires_after(kFarewellLimit);
     m_pause.async_wait([this](error_code) { m_io.stop(); });
 }
@@ -302,7 +327,7 @@ void IpcWebSocketServer::Impl::stop() {
     {
         const platform::ForeignWait waiting;
         for (std::thread& thread : m_threads)
-            thread.join();
+            if (thread.joinable()) thread.join();
     }
     if (m_unhandled != 0) platform::endForeignWork();
     m_clients.clear();
@@ -330,7 +355,7 @@ bool IpcSession::isSameAccount() {
 
 void IpcSession::readRequest() {
     beast::get_lowest_layer(m_stream).expires_after(kHandshakeLimit);
-    http::async_read_header(m_stream.next_layer(), m_buffer, m_request,
+    http::async_read_header(m_stream.next_layer(), m_buffer, m_request.emplace(),
                             [self = shared_from_this()](error_code ec, std::size_t) { self->onRequest(ec); });
 }
 
@@ -338,7 +363,8 @@ void IpcSession::onRequest(error_code ec) {
     if (ec == http::error::end_of_stream || ec == beast::error::timeout ||
         ec == asio::error::operation_aborted)
         return leave();
-    if (ec || !mayEnter(m_request.get())) return refuse();
+    // A client has to wait for the answer before he says more.
+    if (ec || m_buffer.size() != 0 || !mayEnter(m_request->get())) return refuse();
     beast::get_lowest_layer(m_stream).expires_never();
     websocket::stream_base::timeout limits{};
     limits.handshake_timeout = kHandshakeLimit;
@@ -348,7 +374,11 @@ void IpcSession::onRequest(error_code ec) {
     m_stream.read_message_max(IpcWebSocketServer::kMaxMessage);
     m_stream.auto_fragment(false);
     m_stream.text(true);
-    m_stream.async_accept(m_request.get(), [self = shared_from_this()](error_code failed) {
+    // From here on, so that a client who has the answer misses nothing that is sent.
+    m_isOpen = true;
+    m_isWriting = true;
+    m_server.clientEntered(m_id, shared_from_this());
+    m_stream.async_accept(m_request->get(), [self = shared_from_this()](error_code failed) {
         failed ? self->leave() : self->enter();
     });
 }
@@ -374,10 +404,10 @@ void IpcSession::discardRest() {
 }
 
 void IpcSession::enter() {
-    m_isOpen = true;
-    m_buffer.clear();
-    m_server.clientEntered(m_id, shared_from_this());
+    m_request.reset();
+    m_buffer = {};
     read();
+    writeNext();
 }
 
 void IpcSession::read() {
@@ -388,28 +418,30 @@ void IpcSession::read() {
 void IpcSession::onMessage(error_code ec) {
     if (ec) return leave();
     std::string message = beast::buffers_to_string(m_buffer.data());
-    m_buffer.consume(m_buffer.size());
+    m_buffer.clear();
+    if (m_buffer.capacity() > kMaxIdleBuffer) m_buffer.shrink_to_fit();
     m_unhandledMessages += 1;
     m_unhandledBytes += message.size();
     m_server.received(shared_from_this(), m_id, std::move(message));
-    m_isPaused = isBehind();
-    if (!m_isPaused) read();
+    m_isPaused = true;
+    if (!isBehind()) resume();
 }
 
 bool IpcSession::isBehind() const {
     return m_unhandledMessages >= kMaxUnhandledMessages || m_unhandledBytes > kMaxUnhandledBytes;
 }
 
-// On the handler's thread. Only a client that was behind can be paused.
+void IpcSession::resume() {
+    if (m_isPaused.exchange(false)) read();
+}
+
+// On the handler's thread. The reader marks himself as paused before he looks at the counts, which are taken
+// down here before the mark is looked at: one of the two sees the other.
 void IpcSession::messageHandled(std::size_t size) {
-    const bool wasBehind = isBehind();
     m_unhandledMessages -= 1;
     m_unhandledBytes -= size;
-    if (!wasBehind || isBehind()) return;
-    asio::post(m_server.inout(), [self = shared_from_this()] {
-        if (!std::exchange(self->m_isPaused, false)) return;
-        self->read();
-    });
+    if (!m_isPaused || isBehind()) return;
+    asio::post(m_server.inout(), [self = shared_from_this()] { self->resume(); });
 }
 
 void IpcSession::send(const Text& text) {
@@ -417,10 +449,15 @@ void IpcSession::send(const Text& text) {
     m_queue.push_back(text);
     m_queuedBytes += text->size();
     if (m_queuedBytes > IpcWebSocketServer::kMaxQueued) return close(websocket::close_code::policy_error);
-    if (m_queue.size() == 1) write();
+    if (!m_isWriting) writeNext();
 }
 
-void IpcSession::write() {
+void IpcSession::writeNext() {
+    m_isWriting = !m_queue.empty();
+    if (!m_isWriting) {
+        if (m_closeCode != websocket::close_code::none) sendClose();
+        return;
+    }
     m_stream.async_write(asio::buffer(*m_queue.front()),
                          [self = shared_from_this()](error_code ec, std::size_t) { self->onWritten(ec); });
 }
@@ -429,10 +466,7 @@ void IpcSession::onWritten(error_code ec) {
     if (ec) return leave();
     m_queuedBytes -= m_queue.front()->size();
     m_queue.pop_front();
-    if (!m_queue.empty())
-        write();
-    else if (m_closeCode != websocket::close_code::none)
-        sendClose();
+    writeNext();
 }
 
 // The message that is half out must end before the close frame can follow. At the end of the service all that
@@ -442,7 +476,7 @@ void IpcSession::close(websocket::close_code code) {
     m_closeCode = code;
     m_server.clientLeft(m_id);
     limitLife(kLinger);
-    if (m_queue.empty()) return sendClose();
+    if (!m_isWriting) return sendClose();
     if (code == websocket::close_code::policy_error) m_queue.resize(1);
 }
 
@@ -454,29 +488,28 @@ void IpcSession::limitLife(std::chrono::seconds limit) {
     m_linger.expires_after(limit);
     m_linger.async_wait([weak = weak_from_this()](error_code cancelled) {
         const auto self = weak.lock();
-        if (self && !cancelled) self->abandon();
+        if (self && !cancelled) self->leave();
     });
-}
-
-void IpcSession::abandon() {
-    error_code ignored;
-    socket().close(ignored);
-    leave();
 }
 
 void IpcSession::leave() {
     if (std::exchange(m_isOpen, false)) m_server.clientLeft(m_id);
     m_linger.cancel();
+    error_code ignored;
+    socket().close(ignored);  // ends what is still under way
     m_server.sessionEnded(m_id);
 }
 
 // ---- the public face
 
 std::shared_ptr<IpcWebSocketServer> IpcWebSocketServer::create(std::int32_t port, Handler handler) {
-    auto impl = std::make_unique<Impl>(std::move(handler));
-    if (!impl->open(port)) return nullptr;
-    impl->start();
-    return std::make_shared<IpcWebSocketServer>(std::move(impl));
+    try {
+        auto impl = std::make_unique<Impl>(std::move(handler));
+        if (!impl->open(port) || !impl->start()) return nullptr;
+        return std::make_shared<IpcWebSocketServer>(std::move(impl));
+    } catch (const boost::system::system_error&) {
+        return nullptr;  // no descriptors left for the poll itself
+    }
 }
 
 IpcWebSocketServer::IpcWebSocketServer(std::unique_ptr<Impl> impl) : m_impl(std::move(impl)) {}

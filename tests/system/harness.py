@@ -165,6 +165,7 @@ class WebSocket:
                 elif opcode == CLOSE:
                     code = struct.unpack(">H", payload[:2])[0] if len(payload) >= 2 else 1005
                     self.send_frame(CLOSE, payload[:2])
+                    self._socket.shutdown(socket.SHUT_WR)
                     break
                 elif opcode != PONG:
                     message += payload
