@@ -135,12 +135,12 @@ TEST_F(NamedMutexes, TheDeathOfTheOwnerReleasesThem) {
 
 TEST_F(NamedMutexes, OneOfManyThatStartAtOnceCreates) {
     int created = 0;
-    std::vector<std::unique_ptr<Other>> others;
-    for (int i = 0; i < 8; ++i) {
-        others.push_back(std::make_unique<Other>([] {
+    std::vector<std::unique_ptr<Other>> others(8);
+    for (auto& other : others) {
+        other = std::make_unique<Other>([] {
             static const NamedMutex mutex(kName, Owner::Yes);
             return mutex.existedBefore() ? 'e' : 'c';
-        }));
+        });
     }
     for (const auto& other : others)
         created += other->hear() == 'c' ? 1 : 0;
