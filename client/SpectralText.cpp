@@ -16,14 +16,17 @@ using Change = SpectralView::Change;
 std::string describeSample(const SpectralView::Update& update, const SpectralView& view,
                            const char* quantity) {
     const auto number = view.numberOf(update.order);
-    return (number ? "channel " + std::to_string(*number) : "order " + std::to_string(update.order)) + ": " +
-           quantity + " " + std::to_string(update.value);
+    std::string line = number ? "channel " : "order ";
+    line += std::to_string(number.value_or(update.order));
+    return line + ": " + quantity + " " + std::to_string(update.value);
 }
 
 std::string describeChannels(const SpectralView& view) {
     std::string line = std::to_string(view.channels().size()) + " channels:";
-    for (const auto& channel : view.channels())
-        line += " " + std::to_string(channel.number);
+    for (const auto& channel : view.channels()) {
+        line += ' ';
+        line += std::to_string(channel.number);
+    }
     return line;
 }
 

@@ -12,16 +12,28 @@ using std::chrono::steady_clock;
 
 namespace {
 
-using Deadline = std::optional<steady_clock::time_point>;
+/// The moment at which the watch is over; without a limit it never comes.
+class Deadline {
+public:
+    explicit Deadline(std::optional<milliseconds> limit) : m_limited(limit.has_value()) {
+        m_end = steady_clock::now() + limit.value_or(milliseconds(0));
+    }
 
-/// For poll(): the shorter of the two waits, -1 if there is none.
-int pollTimeout(const Deadline& deadline, std::optional<milliseconds> redraw) {
-    milliseconds wait{-1};
-    if (deadline)
-        wait = std::max(milliseconds(0), std::chrono::ceil<milliseconds>(*deadline - steady_clock::now()));
-    if (redraw && (wait.count() < 0 || *redraw < wait)) wait = *redraw;
-    return static_cast<int>(wait.count());
-}
+    bool isOver() const { return m_limited && steady_clock::now() >= m_end; }
+
+    /// For poll(): the shorter of the wait for the end and the wait for the next drawing, -1 if there is
+    /// none.
+    int pollTimeout(std::optional<milliseconds> redraw) const {
+        if (!m_limited) return redraw ? static_cast<int>(redraw->count()) : -1;
+        const auto left =
+            std::max(milliseconds(0), std::chrono::ceil<milliseconds>(m_end - steady_clock::now()));
+        return static_cast<int>(std::min(left, redraw.value_or(left)).count());
+    }
+
+private:
+    bool m_limited;
+    steady_clock::time_point m_end;
+};
 
 bool stopAsked(Signals& signals, SpectrumOutput& output) {
     while (const auto signal = signals.take()) {
@@ -36,14 +48,14 @@ bool stopAsked(Signals& signals, SpectrumOutput& output) {
 void watchSpectrum(SpectralScan& scan, Signals& signals, SpectrumOutput::Form form,
                    std::optional<milliseconds> limit) {
     SpectrumOutput output(form);
-    const Deadline deadline = limit ? Deadline(steady_clock::now() + *limit) : std::nullopt;
+    const Deadline deadline(limit);
     scan.start();
-    while (!output.isGone() && !(deadline && steady_clock::now() >= *deadline)) {
+    while (!output.isGone() && !deadline.isOver()) {
         const auto redraw = output.refresh(scan.view());
         std::array<pollfd, 3> watched{{{scan.descriptor(), scan.events(), 0},
                                        {signals.descriptor(), POLLIN, 0},
                                        {output.keyDescriptor(), POLLIN, 0}}};
-        ::poll(watched.data(), watched.size(), pollTimeout(deadline, redraw));
+        ::poll(watched.data(), watched.size(), deadline.pollTimeout(redraw));
         if (stopAsked(signals, output)) break;
         if (watched[2].revents != 0 && output.isQuitKey()) break;
         output.show(scan.process(), scan.view());
