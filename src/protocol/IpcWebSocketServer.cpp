@@ -330,8 +330,8 @@ void IpcWebSocketServer::Impl::stop() {
             if (thread.joinable()) thread.join();
     }
     if (m_unhandled != 0) platform::endForeignWork();
-    m_clients.clear();
-    m_sessions.clear();
+    for (const auto& [id, session] : std::map(m_sessions))
+        session->leave();
 }
 
 // ---- a session
