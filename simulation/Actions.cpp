@@ -1,12 +1,12 @@
 #include "simulation/Actions.h"
 
 #include <algorithm>
-#include <cstring>
 
 #include "platform/ClockControl.h"
 #include "simulation/AdapterSetup.h"
 #include "simulation/Guid.h"
 #include "simulation/Machine.h"
+#include "simulation/Wire.h"
 
 namespace vexa::simulation {
 
@@ -31,13 +31,6 @@ std::size_t existingAdapterOf(Machine& machine, const Json::Value& action) {
     const std::size_t index = unsignedOf(action, "adapter", 0);
     if (index >= machine.adapters().count()) throw JsonFault("adapter: no such adapter");
     return index;
-}
-
-template <class T>
-Bytes bytesOf(const T& block) {
-    Bytes bytes(sizeof block);
-    std::memcpy(bytes.data(), &block, sizeof block);
-    return bytes;
 }
 
 Bytes dataOf(const Json::Value& action) {

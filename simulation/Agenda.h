@@ -37,8 +37,8 @@ private:
     platform::Mutex m_mutex;
     std::map<Key, std::function<void()>> m_entries GUARDED_BY(m_mutex);
     std::uint64_t m_sequence GUARDED_BY(m_mutex) = 0;
-    platform::Event m_stop{platform::Reset::Manual};
-    platform::Event m_added{platform::Reset::Auto};
+    platform::Event m_stop{platform::Reset::Manual, "the end of the agenda"};
+    platform::Event m_added{platform::Reset::Auto, "something on the agenda"};
     platform::Thread m_thread;
 };
 

@@ -4,19 +4,14 @@
 #include <cstring>
 #include <string_view>
 
+#include "simulation/Wire.h"
+
 namespace vexa::simulation {
 
 namespace {
 
 constexpr std::u16string_view kMakersDescription = u"Korvane Wireless Adapter";
 constexpr std::u16string_view kOtherDescription = u"Wireless Adapter";
-
-template <class T>
-Bytes bytesOf(const T& value) {
-    Bytes bytes(sizeof value);
-    std::memcpy(bytes.data(), &value, sizeof value);
-    return bytes;
-}
 
 WLAN_INTERFACE_INFO interfaceInfo(Machine& machine, std::size_t adapter) {
     WLAN_INTERFACE_INFO info{};

@@ -5,7 +5,7 @@
 
 namespace vexa::simulation {
 
-/// The list of the inserted adapters; `size` bytes of it are in use.
+/// What WlanEnumInterfaces gives: the inserted adapters, in order, and not a byte more.
 Bytes interfaceList(Machine& machine);
 
 /// What WlanQueryInterface answers about an inserted adapter. A result code; `answer` holds the data on

@@ -14,7 +14,8 @@ struct NotificationQueue::Registration {
     PVOID context;
     bool removed = false;
     bool running = false;
-    Event ended{platform::Reset::Manual};  // set for good when a removed one no longer runs
+    Event ended{platform::Reset::Manual,
+                "the end of a notification handler"};  // set for good when a removed one no longer runs
 };
 
 struct NotificationQueue::Item {
@@ -80,7 +81,7 @@ Ticket NotificationQueue::post(Notification notification) {
 }
 
 void NotificationQueue::waitDelivered(Ticket ticket) {
-    auto delivered = std::make_shared<Event>(platform::Reset::Manual);
+    auto delivered = std::make_shared<Event>(platform::Reset::Manual, "the delivery of a notification");
     {
         const LockGuard<Mutex> lock(m_mutex);
         if (m_stopped || m_delivered >= ticket) return;

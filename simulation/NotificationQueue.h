@@ -76,7 +76,7 @@ private:
     Ticket m_posted GUARDED_BY(m_mutex) = 0;
     Ticket m_delivered GUARDED_BY(m_mutex) = 0;
     bool m_stopped GUARDED_BY(m_mutex) = false;
-    platform::Event m_wake{platform::Reset::Auto};
+    platform::Event m_wake{platform::Reset::Auto, "a notification to deliver"};
     platform::Thread m_thread;
 };
 

@@ -2,7 +2,11 @@
 
 #include <cstddef>
 #include <cstdint>
+#include <cstring>
 #include <span>
+#include <type_traits>
+
+#include "simulation/Text.h"
 
 namespace vexa::simulation {
 
@@ -21,6 +25,15 @@ inline void storeU16(std::span<std::uint8_t> block, std::size_t at, std::uint16_
 inline void storeU32(std::span<std::uint8_t> block, std::size_t at, std::uint32_t value) {
     storeU16(block, at, static_cast<std::uint16_t>(value & 0xFFFF));
     storeU16(block, at + 2, static_cast<std::uint16_t>(value >> 16));
+}
+
+/// The bytes of a structure as they stand in memory.
+template <class T>
+Bytes bytesOf(const T& structure) {
+    static_assert(std::is_trivially_copyable_v<T>);
+    Bytes bytes(sizeof structure);
+    std::memcpy(bytes.data(), &structure, sizeof structure);
+    return bytes;
 }
 
 }  // namespace vexa::simulation
