@@ -140,6 +140,14 @@ class Order(unittest.TestCase):
             self.assertEqual(json.loads(texts.pop())["EventId"], "CARD_PLUG_OUT")
             self.assertTrue(all(not client.received for client in clients))
 
+    def test_a_client_that_has_just_come_in_misses_nothing(self):
+        with Machine({"speed": 20}) as machine:
+            for _ in range(100):
+                for client in (machine.hs20(), machine.sa()):
+                    machine.control.do("pullAdapter")
+                    self.assertEqual(client.next_event()["EventId"], "CARD_PLUG_OUT")
+                    client.close()
+
     def test_clients_that_come_and_go_disturb_nobody(self):
         with Machine({"speed": 20}) as machine:
             steady = machine.sa()
