@@ -6,7 +6,6 @@
 
 #include "client/ClientError.h"
 #include "client/ServiceProcess.h"
-#include "client/TcpPorts.h"
 
 namespace vexa::client {
 
@@ -82,7 +81,9 @@ void ServiceParent::choosePorts(const StartRequest& request) {
     const TcpPorts table = TcpPorts::read();
     m_ports = {request.saPort, request.hs20Port, request.controlPort.value_or(0)};
     const auto choose = [&](std::uint16_t& port) {
-        if (port == 0) port = table.pickFree(wantedPorts(m_ports));
+        if (port != 0) return;
+        m_reserved.push_back(table.reserveFree());
+        port = m_reserved.back().port;
     };
     choose(m_ports.sa);
     choose(m_ports.hs20);
@@ -118,6 +119,7 @@ ServiceParent::State ServiceParent::waitUntilReady() {
         if (steady_clock::now() >= deadline) giveUp();
         if (m_stop.wait(pause) == StopSource::Wake::Stop) return State::StopRequested;
     }
+    m_reserved.clear();
     if (!writePortsFile(m_folder.portsFile(), m_ports)) {
         std::cerr << "vexa: the ports cannot be written to " << m_folder.portsFile().string() << '\n';
     }

@@ -7,10 +7,12 @@
 #include <optional>
 #include <set>
 #include <string>
+#include <vector>
 
 #include "client/MachineFolder.h"
 #include "client/ServicePorts.h"
 #include "client/StopSource.h"
+#include "client/TcpPorts.h"
 #include "platform/NamedMutex.h"
 
 namespace vexa::client {
@@ -71,6 +73,7 @@ private:
     MachineFolder m_folder;
     std::unique_ptr<platform::NamedMutex> m_mutex;
     ServicePorts m_ports;
+    std::vector<ReservedPort> m_reserved;
     std::map<std::uint16_t, std::set<std::uint64_t>> m_listenersBefore;
     std::unique_ptr<ServiceProcess> m_process;
 };

@@ -2,8 +2,10 @@
 
 #include <arpa/inet.h>
 #include <sys/socket.h>
+#include <sys/un.h>
 
 #include <algorithm>
+#include <cstddef>
 #include <fstream>
 #include <random>
 #include <sstream>
@@ -30,6 +32,20 @@ bool canBind(std::uint16_t port) {
     address.sin_port = htons(port);
     address.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
     return ::bind(socket.get(), reinterpret_cast<const sockaddr*>(&address), sizeof address) == 0;
+}
+
+/// Takes a name that stands for the port. It lives in the kernel and goes with its holder. No descriptor if
+/// somebody has it.
+Descriptor takeName(std::uint16_t port) {
+    Descriptor socket(::socket(AF_UNIX, SOCK_DGRAM | SOCK_CLOEXEC, 0));
+    // A NUL in front makes it a name without a file.
+    const std::string name = '\0' + ("vexa-port-" + std::to_string(port));
+    sockaddr_un address{};
+    address.sun_family = AF_UNIX;
+    std::copy(name.begin(), name.end(), std::begin(address.sun_path));
+    const auto size = static_cast<socklen_t>(offsetof(sockaddr_un, sun_path) + name.size());
+    if (::bind(socket.get(), reinterpret_cast<const sockaddr*>(&address), size) != 0) return Descriptor();
+    return socket;
 }
 
 }  // namespace
@@ -65,12 +81,14 @@ std::set<std::uint64_t> TcpPorts::listeners(std::uint16_t port) const {
     return sockets;
 }
 
-std::uint16_t TcpPorts::pickFree(const std::set<std::uint16_t>& taken) const {
+ReservedPort TcpPorts::reserveFree() const {
     std::random_device random;
     std::uniform_int_distribution<int> anyPort(kFirstPort, kLastPort);
     for (int attempt = 0; attempt < kAttempts; ++attempt) {
         const auto port = static_cast<std::uint16_t>(anyPort(random));
-        if (!taken.contains(port) && !isBusy(port) && canBind(port)) return port;
+        if (isBusy(port)) continue;
+        Descriptor holder = takeName(port);
+        if (holder && canBind(port)) return {port, std::move(holder)};
     }
     throw ClientError("no free TCP port was found", kExitNotStarted);
 }

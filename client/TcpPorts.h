@@ -5,7 +5,16 @@
 #include <string>
 #include <vector>
 
+#include "client/Descriptor.h"
+
 namespace vexa::client {
+
+/// A port that other parents do not get while this exists. A server that may reuse addresses can listen on
+/// it.
+struct ReservedPort {
+    std::uint16_t port;
+    Descriptor holder;
+};
 
 /// The IPv4 TCP endpoints of this host at one moment. Nothing is connected to find out about a port: a trial
 /// connection would stay behind in the table and make the port busy for the service.
@@ -20,8 +29,8 @@ public:
     /// The sockets that listen on the port.
     std::set<std::uint64_t> listeners(std::uint16_t port) const;
 
-    /// A port without a row, that can be bound and is not in `taken`. Throws ClientError if there is none.
-    std::uint16_t pickFree(const std::set<std::uint16_t>& taken) const;
+    /// Reserves a port without a row. Throws ClientError if there is none.
+    ReservedPort reserveFree() const;
 
 private:
     struct Row {

@@ -3,6 +3,8 @@
 #include <sys/socket.h>
 
 #include <fstream>
+#include <utility>
+#include <vector>
 
 #include "client/ClientError.h"
 #include "client/Descriptor.h"
@@ -48,26 +50,37 @@ TEST(TcpPorts, ATableThatIsNotThereIsAnError) {
     EXPECT_THROW(TcpPorts::read("/nonexistent/tcp"), ClientError);
 }
 
-TEST(TcpPorts, APickedPortCanBeBoundAndIsNotTaken) {
-    const TcpPorts ports = TcpPorts::read();
-    std::set<std::uint16_t> taken;
-    for (int i = 0; i < 50; ++i) {
-        const std::uint16_t port = ports.pickFree(taken);
-        EXPECT_FALSE(ports.isBusy(port));
-        EXPECT_TRUE(taken.insert(port).second);
-    }
-}
-
-TEST(TcpPorts, AListenerOfThisMomentIsSeen) {
-    const Descriptor socket(::socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC, 0));
+/// The socket, if it could be made to listen.
+Descriptor listenOn(std::uint16_t port) {
+    Descriptor socket(::socket(AF_INET, SOCK_STREAM | SOCK_CLOEXEC, 0));
     sockaddr_in address{};
     address.sin_family = AF_INET;
+    address.sin_port = htons(port);
     address.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
-    socklen_t size = sizeof address;
-    ASSERT_EQ(::bind(socket.get(), reinterpret_cast<sockaddr*>(&address), size), 0);
-    ASSERT_EQ(::listen(socket.get(), 1), 0);
-    ASSERT_EQ(::getsockname(socket.get(), reinterpret_cast<sockaddr*>(&address), &size), 0);
-    EXPECT_EQ(TcpPorts::read().listeners(ntohs(address.sin_port)).size(), 1U);
+    const bool listens =
+        ::bind(socket.get(), reinterpret_cast<const sockaddr*>(&address), sizeof address) == 0 &&
+        ::listen(socket.get(), 1) == 0;
+    return listens ? std::move(socket) : Descriptor();
+}
+
+TEST(TcpPorts, ReservedPortsDifferAndHaveNoRow) {
+    const TcpPorts ports = TcpPorts::read();
+    std::vector<ReservedPort> reserved;
+    std::set<std::uint16_t> numbers;
+    for (int i = 0; i < 50; ++i) {
+        reserved.push_back(ports.reserveFree());
+        EXPECT_TRUE(numbers.insert(reserved.back().port).second);
+    }
+    const TcpPorts after = TcpPorts::read();
+    for (const std::uint16_t number : numbers)
+        EXPECT_FALSE(after.isBusy(number)) << number;
+}
+
+TEST(TcpPorts, AServerCanListenOnAReservedPort) {
+    const ReservedPort reserved = TcpPorts::read().reserveFree();
+    const Descriptor server = listenOn(reserved.port);
+    EXPECT_TRUE(server);
+    EXPECT_EQ(TcpPorts::read().listeners(reserved.port).size(), 1U);
 }
 
 }  // namespace
