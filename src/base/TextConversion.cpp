@@ -24,15 +24,20 @@ char32_t unitAt(std::wstring_view text, std::size_t index) {
     return static_cast<std::make_unsigned_t<wchar_t>>(text[index]);
 }
 
+char32_t unitAt(std::u16string_view text, std::size_t index) {
+    return text[index];
+}
+
 /// One character of wide text and how many wchar_t it takes.
 struct WideCharacter {
     char32_t codePoint;
     std::size_t length;
 };
 
-WideCharacter characterAt(std::wstring_view text, std::size_t index) {
+template <class Char>
+WideCharacter characterAt(std::basic_string_view<Char> text, std::size_t index) {
     const char32_t unit = unitAt(text, index);
-    if (kIsUtf16 && isHighSurrogate(unit) && index + 1 < text.size()) {
+    if (sizeof(Char) == 2 && isHighSurrogate(unit) && index + 1 < text.size()) {
         const char32_t low = unitAt(text, index + 1);
         if (isLowSurrogate(low)) return {0x10000 + ((unit - 0xD800) << 10) + (low - 0xDC00), 2};
     }
@@ -55,6 +60,17 @@ void appendUtf8(std::string& text, char32_t c) {
         byte(0x80 | (c >> 6 & 0x3F));
     }
     byte(0x80 | (c & 0x3F));
+}
+
+template <class Char>
+std::string encodeUtf8(std::basic_string_view<Char> text) {
+    std::string utf8;
+    for (std::size_t i = 0; i < text.size();) {
+        const WideCharacter character = characterAt(text, i);
+        appendUtf8(utf8, character.codePoint);
+        i += character.length;
+    }
+    return utf8;
 }
 
 void appendWide(std::wstring& text, char32_t c) {
@@ -81,18 +97,18 @@ bool isCodePointOfLength(char32_t c, std::size_t length) {
     return c >= kLeast[length] && c <= 0x10FFFF && !isHighSurrogate(c) && !isLowSurrogate(c);
 }
 
-// The character at the beginning of the text, or one byte of what is none.
+// The character at the beginning of the text, of length 0 if there is none.
 WideCharacter decodeUtf8(std::string_view text) {
     const auto byteAt = [&](std::size_t i) { return static_cast<unsigned char>(text[i]); };
     const std::size_t length = sequenceLength(byteAt(0));
     if (length == 1) return {byteAt(0), 1};
-    if (length == 0 || length > text.size()) return {kReplacement, 1};
+    if (length == 0 || length > text.size()) return {kReplacement, 0};
     char32_t c = byteAt(0) & (0xFFU >> (length + 1));
     for (std::size_t i = 1; i < length; ++i) {
-        if ((byteAt(i) & 0xC0) != 0x80) return {kReplacement, 1};
+        if ((byteAt(i) & 0xC0) != 0x80) return {kReplacement, 0};
         c = c << 6 | (byteAt(i) & 0x3FU);
     }
-    return isCodePointOfLength(c, length) ? WideCharacter{c, length} : WideCharacter{kReplacement, 1};
+    return isCodePointOfLength(c, length) ? WideCharacter{c, length} : WideCharacter{kReplacement, 0};
 }
 
 template <class Char>
@@ -112,13 +128,11 @@ int compareFolded(std::basic_string_view<Char> a, std::basic_string_view<Char> b
 }  // namespace
 
 std::string utf8FromWide(std::wstring_view text) {
-    std::string utf8;
-    for (std::size_t i = 0; i < text.size();) {
-        const WideCharacter character = characterAt(text, i);
-        appendUtf8(utf8, character.codePoint);
-        i += character.length;
-    }
-    return utf8;
+    return encodeUtf8(text);
+}
+
+std::string utf8FromUtf16(std::u16string_view text) {
+    return encodeUtf8(text);
 }
 
 std::wstring wideFromUtf8(std::string_view text) {
@@ -126,9 +140,21 @@ std::wstring wideFromUtf8(std::string_view text) {
     while (!text.empty()) {
         const WideCharacter character = decodeUtf8(text);
         appendWide(wide, character.codePoint);
-        text.remove_prefix(character.length);
+        text.remove_prefix(std::max<std::size_t>(character.length, 1));
     }
     return wide;
+}
+
+std::optional<std::u32string> codePointsFromUtf8(std::string_view text) {
+    std::u32string codePoints;
+    codePoints.reserve(text.size());
+    while (!text.empty()) {
+        const WideCharacter character = decodeUtf8(text);
+        if (character.length == 0) return std::nullopt;
+        codePoints += character.codePoint;
+        text.remove_prefix(character.length);
+    }
+    return codePoints;
 }
 
 std::wstring cutToUtf16Units(std::wstring_view text, std::size_t units) {

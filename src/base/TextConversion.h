@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <optional>
 #include <string>
 #include <string_view>
 
@@ -8,9 +9,15 @@ namespace vexa {
 
 // Wide text holds what the platform's wchar_t holds: UTF-16 where it has 2 bytes, code points where it has 4.
 
-/// UTF-8 in both directions. What is no valid sequence becomes U+FFFD, one for each byte, or for a lone surrogate.
+/// UTF-8 in both directions. What is no valid sequence becomes U+FFFD, one for each byte, or for a lone
+/// surrogate.
 std::string utf8FromWide(std::wstring_view text);
 std::wstring wideFromUtf8(std::string_view text);
+
+std::string utf8FromUtf16(std::u16string_view text);
+
+/// The code points of UTF-8 text; nothing if it isn't valid.
+std::optional<std::u32string> codePointsFromUtf8(std::string_view text);
 
 /// At most `units` 16-bit units of the text, never half a surrogate pair.
 std::wstring cutToUtf16Units(std::wstring_view text, std::size_t units);

@@ -31,10 +31,13 @@ WlanMemory<T> queryInterface(HANDLE hWlan, const GUID& guid, WLAN_INTF_OPCODE op
     return size < minimumSize ? nullptr : std::move(answer);
 }
 
+/// An answer about the radio holds one PHY at least.
+inline constexpr DWORD kMinimumRadioState = sizeof(DWORD) + sizeof(WLAN_PHY_RADIO_STATE);
+
 /// Whether the software radio of the first PHY is on; false also if the query fails.
 inline bool isSoftwareRadioOn(HANDLE hWlan, const GUID& guid) {
-    const auto radio = queryInterface<WLAN_RADIO_STATE>(hWlan, guid, wlan_intf_opcode_radio_state,
-                                                        sizeof(DWORD) + sizeof(WLAN_PHY_RADIO_STATE));
+    const auto radio =
+        queryInterface<WLAN_RADIO_STATE>(hWlan, guid, wlan_intf_opcode_radio_state, kMinimumRadioState);
     return radio && radio->PhyRadioState[0].dot11SoftwareRadioState == dot11_radio_state_on;
 }
 

@@ -1,10 +1,13 @@
 #include "connection/SupplicantMgr.h"
 
 #include <algorithm>
+#include <cstdlib>
+#include <utility>
 
 #include "base/AdapterIdentity.h"
 #include "base/DiagnosticLog.h"
 #include "base/NeverDestroyed.h"
+#include "base/TextConversion.h"
 #include "connection/Supplicant.h"
 #include "platform/DebugOutput.h"
 
@@ -18,38 +21,135 @@ using platform::LockGuard;
 
 SupplicantMgr& SupplicantMgr::instance() {
     static NeverDestroyed<SupplicantMgr> manager;
+    [[maybe_unused]] static const int registered = std::atexit([] {
+        instance().takeAll();
+        DiagnosticLog::instance().stop();
+    });
     return manager.get();
 }
 
 int SupplicantMgr::init() {
     platform::outputDebugString(L"[HS20]Start to initialize SupplicantMgr.\n");
+    {
+        const LockGuard lock(g_hs20Lock);
+        bool isChanged = false;
+        if (m_config.initPaths() != kSuccess || m_config.readConfig(&isChanged) != kSuccess) return kFailure;
+        if (m_config.isDumpEnabled())
+            DiagnosticLog::instance().start(narrowFromWide(m_config.dumpFilePath()));
+        if (isChanged) {
+            if (m_config.saveConfig() != kSuccess)
+                Log(6, "ERROR: Reading config detected config changes, but saving config failed.");
+            else
+                Log(3, "Reading config detected config changes, and saving config succeeded.");
+        }
+    }
+    takeAll();
     Log(3, "SupplicantMgr initiailization succeeded.");
-    return 0;
+    m_bInitialized = true;
+    return kSuccess;
+}
+
+void SupplicantMgr::deinit() {
+    for (const auto& supplicant : takeAll())
+        if (supplicant->isInitialized()) supplicant->deinit();
+    if (m_config.isDumpEnabled()) DiagnosticLog::instance().stop();
+    m_bInitialized = false;
+}
+
+int SupplicantMgr::reloadData() {
+    const LockGuard lock(g_hs20Lock);
+    bool isChanged = false;
+    if (m_config.readConfig(&isChanged) != kSuccess) return kFailure;
+    if (isChanged) {
+        if (m_config.saveConfig() != kSuccess) {
+            Log(6, "ERROR: Reading config detected config changes, but saving config failed.");
+            return kFailure;
+        }
+        Log(3, "Reading config detected config changes, and saving config succeeded.");
+    }
+    Log(3, "Reload data succeeded.");
+    return kSuccess;
 }
 
 int SupplicantMgr::addSupplicantIfInterfaceExists() {
+    const LockGuard changes(m_changes);
     Log(4, "Enter addSupplicantIfInterfaceExists...");
-    if (presentAdapter()) return 0;
-    Log(3, "\tInterface card not inserted, skip adding supplicant.");
-    return 2;
+    const auto guid = presentAdapter();
+    if (!guid) {
+        Log(3, "\tInterface card not inserted, skip adding supplicant.");
+        return kNotFound;
+    }
+    if (const auto existing = findSupplicantByGuid(*guid)) {
+        Log(3, "Supplicant with GUID already exists, skip adding.");
+        Log(3, "Going to reset the existed supplicant...");
+        existing->reset();
+        return kSuccess;
+    }
+    Log(4, "Start to add a HS20 supplicant.");
+    auto supplicant = std::make_shared<Supplicant>(*guid, this);
+    supplicant->init();
+    if (!supplicant->isInitialized()) supplicant->init();
+    add(std::move(supplicant));
+    return kSuccess;
 }
 
 int SupplicantMgr::removeSupplicantIfInterfaceRemoved() {
+    const LockGuard changes(m_changes);
     Log(4, "Enter removeSupplicantIfInterfaceRemoved...");
     if (presentAdapter()) {
         Log(3, "\tInterface card still inserted, don't remove supplicant.");
-        return 0;
+        return kSuccess;
     }
-    Log(3, "\tNo supplicant, do nothing.");
-    return 0;
+    const auto supplicant = firstSupplicant();
+    if (!supplicant) {
+        Log(3, "\tNo supplicant, do nothing.");
+        return kSuccess;
+    }
+    supplicant->deinit();
+    Log(4, "Start to remove HS20 supplicant.");
+    removeSupplicant(supplicant.get());
+    return kSuccess;
 }
 
 std::shared_ptr<Supplicant> SupplicantMgr::findSupplicantByGuid(const GUID& guid) {
-    const LockGuard lock(m_mutex);
+    const LockGuard lock(m_listMutex);
     const auto found = std::find_if(m_supplicants.begin(), m_supplicants.end(), [&](const auto& supplicant) {
         return areGuidsEqual(supplicant->m_interfaceGuid, guid);
     });
     return found == m_supplicants.end() ? nullptr : *found;
+}
+
+std::shared_ptr<Supplicant> SupplicantMgr::findSupplicantToNotify(const GUID& guid) {
+    const LockGuard changes(m_changes);
+    return findSupplicantByGuid(guid);
+}
+
+// Nothing is destroyed under the lock of the list.
+int SupplicantMgr::removeSupplicant(const Supplicant* supplicant) {
+    if (supplicant == nullptr) return kInvalidArgument;
+    std::shared_ptr<Supplicant> removed;
+    const LockGuard lock(m_listMutex);
+    const auto found = std::find_if(m_supplicants.begin(), m_supplicants.end(),
+                                    [&](const auto& candidate) { return candidate.get() == supplicant; });
+    if (found == m_supplicants.end()) return kNotFound;
+    removed = std::move(*found);
+    m_supplicants.erase(found);
+    return kSuccess;
+}
+
+std::shared_ptr<Supplicant> SupplicantMgr::firstSupplicant() {
+    const LockGuard lock(m_listMutex);
+    return m_supplicants.empty() ? nullptr : m_supplicants.front();
+}
+
+void SupplicantMgr::add(std::shared_ptr<Supplicant> supplicant) {
+    const LockGuard lock(m_listMutex);
+    m_supplicants.push_back(std::move(supplicant));
+}
+
+std::vector<std::shared_ptr<Supplicant>> SupplicantMgr::takeAll() {
+    const LockGuard lock(m_listMutex);
+    return std::exchange(m_supplicants, {});
 }
 
 }  // namespace vexa

@@ -1,8 +1,11 @@
 #pragma once
 
+#include <atomic>
 #include <memory>
 #include <vector>
 
+#include "base/NetworkListLock.h"
+#include "config/Config.h"
 #include "platform/Mutex.h"
 #include "platform/WlanApi.h"
 
@@ -10,27 +13,53 @@ namespace vexa {
 
 class Supplicant;
 
-/// Root of the hotspot half: follows the adapter's coming and going. Any thread; a Supplicant that it gives
-/// lives as long as the caller keeps it.
+/// Root of the hotspot half: owns the configuration and the Supplicant of each adapter, which it adds and
+/// removes as adapters come and go. Results: kSuccess, kFailure, kNotFound (also: no adapter),
+/// kInvalidArgument.
+///
+/// The lock of changes is held around looking for an adapter, making its Supplicant and adding it, and around
+/// its removal; it comes before the network list lock. Lookups don't take it.
 class SupplicantMgr {
 public:
     /// The one of the process, built on first use and not destroyed.
     static SupplicantMgr& instance();
 
-    /// 0 success, 1 failure.
-    int init();
+    /// Reads the configuration and starts the log. kFailure: the configuration can't be prepared or read.
+    int init() EXCLUDES(g_hs20Lock);
+    /// Ends and destroys all supplicants, and stops the log.
+    void deinit() EXCLUDES(g_hs20Lock);
 
-    /// At start and when an interface arrives. 2: no adapter.
-    int addSupplicantIfInterfaceExists();
-    /// When an interface has gone. Always 0.
-    int removeSupplicantIfInterfaceRemoved();
+    /// Reads the configuration again.
+    int reloadData() EXCLUDES(g_hs20Lock);
 
-    /// Null if there is none.
+    /// At start and when an interface arrives: adds the adapter's Supplicant, or resets the one that is
+    /// there.
+    int addSupplicantIfInterfaceExists() EXCLUDES(g_hs20Lock);
+    /// When an interface has gone: ends the first Supplicant unless an adapter is still present.
+    int removeSupplicantIfInterfaceRemoved() EXCLUDES(g_hs20Lock);
+
+    /// Null if there is none. The result keeps the object alive.
     std::shared_ptr<Supplicant> findSupplicantByGuid(const GUID& guid);
 
+    /// The same, but not before an adding under way has ended: what happens while a Supplicant is made is for
+    /// it to hear.
+    std::shared_ptr<Supplicant> findSupplicantToNotify(const GUID& guid);
+
+    /// Takes it out and drops it; does not deinitialise it.
+    int removeSupplicant(const Supplicant* supplicant);
+
+    Config& config() { return m_config; }
+
 private:
-    platform::Mutex m_mutex{"the list of supplicants"};
-    std::vector<std::shared_ptr<Supplicant>> m_supplicants GUARDED_BY(m_mutex);
+    std::shared_ptr<Supplicant> firstSupplicant();
+    void add(std::shared_ptr<Supplicant> supplicant);
+    std::vector<std::shared_ptr<Supplicant>> takeAll();
+
+    Config m_config;
+    std::atomic<bool> m_bInitialized{false};
+    platform::Mutex m_changes{"changes of supplicants"};
+    platform::Mutex m_listMutex{"the list of supplicants"};
+    std::vector<std::shared_ptr<Supplicant>> m_supplicants GUARDED_BY(m_listMutex);
 };
 
 }  // namespace vexa

@@ -8,8 +8,8 @@
 
 namespace vexa::platform {
 
-// Files of the store and of the log. Paths are those of the operating system, with backslashes; what is created is
-// readable by its owner only. Any thread.
+// Files of the store and of the log. Paths are those of the operating system, with backslashes; what is
+// created is readable by its owner only. Any thread.
 
 /// Whether the file can be opened for reading.
 bool canOpenFile(const std::wstring& path);
@@ -23,13 +23,18 @@ bool createFolder(const std::wstring& path);
 /// The names of the files in a folder, without their paths; none if it can't be read.
 std::vector<std::wstring> filesIn(const std::wstring& folder);
 
-/// A file that did not exist before.
+enum class Existing { Replace, Keep };
+enum class RenameResult { Done, InUse, Failed };
+
+/// A file that did not exist before, held by this process until it is destroyed.
 class NewFile {
 public:
     /// Nothing if it exists or can't be created.
     static std::optional<NewFile> create(const std::wstring& path);
 
-    /// Closes it.
+    /// Removes a file of which no process holds a NewFile any more.
+    static void removeIfAbandoned(const std::wstring& path);
+
     ~NewFile();
     NewFile(NewFile&&) noexcept;
     NewFile& operator=(NewFile&&) noexcept;
@@ -39,23 +44,20 @@ public:
     /// Until this is done, a loss of power can take what was written.
     bool flush();
 
+    /// Gives it another name in its folder, at once: there is no moment without a file of that name if there
+    /// was one before. InUse: another process has the existing file open.
+    RenameResult rename(const std::wstring& to, Existing existing);
+
+    void remove();
+
 private:
     struct State;
     explicit NewFile(std::unique_ptr<State> state);
     std::unique_ptr<State> m_state;
 };
 
-enum class Existing { Replace, Keep };
-enum class RenameResult { Done, InUse, Failed };
-
-/// Gives a file another name in its folder, at once: there is no moment without a file of the new name if there was
-/// one before. InUse: another process has the existing file open.
-RenameResult renameFile(const std::wstring& from, const std::wstring& to, Existing existing);
-
-void removeFile(const std::wstring& path);
-
-/// Appends to a text file, opened and closed by each call. The path is in the narrow code page. False: it can't be
-/// opened, and nothing was written.
+/// Appends to a text file, opened and closed by each call. The path is in the narrow code page. False: it
+/// can't be opened, and nothing was written.
 bool appendToFile(const std::string& narrowPath, std::string_view text);
 
 }  // namespace vexa::platform

@@ -3,6 +3,9 @@
 #include <string_view>
 
 #include "base/DiagnosticLog.h"
+#include "connection/Supplicant.h"
+#include "connection/SupplicantMgr.h"
+#include "protocol/CredentialCommands.h"
 #include "protocol/JsonText.h"
 #include "protocol/SAHotSpotPortlink.h"
 
@@ -12,14 +15,43 @@ namespace {
 
 using Server = SAHotSpotPortlink;
 
+/// False: the command's data can't be read.
+using Action = bool (*)(Server& server, const Json::Value& data);
+
 struct Command {
     std::string_view id;
-    void (*act)(Server& server, const Json::Value& data);
+    Action act;
 };
 
-constexpr std::array<Command, 2> kCommands = {{
-    {"GET_RADIO", [](Server& server, const Json::Value&) { server.SendRadioState(); }},
-    {"GET_IS_CARD_IN", [](Server& server, const Json::Value&) { server.SendCardState(); }},
+template <void (Server::*Send)()>
+bool answer(Server& server, const Json::Value& /*data*/) {
+    (server.*Send)();
+    return true;
+}
+
+// The client learns of a change that failed by a list that is as it was.
+template <Action Change>
+bool changeCredentials(Server& server, const Json::Value& data) {
+    const bool isReadable = Change(server, data);
+    server.SendCredentialList();
+    return isReadable;
+}
+
+bool reload(Server& server, const Json::Value& /*data*/) {
+    const auto supplicant = hotspotSupplicant(server);
+    if (supplicant && supplicant->m_pMgr != nullptr) supplicant->m_pMgr->reloadData();
+    return true;
+}
+
+constexpr std::array<Command, 8> kCommands = {{
+    {"GET_RADIO", answer<&Server::SendRadioState>},
+    {"GET_IS_CARD_IN", answer<&Server::SendCardState>},
+    {"READ_CREDENTIAL_FROM_FILE", reload},
+    {"GET_ALL_CREDENTIAL_LIST", answer<&Server::SendCredentialList>},
+    {"ADD_CREDENTIAL", changeCredentials<addCredential>},
+    {"DELETE_CREDENTIAL", changeCredentials<deleteCredential>},
+    {"EDIT_CREDENTIAL", changeCredentials<editCredential>},
+    {"SET_POSITION_CREDENTIAL", changeCredentials<setCredentialPosition>},
 }};
 
 void logInvalidCommand(const std::string& id) {
@@ -35,13 +67,13 @@ void SAHotSpotPortlink::OnIpcMessage(const char* bytes, std::uint32_t length, vo
 
 void SAHotSpotPortlink::HandleCommand(const Json::Value& root) {
     const auto id = readText(root, "CommandId");
-    const auto dataText = readText(root, "Data");
-    if (!id || !dataText) return logInvalidCommand(id.value_or(""));
-    const Json::Value data = parseJsonText(*dataText);
+    if (!id) return logInvalidCommand("");
     const auto command = std::find_if(kCommands.begin(), kCommands.end(),
                                       [&](const Command& candidate) { return candidate.id == *id; });
-    if (command == kCommands.end()) return logInvalidCommand(*id);
-    command->act(*this, data);
+    const auto dataText = readText(root, "Data");
+    if (command == kCommands.end() || !dataText) return logInvalidCommand(*id);
+    if (!command->act(*this, parseJsonText(*dataText)))
+        Log(6, "ERROR: Invalid data received from UI, command=%s", id->c_str());
 }
 
 }  // namespace vexa

@@ -1,8 +1,35 @@
+#include "base/DiagnosticLog.h"
+#include "base/NetworkListLock.h"
+#include "base/TextConversion.h"
 #include "base/WlanMemory.h"
+#include "config/Config.h"
+#include "connection/Supplicant.h"
+#include "connection/SupplicantMgr.h"
 #include "protocol/JsonText.h"
 #include "protocol/SAHotSpotPortlink.h"
 
 namespace vexa {
+
+namespace {
+
+Json::Value asJson(const Credential& credential) {
+    Json::Value object;
+    object["Id"] = credential.m_id;
+    object["Type"] = credential.m_type;
+    object["AccessType"] = credential.m_accessType;
+    object["CredentialEapMethod"] = credential.m_eapMethod;
+    object["AutoConnect"] = credential.m_bAutoConnect;
+    object["CredentialName"] = utf8FromWide(credential.m_credName);
+    object["RealName"] = utf8FromWide(credential.m_realm);
+    object["Creator"] = utf8FromWide(credential.m_creator);
+    object["CaCert"] = utf8FromWide(credential.m_caCert);
+    object["ClientCert"] = utf8FromWide(credential.m_clientCert);
+    object["Username"] = utf8FromWide(credential.m_username);
+    object["Password"] = utf8FromWide(credential.m_password);
+    return object;
+}
+
+}  // namespace
 
 void SAHotSpotPortlink::SendRadioState() {
     const bool isOn = isSoftwareRadioOn(m_hClientHandle, m_interfaceGuid.get());
@@ -11,6 +38,17 @@ void SAHotSpotPortlink::SendRadioState() {
 
 void SAHotSpotPortlink::SendCardState() {
     SendData("", m_bCardIn ? "CARD_PLUG_IN" : "CARD_PLUG_OUT");
+}
+
+void SAHotSpotPortlink::SendCredentialList() {
+    Log(3, "Send all credentials to vexa.");
+    const auto supplicant = hotspotSupplicant(*this);
+    if (!supplicant || supplicant->m_pMgr == nullptr) return;
+    const platform::LockGuard lock(g_hs20Lock);
+    Json::Value credentials;
+    for (const Credential* credential : supplicant->m_pMgr->config().credentials().copyCredentialPointers())
+        credentials.append(asJson(*credential));
+    SendData(toStyledText(credentials), "GET_ALL_CREDENTIAL_LIST");
 }
 
 }  // namespace vexa

@@ -41,6 +41,8 @@ public:
     void SendRadioState();
     /// Tells the card state as it was last asked for.
     void SendCardState();
+    /// In order of priority. Nothing is sent without a Supplicant.
+    void SendCredentialList();
 
     std::atomic<bool> m_bCardIn{false};
     std::atomic<IpcHandle> m_hIpc{0};

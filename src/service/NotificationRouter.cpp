@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <array>
 #include <cstring>
+#include <memory>
 #include <optional>
 #include <span>
 
@@ -34,6 +35,10 @@ struct Row {
     void (*act)(const Event& event);
 };
 
+std::shared_ptr<Supplicant> supplicantOf(const Event& event) {
+    return SupplicantMgr::instance().findSupplicantToNotify(event.hotspot.m_interfaceGuid.get());
+}
+
 void sendToBoth(const Event& event, const std::string& text) {
     const IpcHandle spectral = event.spectral.m_hIpc;
     if (spectral == 0) return;
@@ -62,11 +67,11 @@ void onLinkChange(const Event& event) {
 }
 
 void onRoamingStart(const Event& event) {
-    if (const auto supplicant = hotspotSupplicant(event.hotspot)) supplicant->m_bRoaming = true;
+    if (const auto supplicant = supplicantOf(event)) supplicant->m_bRoaming = true;
 }
 
 void onRoamingEnd(const Event& event) {
-    const auto supplicant = hotspotSupplicant(event.hotspot);
+    const auto supplicant = supplicantOf(event);
     if (!supplicant) return;
     if (!supplicant->m_bRoaming.exchange(false))
         Log(3, "Received wlan roaming ended event while not received wlan roaming not started event.");
@@ -174,7 +179,8 @@ void WINAPI onWlanNotification(PWLAN_NOTIFICATION_DATA pNotifData, PVOID pServer
 // Without a Supplicant no message of the hotspot module has any effect.
 bool onHs20IhvNotification(const WLAN_NOTIFICATION_DATA* pNotifData) {
     if (pNotifData == nullptr) return false;
-    const auto supplicant = hotspotSupplicant(SAHotSpotPortlink::instance());
+    const GUID guid = SAHotSpotPortlink::instance().m_interfaceGuid.get();
+    const auto supplicant = SupplicantMgr::instance().findSupplicantToNotify(guid);
     return supplicant != nullptr && pNotifData->pData != nullptr;
 }
 

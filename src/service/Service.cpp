@@ -2,9 +2,11 @@
 
 #include <optional>
 
+#include "base/AdapterIdentity.h"
 #include "base/DiagnosticLog.h"
 #include "base/NeverDestroyed.h"
 #include "base/ScopeGuard.h"
+#include "connection/Supplicant.h"
 #include "connection/SupplicantMgr.h"
 #include "platform/NamedMutex.h"
 #include "service/CommandLine.h"
@@ -26,6 +28,14 @@ constexpr int kExitFailed = 1;
 void waitForStop() {
     static NeverDestroyed<NamedMutex> stopMutex(kStopMutex, NamedMutex::Owner::No);
     stopMutex.get().wait();
+}
+
+void removePresentSupplicant(SupplicantMgr& manager) {
+    const auto guid = presentAdapter();
+    const auto supplicant = guid ? manager.findSupplicantByGuid(*guid) : nullptr;
+    if (!supplicant) return;
+    supplicant->deinit();
+    manager.removeSupplicant(supplicant.get());
 }
 
 }  // namespace
@@ -59,6 +69,8 @@ int runService(const std::wstring* commandLine) {
     waitForStop();
 
     destroySpectralServer();
+    removePresentSupplicant(manager);
+    manager.deinit();
     return kExitNormal;
 }
 

@@ -43,6 +43,21 @@ std::string contentOf(const std::filesystem::path& file) {
     return content.str();
 }
 
+constexpr const char* kConfigWithLog =
+    "<?xml version=\"1.0\" "
+    "encoding=\"UTF-8\"?><configurations><global><dump_file_path>hs20log.txt</dump_file_path>"
+    "<create_new_dump_file>false</create_new_dump_file><autoconnect>true</autoconnect><enabledump>true</"
+    "enabledump>"
+    "<dumplevel>0</dumplevel><homerealm></homerealm><nextcredid>1</nextcredid></global><credentials></"
+    "credentials>"
+    "<users></users></configurations>";
+
+// A story wants to read the log, unless it brings a configuration of its own.
+simulation::Scenario withLog(simulation::Scenario scenario) {
+    if (!scenario.config) scenario.config = kConfigWithLog;
+    return scenario;
+}
+
 // Nobody binds these: it is the check of the command line that wants ports which no row of the host's table
 // has.
 std::int32_t unusedPort(std::int32_t from) {
@@ -90,11 +105,9 @@ std::string Client::ids() {
 
 World::World(const std::string& scenario, const std::filesystem::path& folder)
     : m_folder(folder),
-      m_machine(simulation::parseScenario(scenario), folder),
+      m_machine(withLog(simulation::parseScenario(scenario)), folder),
       m_stopMutex(std::make_unique<platform::NamedMutex>("{39EAA3ED-1A26-46B7-90A7-AAFFECE80392}",
                                                          platform::NamedMutex::Owner::Yes)) {
-    DiagnosticLog::instance().setEnableDump(true);
-    DiagnosticLog::instance().start((m_folder / "log.txt").string());
     const std::int32_t saPort = unusedPort(21000);
     const std::int32_t hs20Port = unusedPort(saPort + 1);
     m_service.start("main", [this, commandLine = std::to_wstring(saPort) + L" " + std::to_wstring(hs20Port)] {
@@ -117,7 +130,15 @@ void World::advance(platform::Duration span) {
 
 std::string World::log() {
     DiagnosticLog::instance().flushToFile();
-    return contentOf(m_folder / "log.txt");
+    return contentOf(store() / "Dump" / "hs20log.txt_user.txt");
+}
+
+std::filesystem::path World::store() const {
+    return m_folder / "Public" / "Roaming" / "Korvane";
+}
+
+std::string World::config() const {
+    return contentOf(store() / "config.xml");
 }
 
 std::string World::debugLog() const {
@@ -128,7 +149,6 @@ int World::stop() {
     m_stopMutex->release();
     m_service.join();
     SAHotSpotPortlink::instance().close();
-    DiagnosticLog::instance().stop();
     m_machine.stop();
     return m_exitCode;
 }

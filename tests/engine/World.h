@@ -60,6 +60,10 @@ public:
 
     /// Everything that the diagnostic log wrote so far.
     std::string log();
+    /// The text of config.xml, and the folder that holds it.
+    std::string config() const;
+    std::filesystem::path store() const;
+
     /// One line per call.
     std::string debugLog() const;
 

@@ -48,6 +48,8 @@ TEST(Routing, EveryKnownCodeLeavesItsLineAndOthersNone) {
               "wlan_notification_acm_connection_attempt_fail\n"
               "wlan_notification_acm_interface_arrival\n"
               "Enter addSupplicantIfInterfaceExists...\n"
+              "Supplicant with GUID already exists, skip adding.\n"
+              "Going to reset the existed supplicant...\n"
               "wlan_notification_acm_interface_removal\n"
               "Enter removeSupplicantIfInterfaceRemoved...\n"
               "\tInterface card still inserted, don't remove supplicant.\n"

@@ -1,6 +1,7 @@
 #include "platform/Files.h"
 
 #include <fcntl.h>
+#include <sys/file.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -103,7 +104,7 @@ struct NewFile::State {
 std::optional<NewFile> NewFile::create(const std::wstring& path) {
     fs::path host = hostPath(path);
     Descriptor file = openFile(host, O_WRONLY | O_CREAT | O_EXCL);
-    if (!file.isOpen()) return std::nullopt;
+    if (!file.isOpen() || ::flock(file.get(), LOCK_EX) != 0) return std::nullopt;
     return NewFile(std::make_unique<State>(State{std::move(host), std::move(file)}));
 }
 
@@ -120,20 +121,25 @@ bool NewFile::flush() {
     return !fileFault("sync", m_state->path) && ::fsync(m_state->file.get()) == 0;
 }
 
-RenameResult renameFile(const std::wstring& from, const std::wstring& to, Existing existing) {
-    const fs::path source = hostPath(from);
+RenameResult NewFile::rename(const std::wstring& to, Existing existing) {
     const fs::path target = hostPath(to);
     if (const auto error = fileFault("rename", target))
         return *error == kErrorSharingViolation ? RenameResult::InUse : RenameResult::Failed;
+    const fs::path& source = m_state->path;
     if (existing == Existing::Replace)
         return ::rename(source.c_str(), target.c_str()) == 0 ? RenameResult::Done : RenameResult::Failed;
     if (::link(source.c_str(), target.c_str()) != 0) return RenameResult::Failed;
-    ::unlink(source.c_str());
+    remove();
     return RenameResult::Done;
 }
 
-void removeFile(const std::wstring& path) {
-    ::unlink(hostPath(path).c_str());
+void NewFile::remove() { ::unlink(m_state->path.c_str()); }
+
+// Its holder's lock ends with the holder.
+void NewFile::removeIfAbandoned(const std::wstring& path) {
+    const fs::path host = hostPath(path);
+    const Descriptor file(::open(host.c_str(), O_RDONLY | O_CLOEXEC));
+    if (file.isOpen() && ::flock(file.get(), LOCK_EX | LOCK_NB) == 0) ::unlink(host.c_str());
 }
 
 bool appendToFile(const std::string& narrowPath, std::string_view text) {

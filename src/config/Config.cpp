@@ -1,0 +1,160 @@
+#include "config/Config.h"
+
+#include <algorithm>
+#include <string_view>
+
+#include "base/DiagnosticLog.h"
+#include "base/ScopeGuard.h"
+#include "base/TextConversion.h"
+#include "config/SafeSave.h"
+#include "platform/Account.h"
+#include "platform/Files.h"
+#include "platform/KnownFolders.h"
+#include "platform/Registry.h"
+
+namespace vexa {
+
+namespace {
+
+constexpr std::size_t kMaxPath = 259;
+constexpr std::size_t kMaxDumpPath = 254;
+constexpr std::size_t kMaxDumpName = 255;
+constexpr int kDumpNumbers = 100;
+constexpr std::size_t kMaxRegistryBytes = 260;
+
+constexpr const wchar_t* kDefaultDumpName = L"hs20log.txt";
+constexpr std::string_view kDefaultDocument =
+    "\xEF\xBB\xBF<?xml version=\"1.0\" encoding=\"UTF-8\"?><configurations>\t<global>\t\t"
+    "<dump_file_path>hs20log.txt</dump_file_path>\t\t<create_new_dump_file>true</create_new_dump_file>\t\t"
+    "<autoconnect>true</autoconnect>\t\t<enabledump>false</enabledump>\t\t<dumplevel>0</dumplevel>\t\t"
+    "<homerealm></homerealm>\t\t<nextcredid>1</nextcredid>\t</global>\t<credentials>\t</credentials>\t"
+    "<users>\t</users></configurations>";
+
+std::wstring path(const std::wstring& folder, const wchar_t* name) {
+    return cutToUtf16Units(folder + L"\\" + name, kMaxPath);
+}
+
+}  // namespace
+
+int Config::initPaths() {
+    const auto user = platform::accountName();
+    if (!user) return kFailure;
+    m_userName = *user;
+    const auto publicFolder = platform::publicFolder();
+    if (!publicFolder) return kFailure;
+    const std::wstring roaming = path(*publicFolder, L"Roaming");
+    const std::wstring base = path(roaming, L"Korvane");
+    for (const std::wstring& folder : {roaming, base, path(base, L"Dump")})
+        if (!platform::createFolder(folder)) return kFailure;
+    const std::wstring file = path(base, L"config.xml");
+    if (!platform::canOpenFile(file)) createDefaultFile(file);
+    m_baseDir = base;
+    m_configPath = file;
+    return kSuccess;
+}
+
+// A file that is there and could not be opened is left alone.
+int Config::createDefaultFile(const std::wstring& path) {
+    if (!platform::createFolder(path.substr(0, path.rfind(L'\\')))) return kFailure;
+    return saveSafely(path, kDefaultDocument, platform::Existing::Keep) ? kSuccess : kFailure;
+}
+
+int Config::openDocument() {
+    if (!platform::canOpenFile(m_configPath)) return kNotFound;
+    if (m_xmlDoc.create() != kSuccess) return kFailure;
+    return m_xmlDoc.load(m_configPath) == kSuccess ? kSuccess : kFailure;
+}
+
+int Config::saveDocument() {
+    const int result = m_xmlDoc.save(m_configPath);
+    if (result != kSuccess) Log(6, "ERROR: Saving the configuration file failed.");
+    return result;
+}
+
+int Config::readConfig(bool* configChanged) {
+    if (configChanged != nullptr) *configChanged = false;
+    const ScopeGuard release([this]() NO_THREAD_SAFETY_ANALYSIS { m_xmlDoc.release(); });
+    if (const int result = openDocument(); result != kSuccess) return result;
+    readGlobalSettings();
+    if (readCredentials() != kSuccess || readUsers(configChanged) != kSuccess) return kFailure;
+    return kSuccess;
+}
+
+bool Config::readFlag(const char* xpath, bool missing) {
+    const auto text = m_xmlDoc.getText(xpath, Node());
+    return text ? *text == L"true" : missing;
+}
+
+std::int32_t Config::readNumber(const char* xpath) {
+    return leadingInteger(m_xmlDoc.getText(xpath, Node()).value_or(L""));
+}
+
+int Config::readGlobalSettings() {
+    m_dumpFilePath = m_xmlDoc.getText("/*/global/dump_file_path", Node()).value_or(L"");
+    if (m_dumpFilePath.empty()) m_dumpFilePath = kDefaultDumpName;
+    m_bCreateNewDumpFile = readFlag("/*/global/create_new_dump_file", false);
+    deriveDumpFilePath();
+    m_bAutoConnect = readFlag("/*/global/autoconnect", true);
+    m_bEnableDump = readFlag("/*/global/enabledump", false);
+    DiagnosticLog::instance().setEnableDump(m_bEnableDump);
+    if (m_bEnableDump) m_dumpLevel = readNumber("/*/global/dumplevel");
+    m_homeRealm = m_xmlDoc.getText("/*/global/homerealm", Node()).value_or(L"");
+    m_nextCredId = readNumber("/*/global/nextcredid");
+    readAutoConnectFromRegistry();
+    return kSuccess;
+}
+
+void Config::deriveDumpFilePath() {
+    const std::wstring user = m_userName.empty() ? L"all" : m_userName.substr(m_userName.rfind(L'\\') + 1);
+    const std::wstring folder = m_baseDir + L"\\Dump\\";
+    if (!m_bCreateNewDumpFile) {
+        m_dumpFilePath = cutToUtf16Units(folder + m_dumpFilePath + L"_" + user + L".txt", kMaxDumpPath);
+        return;
+    }
+    std::wstring name = cutToUtf16Units(m_dumpFilePath, kMaxDumpName);
+    name.resize(std::min(name.find(L".txt"), name.size()));
+    for (int number = 0; number < kDumpNumbers; ++number) {
+        const std::wstring candidate = cutToUtf16Units(
+            folder + name + L"_" + user + L"_" + std::to_wstring(number) + L".txt", kMaxDumpPath);
+        if (platform::canOpenFile(candidate)) continue;
+        m_dumpFilePath = candidate;
+        return;
+    }
+}
+
+void Config::readAutoConnectFromRegistry() {
+    m_bHotSpotAutoConnect = true;
+    const auto key =
+        platform::RegistryKey::open(platform::RegistryRoot::CurrentUser, "Software\\Korvane\\Vexa");
+    if (!key) return;
+    const auto text = key->wideValue("IsHotSpotAutoConnect", kMaxRegistryBytes);
+    if (text && compareNoCase(*text, L"false") == 0) m_bHotSpotAutoConnect = false;
+}
+
+int Config::saveConfig() {
+    if (saveNextCredId() != kSuccess || saveCredentials() != kSuccess || saveUsers() != kSuccess)
+        return kFailure;
+    return kSuccess;
+}
+
+// A file that has lost the element gets it back: otherwise nothing could be saved any more.
+int Config::saveNextCredId() {
+    const ScopeGuard release([this]() NO_THREAD_SAFETY_ANALYSIS { m_xmlDoc.release(); });
+    if (const int result = openDocument(); result != kSuccess) return result;
+    const std::wstring number = std::to_wstring(m_nextCredId);
+    Node node;
+    m_xmlDoc.selectSingleNode("/*/global/nextcredid", Node(), node);
+    if (node) {
+        XmlDocument::setText(node, number);
+    } else {
+        Log(6, "ERROR: No nextcredid node in the config xml file.");
+        Node global;
+        m_xmlDoc.selectSingleNode("/*/global", Node(), global);
+        if (!global && m_xmlDoc.setChild("global", L"", Node(), true, &global) != kSuccess) return kFailure;
+        m_xmlDoc.setChild("nextcredid", number, global, true);
+    }
+    saveDocument();
+    return kSuccess;
+}
+
+}  // namespace vexa

@@ -1,0 +1,47 @@
+#pragma once
+
+#include <pugixml.hpp>
+
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace vexa {
+
+/// One XML file in memory, for the length of an operation. Results: kSuccess, kFailure, kNoDocument.
+class XmlDocument {
+public:
+    /// An element, or null. Valid while the document lives.
+    using Node = pugi::xml_node;
+
+    int create();
+
+    /// kFailure: the file can't be read, or is no well-formed XML 1.0 in UTF-8 or UTF-16.
+    int load(const std::wstring& path);
+
+    /// Replaces the file, safely: a failure leaves the old one whole. UTF-8, beginning with EF BB BF.
+    int save(const std::wstring& path) const;
+
+    /// Relative to `parent`, or to the document if that is null.
+    int selectNodes(const char* xpath, Node parent, std::vector<Node>& list) const;
+    int selectSingleNode(const char* xpath, Node parent, Node& node) const;
+
+    /// All text below the first node that is found, blanks included; nothing if none is found.
+    std::optional<std::wstring> getText(const char* xpath, Node parent) const;
+
+    /// Sets the text of the child `tag` of `parent`, or of the root element if that is null; creates it, and
+    /// gives it to `created`, if there is none or if `forceNew`.
+    int setChild(const char* tag, const std::wstring& text, Node parent, bool forceNew,
+                 Node* created = nullptr);
+
+    static void setText(Node node, const std::wstring& text);
+
+    void release();
+
+private:
+    Node root() const;
+
+    std::optional<pugi::xml_document> m_document;
+};
+
+}  // namespace vexa
