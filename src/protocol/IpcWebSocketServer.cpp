@@ -1,7 +1,6 @@
 #include "protocol/IpcWebSocketServer.h"
 
 #include <algorithm>
-#include <array>
 #include <atomic>
 #include <boost/asio/io_context.hpp>
 #include <boost/asio/ip/tcp.hpp>
@@ -28,6 +27,7 @@
 
 #include "platform/PeerAccount.h"
 #include "platform/Thread.h"
+#include "protocol/IpcStandby.h"
 
 namespace vexa {
 
@@ -144,7 +144,8 @@ private:
     std::atomic<bool> m_isStopped{false};
     std::mutex m_outboxMutex;
     std::vector<Outgoing> m_outbox;
-    std::array<std::thread, 2> m_threads;
+    IpcStandby m_standby{m_io};
+    std::thread m_thread;
 };
 
 /// One connection, from the accept to the end. Lives as long as an operation of it is under way.
@@ -208,8 +209,8 @@ bool IpcWebSocketServer::Impl::open(std::int32_t port) {
 bool IpcWebSocketServer::Impl::start() {
     asio::post(m_inout, [this] { accept(); });
     try {
-        for (std::thread& thread : m_threads)
-            thread = std::thread([this] { m_io.run(); });
+        m_standby.start();
+        m_thread = std::thread([this] { m_io.run(); });
         return true;
     } catch (const std::system_error&) {
         stop();
@@ -261,7 +262,7 @@ void IpcWebSocketServer::Impl::sendTo(ClientId client, std::string message) {
     queue({client, std::make_shared<const std::string>(std::move(message))});
 }
 
-// Posted, not deferred: the other thread writes while the handler that sends may be slow.
+// Posted, not deferred: the standby may have to write while the handler that sends is slow.
 void IpcWebSocketServer::Impl::queue(Outgoing outgoing) {
     {
         const std::lock_guard lock(m_outboxMutex);
@@ -300,7 +301,9 @@ void IpcWebSocketServer::Impl::received(std::shared_ptr<IpcSession> session, Cli
 }
 
 void IpcWebSocketServer::Impl::handle(IpcSession& session, ClientId id, const std::string& message) {
+    m_standby.callBegins();
     if (!m_isStopped) m_handler(id, message);
+    m_standby.callEnds();
     session.messageHandled(message.size());
     if (--m_unhandled == 0) platform::endForeignWork();
 }
@@ -317,7 +320,7 @@ void IpcWebSocketServer::Impl::sayFarewell() {
     m_pause.async_wait([this](error_code) { m_io.stop(); });
 }
 
-// A handler that runs now is waited for by the joins; messages that still wait for it are dropped.
+// A handler that runs now is waited for by the join; messages that still wait for it are dropped.
 void IpcWebSocketServer::Impl::stop() {
     if (m_isStopped.exchange(true)) return;
     asio::post(m_inout, [this] {
@@ -326,8 +329,8 @@ void IpcWebSocketServer::Impl::stop() {
     });
     {
         const platform::ForeignWait waiting;
-        for (std::thread& thread : m_threads)
-            if (thread.joinable()) thread.join();
+        if (m_thread.joinable()) m_thread.join();
+        m_standby.stop();
     }
     if (m_unhandled != 0) platform::endForeignWork();
     for (const auto& [id, session] : std::map(m_sessions))

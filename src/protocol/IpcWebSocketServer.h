@@ -13,9 +13,10 @@ namespace vexa {
 /// binary comes in, text goes out. Only processes of this account get in, with a loopback name in `Host` and
 /// without an `Origin`; everyone else gets HTTP 403.
 ///
-/// Two threads serve a server. One runs the input and output of all clients while the other is in the
-/// handler: a slow handler holds up neither the writing of queued messages nor the reading of others. They
-/// change roles with each message, so that an answer need not wait for a thread to wake up.
+/// One thread runs the input and output of all clients and the handler, so that an answer need not wait for
+/// another thread to wake up. While a handler is slow, a second thread runs the input and output: it takes
+/// over within some 2 ms, so a slow handler holds up neither the writing of queued messages nor the reading
+/// of others.
 class IpcWebSocketServer {
 public:
     using ClientId = std::uint64_t;
