@@ -158,13 +158,17 @@ void DiagnosticLog::addLine(std::string_view text, bool numbered) {
     m_lineCount = m_lines.size();
 }
 
+// A file that could not be opened is tried empty first: each line of a long queue comes here, and to join
+// them all for nothing would cost more than the queue is worth.
 void DiagnosticLog::flushToFile() {
     if (!m_bEnabled) return;
     const LockGuard lock(g_hs20Lock);
+    if (m_bFileFailed && !platform::appendToFile(m_filePath, {})) return;
     std::string text;
     for (const std::string& line : m_lines)
         text += line;
-    if (!platform::appendToFile(m_filePath, text)) return;
+    m_bFileFailed = !platform::appendToFile(m_filePath, text);
+    if (m_bFileFailed) return;
     m_lines.clear();
     m_lineCount = 0;
 }

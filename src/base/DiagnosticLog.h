@@ -63,6 +63,7 @@ private:
     std::atomic<std::size_t> m_lineCount{0};
     std::deque<std::string> m_lines GUARDED_BY(g_hs20Lock);
     std::string m_filePath GUARDED_BY(g_hs20Lock);
+    bool m_bFileFailed GUARDED_BY(g_hs20Lock) = false;
     std::int32_t m_sequence GUARDED_BY(g_hs20Lock) = 0;
     platform::Event m_hStopEvent{platform::Reset::Auto, "the log's stop event"};
     platform::Thread m_thread;

@@ -65,10 +65,8 @@ int Config::openDocument() {
     return m_xmlDoc.load(m_configPath) == kSuccess ? kSuccess : kFailure;
 }
 
-int Config::saveDocument() {
-    const int result = m_xmlDoc.save(m_configPath);
-    if (result != kSuccess) Log(6, "ERROR: Saving the configuration file failed.");
-    return result;
+void Config::saveDocument() {
+    if (m_xmlDoc.save(m_configPath) != kSuccess) m_bSaveFailed = true;
 }
 
 int Config::readConfig(bool* configChanged) {
@@ -131,10 +129,13 @@ void Config::readAutoConnectFromRegistry() {
     if (text && compareNoCase(*text, L"false") == 0) m_bHotSpotAutoConnect = false;
 }
 
+// However many of the three are lost, as with a full disk, one line tells of it.
 int Config::saveConfig() {
-    if (saveNextCredId() != kSuccess || saveCredentials() != kSuccess || saveUsers() != kSuccess)
-        return kFailure;
-    return kSuccess;
+    m_bSaveFailed = false;
+    const bool isDone =
+        saveNextCredId() == kSuccess && saveCredentials() == kSuccess && saveUsers() == kSuccess;
+    if (!isDone || m_bSaveFailed) Log(6, "ERROR: Saving the configuration file failed.");
+    return isDone ? kSuccess : kFailure;
 }
 
 // A file that has lost the element gets it back: otherwise nothing could be saved any more.

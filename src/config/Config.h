@@ -53,7 +53,7 @@ private:
 
     int createDefaultFile(const std::wstring& path) REQUIRES(g_hs20Lock);
     int openDocument() REQUIRES(g_hs20Lock);
-    int saveDocument() REQUIRES(g_hs20Lock);
+    void saveDocument() REQUIRES(g_hs20Lock);
 
     int readGlobalSettings() REQUIRES(g_hs20Lock);
     bool readFlag(const char* xpath, bool missing) REQUIRES(g_hs20Lock);
@@ -84,6 +84,7 @@ private:
     std::atomic<bool> m_bAutoConnect{true};
     std::wstring m_homeRealm GUARDED_BY(g_hs20Lock);
     std::wstring m_baseDir GUARDED_BY(g_hs20Lock);
+    bool m_bSaveFailed GUARDED_BY(g_hs20Lock) = false;
     std::wstring m_configPath GUARDED_BY(g_hs20Lock);
 };
 

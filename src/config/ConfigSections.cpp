@@ -188,7 +188,7 @@ int Config::saveCredentials() {
         return kFailure;
     const auto present = m_credentials.credentialsById();
     for (const Node node : nodes)
-        if (mustRemove(node, present)) node.parent().remove_child(node);
+        if (mustRemove(node, present)) XmlDocument::remove(node);
     for (const Credential* credential : m_credentials.copyCredentialPointers())
         if (!section || writeCredential(*credential, section) != kSuccess) return kFailure;
     Log(2, "Saving credentials to xml file...");
@@ -213,8 +213,10 @@ bool Config::mustRemove(Node node, const std::unordered_map<std::int32_t, Creden
 int Config::writeCredential(const Credential& credential, Node section) {
     Node node;
     if (m_xmlDoc.setChild("credential", L"", section, true, &node) != kSuccess) return kFailure;
-    const auto write = [&](const char* tag, const std::wstring& text)
-                           NO_THREAD_SAFETY_ANALYSIS { m_xmlDoc.setChild(tag, text, node, true); };
+    int result = kSuccess;
+    const auto write = [&](const char* tag, const std::wstring& text) NO_THREAD_SAFETY_ANALYSIS {
+        if (m_xmlDoc.setChild(tag, text, node, true) != kSuccess) result = kFailure;
+    };
     write("id", std::to_wstring(credential.m_id));
     write("type", textOfType(credential.m_type));
     write("accesstype", textOfAccess(credential.m_accessType));
@@ -224,13 +226,13 @@ int Config::writeCredential(const Credential& credential, Node section) {
     const bool isTtls = credential.m_type == CRED_TYPE_EAP_TTLS;
     if (!isTtls && credential.m_type != CRED_TYPE_EAP_TLS) {
         Log(2, "Invalid credential type.");
-        return kSuccess;
+        return result;
     }
     write("credname", credential.m_credName);
     write("realm", credential.m_realm);
     write(isTtls ? "username" : "cacert", isTtls ? credential.m_username : credential.m_caCert);
     write(isTtls ? "password" : "clientcert", isTtls ? credential.m_password : credential.m_clientCert);
-    return kSuccess;
+    return result;
 }
 
 int Config::saveUsers() {
@@ -243,7 +245,7 @@ int Config::saveUsers() {
         m_xmlDoc.selectNodes("/*/users/*", Node(), users) != kSuccess)
         return kFailure;
     for (const Node user : users)
-        if (textOf(user, "username", kInvalid) == m_userName) user.parent().remove_child(user);
+        if (textOf(user, "username", kInvalid) == m_userName) XmlDocument::remove(user);
     Node user;
     Node list;
     if (m_xmlDoc.setChild("user", L"", section, true, &user) != kSuccess ||

@@ -17,6 +17,19 @@ constexpr unsigned kParse = (pugi::parse_full | pugi::parse_ws_pcdata) & ~pugi::
 constexpr unsigned kFormat = pugi::format_raw | pugi::format_write_bom;
 constexpr std::string_view kUtf8Mark = "\xEF\xBB\xBF";
 
+bool arePaired(std::u16string_view units) {
+    for (std::size_t i = 0; i < units.size(); ++i) {
+        const bool isHigh = (units[i] & 0xFC00) == 0xD800;
+        if (isHigh && (i + 1 == units.size() || (units[i + 1] & 0xFC00) != 0xDC00)) return false;
+        if (isHigh)
+            ++i;
+        else if ((units[i] & 0xFC00) == 0xDC00)
+            return false;
+    }
+    return true;
+}
+
+// Empty if it is no valid UTF-16.
 std::string decodeUtf16(std::string_view bytes, bool isBigEndian) {
     std::u16string units;
     for (std::size_t i = 2; i + 1 < bytes.size(); i += 2) {
@@ -24,14 +37,40 @@ std::string decodeUtf16(std::string_view bytes, bool isBigEndian) {
         const auto low = static_cast<unsigned char>(bytes[isBigEndian ? i + 1 : i]);
         units += static_cast<char16_t>(high << 8 | low);
     }
-    return utf8FromUtf16(units);
+    return bytes.size() % 2 == 0 && arePaired(units) ? utf8FromUtf16(units) : std::string();
 }
 
-std::string asUtf8(const std::string& content) {
-    if (content.starts_with(kUtf8Mark)) return content.substr(kUtf8Mark.size());
-    if (content.starts_with("\xFF\xFE")) return decodeUtf16(content, false);
-    if (content.starts_with("\xFE\xFF")) return decodeUtf16(content, true);
-    return content;
+struct EncodedText {
+    std::string utf8;
+    XmlEncoding encoding;
+};
+
+EncodedText decode(const std::string& content) {
+    if (content.starts_with("\xFF\xFE")) return {decodeUtf16(content, false), XmlEncoding::Utf16};
+    if (content.starts_with("\xFE\xFF")) return {decodeUtf16(content, true), XmlEncoding::Utf16};
+    if (content.starts_with(kUtf8Mark)) return {content.substr(kUtf8Mark.size()), XmlEncoding::Utf8};
+    const XmlEncoding declared = declaredXmlEncoding(content);
+    if (declared == XmlEncoding::Latin1) return {utf8FromWide(wideFromNarrow(content)), declared};
+    return {content, declared == XmlEncoding::Ascii ? declared : XmlEncoding::Utf8};
+}
+
+// A line end is one line feed, in whatever form it was written. After this a carriage return is one that was
+// meant.
+std::string withPlainLineEnds(const std::string& text) {
+    std::string plain;
+    plain.reserve(text.size());
+    for (std::size_t i = 0; i < text.size(); ++i) {
+        if (text[i] == '\r' && i + 1 < text.size() && text[i + 1] == '\n') continue;
+        plain += text[i] == '\r' ? '\n' : text[i];
+    }
+    return plain;
+}
+
+// Processing instructions have names too.
+XmlDocument::Node childElement(XmlDocument::Node parent, const char* name) {
+    for (const XmlDocument::Node child : parent.children(name))
+        if (child.type() == pugi::node_element) return child;
+    return {};
 }
 
 struct TextCollector : pugi::xml_tree_walker {
@@ -43,11 +82,18 @@ struct TextCollector : pugi::xml_tree_walker {
     }
 };
 
+// A carriage return is written as a reference, since as it stands it would be read as a line end. The library
+// leaves those of text as they are; nothing else in a document that was read holds one.
 struct StringWriter : pugi::xml_writer {
     std::string text;
 
     void write(const void* data, std::size_t size) override {
-        text.append(static_cast<const char*>(data), size);
+        std::string_view rest(static_cast<const char*>(data), size);
+        for (std::size_t at = rest.find('\r'); at != rest.npos; at = rest.find('\r')) {
+            text.append(rest.substr(0, at)).append("&#13;");
+            rest.remove_prefix(at + 1);
+        }
+        text.append(rest);
     }
 };
 
@@ -62,8 +108,9 @@ int XmlDocument::load(const std::wstring& path) {
     if (!m_document) return kNoDocument;
     const auto content = platform::readFile(path);
     if (!content) return kFailure;
-    const std::string text = asUtf8(*content);
-    if (!isWellFormedXml(text)) return kFailure;
+    const auto [utf8, encoding] = decode(*content);
+    const std::string text = withPlainLineEnds(utf8);
+    if (!isWellFormedXml(text, encoding)) return kFailure;
     return m_document->load_buffer(text.data(), text.size(), kParse, pugi::encoding_utf8) ? kSuccess
                                                                                           : kFailure;
 }
@@ -93,7 +140,7 @@ int XmlDocument::selectNodes(const char* xpath, Node parent, std::vector<Node>& 
 int XmlDocument::selectSingleNode(const char* xpath, Node parent, Node& node) const {
     if (!m_document) return kFailure;
     const bool isChildName = parent && std::strpbrk(xpath, "/*") == nullptr;
-    node = isChildName ? parent.child(xpath) : (parent ? parent : root()).select_node(xpath).node();
+    node = isChildName ? childElement(parent, xpath) : (parent ? parent : root()).select_node(xpath).node();
     return kSuccess;
 }
 
@@ -105,9 +152,25 @@ std::optional<std::wstring> XmlDocument::getText(const char* xpath, Node parent)
     return wideFromUtf8(collector.text);
 }
 
-void XmlDocument::setText(Node node, const std::wstring& text) {
-    node.remove_children();
+int XmlDocument::setText(Node node, const std::wstring& text) {
+    if (!canStandInXml(text)) return kFailure;
+    while (const Node child = node.last_child())
+        remove(child);
     node.append_child(pugi::node_pcdata).set_value(utf8FromWide(text).c_str());
+    return kSuccess;
+}
+
+// From the leaves up: the library's own way is recursive, and the depth of a document is its author's choice.
+void XmlDocument::remove(Node node) {
+    for (Node at = node;;) {
+        while (const Node child = at.last_child())
+            at = child;
+        Node parent = at.parent();
+        const bool isLast = at == node;
+        parent.remove_child(at);
+        if (isLast) return;
+        at = parent;
+    }
 }
 
 int XmlDocument::setChild(const char* tag, const std::wstring& text, Node parent, bool forceNew,
@@ -116,14 +179,10 @@ int XmlDocument::setChild(const char* tag, const std::wstring& text, Node parent
     if (!m_document) return kFailure;
     Node existing;
     if (!forceNew) selectSingleNode(tag, parent, existing);
-    if (existing) {
-        setText(existing, text);
-        return kSuccess;
-    }
+    if (existing) return setText(existing, text);
     if (!parent) selectSingleNode("/*", Node(), parent);
     Node node = parent.append_child(tag);
-    if (!node) return kFailure;
-    setText(node, text);
+    if (!node || setText(node, text) != kSuccess) return kFailure;
     if (created != nullptr) *created = node;
     return kSuccess;
 }

@@ -16,7 +16,8 @@ public:
 
     int create();
 
-    /// kFailure: the file can't be read, or is no well-formed XML 1.0 in UTF-8 or UTF-16.
+    /// kFailure: the file can't be read, or is no well-formed XML 1.0 in an encoding that we know: UTF-8,
+    /// UTF-16 with its mark, ISO-8859-1, US-ASCII.
     int load(const std::wstring& path);
 
     /// Replaces the file, safely: a failure leaves the old one whole. UTF-8, beginning with EF BB BF.
@@ -30,11 +31,15 @@ public:
     std::optional<std::wstring> getText(const char* xpath, Node parent) const;
 
     /// Sets the text of the child `tag` of `parent`, or of the root element if that is null; creates it, and
-    /// gives it to `created`, if there is none or if `forceNew`.
+    /// gives it to `created`, if there is none or if `forceNew`. kFailure also for text that XML can't hold.
     int setChild(const char* tag, const std::wstring& text, Node parent, bool forceNew,
                  Node* created = nullptr);
 
-    static void setText(Node node, const std::wstring& text);
+    /// In place of all that the node holds. kFailure, and no change: the text holds what XML can't.
+    static int setText(Node node, const std::wstring& text);
+
+    /// Takes a node and all below it out of the document.
+    static void remove(Node node);
 
     void release();
 

@@ -43,6 +43,29 @@ bool isIn(const std::array<Range, N>& ranges, char32_t c) {
                        [c](const Range& range) { return c >= range.first && c <= range.last; });
 }
 
+struct EncodingName {
+    std::string_view name;
+    XmlEncoding encoding;
+};
+
+constexpr std::array<EncodingName, 5> kEncodings = {{{"", XmlEncoding::Utf8},
+                                                     {"UTF-8", XmlEncoding::Utf8},
+                                                     {"UTF-16", XmlEncoding::Utf16},
+                                                     {"ISO-8859-1", XmlEncoding::Latin1},
+                                                     {"US-ASCII", XmlEncoding::Ascii}}};
+
+XmlEncoding encodingOf(std::u32string_view name) {
+    const std::string narrow(name.begin(), name.end());
+    const auto found = std::find_if(kEncodings.begin(), kEncodings.end(), [&](const EncodingName& known) {
+        return compareNoCase(known.name, narrow) == 0;
+    });
+    return found == kEncodings.end() ? XmlEncoding::Unknown : found->encoding;
+}
+
+bool isAscii(std::string_view text) {
+    return std::all_of(text.begin(), text.end(), [](char c) { return static_cast<unsigned char>(c) < 0x80; });
+}
+
 bool isCharacter(char32_t c) {
     return c == 0x9 || c == 0xA || c == 0xD || (c >= 0x20 && c <= 0xD7FF) || (c >= 0xE000 && c <= 0xFFFD) ||
            (c >= 0x10000 && c <= 0x10FFFF);
@@ -58,6 +81,22 @@ public:
         return declaration() && miscellany() && documentType() && miscellany() && rootElement() &&
                miscellany() && m_rest.empty();
     }
+
+    /// Also true if there is none.
+    bool declaration() {
+        if (!m_rest.starts_with(U"<?xml") || m_rest.size() < 6 ||
+            kWhiteSpace.find(m_rest[5]) == kWhiteSpace.npos)
+            return true;
+        take(U"<?xml");
+        std::u32string_view value;
+        if (!pseudoAttribute(U"version", value) || (value != U"1.0" && value != U"1.1")) return false;
+        if (pseudoAttribute(U"encoding", m_encoding) && m_encoding.empty()) return false;
+        if (pseudoAttribute(U"standalone", value) && value != U"yes" && value != U"no") return false;
+        white();
+        return take(U"?>");
+    }
+
+    std::u32string_view encodingName() const { return m_encoding; }
 
 private:
     bool take(std::u32string_view expected) {
@@ -108,19 +147,6 @@ private:
         if (white() && take(wanted) && equals() && quoted(value)) return true;
         m_rest = before;
         return false;
-    }
-
-    bool declaration() {
-        if (!m_rest.starts_with(U"<?xml") || m_rest.size() < 6 ||
-            kWhiteSpace.find(m_rest[5]) == kWhiteSpace.npos)
-            return true;
-        take(U"<?xml");
-        std::u32string_view value;
-        if (!pseudoAttribute(U"version", value) || (value != U"1.0" && value != U"1.1")) return false;
-        pseudoAttribute(U"encoding", value);
-        if (pseudoAttribute(U"standalone", value) && value != U"yes" && value != U"no") return false;
-        white();
-        return take(U"?>");
     }
 
     bool comment() {
@@ -259,15 +285,26 @@ private:
     }
 
     std::u32string_view m_rest;
+    std::u32string_view m_encoding;
     std::vector<std::u32string_view> m_open;
 };
 
 }  // namespace
 
-bool isWellFormedXml(std::string_view text) {
+XmlEncoding declaredXmlEncoding(std::string_view content) {
+    const std::string_view line = content.substr(0, content.find("?>") + 2);
+    const std::u32string wide(line.begin(), line.end());
+    Scanner scanner(wide);
+    return scanner.declaration() ? encodingOf(scanner.encodingName()) : XmlEncoding::Unknown;
+}
+
+bool isWellFormedXml(std::string_view text, XmlEncoding encoding) {
     const auto codePoints = codePointsFromUtf8(text);
-    return codePoints && std::all_of(codePoints->begin(), codePoints->end(), isCharacter) &&
-           Scanner(*codePoints).document();
+    if (!codePoints || !std::all_of(codePoints->begin(), codePoints->end(), isCharacter)) return false;
+    Scanner scanner(*codePoints);
+    if (!scanner.document()) return false;
+    const bool isClaimed = scanner.encodingName().empty() || encodingOf(scanner.encodingName()) == encoding;
+    return isClaimed && (encoding != XmlEncoding::Ascii || isAscii(text));
 }
 
 bool canStandInXml(std::wstring_view text) {
