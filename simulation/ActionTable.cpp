@@ -25,6 +25,9 @@ constexpr Check kSession = [](const JsonPlace& p, std::size_t) { readSessionStat
 constexpr Check kUnsigned = [](const JsonPlace& p, std::size_t) { p.integer(0, kMaxUnsigned); };
 constexpr Check kMilliseconds = [](const JsonPlace& p, std::size_t) { p.milliseconds(); };
 constexpr Check kSignedMilliseconds = [](const JsonPlace& p, std::size_t) { p.signedMilliseconds(); };
+constexpr Check kSsid = [](const JsonPlace& p, std::size_t) {
+    if (p.text().size() > DOT11_SSID_MAX_LENGTH) p.fail("more than 32 bytes");
+};
 constexpr Check kNetwork = [](const JsonPlace& p, std::size_t) { readNetwork(p); };
 constexpr Check kTexts = [](const JsonPlace& p, std::size_t) {
     readArray(p, [](const JsonPlace& element) { return element.text(); });
@@ -98,13 +101,13 @@ constexpr ActionMember kRadioMembers[] = {{"hardware", kRadio}, {"software", kRa
 constexpr ActionMember kAdapterMember[] = {{"adapter", kAdapter}};
 constexpr ActionMember kBssidMember[] = {{"bssid", kBssid, Needed::Yes}};
 constexpr ActionMember kNetworkMember[] = {{"network", kNetwork, Needed::Yes}};
-constexpr ActionMember kUserDisconnectMembers[] = {{"ssid", kText, Needed::Yes}, {"isHs20", kUnsigned}};
+constexpr ActionMember kUserDisconnectMembers[] = {{"ssid", kSsid, Needed::Yes}, {"isHs20", kUnsigned}};
 constexpr ActionMember kSessionChangeMembers[] = {
     {"eventType", kUnsigned, Needed::Yes}, {"sessionId", kUnsigned}, {"session", kSession}};
 constexpr ActionMember kSetSessionMembers[] = {{"session", kSession, Needed::Yes}};
 constexpr ActionMember kDriverStateMembers[] = {{"current", kUnsigned, Needed::Yes},
                                                 {"previous", kUnsigned, Needed::Yes}};
-constexpr ActionMember kOsConnectMembers[] = {{"ssid", kText, Needed::Yes}, {"succeeds", kFlag}};
+constexpr ActionMember kOsConnectMembers[] = {{"ssid", kSsid, Needed::Yes}, {"succeeds", kFlag}};
 constexpr ActionMember kDropMembers[] = {{"reason", kUnsigned}};
 constexpr ActionMember kConnectionMembers[] = {
     {"code", kUnsigned, Needed::Yes}, {"profileName", kText}, {"ssidHex", kHex}, {"reason", kUnsigned}};
@@ -131,17 +134,17 @@ constexpr Action kActions[] = {
     {"radio", kRadioMembers, runRadio},
     {"pullAdapter", kAdapterMember, runPullAdapter},
     {"insertAdapter", kAdapterMember, runInsertAdapter},
-    {"show", kBssidMember},
-    {"hide", kBssidMember},
-    {"addNetwork", kNetworkMember},
-    {"setNetwork", {}, nullptr, checkNetworkChange, true},
-    {"reportNetworks", {}},
-    {"reportAnqp", kBssidMember},
-    {"completeAnqpQuery", {}},
-    {"userDisconnect", kUserDisconnectMembers},
-    {"sessionChange", kSessionChangeMembers},
+    {"show", kBssidMember, runShow},
+    {"hide", kBssidMember, runHide},
+    {"addNetwork", kNetworkMember, runAddNetwork},
+    {"setNetwork", {}, runSetNetwork, checkNetworkChange, true},
+    {"reportNetworks", {}, runReportNetworks},
+    {"reportAnqp", kBssidMember, runReportAnqp},
+    {"completeAnqpQuery", {}, runCompleteAnqpQuery},
+    {"userDisconnect", kUserDisconnectMembers, runUserDisconnect},
+    {"sessionChange", kSessionChangeMembers, runSessionChange},
     {"setSession", kSetSessionMembers, runSetSession},
-    {"driverState", kDriverStateMembers},
+    {"driverState", kDriverStateMembers, runDriverState},
     {"osConnect", kOsConnectMembers},
     {"dropConnection", kDropMembers},
     {"connection", kConnectionMembers, runConnection},

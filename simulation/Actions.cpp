@@ -3,8 +3,8 @@
 #include <algorithm>
 
 #include "platform/ClockControl.h"
+#include "simulation/ActionInput.h"
 #include "simulation/AdapterSetup.h"
-#include "simulation/Guid.h"
 #include "simulation/Machine.h"
 #include "simulation/Wire.h"
 
@@ -18,41 +18,16 @@ constexpr DWORD kRoamingStart = 5;
 constexpr DWORD kRoamingEnd = 6;
 constexpr DWORD kRadioStateChange = 7;
 
-JsonPlace memberOf(const Json::Value& action, const char* name) {
-    return JsonPlace(action, "").member(name);
-}
-
-std::uint32_t unsignedOf(const Json::Value& action, const char* name, std::uint32_t otherwise) {
-    return action.isMember(name) ? action[name].asUInt() : otherwise;
-}
-
-// An action may name no adapter at all, which means the first: there may be none.
-std::size_t existingAdapterOf(Machine& machine, const Json::Value& action) {
-    const std::size_t index = unsignedOf(action, "adapter", 0);
-    if (index >= machine.adapters().count()) throw JsonFault("adapter: no such adapter");
-    return index;
-}
-
-Bytes dataOf(const Json::Value& action) {
-    return action.isMember("dataHex") ? memberOf(action, "dataHex").hex() : Bytes{};
-}
-
-GUID usualGuid(Machine& machine) {
-    const auto index = machine.adapters().usual();
-    return index ? machine.adapters().guid(*index) : GUID{};
-}
-
-GUID guidOf(Machine& machine, const Json::Value& action) {
-    return action.isMember("guid") ? memberOf(action, "guid").guid() : usualGuid(machine);
-}
-
 std::optional<DOT11_RADIO_STATE> radioOf(const Json::Value& action, const char* name) {
     if (!action.isMember(name)) return std::nullopt;
     return readRadioState(memberOf(action, name));
 }
 
 void pull(Machine& machine, std::size_t adapter) {
-    if (machine.adapters().served() == adapter) machine.spectral().abandonScan();
+    if (machine.adapters().served() == adapter) {
+        machine.spectral().abandonScan();
+        machine.hotspot().abandonQueries();
+    }
     machine.adapters().setInserted(adapter, false);
 }
 
@@ -142,7 +117,7 @@ Ticket runSet(Machine& machine, const Json::Value& action, Asker /*asker*/) {
         throw JsonFault("scanMs: the machine has no spectrum");
     }
     if (action.isMember("connectMs")) machine.setConnectTime(time("connectMs"));
-    if (action.isMember("anqpMs")) machine.setAnqpTime(time("anqpMs"));
+    if (action.isMember("anqpMs")) machine.hotspot().setAnqpTime(time("anqpMs"));
     return 0;
 }
 

@@ -9,6 +9,16 @@ namespace vexa::simulation {
 Ticket runRadio(Machine& machine, const Json::Value& action, Asker asker);
 Ticket runPullAdapter(Machine& machine, const Json::Value& action, Asker asker);
 Ticket runInsertAdapter(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runShow(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runHide(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runAddNetwork(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runSetNetwork(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runReportNetworks(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runReportAnqp(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runCompleteAnqpQuery(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runUserDisconnect(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runSessionChange(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runDriverState(Machine& machine, const Json::Value& action, Asker asker);
 Ticket runSetSession(Machine& machine, const Json::Value& action, Asker asker);
 Ticket runConnection(Machine& machine, const Json::Value& action, Asker asker);
 Ticket runRoam(Machine& machine, const Json::Value& action, Asker asker);

@@ -34,12 +34,13 @@ Machine::Machine(Scenario scenario, std::filesystem::path folder)
       m_folder(std::move(folder)),
       m_start(platform::now()),
       m_adapters(m_scenario.adapters),
+      m_airspace(m_scenario.networks),
       m_registry(m_scenario.registryClass, m_folder / "registry.json"),
       m_session(m_scenario.session),
       m_connectTime(m_scenario.connectTime),
-      m_anqpTime(m_scenario.anqpTime),
       m_interfaceStateOverride(kNoOverride),
-      m_spectral(m_scenario.spectrum, m_scenario.seed, m_agenda, m_notifications) {
+      m_spectral(m_scenario.spectrum, m_scenario.seed, m_agenda, m_notifications),
+      m_hotspot(m_airspace, m_scenario.anqpTime, m_agenda, m_notifications) {
     [[maybe_unused]] Machine* const other = currentMachine.exchange(this);
     assert(!other);
     if (m_scenario.hotspotAutoConnect) m_registry.setAutoConnect(m_scenario.hotspotAutoConnect);

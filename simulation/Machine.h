@@ -10,9 +10,11 @@
 #include "simulation/ActionTable.h"
 #include "simulation/Adapters.h"
 #include "simulation/Agenda.h"
+#include "simulation/Airspace.h"
 #include "simulation/CallLog.h"
 #include "simulation/Faults.h"
 #include "simulation/Handles.h"
+#include "simulation/HotspotModule.h"
 #include "simulation/MachineRegistry.h"
 #include "simulation/NotificationQueue.h"
 #include "simulation/Scenario.h"
@@ -38,7 +40,7 @@ public:
     /// action's own notifications have been delivered. Not to be called by a callback of this machine.
     Json::Value perform(const Json::Value& message);
 
-    /// Ends timeline, scans and notifications. Requests are still answered afterwards.
+    /// Ends timeline, scans, queries and notifications. Requests are still answered afterwards.
     void stop();
 
     platform::Duration elapsed() const { return platform::now() - m_start; }
@@ -52,6 +54,8 @@ public:
     CallLog& calls() { return m_calls; }
     NotificationQueue& notifications() { return m_notifications; }
     SpectralModule& spectral() { return m_spectral; }
+    HotspotModule& hotspot() { return m_hotspot; }
+    Airspace& airspace() { return m_airspace; }
 
     SessionState session() const { return m_session; }
     void setSession(SessionState session) { m_session = session; }
@@ -61,7 +65,6 @@ public:
     void overrideInterfaceState(std::optional<WLAN_INTERFACE_STATE> state);
 
     void setConnectTime(platform::Duration time) { m_connectTime = time; }
-    void setAnqpTime(platform::Duration time) { m_anqpTime = time; }
 
     /// The adapter that actions mean which name none. Throws JsonFault if the machine has none.
     std::size_t usualAdapter() const;
@@ -74,17 +77,18 @@ private:
     const std::filesystem::path m_folder;
     const platform::Duration m_start;
     Adapters m_adapters;
+    Airspace m_airspace;
     MachineRegistry m_registry;
     Handles m_handles;
     Faults m_faults;
     CallLog m_calls;
     std::atomic<SessionState> m_session;
     std::atomic<platform::Duration> m_connectTime;
-    std::atomic<platform::Duration> m_anqpTime;
     std::atomic<int> m_interfaceStateOverride;
     NotificationQueue m_notifications;
     Agenda m_agenda;
     SpectralModule m_spectral;
+    HotspotModule m_hotspot;
 };
 
 }  // namespace vexa::simulation

@@ -7,6 +7,8 @@ namespace vexa::simulation {
 namespace {
 
 constexpr std::size_t kMaxSsid = 32;
+constexpr std::size_t kMaxByte = 255;
+constexpr std::size_t kMaxRealms = 0xFFFF;
 constexpr std::int64_t kEapTls = 13;
 constexpr std::int64_t kEapTtls = 21;
 
@@ -30,6 +32,8 @@ constexpr JsonMember<NetworkRealm> kRealmMembers[] = {
 NetworkRealm readRealm(const JsonPlace& place) {
     NetworkRealm realm;
     readObject(place, kRealmMembers, realm);
+    if (joinedNames(realm).size() > kMaxByte) place.member("names").fail("more than 255 bytes");
+    if (realm.eapMethods.size() > kMaxByte) place.member("eapMethods").fail("more than 255 methods");
     return realm;
 }
 
@@ -65,6 +69,7 @@ void readSsid(Network& network, const JsonPlace& place) {
 
 void readRealms(Network& network, const JsonPlace& place) {
     network.realms = readArray(place, readRealm);
+    if (network.realms->size() > kMaxRealms) place.fail("more than 65535 realms");
     network.naiRealmList.reset();
 }
 
@@ -79,6 +84,11 @@ constexpr std::pair<std::string_view, AnqpAnswer> kAnqpAnswers[] = {
     {"never", AnqpAnswer::Never},
 };
 
+void readAnqp(Network& network, const JsonPlace& place) {
+    network.anqp = readName(place, kAnqpAnswers);
+    network.wasQueried = false;
+}
+
 constexpr JsonMember<Network> kNetworkMembers[] = {
     {"bssid", [](Network& n, const JsonPlace& p) { n.bssid = p.macAddress(); }},
     {"ssid", readSsid},
@@ -90,7 +100,7 @@ constexpr JsonMember<Network> kNetworkMembers[] = {
     {"reported", [](Network& n, const JsonPlace& p) { n.reported = p.flag(); }},
     {"realms", readRealms},
     {"naiRealmHex", readRealmList},
-    {"anqp", [](Network& n, const JsonPlace& p) { n.anqp = readName(p, kAnqpAnswers); }},
+    {"anqp", readAnqp},
     {"visible", [](Network& n, const JsonPlace& p) { n.visible = p.flag(); }},
     {"osProfile", [](Network& n, const JsonPlace& p) { n.osProfile = p.flag(); }},
     {"accepts", [](Network& n, const JsonPlace& p) { n.accepts = readArray(p, readAccept); }},
@@ -103,6 +113,17 @@ void refuseBoth(const JsonPlace& place, const char* first, const char* second) {
 }
 
 }  // namespace
+
+bool hasAnswered(const Network& network) {
+    return network.anqp == AnqpAnswer::Ready || (network.anqp == AnqpAnswer::OnQuery && network.wasQueried);
+}
+
+std::string joinedNames(const NetworkRealm& realm) {
+    std::string names;
+    for (const std::string& name : realm.names)
+        names += (&name == realm.names.data() ? "" : ";") + name;
+    return names;
+}
 
 Network readNetwork(const JsonPlace& place) {
     Network network;

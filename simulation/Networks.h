@@ -41,7 +41,14 @@ struct Network {
     bool visible = true;
     bool osProfile = false;
     std::vector<AcceptRule> accepts;
+    bool wasQueried = false;  ///< An ANQP query has ended since its way to answer was set.
 };
+
+/// Whether the network's answer to ANQP queries is there.
+bool hasAnswered(const Network& network);
+
+/// The names as they stand in the NAI Realm list, with ";" between them.
+std::string joinedNames(const NetworkRealm& realm);
 
 Network readNetwork(const JsonPlace& place);
 

@@ -56,9 +56,10 @@ DWORD askModule(Machine& machine, const IhvCall& call, IhvRequest kind, Bytes& a
         return ERROR_SUCCESS;
     }
     const bool isModules = machine.adapters().served() == adapter;
+    if (!isModules || kind == IhvRequest::Unknown) return ERROR_INVALID_PARAMETER;
     const bool isSpectral = kind == IhvRequest::Scan || kind == IhvRequest::ChannelList;
-    if (!isModules || !isSpectral) return ERROR_INVALID_PARAMETER;
-    return machine.spectral().handle(*call.guid, kind, call.request, answer);
+    return isSpectral ? machine.spectral().handle(*call.guid, kind, call.request, answer)
+                      : machine.hotspot().handle(*call.guid, kind, call.request, call.output.size(), answer);
 }
 
 DWORD ihvControl(Machine& machine, const IhvCall& call, PDWORD bytesReturned) {
@@ -141,6 +142,13 @@ DWORD WlanRegisterNotification(HANDLE handle, DWORD sources, BOOL /*ignoreDuplic
                                : machine->notifications().unregister(handle);
     if (previousSources) *previousSources = previous;
     return ERROR_SUCCESS;
+}
+
+DWORD WlanDisconnect(HANDLE handle, const GUID* guid, PVOID /*reserved*/) {
+    Machine* const machine = Machine::current();
+    const DWORD admitted = admit(machine, handle, "WlanDisconnect");
+    if (admitted != ERROR_SUCCESS) return admitted;
+    return guid != nullptr && machine->adapters().findInserted(*guid) ? ERROR_SUCCESS : ERROR_NOT_FOUND;
 }
 
 DWORD WlanIhvControl(HANDLE handle, const GUID* guid, WLAN_IHV_CONTROL_TYPE type, DWORD inSize,

@@ -25,7 +25,7 @@ TEST(Actions, WhatIsNotUnderstoodIsRefusedWithAReason) {
         {"{'do': 'advance'}", "ms: missing"},
         {"{'do': 'advance', 'ms': -1}", "ms: negative"},
         {"{'do': 'pullAdapter', 'adapter': 1}", "adapter: no such adapter"},
-        {"{'do': 'show', 'bssid': '02:00:00:00:00:01'}", "do: show is not there yet"},
+        {"{'do': 'show', 'bssid': '02:00:00:00:00:01'}", "bssid: no such network"},
         {"{'do': 'levels', 'levels': {}}", "levels: the machine has no spectrum"},
         {"{'do': 'set', 'scanMs': 5}", "scanMs: the machine has no spectrum"},
         {"{'do': 'connection', 'code': 10, 'ssidHex': "

@@ -29,7 +29,7 @@ std::string faultOf(const std::string& text) {
 
 TEST(Scenario, AFaultNamesTheMember) {
     struct Case {
-        const char* text;
+        std::string text;
         const char* fault;
     };
     const Case cases[] = {
@@ -63,6 +63,9 @@ TEST(Scenario, AFaultNamesTheMember) {
          "'b'},"
          "{'bssid': '02:00:00:00:00:03', 'ssid': 'c', 'realms': [{'names': ['r'], 'eapMethods': 13}]}]}",
          "networks[2].realms[0].eapMethods: not an array"},
+        {"{'networks': [{'bssid': '02:00:00:00:00:01', 'ssid': 'a', 'realms': [{'names': ['" +
+             std::string(128, 'x') + "', '" + std::string(127, 'x') + "']}]}]}",
+         "networks[0].realms[0].names: more than 255 bytes"},
         {"{'networks': [{'bssid': '02:00:00:00:00:01', 'ssid': 'a', 'anqp': 'soon'}]}",
          "networks[0].anqp: not one of ready, onQuery, never"},
         {"{'networks': [{'bssid': '02:00:00:00:00:01', 'ssid': 'a', 'accepts': [{'eapMethod': 25}]}]}",
