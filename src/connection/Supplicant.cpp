@@ -68,6 +68,7 @@ int Supplicant::init() {
         Log(6, "%s", error);
         Log(6, "ERROR: Initiailize supplicant failed.");
         deinit();
+        m_interworkingMgr.stop();
         closeWlanHandle();
         return kSuccess;
     }
@@ -81,6 +82,9 @@ const char* Supplicant::initSteps() {
     logInterfaceGuid();
     if (queryMacAddress() != kSuccess) return "ERROR: Query MAC address failed.";
     if (!openWlanHandle()) return "ERROR: Open wlan handle failed.";
+    if (m_interworkingMgr.init() != kSuccess) return "ERROR: Failed to initi NetworkinMgr.";
+    if (getHs20BssListFromIHV() != kSuccess)
+        Log(6, "ERROR: Get HS20 network list failed in supplicant initialization.");
     setRadioState(isRadioOn());
     setState(SupplicantState::Initialized);
     const LockGuard lock(g_hs20Lock);
@@ -116,6 +120,11 @@ void Supplicant::deinit() {
     assert(!g_hs20Lock.isHeldByThisThread());
     Log(3, "Deinitializing supplicant...");
     if (!m_bInitialized) return;
+    m_interworkingMgr.stop();
+    {
+        const LockGuard lock(g_hs20Lock);
+        m_retryHelper.clear();
+    }
     closeWlanHandle();
     m_bInitialized = false;
     Log(3, "Deinitialize supplicant completed.");
@@ -123,7 +132,10 @@ void Supplicant::deinit() {
 
 void Supplicant::reset() {
     const LockGuard lock(g_hs20Lock);
+    m_bConnectionStarted = false;
+    m_bQueryingAnqp = false;
     m_bRoaming = false;
+    m_retryHelper.resetAllNumRetries();
 }
 
 int Supplicant::setState(SupplicantState state) {
@@ -161,6 +173,16 @@ bool Supplicant::isHs20Enabled() const {
     return m_pMgr == nullptr || m_pMgr->config().m_bHotSpotAutoConnect;
 }
 
+// Nothing to choose from as long as nothing chooses.
+int Supplicant::connectNetwork(int& result) {
+    result = kConnectNothingLeft;
+    return kSuccess;
+}
+
+void Supplicant::tellClient(const std::function<void(const ClientEvents&)>& tell) {
+    if (m_pMgr != nullptr && m_pMgr->clientEvents().isComplete()) tell(m_pMgr->clientEvents());
+}
+
 int Supplicant::getCredential(std::int32_t id, Credential*& credential) {
     if (m_pMgr == nullptr) return kFailure;
     if (id < 1) return kInvalidArgument;
@@ -174,6 +196,7 @@ int Supplicant::deleteCredential(std::int32_t id) {
     Config& config = m_pMgr->config();
     if (!config.credentials().deleteCredential(id)) return kFailure;
     config.saveConfig();
+    m_retryHelper.removeAllCredNumRetryEntries(id);
     m_hCredentialChangedEvent.set();
     return kSuccess;
 }
@@ -188,6 +211,7 @@ int Supplicant::updateCredential(const CredentialInput& input) {
     Config& config = m_pMgr->config();
     if (config.credentials().updateCredential(input) != kSuccess) return kFailure;
     config.saveConfig();
+    m_retryHelper.resetNumRetries(input.id);
     m_hCredentialChangedEvent.set();
     return kSuccess;
 }

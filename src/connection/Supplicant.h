@@ -3,9 +3,17 @@
 #include <array>
 #include <atomic>
 #include <cstdint>
+#include <functional>
+#include <string_view>
+#include <vector>
 
 #include "base/NetworkListLock.h"
+#include "base/TimeValue.h"
 #include "config/Credential.h"
+#include "connection/ClientEvents.h"
+#include "connection/InterworkingMgr.h"
+#include "connection/NetworkRetryHelper.h"
+#include "hotspot/Hs20NetworkList.h"
 #include "platform/Event.h"
 #include "platform/WlanApi.h"
 
@@ -31,6 +39,9 @@ enum class SupplicantState : std::int32_t {
 };
 
 const char* nameOf(SupplicantState state);
+
+/// The bytes of an SSID, 32 at most.
+std::string_view bytesOf(const DOT11_SSID& ssid);
 
 /// All that belongs to one adapter. Made and ended by SupplicantMgr; notification and command threads come
 /// here with a reference that keeps the object alive, also beyond deinit(): its events and its handle stay
@@ -67,6 +78,37 @@ public:
     /// Whether the adapter has a DNS server. Always 0; no access if it can't be told.
     int queryInternetAccess(bool& hasAccess) const;
 
+    /// The WLAN service's current connection; kFailure if there is none.
+    int queryCurrentConnection(DOT11_SSID& ssid, MacAddress& bssid, bool includeConnecting) const;
+    /// Its network in the list; null if there is none. Good while the lock is held.
+    Hs20Network* getConnectedBss(bool includeConnecting) const REQUIRES(g_hs20Lock);
+
+    /// Takes over a report of the networks in range, fetches what ANQP has found out about each, and tells
+    /// the client. kInvalidArgument without records.
+    int updateHs20NetworkList(const std::vector<Hs20BssRecord>& records);
+    bool hasUnfetchedAnqpInfo() const;
+    void sendNetworkList() REQUIRES(g_hs20Lock);
+
+    /// Asks the WLAN service to end its connection.
+    DWORD requestDisconnect() const;
+
+    /// Requests to the hotspot module: start the ANQP queries of all networks, read the networks in range,
+    /// read what is known of one. kSuccess or kFailure.
+    int queryHs20NetworkAnqpInfo();
+    int getHs20BssListFromIHV();
+    int fetchBssAnqpInfo(Hs20Network* network) REQUIRES(g_hs20Lock);
+
+    /// Messages of the hotspot module.
+    int onNetworkListChanged(Bytes payload);
+    int onAnqpInfoChanged(Bytes payload);
+    void onAnqpQueryCompleted();
+
+    /// Notifications of the WLAN service. Null data: kInvalidArgument.
+    int onRadioStateChanged(const WLAN_PHY_RADIO_STATE* data);
+
+    /// One attempt of the connecting thread; `result` is kConnectStarted, kConnectNothingLeft or neither.
+    int connectNetwork(int& result);
+
     /// 1 without a manager, 4 for an id below 1; else 0, with `credential` null if there is none.
     int getCredential(std::int32_t id, Credential*& credential) REQUIRES(g_hs20Lock);
     /// Change a stored credential, save, and wake the connecting thread. 0, 1 or 4.
@@ -84,10 +126,26 @@ public:
     platform::Event m_hEnableHs20Event{platform::Reset::Auto, "HS20 enabled or disabled"};
     platform::Event m_hAnqpInfoReadyEvent{platform::Reset::Auto, "ANQP info ready"};
 
-    /// Between roaming start and end.
-    std::atomic<bool> m_bRoaming{false};
+    Hs20NetworkList m_networkList GUARDED_BY(g_hs20Lock);
+    NetworkRetryHelper m_retryHelper GUARDED_BY(g_hs20Lock);
+
+    // Written under the lock, read also without it.
+
+    std::atomic<bool> m_bConnectionStarted{false};  // a connection that this program asked for is under way
+    std::atomic<bool> m_bQueryingAnqp{false};
+    std::atomic<bool> m_bUserDisconnecting{false};  // the client asked to disconnect
+    std::atomic<bool> m_bRoaming{false};            // between roaming start and end
+
+    bool isRadioOnCached() const { return m_bRadioOn; }
+    bool isThreadLate() const { return m_interworkingMgr.isThreadLate(); }
+
+    /// When the client last switched the hotspot function. Starts long ago.
+    TimeValue m_lastHs20ToggleTime GUARDED_BY(g_hs20Lock);
 
 private:
+    DWORD callIhv(std::vector<std::byte> request, std::vector<std::byte>* reply) const;
+    int sendIhvCmd();
+    void tellClient(const std::function<void(const ClientEvents&)>& tell) REQUIRES(g_hs20Lock);
     const char* initSteps();
     void logInterfaceGuid() const;
     bool openWlanHandle();
@@ -99,6 +157,7 @@ private:
     std::atomic<std::uint32_t> m_ifIndex{0};
     std::atomic<HANDLE> m_hWlan{nullptr};
     SupplicantState m_state GUARDED_BY(g_hs20Lock) = SupplicantState::InvalidState;
+    InterworkingMgr m_interworkingMgr{this};  // its thread uses all of the above
 };
 
 }  // namespace vexa

@@ -50,8 +50,10 @@ int SupplicantMgr::init() {
 }
 
 void SupplicantMgr::deinit() {
-    for (const auto& supplicant : takeAll())
+    for (const auto& supplicant : takeAll()) {
         if (supplicant->isInitialized()) supplicant->deinit();
+        retireIfLate(supplicant);
+    }
     if (m_config.isDumpEnabled()) DiagnosticLog::instance().stop();
     m_bInitialized = false;
 }
@@ -134,7 +136,14 @@ int SupplicantMgr::removeSupplicant(const Supplicant* supplicant) {
     if (found == m_supplicants.end()) return kNotFound;
     removed = std::move(*found);
     m_supplicants.erase(found);
+    if (removed->isThreadLate()) m_retired.push_back(removed);
     return kSuccess;
+}
+
+void SupplicantMgr::retireIfLate(const std::shared_ptr<Supplicant>& supplicant) {
+    if (!supplicant->isThreadLate()) return;
+    const LockGuard lock(m_listMutex);
+    m_retired.push_back(supplicant);
 }
 
 std::shared_ptr<Supplicant> SupplicantMgr::firstSupplicant() {

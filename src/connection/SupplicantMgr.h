@@ -2,10 +2,12 @@
 
 #include <atomic>
 #include <memory>
+#include <utility>
 #include <vector>
 
 #include "base/NetworkListLock.h"
 #include "config/Config.h"
+#include "connection/ClientEvents.h"
 #include "platform/Mutex.h"
 #include "platform/WlanApi.h"
 
@@ -50,16 +52,23 @@ public:
 
     Config& config() { return m_config; }
 
+    const ClientEvents& clientEvents() const REQUIRES(g_hs20Lock) { return m_clientEvents; }
+    void setClientEvents(ClientEvents events) REQUIRES(g_hs20Lock) { m_clientEvents = std::move(events); }
+
 private:
+    void retireIfLate(const std::shared_ptr<Supplicant>& supplicant);
     std::shared_ptr<Supplicant> firstSupplicant();
     void add(std::shared_ptr<Supplicant> supplicant);
     std::vector<std::shared_ptr<Supplicant>> takeAll();
 
     Config m_config;
+    ClientEvents m_clientEvents GUARDED_BY(g_hs20Lock);
     std::atomic<bool> m_bInitialized{false};
     platform::Mutex m_changes{"changes of supplicants"};
     platform::Mutex m_listMutex{"the list of supplicants"};
     std::vector<std::shared_ptr<Supplicant>> m_supplicants GUARDED_BY(m_listMutex);
+    /// Their connecting threads did not end in time, and may still look at them.
+    std::vector<std::shared_ptr<Supplicant>> m_retired GUARDED_BY(m_listMutex);
 };
 
 }  // namespace vexa

@@ -156,6 +156,57 @@ struct WLAN_CONNECTION_NOTIFICATION_DATA {
     WCHAR strProfileXml[1];
 };
 
+using DOT11_MAC_ADDRESS = UCHAR[6];
+
+struct WLAN_ASSOCIATION_ATTRIBUTES {
+    DOT11_SSID dot11Ssid;
+    DOT11_BSS_TYPE dot11BssType;
+    DOT11_MAC_ADDRESS dot11Bssid;
+    DWORD dot11PhyType;
+    ULONG uDot11PhyIndex;
+    ULONG wlanSignalQuality;
+    ULONG ulRxRate;
+    ULONG ulTxRate;
+};
+
+struct WLAN_SECURITY_ATTRIBUTES {
+    BOOL bSecurityEnabled;
+    BOOL bOneXEnabled;
+    DWORD dot11AuthAlgorithm;
+    DWORD dot11CipherAlgorithm;
+};
+
+struct WLAN_CONNECTION_ATTRIBUTES {
+    WLAN_INTERFACE_STATE isState;
+    WLAN_CONNECTION_MODE wlanConnectionMode;
+    WCHAR strProfileName[WLAN_MAX_NAME_LENGTH];
+    WLAN_ASSOCIATION_ATTRIBUTES wlanAssociationAttributes;
+    WLAN_SECURITY_ATTRIBUTES wlanSecurityAttributes;
+};
+
+struct NDIS_OBJECT_HEADER {
+    UCHAR Type;
+    UCHAR Revision;
+    USHORT Size;
+};
+
+struct DOT11_BSSID_LIST {
+    NDIS_OBJECT_HEADER Header;
+    ULONG uNumOfEntries;
+    ULONG uTotalNumOfEntries;
+    DOT11_MAC_ADDRESS BSSIDs[1];
+};
+
+struct WLAN_CONNECTION_PARAMETERS {
+    WLAN_CONNECTION_MODE wlanConnectionMode;
+    LPCWSTR strProfile;
+    DOT11_SSID* pDot11Ssid;
+    DOT11_BSSID_LIST* pDesiredBssidList;
+    DOT11_BSS_TYPE dot11BssType;
+    DWORD dwFlags;
+};
+using PWLAN_CONNECTION_PARAMETERS = WLAN_CONNECTION_PARAMETERS*;
+
 using WLAN_NOTIFICATION_CALLBACK = void (*)(PWLAN_NOTIFICATION_DATA, PVOID);
 
 DWORD WlanOpenHandle(DWORD dwClientVersion, PVOID pReserved, PDWORD pdwNegotiatedVersion,
@@ -166,6 +217,10 @@ void WlanFreeMemory(PVOID pMemory);
 DWORD WlanQueryInterface(HANDLE hClientHandle, const GUID* pInterfaceGuid, WLAN_INTF_OPCODE OpCode,
                          PVOID pReserved, PDWORD pdwDataSize, PVOID* ppData,
                          WLAN_OPCODE_VALUE_TYPE* pWlanOpcodeValueType);
+DWORD WlanConnect(HANDLE hClientHandle, const GUID* pInterfaceGuid,
+                  const PWLAN_CONNECTION_PARAMETERS pConnectionParameters, PVOID pReserved);
+DWORD WlanDisconnect(HANDLE hClientHandle, const GUID* pInterfaceGuid, PVOID pReserved);
+DWORD WlanReasonCodeToString(DWORD dwReasonCode, DWORD dwBufferSize, LPWSTR pStringBuffer, PVOID pReserved);
 DWORD WlanRegisterNotification(HANDLE hClientHandle, DWORD dwNotifSource, BOOL bIgnoreDuplicate,
                                WLAN_NOTIFICATION_CALLBACK funcCallback, PVOID pCallbackContext,
                                PVOID pReserved, PDWORD pdwPrevNotifSource);

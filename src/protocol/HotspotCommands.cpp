@@ -43,8 +43,22 @@ bool reload(Server& server, const Json::Value& /*data*/) {
     return true;
 }
 
-constexpr std::array<Command, 8> kCommands = {{
+// Sends nothing while no adapter is present.
+bool networkList(Server& server, const Json::Value& /*data*/) {
+    if (server.m_bCardIn) server.SendNetworkList(nullptr);
+    return true;
+}
+
+bool autoConnect(Server& server, const Json::Value& data) {
+    if (!data.isNull() && !data.isBool()) return false;
+    server.setHotSpotAutoConnect(data.isBool() && data.asBool());
+    return true;
+}
+
+constexpr std::array<Command, 12> kCommands = {{
+    {"UPDATE_NETWORK_REALM", answer<&Server::updateNetworkRealm>},
     {"GET_RADIO", answer<&Server::SendRadioState>},
+    {"SET_HOTSPOT_AUTO_CONNECT", autoConnect},
     {"GET_IS_CARD_IN", answer<&Server::SendCardState>},
     {"READ_CREDENTIAL_FROM_FILE", reload},
     {"GET_ALL_CREDENTIAL_LIST", answer<&Server::SendCredentialList>},
@@ -52,6 +66,8 @@ constexpr std::array<Command, 8> kCommands = {{
     {"DELETE_CREDENTIAL", changeCredentials<deleteCredential>},
     {"EDIT_CREDENTIAL", changeCredentials<editCredential>},
     {"SET_POSITION_CREDENTIAL", changeCredentials<setCredentialPosition>},
+    {"GET_ALL_NETWORK_LIST", networkList},
+    {"GET_IS_INTERNET_ACCESS", answer<&Server::SendInternetAccess>},
 }};
 
 void logInvalidCommand(const std::string& id) {

@@ -1,5 +1,6 @@
 #include "base/DiagnosticLog.h"
 #include "base/NetworkListLock.h"
+#include "base/StandardOutput.h"
 #include "base/TextConversion.h"
 #include "base/WlanMemory.h"
 #include "config/Config.h"
@@ -49,6 +50,32 @@ void SAHotSpotPortlink::SendCredentialList() {
     for (const Credential* credential : supplicant->m_pMgr->config().credentials().copyCredentialPointers())
         credentials.append(asJson(*credential));
     SendData(toStyledText(credentials), "GET_ALL_CREDENTIAL_LIST");
+}
+
+void SAHotSpotPortlink::SendInternetAccess() {
+    const platform::LockGuard lock(g_hs20Lock);
+    Log(3, "Send connection status to vexa");
+    const auto supplicant = hotspotSupplicant(*this);
+    if (!supplicant) return;
+    bool hasAccess = false;
+    if (supplicant->getConnectedBss(false) != nullptr) supplicant->queryInternetAccess(hasAccess);
+    SendData(toStyledText(Json::Value(hasAccess)), "GET_IS_INTERNET_ACCESS");
+}
+
+void SAHotSpotPortlink::SendDetectedHotspot() {
+    Log(3, "Detected HS20 networks.");
+    SendData(toStyledText(Json::Value()), "DETECTED_HOTSPOT");
+}
+
+void SAHotSpotPortlink::SendSupplicantState(Bytes payload) {
+    const std::uint32_t current = numberAt(payload, 0);
+    const std::uint32_t previous = numberAt(payload, 4);
+    printToStandardOutput("PreviousState=%d \n", static_cast<int>(previous));
+    printToStandardOutput("CurrentState=%d \n", static_cast<int>(current));
+    Json::Value states;
+    states["PreviousState"] = static_cast<std::int32_t>(previous);
+    states["CurrentState"] = static_cast<std::int32_t>(current);
+    SendData(toStyledText(states), "SUPPLICANT_STATE_CHANGE");
 }
 
 }  // namespace vexa

@@ -21,6 +21,12 @@ SAHotSpotPortlink::SAHotSpotPortlink() {
     HANDLE handle = nullptr;
     WlanOpenHandle(kWlanClientVersion, nullptr, &negotiated, &handle);
     m_hClientHandle = handle;
+
+    const platform::LockGuard lock(g_hs20Lock);
+    SupplicantMgr::instance().setClientEvents({
+        [this](Supplicant& supplicant) { SendNetworkList(&supplicant); },
+        [this] { SendDetectedHotspot(); },
+    });
 }
 
 void SAHotSpotPortlink::close() {

@@ -8,6 +8,8 @@
 #include <string>
 
 #include "base/AdapterIdentity.h"
+#include "base/LittleEndian.h"
+#include "base/NetworkListLock.h"
 #include "platform/WlanApi.h"
 #include "protocol/Ipc.h"
 
@@ -44,11 +46,29 @@ public:
     /// In order of priority. Nothing is sent without a Supplicant.
     void SendCredentialList();
 
+    /// The networks in range, or null while the radio or the function is off. `supplicant` may be null and is
+    /// then looked up; nothing is sent unless one is found. Holds the network list lock.
+    void SendNetworkList(Supplicant* supplicant);
+    void SendInternetAccess();
+    void SendDetectedHotspot();
+    /// The driver's state, from a message of the hotspot module.
+    void SendSupplicantState(Bytes payload);
+
+    /// The client's switch for the whole hotspot function. Holds the network list lock.
+    void setHotSpotAutoConnect(bool enable);
+    /// Reads the realms of all networks anew, after a disconnection if need be.
+    void updateNetworkRealm();
+
     std::atomic<bool> m_bCardIn{false};
     std::atomic<IpcHandle> m_hIpc{0};
     std::atomic<HANDLE> m_hClientHandle{nullptr};
     /// The adapter as the last successful check found it: the key of its Supplicant.
     SharedGuid m_interfaceGuid;
+    /// A realm update waits for the disconnection.
+    std::atomic<bool> m_bRealmUpdatePending{false};
+
+private:
+    void switchHotspot(Supplicant& supplicant, bool enable) REQUIRES(g_hs20Lock);
 };
 
 /// The Supplicant of the server's adapter, kept alive by the result; null if there is none.

@@ -11,15 +11,13 @@
 #include "base/LittleEndian.h"
 #include "connection/Supplicant.h"
 #include "connection/SupplicantMgr.h"
+#include "hotspot/IhvMessages.h"
 #include "protocol/SAHotSpotPortlink.h"
 #include "spectral/SAPortlink.h"
 
 namespace vexa {
 
 namespace {
-
-constexpr std::size_t kIhvHeaderSize = 16;
-constexpr std::uint32_t kHotspotSignature = 0x03C45E00;
 
 /// One notification and the two servers that it may concern.
 struct Event {
@@ -93,6 +91,8 @@ void onRadioChange(const Event& event) {
     if (const IpcHandle ipc = event.spectral.m_hIpc)
         IpcSend(ipc, text.data(), static_cast<std::uint32_t>(text.size()));
     event.hotspot.SendRadioState();
+    if (const auto supplicant = supplicantOf(event))
+        supplicant->onRadioStateChanged(radio ? &*radio : nullptr);
 }
 
 constexpr std::array<Row, 12> kAcmRows = {{
@@ -147,7 +147,7 @@ void dispatchIhv(const Event& event) {
     }
     const Bytes message(static_cast<const std::byte*>(notification.pData), notification.dwDataSize);
     switch (readLittleEndian<std::uint32_t>(message, 0)) {
-        case kHotspotSignature:
+        case HS20_MODULE_SIGNATURE:
             onHs20IhvNotification(&notification);
             return;
         case kSpectralSignature:
@@ -179,9 +179,28 @@ void WINAPI onWlanNotification(PWLAN_NOTIFICATION_DATA pNotifData, PVOID pServer
 // Without a Supplicant no message of the hotspot module has any effect.
 bool onHs20IhvNotification(const WLAN_NOTIFICATION_DATA* pNotifData) {
     if (pNotifData == nullptr) return false;
-    const GUID guid = SAHotSpotPortlink::instance().m_interfaceGuid.get();
-    const auto supplicant = SupplicantMgr::instance().findSupplicantToNotify(guid);
-    return supplicant != nullptr && pNotifData->pData != nullptr;
+    SAHotSpotPortlink& hotspot = SAHotSpotPortlink::instance();
+    const auto supplicant = SupplicantMgr::instance().findSupplicantToNotify(hotspot.m_interfaceGuid.get());
+    if (!supplicant || pNotifData->pData == nullptr) return false;
+    const IhvMessage message =
+        parseIhvMessage({static_cast<const std::byte*>(pNotifData->pData), pNotifData->dwDataSize});
+    switch (message.subtype) {
+        case IhvNotification::StateChanged:
+            hotspot.SendSupplicantState(message.payload);
+            break;
+        case IhvNotification::NetworkListChanged:
+            supplicant->onNetworkListChanged(message.payload);
+            break;
+        case IhvNotification::AnqpInfoChanged:
+            supplicant->onAnqpInfoChanged(message.payload);
+            break;
+        case IhvNotification::AnqpQueryCompleted:
+            supplicant->onAnqpQueryCompleted();
+            break;
+        default:
+            break;
+    }
+    return true;
 }
 
 }  // namespace vexa

