@@ -14,7 +14,7 @@ namespace vexa {
 namespace {
 
 constexpr unsigned kParse = (pugi::parse_full | pugi::parse_ws_pcdata) & ~pugi::parse_trim_pcdata;
-constexpr unsigned kFormat = pugi::format_raw | pugi::format_write_bom;
+constexpr unsigned kFormat = pugi::format_raw | pugi::format_write_bom | pugi::format_no_empty_element_tags;
 constexpr std::string_view kUtf8Mark = "\xEF\xBB\xBF";
 
 bool arePaired(std::u16string_view units) {

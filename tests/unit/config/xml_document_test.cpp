@@ -241,7 +241,7 @@ TEST_F(XmlFile, MayBeOfAnyDepth) {
     ASSERT_EQ(save(), kSuccess);
     XmlDocument::remove(select("/r/c"));
     ASSERT_EQ(save(), kSuccess);
-    EXPECT_TRUE(saved().ends_with("<r/>") || saved().ends_with("<r />")) << saved();
+    EXPECT_TRUE(saved().ends_with("<r></r>"));
 }
 
 TEST_F(XmlFile, IsNothingWithoutADocument) {
