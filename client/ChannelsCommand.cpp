@@ -21,7 +21,7 @@ using std::chrono::steady_clock;
 constexpr std::chrono::seconds kAnswerLimit{10};
 
 struct ChannelsOptions {
-    PortOption port;
+    PortOption port{Half::Spectral};
     bool json = false;
 };
 
@@ -61,7 +61,7 @@ void printJson(const SpectralView& view) {
 
 int runChannels(const ChannelsOptions& options) {
     Signals signals;
-    SpectralScan scan(options.port.spectralPort());
+    SpectralScan scan(options.port.find());
     if (!waitForList(scan, signals)) return kExitOk;
     options.json ? printJson(scan.view()) : printTable(scan.view());
     if (scan.view().channels().empty()) std::cerr << "vexa: the service knows no channels\n";

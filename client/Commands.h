@@ -15,5 +15,9 @@ void addScanCommand(CLI::App& app, int& exitCode);
 void addChannelsCommand(CLI::App& app, int& exitCode);
 void addSendCommand(CLI::App& app, int& exitCode);
 void addListenCommand(CLI::App& app, int& exitCode);
+void addCredentialsCommand(CLI::App& app, int& exitCode);
+void addCredentialCommand(CLI::App& app, int& exitCode);
+void addReloadCommand(CLI::App& app, int& exitCode);
+void addLogCommand(CLI::App& app, int& exitCode);
 
 }  // namespace vexa::client

@@ -12,7 +12,8 @@ std::optional<Event> parseEvent(std::string_view text) {
     const Json::Value& id = (*envelope)["EventId"];
     const Json::Value& data = (*envelope)["Data"];
     if (!id.isString() || !(data.isString() || data.isNull())) return std::nullopt;
-    return Event{id.asString(), data.asString()};
+    const Json::Value& source = (*envelope)["Source"];
+    return Event{id.asString(), data.asString(), source.isString() ? source.asString() : ""};
 }
 
 std::string commandText(const std::string& id, const std::optional<std::string>& data) {

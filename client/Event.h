@@ -10,6 +10,7 @@ namespace vexa::client {
 struct Event {
     std::string id;
     std::string data;
+    std::string source = {};
 };
 
 /// Nothing if the text is no event.

@@ -17,11 +17,17 @@ public:
     const std::filesystem::path& path() const { return m_path; }
     std::filesystem::path portsFile() const { return m_path / "ports.json"; }
     std::filesystem::path outputFile() const { return m_path / "stdout.log"; }
+    std::filesystem::path configFile() const { return storeFolder() / "config.xml"; }
+
+    /// Where the service writes its diagnostic log.
+    std::filesystem::path dumpFolder() const { return storeFolder() / "Dump"; }
 
     /// Makes the folder, and those above it that are missing, for the owner only. Throws ClientError.
     void create() const;
 
 private:
+    std::filesystem::path storeFolder() const { return m_path / "Public" / "Roaming" / "Korvane"; }
+
     std::filesystem::path m_path;
 };
 

@@ -9,8 +9,9 @@ namespace {
 
 using namespace vexa::client;
 
-constexpr std::array kCommands{&addStartCommand,    &addDemoCommand, &addScanCommand,
-                               &addChannelsCommand, &addSendCommand, &addListenCommand};
+constexpr std::array kCommands{
+    &addStartCommand,      &addDemoCommand,   &addScanCommand, &addChannelsCommand, &addCredentialsCommand,
+    &addCredentialCommand, &addReloadCommand, &addLogCommand,  &addSendCommand,     &addListenCommand};
 
 int report(const std::exception& error, int exitCode) {
     std::cerr << "vexa: " << error.what() << '\n';
@@ -24,7 +25,7 @@ int reportWrongUse(const CLI::ParseError& error) {
 }
 
 int run(int argc, char** argv) {
-    CLI::App app("The Vexa wireless service: start it, look at the spectrum, talk to its ports.", "vexa");
+    CLI::App app("The Vexa wireless service: start it, look at the spectrum, keep its credentials.", "vexa");
     app.require_subcommand(1);
     int exitCode = kExitOk;
     for (const auto add : kCommands)

@@ -8,24 +8,44 @@
 
 namespace vexa::client {
 
+namespace {
+
+struct HalfNames {
+    const char* option;
+    const char* variable;
+    const char* description;
+    std::uint16_t ServicePorts::*port;
+};
+
+const HalfNames& namesOf(Half half) {
+    static constexpr HalfNames kSpectral{"--sa-port", "VEXA_SA_PORT", "Port of the spectral analyser",
+                                         &ServicePorts::sa};
+    static constexpr HalfNames kHotspot{"--hs20-port", "VEXA_HS20_PORT", "Port of the hotspot half",
+                                        &ServicePorts::hs20};
+    return half == Half::Spectral ? kSpectral : kHotspot;
+}
+
+}  // namespace
+
 void PortOption::addTo(CLI::App& command) {
-    command.add_option("--sa-port,--port", port, "Port of the spectral analyser")
+    const HalfNames& names = namesOf(m_half);
+    command.add_option(names.option + std::string(",--port"), m_port, names.description)
         ->type_name("N")
         ->check(CLI::Range(1, 65535))
-        ->envname("VEXA_SA_PORT");
-    command.add_option("--machine", machine, "Folder of the machine whose service is meant")
+        ->envname(names.variable);
+    command.add_option("--machine", m_machine, "Folder of the machine whose service is meant")
         ->type_name("DIR");
 }
 
-std::uint16_t PortOption::spectralPort() const {
-    if (port != 0) return port;
-    const MachineFolder folder(machine);
+std::uint16_t PortOption::find() const {
+    if (m_port != 0) return m_port;
+    const MachineFolder folder(m_machine);
     const auto ports = readPortsFile(folder.portsFile());
     if (!ports) {
         throw ClientError("no service runs on the machine " + folder.path().string() +
-                          ": start one with `vexa start`, or give --sa-port");
+                          ": start one with `vexa start`, or give " + namesOf(m_half).option);
     }
-    return ports->sa;
+    return (*ports).*namesOf(m_half).port;
 }
 
 }  // namespace vexa::client

@@ -9,16 +9,24 @@ class App;
 
 namespace vexa::client {
 
-/// How a command finds the spectral port of a running service.
-struct PortOption {
-    std::uint16_t port = 0;
-    std::string machine;
+/// The two halves of the service, each with a port of its own.
+enum class Half { Spectral, Hotspot };
+
+/// How a command finds a port of a running service.
+class PortOption {
+public:
+    explicit PortOption(Half half) : m_half(half) {}
 
     void addTo(CLI::App& command);
 
     /// The port that was given; else that of the environment; else what the parent left in the machine's
     /// folder. Throws ClientError if none tells.
-    std::uint16_t spectralPort() const;
+    std::uint16_t find() const;
+
+private:
+    Half m_half;
+    std::uint16_t m_port = 0;
+    std::string m_machine;
 };
 
 }  // namespace vexa::client

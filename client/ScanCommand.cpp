@@ -26,7 +26,7 @@ constexpr milliseconds kRestOfBurst{200};
 constexpr milliseconds kQuietLimit{3000};
 
 struct ScanOptions {
-    PortOption port;
+    PortOption port{Half::Spectral};
     int timeout = kDefaultTimeout;
     bool watch = false;
     bool json = false;
@@ -71,7 +71,7 @@ void scanOnce(SpectralScan& scan, Signals& signals, seconds limit) {
 
 int runScan(const ScanOptions& options) {
     Signals signals;
-    SpectralScan scan(options.port.spectralPort());
+    SpectralScan scan(options.port.find());
     if (options.watch) {
         watchSpectrum(scan, signals,
                       options.json ? SpectrumOutput::Form::Json : SpectrumOutput::Form::Readable,

@@ -5,6 +5,8 @@
 #include <iomanip>
 #include <sstream>
 
+#include "client/Text.h"
+
 namespace vexa::client {
 
 namespace {
@@ -84,8 +86,8 @@ std::string heading(const PictureStyle& style) {
 }
 
 std::string status(const SpectralView& view) {
-    std::string text = std::to_string(view.channels().size()) + " channels, " +
-                       std::to_string(view.eventCount()) + " events";
+    std::string text =
+        counted(view.channels().size(), "channel") + ", " + counted(view.eventCount(), "event");
     if (view.radioOn()) text += *view.radioOn() ? ", radio on" : ", radio off";
     if (view.cardIn() && !*view.cardIn()) text += ", adapter out";
     return text;

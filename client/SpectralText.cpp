@@ -6,6 +6,7 @@
 #include <sstream>
 
 #include "client/JsonLine.h"
+#include "client/Text.h"
 
 namespace vexa::client {
 
@@ -22,7 +23,7 @@ std::string describeSample(const SpectralView::Update& update, const SpectralVie
 }
 
 std::string describeChannels(const SpectralView& view) {
-    std::string line = std::to_string(view.channels().size()) + " channels:";
+    std::string line = counted(view.channels().size(), "channel") + ":";
     for (const auto& channel : view.channels()) {
         line += ' ';
         line += std::to_string(channel.number);
@@ -87,8 +88,8 @@ std::string spectrumJson(const SpectralView& view) {
 
 std::string summaryText(const SpectralView& view) {
     const auto busiest = view.busiest();
-    return "Seen: " + std::to_string(view.channels().size()) + " channels, " +
-           std::to_string(view.eventCount()) + " events, " +
+    return "Seen: " + counted(view.channels().size(), "channel") + ", " +
+           counted(view.eventCount(), "event") + ", " +
            (busiest ? "busiest channel " + std::to_string(busiest->number) + " (congestion " +
                           std::to_string(*busiest->congestion) + ")"
                     : "no congestion on any channel");

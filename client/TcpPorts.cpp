@@ -2,16 +2,15 @@
 
 #include <arpa/inet.h>
 #include <sys/socket.h>
-#include <sys/un.h>
 
 #include <algorithm>
-#include <cstddef>
 #include <fstream>
 #include <random>
 #include <sstream>
 
 #include "client/ClientError.h"
 #include "client/Descriptor.h"
+#include "client/KernelName.h"
 
 namespace vexa::client {
 
@@ -32,20 +31,6 @@ bool canBind(std::uint16_t port) {
     address.sin_port = htons(port);
     address.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
     return ::bind(socket.get(), reinterpret_cast<const sockaddr*>(&address), sizeof address) == 0;
-}
-
-/// Takes a name that stands for the port. It lives in the kernel and goes with its holder. No descriptor if
-/// somebody has it.
-Descriptor takeName(std::uint16_t port) {
-    Descriptor socket(::socket(AF_UNIX, SOCK_DGRAM | SOCK_CLOEXEC, 0));
-    // A NUL in front makes it a name without a file.
-    const std::string name = '\0' + ("vexa-port-" + std::to_string(port));
-    sockaddr_un address{};
-    address.sun_family = AF_UNIX;
-    std::copy(name.begin(), name.end(), std::begin(address.sun_path));
-    const auto size = static_cast<socklen_t>(offsetof(sockaddr_un, sun_path) + name.size());
-    if (::bind(socket.get(), reinterpret_cast<const sockaddr*>(&address), size) != 0) return Descriptor();
-    return socket;
 }
 
 }  // namespace
@@ -87,7 +72,7 @@ ReservedPort TcpPorts::reserveFree() const {
     for (int attempt = 0; attempt < kAttempts; ++attempt) {
         const auto port = static_cast<std::uint16_t>(anyPort(random));
         if (isBusy(port)) continue;
-        Descriptor holder = takeName(port);
+        Descriptor holder = takeKernelName("vexa-port-" + std::to_string(port));
         if (holder && canBind(port)) return {port, std::move(holder)};
     }
     throw ClientError("no free TCP port was found", kExitNotStarted);

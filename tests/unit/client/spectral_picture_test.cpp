@@ -32,7 +32,7 @@ TEST(SpectralPicture, BarsAreAsLongAsTheirValues) {
 
 TEST(SpectralPicture, ARowTellsBothValues) {
     const auto lines = drawSpectrum(viewWith(30, 100), {49, false, false});
-    EXPECT_EQ(lines[0], "1 channels, 3 events");
+    EXPECT_EQ(lines[0], "1 channel, 3 events");
     EXPECT_EQ(lines[2], "     36      1  ###         30  ########## 100");
 }
 

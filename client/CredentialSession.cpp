@@ -1,0 +1,33 @@
+#include "client/CredentialSession.h"
+
+#include <iostream>
+
+#include "client/JsonLine.h"
+
+namespace vexa::client {
+
+CredentialSession::CredentialSession(const HotspotOptions& options)
+    : m_options(options),
+      m_number(options.port.find()),
+      m_port(m_number, m_signals, options.limit()),
+      m_store(m_port) {}
+
+CredentialStore& CredentialSession::begin() {
+    m_turn.emplace(m_number, m_signals, m_options.limit());
+    m_store.read();
+    return m_store;
+}
+
+void CredentialSession::report(const std::string& verb, const std::string& sentence,
+                               const Credential& credential, std::size_t position) const {
+    if (!m_options.json) {
+        std::cout << sentence << '\n';
+        return;
+    }
+    Json::Value object(Json::objectValue);
+    object["done"] = verb;
+    object["credential"] = credentialJson(credential, position, Passwords::Hidden);
+    std::cout << jsonLine(object) << '\n';
+}
+
+}  // namespace vexa::client

@@ -1,0 +1,37 @@
+#pragma once
+
+#include <optional>
+
+#include "client/ChangeTurn.h"
+#include "client/CredentialStore.h"
+#include "client/CredentialText.h"
+#include "client/HotspotOptions.h"
+#include "client/HotspotPort.h"
+#include "client/Signals.h"
+
+namespace vexa::client {
+
+/// A command that changes credentials: connected from the start, and from begin() on the only one.
+class CredentialSession {
+public:
+    explicit CredentialSession(const HotspotOptions& options);
+
+    Signals& signals() { return m_signals; }
+
+    /// Waits for our turn and reads the list.
+    CredentialStore& begin();
+
+    /// Says what was done: a sentence, or an object with `verb` and the credential.
+    void report(const std::string& verb, const std::string& sentence, const Credential& credential,
+                std::size_t position) const;
+
+private:
+    HotspotOptions m_options;
+    std::uint16_t m_number;
+    Signals m_signals;
+    HotspotPort m_port;
+    CredentialStore m_store;
+    std::optional<ChangeTurn> m_turn;
+};
+
+}  // namespace vexa::client

@@ -1,0 +1,15 @@
+#include "client/HotspotOptions.h"
+
+#include <CLI/CLI.hpp>
+
+namespace vexa::client {
+
+void HotspotOptions::addTo(CLI::App& command) {
+    port.addTo(command);
+    command.add_option("--timeout", timeout, "Seconds to wait for the service at most; default 10")
+        ->type_name("N")
+        ->check(CLI::Range(1, 3600));
+    command.add_flag("--json", json, "Print JSON");
+}
+
+}  // namespace vexa::client

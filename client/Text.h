@@ -1,0 +1,36 @@
+#pragma once
+
+#include <cstddef>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace vexa::client {
+
+/// The text is well-formed UTF-8.
+bool isUtf8(std::string_view text);
+
+/// The length of UTF-8 text as the service counts it: in UTF-16 units.
+std::size_t utf16Length(std::string_view text);
+
+/// UTF-8 text that a terminal shows and that does nothing to it: control characters are written as \xNN, and
+/// what is no UTF-8 is taken for Latin-1.
+std::string printable(std::string_view text);
+
+/// How many columns of a terminal printable UTF-8 text takes.
+int columnsOf(std::string_view text);
+
+/// The longest beginning of printable UTF-8 text that fits into so many columns.
+std::string cutToColumns(std::string_view text, int columns);
+
+/// The text between double quotes.
+std::string inQuotes(std::string_view text);
+
+/// Rows of cells as lines: columns as wide as their widest cell, two blanks between them, no blanks at the
+/// end. Cells are made printable.
+std::vector<std::string> alignedLines(const std::vector<std::vector<std::string>>& rows);
+
+/// "1 channel", "2 channels".
+std::string counted(std::size_t count, const std::string& noun);
+
+}  // namespace vexa::client
