@@ -82,7 +82,7 @@ IhvMessage parseIhvMessage(Bytes block) {
     const Bytes behind = block.subspan(kIhvHeaderSize);
     const std::size_t claimed = numberAt(block, kLengthOffset);
     return {static_cast<IhvNotification>(numberAt(block, kSubtypeOffset)),
-            behind.first(std::min(claimed, behind.size()))};
+            behind.first(std::min(claimed, behind.size())), behind};
 }
 
 }  // namespace vexa

@@ -65,6 +65,7 @@ std::vector<std::byte> ihvRequest(IhvRequest subtype, const Hs20BssRecord& recor
 struct IhvMessage {
     IhvNotification subtype;
     Bytes payload;  ///< As long as it claims, but no longer than the block.
+    Bytes block;    ///< All behind the header, for messages whose length is not looked at.
 };
 
 /// REQUIRES: kIhvHeaderSize bytes.

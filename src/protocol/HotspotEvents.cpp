@@ -13,6 +13,8 @@ namespace vexa {
 
 namespace {
 
+constexpr std::size_t kSupplicantStateSize = 8;
+
 Json::Value asJson(const Credential& credential) {
     Json::Value object;
     object["Id"] = credential.m_id;
@@ -68,6 +70,7 @@ void SAHotSpotPortlink::SendDetectedHotspot() {
 }
 
 void SAHotSpotPortlink::SendSupplicantState(Bytes payload) {
+    if (payload.size() < kSupplicantStateSize) return;
     const std::uint32_t current = numberAt(payload, 0);
     const std::uint32_t previous = numberAt(payload, 4);
     printToStandardOutput("PreviousState=%d \n", static_cast<int>(previous));

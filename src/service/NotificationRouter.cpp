@@ -186,7 +186,7 @@ bool onHs20IhvNotification(const WLAN_NOTIFICATION_DATA* pNotifData) {
         parseIhvMessage({static_cast<const std::byte*>(pNotifData->pData), pNotifData->dwDataSize});
     switch (message.subtype) {
         case IhvNotification::StateChanged:
-            hotspot.SendSupplicantState(message.payload);
+            hotspot.SendSupplicantState(message.block);
             break;
         case IhvNotification::NetworkListChanged:
             supplicant->onNetworkListChanged(message.payload);
