@@ -28,6 +28,10 @@ constexpr Check kSignedMilliseconds = [](const JsonPlace& p, std::size_t) { p.si
 constexpr Check kSsid = [](const JsonPlace& p, std::size_t) {
     if (p.text().size() > DOT11_SSID_MAX_LENGTH) p.fail("more than 32 bytes");
 };
+constexpr Check kNetworkName = [](const JsonPlace& p, std::size_t adapterCount) {
+    kSsid(p, adapterCount);
+    if (p.text().empty()) p.fail("empty");
+};
 constexpr Check kNetwork = [](const JsonPlace& p, std::size_t) { readNetwork(p); };
 constexpr Check kTexts = [](const JsonPlace& p, std::size_t) {
     readArray(p, [](const JsonPlace& element) { return element.text(); });
@@ -107,7 +111,7 @@ constexpr ActionMember kSessionChangeMembers[] = {
 constexpr ActionMember kSetSessionMembers[] = {{"session", kSession, Needed::Yes}};
 constexpr ActionMember kDriverStateMembers[] = {{"current", kUnsigned, Needed::Yes},
                                                 {"previous", kUnsigned, Needed::Yes}};
-constexpr ActionMember kOsConnectMembers[] = {{"ssid", kSsid, Needed::Yes}, {"succeeds", kFlag}};
+constexpr ActionMember kOsConnectMembers[] = {{"ssid", kNetworkName, Needed::Yes}, {"succeeds", kFlag}};
 constexpr ActionMember kDropMembers[] = {{"reason", kUnsigned}};
 constexpr ActionMember kConnectionMembers[] = {
     {"code", kUnsigned, Needed::Yes}, {"profileName", kText}, {"ssidHex", kHex}, {"reason", kUnsigned}};
@@ -145,8 +149,8 @@ constexpr Action kActions[] = {
     {"sessionChange", kSessionChangeMembers, runSessionChange},
     {"setSession", kSetSessionMembers, runSetSession},
     {"driverState", kDriverStateMembers, runDriverState},
-    {"osConnect", kOsConnectMembers},
-    {"dropConnection", kDropMembers},
+    {"osConnect", kOsConnectMembers, runOsConnect},
+    {"dropConnection", kDropMembers, runDropConnection},
     {"connection", kConnectionMembers, runConnection},
     {"roam", {}, runRoam},
     {"setDns", kDnsMembers, runSetDns},

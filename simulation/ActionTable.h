@@ -31,7 +31,7 @@ struct ActionMember {
 struct Action {
     std::string_view name;
     std::span<const ActionMember> members;
-    ActionRun run = nullptr;                               ///< Null: not to be had yet.
+    ActionRun run = nullptr;
     void (*checkWhole)(const JsonPlace& place) = nullptr;  ///< What concerns several members.
     bool anyMembers = false;                               ///< checkWhole looks at the members itself.
 };

@@ -12,82 +12,37 @@ namespace vexa::simulation {
 
 namespace {
 
-constexpr DWORD kArrival = 13;
-constexpr DWORD kRemoval = 14;
 constexpr DWORD kRoamingStart = 5;
 constexpr DWORD kRoamingEnd = 6;
-constexpr DWORD kRadioStateChange = 7;
 
 std::optional<DOT11_RADIO_STATE> radioOf(const Json::Value& action, const char* name) {
     if (!action.isMember(name)) return std::nullopt;
     return readRadioState(memberOf(action, name));
 }
 
-void pull(Machine& machine, std::size_t adapter) {
-    if (machine.adapters().served() == adapter) {
-        machine.spectral().abandonScan();
-        machine.hotspot().abandonQueries();
-    }
-    machine.adapters().setInserted(adapter, false);
-}
-
-WLAN_CONNECTION_NOTIFICATION_DATA connectionBlock(const Json::Value& action) {
-    WLAN_CONNECTION_NOTIFICATION_DATA block{};
-    block.wlanConnectionMode = wlan_connection_mode_temporary_profile;
-    block.dot11BssType = dot11_BSS_type_infrastructure;
-    block.bSecurityEnabled = TRUE;
-    block.wlanReasonCode = unsignedOf(action, "reason", 0);
-    const std::u16string name = utf16(action["profileName"].asString());
-    if (name.size() >= WLAN_MAX_NAME_LENGTH) memberOf(action, "profileName").fail("more than 255 characters");
-    std::copy(name.begin(), name.end(), block.strProfileName);
-    const Bytes ssid = action.isMember("ssidHex") ? memberOf(action, "ssidHex").hex() : Bytes{};
-    if (ssid.size() > DOT11_SSID_MAX_LENGTH) memberOf(action, "ssidHex").fail("more than 32 bytes");
-    block.dot11Ssid.uSSIDLength = static_cast<ULONG>(ssid.size());
-    std::copy(ssid.begin(), ssid.end(), block.dot11Ssid.ucSSID);
-    return block;
-}
-
 }  // namespace
 
 Ticket runRadio(Machine& machine, const Json::Value& action, Asker /*asker*/) {
-    const std::size_t adapter = machine.usualAdapter();
-    const auto change = [&machine, adapter, hardware = radioOf(action, "hardware"),
-                         software = radioOf(action, "software")](Bytes& data) {
-        machine.adapters().setRadio(adapter, hardware, software);
-        const RadioState radio = machine.adapters().radio(adapter);
-        data = bytesOf(WLAN_PHY_RADIO_STATE{0, radio.software, radio.hardware});
-    };
-    return machine.notifications().post(
-        {WLAN_NOTIFICATION_SOURCE_MSM, kRadioStateChange, machine.adapters().guid(adapter), {}, change});
+    return machine.connections().changeRadio(machine.usualAdapter(), radioOf(action, "hardware"),
+                                             radioOf(action, "software"));
 }
 
 Ticket runPullAdapter(Machine& machine, const Json::Value& action, Asker /*asker*/) {
     const std::size_t adapter = existingAdapterOf(machine, action);
-    return machine.notifications().post({WLAN_NOTIFICATION_SOURCE_ACM,
-                                         kRemoval,
-                                         machine.adapters().guid(adapter),
-                                         {},
-                                         [&machine, adapter](Bytes&) { pull(machine, adapter); }});
+    return machine.connections().pull(adapter, [&machine, adapter] {
+        if (machine.adapters().served() != adapter) return;
+        machine.spectral().abandonScan();
+        machine.hotspot().abandonQueries();
+    });
 }
 
 Ticket runInsertAdapter(Machine& machine, const Json::Value& action, Asker /*asker*/) {
-    const std::size_t adapter = existingAdapterOf(machine, action);
-    return machine.notifications().post(
-        {WLAN_NOTIFICATION_SOURCE_ACM,
-         kArrival,
-         machine.adapters().guid(adapter),
-         {},
-         [&machine, adapter](Bytes&) { machine.adapters().setInserted(adapter, true); }});
+    return machine.connections().insert(existingAdapterOf(machine, action));
 }
 
 Ticket runSetSession(Machine& machine, const Json::Value& action, Asker /*asker*/) {
     machine.setSession(readSessionState(memberOf(action, "session")));
     return 0;
-}
-
-Ticket runConnection(Machine& machine, const Json::Value& action, Asker /*asker*/) {
-    return machine.notifications().post({WLAN_NOTIFICATION_SOURCE_ACM, action["code"].asUInt(),
-                                         usualGuid(machine), bytesOf(connectionBlock(action)), nullptr});
 }
 
 Ticket runRoam(Machine& machine, const Json::Value& /*action*/, Asker /*asker*/) {
@@ -116,7 +71,7 @@ Ticket runSet(Machine& machine, const Json::Value& action, Asker /*asker*/) {
     if (action.isMember("scanMs") && !machine.spectral().setScanTime(time("scanMs"))) {
         throw JsonFault("scanMs: the machine has no spectrum");
     }
-    if (action.isMember("connectMs")) machine.setConnectTime(time("connectMs"));
+    if (action.isMember("connectMs")) machine.connections().setConnectTime(time("connectMs"));
     if (action.isMember("anqpMs")) machine.hotspot().setAnqpTime(time("anqpMs"));
     return 0;
 }

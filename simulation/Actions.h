@@ -21,6 +21,8 @@ Ticket runSessionChange(Machine& machine, const Json::Value& action, Asker asker
 Ticket runDriverState(Machine& machine, const Json::Value& action, Asker asker);
 Ticket runSetSession(Machine& machine, const Json::Value& action, Asker asker);
 Ticket runConnection(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runOsConnect(Machine& machine, const Json::Value& action, Asker asker);
+Ticket runDropConnection(Machine& machine, const Json::Value& action, Asker asker);
 Ticket runRoam(Machine& machine, const Json::Value& action, Asker asker);
 Ticket runSetDns(Machine& machine, const Json::Value& action, Asker asker);
 Ticket runSetRegistry(Machine& machine, const Json::Value& action, Asker asker);

@@ -23,8 +23,9 @@ Ticket runShow(Machine& machine, const Json::Value& action, Asker /*asker*/) {
 }
 
 Ticket runHide(Machine& machine, const Json::Value& action, Asker /*asker*/) {
-    machine.airspace().setVisible(existingNetworkOf(machine, action).bssid, false);
-    return 0;
+    const Network network = existingNetworkOf(machine, action);
+    machine.airspace().setVisible(network.bssid, false);
+    return machine.connections().dropFrom(network.bssid);
 }
 
 Ticket runAddNetwork(Machine& machine, const Json::Value& action, Asker /*asker*/) {
@@ -34,11 +35,12 @@ Ticket runAddNetwork(Machine& machine, const Json::Value& action, Asker /*asker*
 }
 
 Ticket runSetNetwork(Machine& machine, const Json::Value& action, Asker /*asker*/) {
-    existingNetworkOf(machine, action);
+    const Network network = existingNetworkOf(machine, action);
     Json::Value changes = action;
     changes.removeMember("do");
     machine.airspace().change(JsonPlace(changes, ""));
-    return 0;
+    const bool isGone = action.isMember("visible") && !action["visible"].asBool();
+    return isGone ? machine.connections().dropFrom(network.bssid) : 0;
 }
 
 Ticket runReportNetworks(Machine& machine, const Json::Value& /*action*/, Asker /*asker*/) {

@@ -30,6 +30,13 @@ WLAN_RADIO_STATE radioState(Machine& machine, std::size_t adapter) {
     return state;
 }
 
+DWORD currentConnection(Machine& machine, std::size_t adapter, Bytes& answer) {
+    const Link link = machine.connections().shown(adapter);
+    if (!isUp(link)) return ERROR_INVALID_STATE;
+    answer = connectionAttributes(link);
+    return ERROR_SUCCESS;
+}
+
 }  // namespace
 
 Bytes interfaceList(Machine& machine) {
@@ -54,10 +61,10 @@ DWORD queryInterfaceValue(Machine& machine, std::size_t adapter, WLAN_INTF_OPCOD
             answer = bytesOf(machine.interfaceState(adapter));
             return ERROR_SUCCESS;
         case wlan_intf_opcode_channel_number:
-            answer = bytesOf(ULONG{0});
+            answer = bytesOf(machine.connections().shown(adapter).channel);
             return ERROR_SUCCESS;
         case wlan_intf_opcode_current_connection:
-            return ERROR_INVALID_STATE;
+            return currentConnection(machine, adapter, answer);
     }
     return ERROR_INVALID_PARAMETER;
 }

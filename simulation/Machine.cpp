@@ -23,7 +23,6 @@ Json::Value refusal(const std::string& error) {
 Ticket runAction(Machine& machine, const Json::Value& message, Asker asker) {
     const JsonPlace place(message, "");
     const Action& action = checkAction(place, machine.adapters().count());
-    if (!action.run) place.member("do").fail(std::string(action.name) + " is not there yet");
     return action.run(machine, message, asker);
 }
 
@@ -37,10 +36,10 @@ Machine::Machine(Scenario scenario, std::filesystem::path folder)
       m_airspace(m_scenario.networks),
       m_registry(m_scenario.registryClass, m_folder / "registry.json"),
       m_session(m_scenario.session),
-      m_connectTime(m_scenario.connectTime),
       m_interfaceStateOverride(kNoOverride),
       m_spectral(m_scenario.spectrum, m_scenario.seed, m_agenda, m_notifications),
-      m_hotspot(m_airspace, m_scenario.anqpTime, m_agenda, m_notifications) {
+      m_hotspot(m_airspace, m_scenario.anqpTime, m_agenda, m_notifications),
+      m_connections(m_adapters, m_airspace, m_scenario.connectTime, m_agenda, m_notifications) {
     [[maybe_unused]] Machine* const other = currentMachine.exchange(this);
     assert(!other);
     if (m_scenario.hotspotAutoConnect) m_registry.setAutoConnect(m_scenario.hotspotAutoConnect);
@@ -80,7 +79,7 @@ void Machine::stop() {
 WLAN_INTERFACE_STATE Machine::interfaceState(std::size_t adapter) const {
     const int state = m_interfaceStateOverride;
     if (state != kNoOverride) return static_cast<WLAN_INTERFACE_STATE>(state);
-    return m_adapters.snapshot(adapter).inserted ? wlan_interface_state_disconnected
+    return m_adapters.snapshot(adapter).inserted ? m_connections.shown(adapter).state
                                                  : wlan_interface_state_not_ready;
 }
 

@@ -12,6 +12,7 @@
 #include "simulation/Agenda.h"
 #include "simulation/Airspace.h"
 #include "simulation/CallLog.h"
+#include "simulation/Connections.h"
 #include "simulation/Faults.h"
 #include "simulation/Handles.h"
 #include "simulation/HotspotModule.h"
@@ -40,7 +41,8 @@ public:
     /// action's own notifications have been delivered. Not to be called by a callback of this machine.
     Json::Value perform(const Json::Value& message);
 
-    /// Ends timeline, scans, queries and notifications. Requests are still answered afterwards.
+    /// Ends timeline, scans, queries, connection attempts and notifications. Requests are still answered
+    /// afterwards.
     void stop();
 
     platform::Duration elapsed() const { return platform::now() - m_start; }
@@ -56,6 +58,7 @@ public:
     SpectralModule& spectral() { return m_spectral; }
     HotspotModule& hotspot() { return m_hotspot; }
     Airspace& airspace() { return m_airspace; }
+    Connections& connections() { return m_connections; }
 
     SessionState session() const { return m_session; }
     void setSession(SessionState session) { m_session = session; }
@@ -63,8 +66,6 @@ public:
     /// What queries answer as the state of an interface.
     WLAN_INTERFACE_STATE interfaceState(std::size_t adapter) const;
     void overrideInterfaceState(std::optional<WLAN_INTERFACE_STATE> state);
-
-    void setConnectTime(platform::Duration time) { m_connectTime = time; }
 
     /// The adapter that actions mean which name none. Throws JsonFault if the machine has none.
     std::size_t usualAdapter() const;
@@ -83,12 +84,12 @@ private:
     Faults m_faults;
     CallLog m_calls;
     std::atomic<SessionState> m_session;
-    std::atomic<platform::Duration> m_connectTime;
     std::atomic<int> m_interfaceStateOverride;
     NotificationQueue m_notifications;
     Agenda m_agenda;
     SpectralModule m_spectral;
     HotspotModule m_hotspot;
+    Connections m_connections;
 };
 
 }  // namespace vexa::simulation

@@ -23,7 +23,8 @@ Json::Value queryInterface(Machine& machine, const Json::Value& /*message*/) {
     const RadioState radio = machine.adapters().radio(adapter);
     Json::Value result;
     result["state"] = kInterfaceStates.at(machine.interfaceState(adapter));
-    result["ssid"] = Json::Value();
+    const Link link = machine.connections().shown(adapter);
+    result["ssid"] = isUp(link) ? Json::Value(textOfBytes(link.ssid)) : Json::Value();
     result["radio"]["hardware"] = kRadioStates.at(radio.hardware);
     result["radio"]["software"] = kRadioStates.at(radio.software);
     return result;

@@ -116,6 +116,10 @@ std::string utf8(std::u32string_view codePoints) {
     return out;
 }
 
+std::string textOfBytes(std::span<const std::uint8_t> bytes) {
+    return utf8(codePoints(std::string(bytes.begin(), bytes.end())));
+}
+
 std::string hexText(std::span<const std::uint8_t> bytes) {
     constexpr std::string_view kDigits = "0123456789abcdef";
     std::string out;

@@ -23,6 +23,9 @@ std::string latin1(std::string_view utf8);
 
 std::string utf8(std::u32string_view codePoints);
 
+/// Bytes that are meant to be UTF-8, such as an SSID, as text that is.
+std::string textOfBytes(std::span<const std::uint8_t> bytes);
+
 /// Lower case, without separators.
 std::string hexText(std::span<const std::uint8_t> bytes);
 

@@ -8,14 +8,16 @@
 #include "simulation/CallersMemory.h"
 #include "simulation/InterfaceQueries.h"
 #include "simulation/Machine.h"
+#include "simulation/ServiceEntry.h"
 
 namespace {
 
+using vexa::simulation::admit;
 using vexa::simulation::Bytes;
 using vexa::simulation::IhvRequest;
+using vexa::simulation::kServiceNotActive;
 using vexa::simulation::Machine;
 
-constexpr DWORD kServiceNotActive = 1062;
 constexpr DWORD kNegotiatedVersion = 2;
 
 struct IhvCall {
@@ -25,13 +27,6 @@ struct IhvCall {
     std::span<const std::uint8_t> request;
     std::span<std::uint8_t> output;
 };
-
-// What every call meets first: an error that was asked for, then a handle that isn't open.
-DWORD admit(Machine* machine, HANDLE client, const char* call, std::string_view detail = {}) {
-    if (!machine) return kServiceNotActive;
-    if (const auto error = machine->faults().nextError(call, detail)) return *error;
-    return machine->handles().isOpen(client) ? ERROR_SUCCESS : ERROR_INVALID_HANDLE;
-}
 
 DWORD queryInterface(Machine* machine, HANDLE client, const GUID* guid, WLAN_INTF_OPCODE opcode, PDWORD size,
                      PVOID* data) {
@@ -142,13 +137,6 @@ DWORD WlanRegisterNotification(HANDLE handle, DWORD sources, BOOL /*ignoreDuplic
                                : machine->notifications().unregister(handle);
     if (previousSources) *previousSources = previous;
     return ERROR_SUCCESS;
-}
-
-DWORD WlanDisconnect(HANDLE handle, const GUID* guid, PVOID /*reserved*/) {
-    Machine* const machine = Machine::current();
-    const DWORD admitted = admit(machine, handle, "WlanDisconnect");
-    if (admitted != ERROR_SUCCESS) return admitted;
-    return guid != nullptr && machine->adapters().findInserted(*guid) ? ERROR_SUCCESS : ERROR_NOT_FOUND;
 }
 
 DWORD WlanIhvControl(HANDLE handle, const GUID* guid, WLAN_IHV_CONTROL_TYPE type, DWORD inSize,
