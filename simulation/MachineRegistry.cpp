@@ -107,6 +107,16 @@ bool MachineRegistry::setAutoConnect(const std::optional<std::string>& text) {
     return replaceFile(m_file, indentedJson(keys));
 }
 
+bool MachineRegistry::setNumber(const std::string& path, const std::string& name, std::uint32_t number) {
+    const LockGuard<Mutex> lock(m_mutex);
+    Json::Value keys = readContent();
+    Json::Value& values = keys[fullPath(RegistryRoot::CurrentUser, path)];
+    if (!values.isObject()) values = Json::Value(Json::objectValue);
+    if (values[name] == Json::Value(number)) return true;
+    values[name] = number;
+    return replaceFile(m_file, indentedJson(keys));
+}
+
 Json::Value MachineRegistry::content() const {
     const LockGuard<Mutex> lock(m_mutex);
     return readContent();

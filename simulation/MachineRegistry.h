@@ -2,6 +2,7 @@
 
 #include <json/value.h>
 
+#include <cstdint>
 #include <filesystem>
 #include <optional>
 #include <string>
@@ -30,6 +31,10 @@ public:
     /// Sets or removes the user's choice whether hotspots are joined by themselves. False if the file can't
     /// be written.
     bool setAutoConnect(const std::optional<std::string>& text);
+
+    /// Sets a number below the current user's part; the key is created at need. False if the file can't be
+    /// written.
+    bool setNumber(const std::string& path, const std::string& name, std::uint32_t number);
 
     /// The content of the file.
     Json::Value content() const;

@@ -146,7 +146,8 @@ void DiagnosticLog::runThread() {
 
 std::string DiagnosticLog::nextNumber() {
     m_sequence = m_sequence >= kLastSequence ? 1 : m_sequence + 1;
-    return "[" + std::to_string(m_sequence) + "] ";
+    std::string number = "[";
+    return number.append(std::to_string(m_sequence)).append("] ");
 }
 
 void DiagnosticLog::addLine(std::string_view text, bool numbered) {

@@ -169,16 +169,25 @@ std::wstring cutToUtf16Units(std::wstring_view text, std::size_t units) {
     return std::wstring(text.substr(0, end));
 }
 
-std::string narrowFromWide(std::wstring_view text) {
-    std::string narrow;
-    const auto append = [&](char32_t unit) {
-        narrow += static_cast<char>(static_cast<unsigned char>(unit & 0xFF));
-    };
+std::u16string utf16FromWide(std::wstring_view text) {
+    std::u16string units;
     for (std::size_t i = 0; i < text.size(); ++i) {
         const char32_t unit = unitAt(text, i);
-        if (unit >= 0x10000) append((unit - 0x10000) >> 10);
-        append(unit);
+        if (unit < 0x10000) {
+            units += static_cast<char16_t>(unit);
+        } else {
+            units += static_cast<char16_t>(0xD800 + ((unit - 0x10000) >> 10));
+            units += static_cast<char16_t>(0xDC00 + ((unit - 0x10000) & 0x3FF));
+        }
     }
+    return units;
+}
+
+std::string narrowFromWide(std::wstring_view text) {
+    const std::u16string units = utf16FromWide(text);
+    std::string narrow(units.size(), '\0');
+    std::transform(units.begin(), units.end(), narrow.begin(),
+                   [](char16_t unit) { return static_cast<char>(static_cast<unsigned char>(unit & 0xFF)); });
     return narrow;
 }
 

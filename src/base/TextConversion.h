@@ -15,6 +15,7 @@ std::string utf8FromWide(std::wstring_view text);
 std::wstring wideFromUtf8(std::string_view text);
 
 std::string utf8FromUtf16(std::u16string_view text);
+std::u16string utf16FromWide(std::wstring_view text);
 
 /// The code points of UTF-8 text; nothing if it isn't valid.
 std::optional<std::u32string> codePointsFromUtf8(std::string_view text);

@@ -192,7 +192,7 @@ bool InterworkingMgr::passesGates() {
 
 void InterworkingMgr::connect() {
     int outcome = 0;
-    if (m_pSupplicant->connectNetwork(outcome) != kSuccess)
+    if (connectNetwork(outcome) != kSuccess)
         Log(6, "connectNetwork returns error.");
     else if (outcome == kConnectStarted)
         Log(3, "connectNetwork returns with op succeeded.");

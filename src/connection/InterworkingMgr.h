@@ -1,14 +1,26 @@
 #pragma once
 
 #include <atomic>
-#include <memory>
+#include <string>
+#include <vector>
+
+#include "base/NetworkListLock.h"
 
 #include "platform/Event.h"
 #include "platform/Thread.h"
 
 namespace vexa {
 
+struct Credential;
+struct NetworkProfile;
+class Hs20Network;
 class Supplicant;
+
+/// A network and the credential to join it with; both null if there is none.
+struct NetworkChoice {
+    Hs20Network* network = nullptr;
+    Credential* credential = nullptr;
+};
 
 /// The network connecting thread: the only place where the system decides by itself to connect. It sleeps on
 /// eight events, 10 s at most, and then runs one round: a chain of gates, each of which can end the round
@@ -36,6 +48,16 @@ private:
     void runRound();
     bool passesGates();
     void connect();
+
+    /// One attempt: chooses, finds or builds the profile, and asks for the connection. `result` is
+    /// kConnectStarted, kConnectNothingLeft, or 0 with the failure that is given.
+    int connectNetwork(int& result) EXCLUDES(g_hs20Lock);
+    NetworkChoice findBestMatchBssAndCredential() REQUIRES(g_hs20Lock);
+    Credential* selectCredential(const Hs20Network& network, const std::vector<Credential*>& found)
+        REQUIRES(g_hs20Lock);
+    NetworkProfile* profileFor(const NetworkChoice& choice, const std::wstring& name) REQUIRES(g_hs20Lock);
+    NetworkProfile* reusableProfile(const NetworkChoice& choice, const std::wstring& name)
+        REQUIRES(g_hs20Lock);
 
     Supplicant* const m_pSupplicant;
     std::atomic<bool> m_bInited{false};

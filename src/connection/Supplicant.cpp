@@ -86,10 +86,20 @@ const char* Supplicant::initSteps() {
     if (getHs20BssListFromIHV() != kSuccess)
         Log(6, "ERROR: Get HS20 network list failed in supplicant initialization.");
     setRadioState(isRadioOn());
+    recordConnectionAtStart();
     setState(SupplicantState::Initialized);
     const LockGuard lock(g_hs20Lock);
     Log(3, "Supplicant State=%s", nameOf(m_state));
     return nullptr;
+}
+
+// A connection that exists already is recorded as though it began now.
+void Supplicant::recordConnectionAtStart() {
+    DOT11_SSID ssid{};
+    MacAddress bssid{};
+    if (queryCurrentConnection(ssid, bssid, false) != kSuccess) return;
+    const LockGuard lock(g_hs20Lock);
+    m_history.addConnection(bytesOf(ssid), bssid, m_networkList);
 }
 
 void Supplicant::logInterfaceGuid() const {
@@ -133,8 +143,17 @@ void Supplicant::deinit() {
 void Supplicant::reset() {
     const LockGuard lock(g_hs20Lock);
     m_bConnectionStarted = false;
+    m_bManualConnectStarted = false;
+    m_connectingSsid.clear();
+    m_triedCredentialIds.clear();
+    m_bManualConnectPending = false;
+    m_pendingManualSsid.clear();
     m_bQueryingAnqp = false;
     m_bRoaming = false;
+    m_bConnectionStartedByOs = false;
+    m_bHs20Connected = false;
+    m_blockedNetworks.clear();
+    m_profileMgr.clear();
     m_retryHelper.resetAllNumRetries();
 }
 
@@ -173,12 +192,6 @@ bool Supplicant::isHs20Enabled() const {
     return m_pMgr == nullptr || m_pMgr->config().m_bHotSpotAutoConnect;
 }
 
-// Nothing to choose from as long as nothing chooses.
-int Supplicant::connectNetwork(int& result) {
-    result = kConnectNothingLeft;
-    return kSuccess;
-}
-
 void Supplicant::tellClient(const std::function<void(const ClientEvents&)>& tell) {
     if (m_pMgr != nullptr && m_pMgr->clientEvents().isComplete()) tell(m_pMgr->clientEvents());
 }
@@ -197,6 +210,7 @@ int Supplicant::deleteCredential(std::int32_t id) {
     if (!config.credentials().deleteCredential(id)) return kFailure;
     config.saveConfig();
     m_retryHelper.removeAllCredNumRetryEntries(id);
+    m_profileMgr.deleteProfilesOfCredential(id);
     m_hCredentialChangedEvent.set();
     return kSuccess;
 }
@@ -209,9 +223,12 @@ int Supplicant::updateCredential(const CredentialInput& input) {
         return kFailure;
     }
     Config& config = m_pMgr->config();
+    if (!credential->m_bAutoConnect && input.autoConnect)
+        m_blockedNetworks.onCredentialAutoConnectChanged(input.id, config.credentials(), m_networkList);
     if (config.credentials().updateCredential(input) != kSuccess) return kFailure;
     config.saveConfig();
     m_retryHelper.resetNumRetries(input.id);
+    m_profileMgr.deleteProfilesOfCredential(input.id);
     m_hCredentialChangedEvent.set();
     return kSuccess;
 }

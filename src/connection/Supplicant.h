@@ -4,14 +4,18 @@
 #include <atomic>
 #include <cstdint>
 #include <functional>
+#include <string>
 #include <string_view>
 #include <vector>
 
 #include "base/NetworkListLock.h"
 #include "base/TimeValue.h"
 #include "config/Credential.h"
+#include "connection/BlockedNetworkList.h"
 #include "connection/ClientEvents.h"
+#include "connection/ConnectionHistory.h"
 #include "connection/InterworkingMgr.h"
+#include "connection/NetworkProfileMgr.h"
 #include "connection/NetworkRetryHelper.h"
 #include "hotspot/Hs20NetworkList.h"
 #include "platform/Event.h"
@@ -102,12 +106,25 @@ public:
     int onNetworkListChanged(Bytes payload);
     int onAnqpInfoChanged(Bytes payload);
     void onAnqpQueryCompleted();
+    int onUserDisconnected(Bytes payload);
+    int onSessionChanged(Bytes payload);
 
-    /// Notifications of the WLAN service. Null data: kInvalidArgument.
+    /// Notifications of the WLAN service. Null data changes nothing but what every call does.
+    int onConnectionStart(const WLAN_CONNECTION_NOTIFICATION_DATA* data);
+    int onConnectionComplete(const WLAN_CONNECTION_NOTIFICATION_DATA* data);
+    int onDisconnected(const WLAN_CONNECTION_NOTIFICATION_DATA* data);
     int onRadioStateChanged(const WLAN_PHY_RADIO_STATE* data);
 
-    /// One attempt of the connecting thread; `result` is kConnectStarted, kConnectNothingLeft or neither.
-    int connectNetwork(int& result);
+    /// Asks for a connection; also kSuccess where none is needed. kInvalidArgument for null.
+    int connectToNetwork(const Hs20Network* network, const NetworkProfile* profile) REQUIRES(g_hs20Lock);
+
+    /// The user wants this network: at once, or when the running attempt has ended. kSuccess if the
+    /// connection was started or postponed; kFailure; kInvalidArgument without an SSID.
+    int connectBss(std::string_view ssid);
+
+    /// The user leaves the network, which auto-connect then stays away from if `blockNetwork`. kFailure if
+    /// `requireHs20` and none of the list is connected, or the request failed.
+    int disconnectedBSS(bool blockNetwork, bool requireHs20);
 
     /// 1 without a manager, 4 for an id below 1; else 0, with `credential` null if there is none.
     int getCredential(std::int32_t id, Credential*& credential) REQUIRES(g_hs20Lock);
@@ -126,8 +143,11 @@ public:
     platform::Event m_hEnableHs20Event{platform::Reset::Auto, "HS20 enabled or disabled"};
     platform::Event m_hAnqpInfoReadyEvent{platform::Reset::Auto, "ANQP info ready"};
 
+    ConnectionHistory m_history GUARDED_BY(g_hs20Lock);
+    NetworkProfileMgr m_profileMgr GUARDED_BY(g_hs20Lock);
     Hs20NetworkList m_networkList GUARDED_BY(g_hs20Lock);
     NetworkRetryHelper m_retryHelper GUARDED_BY(g_hs20Lock);
+    BlockedNetworkList m_blockedNetworks GUARDED_BY(g_hs20Lock);
 
     // Written under the lock, read also without it.
 
@@ -135,6 +155,7 @@ public:
     std::atomic<bool> m_bQueryingAnqp{false};
     std::atomic<bool> m_bUserDisconnecting{false};  // the client asked to disconnect
     std::atomic<bool> m_bRoaming{false};            // between roaming start and end
+    std::atomic<bool> m_bHs20Connected{false};      // the last connection that this program asked for lives
 
     bool isRadioOnCached() const { return m_bRadioOn; }
     bool isThreadLate() const { return m_interworkingMgr.isThreadLate(); }
@@ -143,10 +164,36 @@ public:
     TimeValue m_lastHs20ToggleTime GUARDED_BY(g_hs20Lock);
 
 private:
+    bool isOwnConnection(const WLAN_CONNECTION_NOTIFICATION_DATA& data) const REQUIRES(g_hs20Lock);
+    int onOwnResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::uint32_t& eapMethod)
+        REQUIRES(g_hs20Lock);
+    int onForeignResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data) REQUIRES(g_hs20Lock);
+    int carryOutPendingRequest() REQUIRES(g_hs20Lock);
+    int onSuccess(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const NetworkProfile& profile,
+                  std::uint32_t& eapMethod) REQUIRES(g_hs20Lock);
+    int onFailure(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const NetworkProfile& profile)
+        REQUIRES(g_hs20Lock);
+    int tryMachineMode(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const NetworkProfile& failed)
+        REQUIRES(g_hs20Lock);
+    int tryNextCredential(const WLAN_CONNECTION_NOTIFICATION_DATA& data) REQUIRES(g_hs20Lock);
+    int endAttempt(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::uint32_t outcome) REQUIRES(g_hs20Lock);
+    int report(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::uint32_t outcome) REQUIRES(g_hs20Lock);
+    void clearNumRetriesOnConnSuccess(const std::wstring& profileName, std::string_view ssid)
+        REQUIRES(g_hs20Lock);
+
+    int connectBssNow(const std::string& ssid) REQUIRES(g_hs20Lock);
+    int connectPlainly(const Hs20Network& network) REQUIRES(g_hs20Lock);
+    int tryConnectHs20BssUsingNextCredential(std::string_view ssid, int& connResult) REQUIRES(g_hs20Lock);
+    const Credential* nextUntried(const Hs20Network& network) REQUIRES(g_hs20Lock);
+    int connectFreshly(const Hs20Network& network, const Credential& credential) REQUIRES(g_hs20Lock);
+    DWORD requestConnection(const Hs20Network& network, const NetworkProfile* profile) REQUIRES(g_hs20Lock);
+    const char* reasonNotToBlock() const REQUIRES(g_hs20Lock);
+
     DWORD callIhv(std::vector<std::byte> request, std::vector<std::byte>* reply) const;
     int sendIhvCmd();
     void tellClient(const std::function<void(const ClientEvents&)>& tell) REQUIRES(g_hs20Lock);
     const char* initSteps();
+    void recordConnectionAtStart();
     void logInterfaceGuid() const;
     bool openWlanHandle();
     void closeWlanHandle();
@@ -157,6 +204,16 @@ private:
     std::atomic<std::uint32_t> m_ifIndex{0};
     std::atomic<HANDLE> m_hWlan{nullptr};
     SupplicantState m_state GUARDED_BY(g_hs20Lock) = SupplicantState::InvalidState;
+
+    // What tells this program's connections from the operating system's, and the client's from
+    // auto-connect's.
+    std::string m_connectingSsid GUARDED_BY(g_hs20Lock);
+    bool m_bConnectionStartedByOs GUARDED_BY(g_hs20Lock) = false;
+    bool m_bManualConnectStarted GUARDED_BY(g_hs20Lock) = false;
+    bool m_bManualConnectPending GUARDED_BY(g_hs20Lock) = false;
+    std::string m_pendingManualSsid GUARDED_BY(g_hs20Lock);
+    std::vector<std::int32_t> m_triedCredentialIds GUARDED_BY(g_hs20Lock);
+
     InterworkingMgr m_interworkingMgr{this};  // its thread uses all of the above
 };
 

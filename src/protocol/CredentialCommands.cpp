@@ -25,6 +25,7 @@ void addToTable(Supplicant& supplicant, const CredentialInput& input) REQUIRES(g
     if (result != kSuccess || id <= 0) return;
     config.advanceNextCredId();
     config.saveConfig();
+    supplicant.m_blockedNetworks.onCredentialAdded(id, config.credentials(), supplicant.m_networkList);
     supplicant.m_hCredentialChangedEvent.set();
 }
 

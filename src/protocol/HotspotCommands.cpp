@@ -55,7 +55,15 @@ bool autoConnect(Server& server, const Json::Value& data) {
     return true;
 }
 
-constexpr std::array<Command, 12> kCommands = {{
+template <void (Server::*Act)(const std::string& name)>
+bool withNetwork(Server& server, const Json::Value& data) {
+    const auto name = readText(data, "NetWorkName");
+    if (!name || (data.isObject() && data["NetWorkName"].isBool())) return false;
+    (server.*Act)(name->substr(0, name->find('\0')));
+    return true;
+}
+
+constexpr std::array<Command, 14> kCommands = {{
     {"UPDATE_NETWORK_REALM", answer<&Server::updateNetworkRealm>},
     {"GET_RADIO", answer<&Server::SendRadioState>},
     {"SET_HOTSPOT_AUTO_CONNECT", autoConnect},
@@ -66,6 +74,8 @@ constexpr std::array<Command, 12> kCommands = {{
     {"DELETE_CREDENTIAL", changeCredentials<deleteCredential>},
     {"EDIT_CREDENTIAL", changeCredentials<editCredential>},
     {"SET_POSITION_CREDENTIAL", changeCredentials<setCredentialPosition>},
+    {"CONNECT_NETWORK", withNetwork<&Server::connectNetworkByName>},
+    {"DISCONNECT_NETWORK", withNetwork<&Server::disconnectNetworkByName>},
     {"GET_ALL_NETWORK_LIST", networkList},
     {"GET_IS_INTERNET_ACCESS", answer<&Server::SendInternetAccess>},
 }};

@@ -64,6 +64,12 @@ void SAHotSpotPortlink::SendInternetAccess() {
     SendData(toStyledText(Json::Value(hasAccess)), "GET_IS_INTERNET_ACCESS");
 }
 
+void SAHotSpotPortlink::SendConnectionResult(const ConnectionResult& result) {
+    Log(3, "Send connection result to vexa.");
+    const int outcome = result.m_result == ConnectionResult::kSucceeded ? 1 : 0;
+    SendData(toStyledText(Json::Value(outcome)), "CONNECT_DISCONNECT");
+}
+
 void SAHotSpotPortlink::SendDetectedHotspot() {
     Log(3, "Detected HS20 networks.");
     SendData(toStyledText(Json::Value()), "DETECTED_HOTSPOT");

@@ -1,5 +1,6 @@
 #include "base/DiagnosticLog.h"
 #include "base/NetworkListLock.h"
+#include "config/ResultCodes.h"
 #include "connection/Supplicant.h"
 #include "protocol/SAHotSpotPortlink.h"
 
@@ -21,6 +22,27 @@ void SAHotSpotPortlink::updateNetworkRealm() {
     supplicant->requestDisconnect();
     supplicant->m_bUserDisconnecting = true;
     m_bRealmUpdatePending = true;
+}
+
+// An SSID has 32 bytes at most; a longer name is refused like one that can't be joined.
+void SAHotSpotPortlink::connectNetworkByName(const std::string& name) {
+    const auto supplicant = hotspotSupplicant(*this);
+    if (name.empty() || !supplicant) return;
+    if (name.size() <= kMaxSsidLength && supplicant->connectBss(name) == kSuccess) return;
+    Log(6, "connectBss failed.");
+    SendConnectionResult(ConnectionResult{});
+}
+
+void SAHotSpotPortlink::disconnectNetworkByName(const std::string& name) {
+    const auto supplicant = hotspotSupplicant(*this);
+    if (name.empty() || !supplicant) return;
+    const platform::LockGuard lock(g_hs20Lock);
+    const Hs20Network* const connected = supplicant->getConnectedBss(true);
+    if (connected == nullptr) return Log(6, "ERROR: Cannot get connected BSS.");
+    if (connected->ssidText() != name)
+        return Log(6, "ERROR: Connected ssid=%s while requesting disconnect from ssid=%s",
+                   connected->ssidText().c_str(), name.c_str());
+    if (supplicant->disconnectedBSS(true, true) != kSuccess) Log(6, "ERROR: disconnectedBSS call failed.");
 }
 
 }  // namespace vexa

@@ -26,6 +26,9 @@ SAHotSpotPortlink::SAHotSpotPortlink() {
     SupplicantMgr::instance().setClientEvents({
         [this](Supplicant& supplicant) { SendNetworkList(&supplicant); },
         [this] { SendDetectedHotspot(); },
+        [this](const ConnectionResult& result) { SendConnectionResult(result); },
+        [this] { SendInternetAccess(); },
+        [this] { return m_bRealmUpdatePending.exchange(false); },
     });
 }
 

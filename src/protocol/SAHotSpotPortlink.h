@@ -10,12 +10,11 @@
 #include "base/AdapterIdentity.h"
 #include "base/LittleEndian.h"
 #include "base/NetworkListLock.h"
+#include "connection/ClientEvents.h"
 #include "platform/WlanApi.h"
 #include "protocol/Ipc.h"
 
 namespace vexa {
-
-class Supplicant;
 
 /// The hotspot port's server: takes the client's commands and sends him the hotspot events. Any thread may
 /// call anything. Every command finds its Supplicant anew, by the adapter's GUID.
@@ -50,12 +49,16 @@ public:
     /// then looked up; nothing is sent unless one is found. Holds the network list lock.
     void SendNetworkList(Supplicant* supplicant);
     void SendInternetAccess();
+    void SendConnectionResult(const ConnectionResult& result);
     void SendDetectedHotspot();
     /// The driver's state, from a message of the hotspot module.
     void SendSupplicantState(Bytes payload);
 
     /// The client's switch for the whole hotspot function. Holds the network list lock.
     void setHotSpotAutoConnect(bool enable);
+    /// The user's wish to join a network or to leave it. The outcome comes as an event.
+    void connectNetworkByName(const std::string& name);
+    void disconnectNetworkByName(const std::string& name);
     /// Reads the realms of all networks anew, after a disconnection if need be.
     void updateNetworkRealm();
 

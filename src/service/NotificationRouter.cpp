@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <array>
+#include <cstddef>
 #include <cstring>
 #include <memory>
 #include <optional>
@@ -95,19 +96,36 @@ void onRadioChange(const Event& event) {
         supplicant->onRadioStateChanged(radio ? &*radio : nullptr);
 }
 
+/// What the handlers read of a connection's data ends with the reason.
+constexpr std::size_t kLeastConnectionData = offsetof(WLAN_CONNECTION_NOTIFICATION_DATA, dwFlags);
+
+template <int (Supplicant::*Handle)(const WLAN_CONNECTION_NOTIFICATION_DATA*)>
+void onConnection(const Event& event) {
+    const auto supplicant = supplicantOf(event);
+    if (!supplicant) return;
+    const WLAN_NOTIFICATION_DATA& notification = event.notification;
+    if (notification.pData == nullptr || notification.dwDataSize < kLeastConnectionData) {
+        ((*supplicant).*Handle)(nullptr);
+        return;
+    }
+    WLAN_CONNECTION_NOTIFICATION_DATA data{};
+    std::memcpy(&data, notification.pData, std::min<std::size_t>(notification.dwDataSize, sizeof data));
+    ((*supplicant).*Handle)(&data);
+}
+
 constexpr std::array<Row, 12> kAcmRows = {{
     {0, "wlan_notification_acm_start", 3, nullptr},
     {1, "wlan_notification_acm_autoconf_enabled", 3, nullptr},
     {2, "wlan_notification_acm_autoconf_disabled", 3, nullptr},
     {7, "wlan_notification_acm_scan_complete", 3, nullptr},
     {8, "wlan_notification_acm_scan_fail", 3, nullptr},
-    {9, "wlan_notification_acm_connection_start", 2, nullptr},
-    {10, "wlan_notification_acm_connection_complete", 3, nullptr},
+    {9, "wlan_notification_acm_connection_start", 2, onConnection<&Supplicant::onConnectionStart>},
+    {10, "wlan_notification_acm_connection_complete", 3, onConnection<&Supplicant::onConnectionComplete>},
     {11, "wlan_notification_acm_connection_attempt_fail", 3, nullptr},
     {13, "wlan_notification_acm_interface_arrival", 3, onAdapterArrival},
     {14, "wlan_notification_acm_interface_removal", 3, onAdapterRemoval},
     {20, "wlan_notification_acm_disconnecting", 3, nullptr},
-    {21, "wlan_notification_acm_disconnected", 3, nullptr},
+    {21, "wlan_notification_acm_disconnected", 3, onConnection<&Supplicant::onDisconnected>},
 }};
 
 constexpr std::array<Row, 16> kMsmRows = {{

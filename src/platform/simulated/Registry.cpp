@@ -42,4 +42,9 @@ std::optional<std::wstring> RegistryKey::wideValue(const std::string& name, std:
     return text.substr(0, text.find(L'\0'));
 }
 
+bool writeRegistryNumber(const std::string& path, const std::string& name, std::uint32_t number) {
+    simulation::Machine* const machine = simulation::Machine::current();
+    return machine != nullptr && machine->registry().setNumber(path, name, number);
+}
+
 }  // namespace vexa::platform

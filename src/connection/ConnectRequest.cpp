@@ -1,0 +1,73 @@
+#include "base/DiagnosticLog.h"
+#include "base/TextConversion.h"
+#include "base/WlanText.h"
+#include "config/Config.h"
+#include "config/ResultCodes.h"
+#include "connection/Supplicant.h"
+#include "connection/SupplicantMgr.h"
+#include "hotspot/CredentialMatching.h"
+
+namespace vexa {
+
+namespace {
+
+DOT11_SSID ssidOf(const Hs20Network& network) {
+    DOT11_SSID ssid{};
+    ssid.uSSIDLength = network.m_ssidLength;
+    for (std::size_t i = 0; i < network.m_ssidLength; ++i)
+        ssid.ucSSID[i] = static_cast<UCHAR>(network.m_ssid[i]);
+    return ssid;
+}
+
+}  // namespace
+
+// Null: the operating system chooses the profile.
+DWORD Supplicant::requestConnection(const Hs20Network& network, const NetworkProfile* profile) {
+    const std::basic_string<WCHAR> text =
+        profile == nullptr ? std::basic_string<WCHAR>() : toWlanText(profile->m_profileXml);
+    DOT11_SSID ssid = ssidOf(network);
+    WLAN_CONNECTION_PARAMETERS parameters{};
+    parameters.wlanConnectionMode =
+        profile == nullptr ? wlan_connection_mode_discovery_secure : wlan_connection_mode_temporary_profile;
+    parameters.strProfile = profile == nullptr ? nullptr : text.c_str();
+    parameters.pDot11Ssid = profile == nullptr ? &ssid : nullptr;
+    parameters.dot11BssType = dot11_BSS_type_infrastructure;
+    parameters.dwFlags = WLAN_CONNECTION_HIDDEN_NETWORK;
+    const DWORD result = WlanConnect(m_hWlan, &m_interfaceGuid, &parameters, nullptr);
+    if (result != ERROR_SUCCESS) return result;
+    m_connectingSsid = network.ssid();
+    m_bConnectionStarted = true;
+    return result;
+}
+
+// The notifications of the connection may come at once; they wait for the lock.
+int Supplicant::connectToNetwork(const Hs20Network* network, const NetworkProfile* profile) {
+    if (network == nullptr || profile == nullptr) return kInvalidArgument;
+    LogWide(3, L"\nConnect to network %s", profile->m_name.c_str());
+    if (m_state == SupplicantState::Connected) {
+        const Hs20Network* const connected = getConnectedBss(false);
+        if (connected == nullptr) Log(3, "Supplicant connected to a legacy network.");
+        if (connected == network) {
+            Log(3,
+                "Already in connected state while requesting to connect to the same network, skip connecting "
+                "again.");
+            return kSuccess;
+        }
+    }
+    if (m_bConnectionStarted) {
+        Log(3, "###Connection already started, skip connecting again.###");
+        return kSuccess;
+    }
+    if (m_pMgr != nullptr &&
+        findRoamingConsortiumCredential(m_pMgr->config().credentials(), *network) != nullptr)
+        return kSuccess;
+    Log(2, "Network profile for ssid=%s", network->ssidText().c_str());
+    Log(2, "\tInterworking: Connect with %s", toText(network->m_macAddress).c_str());
+    if (network->m_ssidLength == 0) return kFailure;
+    const DWORD result = requestConnection(*network, profile);
+    if (result == ERROR_SUCCESS) return kSuccess;
+    Log(2, "WlanConnect call failed with error code=%d.", static_cast<int>(result));
+    return kFailure;
+}
+
+}  // namespace vexa

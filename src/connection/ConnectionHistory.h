@@ -1,0 +1,44 @@
+#pragma once
+
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "base/NetworkListLock.h"
+#include "base/TimeValue.h"
+#include "hotspot/IhvMessages.h"
+
+namespace vexa {
+
+class Hs20NetworkList;
+
+inline constexpr std::size_t CONNECTION_HISTORY_CAPACITY = 50;
+
+/// One connection to a Hotspot 2.0 network.
+struct ConnectionRecord {
+    TimeValue m_connectedTime;
+    TimeValue m_disconnectedTime;
+    bool m_bDisconnectedTimeValid = false;  // false while the connection is open
+    MacAddress m_macAddress{};
+    std::string m_ssid;
+};
+
+/// The recent connections, oldest first. Only in memory; one more than its capacity wipes those before it.
+class ConnectionHistory {
+public:
+    /// kSuccess, also for a network that isn't in the list and leaves no record.
+    int addConnection(std::string_view ssid, const MacAddress& mac, const Hs20NetworkList& networks)
+        REQUIRES(g_hs20Lock);
+    /// kFailure: the last record belongs to another SSID.
+    int updateDisconnection(std::string_view ssid, const Hs20NetworkList& networks) REQUIRES(g_hs20Lock);
+
+    /// The newest record; null if there is none.
+    const ConnectionRecord* last() const REQUIRES(g_hs20Lock);
+
+private:
+    void dump() const REQUIRES(g_hs20Lock);
+
+    std::vector<ConnectionRecord> m_records GUARDED_BY(g_hs20Lock);
+};
+
+}  // namespace vexa
