@@ -1,0 +1,141 @@
+"""The configuration file beside another reader of XML: what that one takes we take, what it refuses we refuse, and both
+read the same."""
+
+import json
+import random
+import re
+import unittest
+import xml.etree.ElementTree
+
+from harness import Machine
+
+SEED = 7
+MUTANTS = 250
+UNTOUCHED = len('<?xml version="1.0"')  # the other reader doesn't care what version it is
+SENTINEL = (
+    "<c><global><nextcredid>2</nextcredid></global><credentials><credential><id>1</id><type>eapttls</type>"
+    "<accesstype>alluser</accesstype><realm>sentinel</realm></credential></credentials><users/></c>"
+).encode()
+BASE = (
+    '<?xml version="1.0" encoding="UTF-8"?><!-- c --><configurations a="1" b=\'&lt;2\'><global>'
+    "<nextcredid>9</nextcredid></global><credentials><credential><id>7</id><type>eapttls</type>"
+    "<accesstype>alluser</accesstype><creator>x</creator><eap>2</eap><credname>n&amp;&#233;&#x1F600; é</credname>"
+    "<realm> r<![CDATA[<&>]]>\r\n</realm><username/><password>p&#13;&quot;</password></credential></credentials>"
+    "<?p i?><users></users></configurations>\n"
+).encode()
+PIECES = [
+    b"<", b">", b"&", b";", b"/", b'"', b"'", b"=", b" ", b"-", b"!", b"?", b"]]>", b"<![CDATA[", b"<!--", b"-->", b"&amp;",
+    b"&#0;", b"&#x41;", b"&x;", b"<a>", b"</a>", b"<a/>", b"<?p?>", b"<?xml?>", b"\x00", b"\x01", b"\x7f", b"\x80", b"\xc3\xa9",
+    b"\xed\xa0\x80", b"\xef\xbf\xbf", b"\xf0\x9f\x98\x80", b"\r", b"\n", b"x", b":", b"1",
+]  # fmt: skip
+
+
+def mutant(rng):
+    text = bytearray(BASE)
+    for _ in range(rng.randrange(1, 4)):
+        at, kind = rng.randrange(UNTOUCHED, len(text)), rng.randrange(4)
+        if kind == 0:
+            del text[at : at + rng.randrange(1, 6)]
+        elif kind == 1:
+            text[at:at] = rng.choice(PIECES)
+        elif kind == 2:
+            text[at : at + 1] = rng.choice(PIECES)
+        else:
+            other = rng.randrange(len(text))
+            text[at:at] = text[other : other + rng.randrange(1, 20)]
+    return bytes(text)
+
+
+CORPUS = [
+    BASE,
+    b"\xef\xbb\xbf" + BASE,
+    BASE.decode().replace("UTF-8", "UTF-16").encode("utf-16"),
+    ("\ufeff" + BASE.decode().replace("UTF-8", "UTF-16")).encode("utf-16-be"),
+    BASE.decode().replace("&#x1F600;", "").replace("UTF-8", "ISO-8859-1").encode("latin-1"),
+    BASE.replace(b"UTF-8", b"UTF-16"),
+    BASE.replace(b"UTF-8", b"US-ASCII"),
+    BASE.replace(b"UTF-8", b"nonsense"),
+    BASE.replace(b"<!-- c -->", b"<!DOCTYPE configurations>"),
+    BASE.replace(b"<!-- c -->", b"<!DOCTYPE x><!DOCTYPE y>"),
+    b"",
+    b"\xef\xbb\xbf",
+    b"\xff\xfe",
+    BASE * 2,
+    BASE + b"x",
+    b" " + BASE,
+    BASE[:-30],
+    BASE.replace(b"\r\n", b"\r"),
+    b"<c>" + b"<d>" * 20000 + b"</d>" * 20000 + b"</c>",
+]
+
+
+def read_by_other(content):
+    """The tree as another reader sees it, or None if it refuses the file."""
+    try:
+        return xml.etree.ElementTree.fromstring(content)
+    except (xml.etree.ElementTree.ParseError, ValueError, LookupError):
+        return None
+
+
+def realms(tree):
+    """The realms that belong in the list, so far as it is the only credential that could."""
+    found = []
+    for node in tree.findall("credentials/*"):
+        text = {child.tag: "".join(child.itertext()) for child in reversed(node)}
+        number = re.match(r"\s*([+-]?[0-9]+)", text.get("id", ""))
+        types = text.get("type") in ("eapttls", "eaptls") and text.get("accesstype") == "alluser"
+        if number and 0 < int(number[1]) < 2**31 and types:
+            found.append(text.get("realm", ""))
+    return found
+
+
+class Reading(unittest.TestCase):
+    @classmethod
+    def setUpClass(cls):
+        cls.machine = Machine({"config": SENTINEL.decode()}, control=False)
+        cls.machine.__enter__()
+        cls.addClassCleanup(cls.machine.__exit__, None, None, None)
+        cls.client = cls.machine.hs20()
+        cls.file = cls.machine.folder / "Public" / "Roaming" / "Korvane" / "config.xml"
+
+    def listed(self, *commands):
+        for command in commands:
+            self.client.send(command)
+        self.client.send("GET_ALL_CREDENTIAL_LIST")
+        return [entry["RealName"] for entry in json.loads(self.client.wait_event("GET_ALL_CREDENTIAL_LIST")["Data"]) or []]
+
+    def check(self, content):
+        self.file.write_bytes(SENTINEL)
+        self.assertEqual(self.listed("READ_CREDENTIAL_FROM_FILE"), ["sentinel"])
+        self.file.write_bytes(content)
+        ours = self.listed("READ_CREDENTIAL_FROM_FILE")
+        tree = read_by_other(content)
+        if tree is None:
+            self.assertEqual(ours, ["sentinel"], "taken, though the other reader refuses it")
+        else:
+            self.assertEqual(ours, realms(tree))
+        self.client.send("SET_POSITION_CREDENTIAL", {"Id": 7, "Order": 0})
+        self.client.wait_event("GET_ALL_CREDENTIAL_LIST")
+        saved = self.file.read_bytes()
+        if tree is None:
+            self.assertEqual(saved, content, "a file that can't be read was changed")
+        else:
+            again = read_by_other(saved)
+            self.assertIsNotNone(again, saved)
+            self.assertEqual(realms(again), realms(tree))
+
+    def test_a_corpus(self):
+        for content in CORPUS:
+            with self.subTest(content[:200]):
+                self.check(content)
+
+    def test_random_damage(self):
+        rng = random.Random(SEED)
+        for number in range(MUTANTS):
+            content = mutant(rng)
+            with self.subTest(seed=SEED, number=number, content=content):
+                self.check(content)
+
+
+if __name__ == "__main__":
+    unittest.main()
