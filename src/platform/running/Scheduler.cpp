@@ -120,7 +120,7 @@ bool Scheduler::releaseNextDue(Duration target) {
 void Scheduler::finishAdvances(Duration target) {
     moveClockTo(target);
     while (!m_advances.empty() && m_advances.begin()->first <= target) {
-        Waiter* waiter = m_advances.begin()->second;
+        Waiter* waiter = m_advances.begin()->second.waiter;
         m_advances.erase(m_advances.begin());
         if (waiter != nullptr) release(*waiter, 0);
     }
@@ -130,7 +130,7 @@ void Scheduler::finishAdvances(Duration target) {
 bool Scheduler::advance(Duration span) {
     Lock lock(m_mutex);
     Waiter waiter{{}, std::nullopt};
-    const auto request = m_advances.emplace(nowLocked() + span, &waiter);
+    const auto request = m_advances.emplace(nowLocked() + span, Advance{++m_nextSequence, &waiter});
     threadRests();
     const RealTime limit = std::chrono::steady_clock::now() + kRestLimit;
     while (!waiter.isReleased) {
@@ -144,7 +144,19 @@ bool Scheduler::advance(Duration span) {
 
 void Scheduler::requestAdvance(Duration span) {
     const Lock lock(m_mutex);
-    m_advances.emplace(nowLocked() + span, nullptr);
+    m_advances.emplace(nowLocked() + span, Advance{++m_nextSequence, nullptr});
+}
+
+std::uint64_t Scheduler::beginJoin(Duration limit) {
+    const Lock lock(m_mutex);
+    const std::uint64_t id = ++m_nextSequence;
+    if (m_speed <= 0.0) m_advances.emplace(nowLocked() + limit, Advance{id, nullptr});
+    return id;
+}
+
+void Scheduler::endJoin(std::uint64_t id) {
+    const Lock lock(m_mutex);
+    std::erase_if(m_advances, [id](const auto& advance) { return advance.second.id == id; });
 }
 
 Duration Scheduler::now() {

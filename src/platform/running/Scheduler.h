@@ -50,9 +50,19 @@ public:
     bool advance(Duration span);
     void requestAdvance(Duration span);
 
+    /// While somebody waits for the end of a thread, a clock that stands still must not hold that thread in a
+    /// sleep: time moves on, at most by this, until endJoin().
+    std::uint64_t beginJoin(Duration limit);
+    void endJoin(std::uint64_t id);
+
 private:
     using Lock = std::unique_lock<std::mutex>;
     using RealTime = std::chrono::steady_clock::time_point;
+    /// A wish to move the clock on, and who waits until it has been fulfilled; null: nobody.
+    struct Advance {
+        std::uint64_t id;
+        Waiter* waiter;
+    };
     using DeadlineKey = std::pair<Duration, std::uint64_t>;
 
     Duration nowLocked() const;
@@ -71,7 +81,7 @@ private:
     int m_atWork = 1;  // the main thread
     std::uint64_t m_nextSequence = 0;
     std::map<DeadlineKey, Waiter*> m_deadlines;
-    std::multimap<Duration, Waiter*> m_advances;
+    std::multimap<Duration, Advance> m_advances;
 
     double m_speed = 1.0;
     RealTime m_realReference = std::chrono::steady_clock::now();

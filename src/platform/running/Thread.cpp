@@ -10,6 +10,18 @@
 
 namespace vexa::platform {
 
+namespace {
+
+bool waitForEnd(Event& ended, Timeout limit) {
+    if (!limit) return ended.wait();
+    const std::uint64_t id = Scheduler::get().beginJoin(*limit);
+    const bool hasEnded = ended.wait(limit);
+    Scheduler::get().endJoin(id);
+    return hasEnded;
+}
+
+}  // namespace
+
 struct Thread::State {
     std::thread thread = {};
     std::atomic<std::thread::id> id = {};
@@ -43,7 +55,7 @@ bool Thread::isCurrent() const {
 }
 
 bool Thread::join(Timeout limit) {
-    if (!m_state->ended.wait(limit)) return false;
+    if (!waitForEnd(m_state->ended, limit)) return false;
     if (m_state->thread.joinable()) m_state->thread.join();
     return true;
 }

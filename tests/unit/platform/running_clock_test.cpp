@@ -1,0 +1,50 @@
+#include <gtest/gtest.h>
+
+#include <atomic>
+
+#include "platform/ClockControl.h"
+#include "platform/Event.h"
+#include "platform/Thread.h"
+
+namespace vexa::platform {
+namespace {
+
+using namespace std::chrono_literals;
+
+// Otherwise a service whose clock stands still could not be stopped while a thread of it sleeps.
+TEST(RunningClock, AJoinWithALimitMovesAStandingClockOnToTheEndOfTheThread) {
+    setClockSpeed(0);
+    const Duration start = now();
+    Thread sleeper;
+    ASSERT_TRUE(sleeper.start("sleeper", [] { sleepFor(10s); }));
+    EXPECT_TRUE(sleeper.join(10s));
+    EXPECT_EQ(now() - start, 10s);
+    Event never(Reset::Auto);
+    EXPECT_FALSE(never.wait(0ms));
+    EXPECT_EQ(now() - start, 10s);
+}
+
+TEST(RunningClock, AJoinThatGivesUpHasMovedTheClockByItsLimit) {
+    setClockSpeed(0);
+    const Duration start = now();
+    Event mayEnd(Reset::Auto);
+    Thread worker;
+    ASSERT_TRUE(worker.start("worker", [&] { mayEnd.wait(); }));
+    EXPECT_FALSE(worker.join(3s));
+    EXPECT_EQ(now() - start, 3s);
+    mayEnd.set();
+    EXPECT_TRUE(worker.join());
+}
+
+TEST(RunningClock, RunsAsFastAsItIsTold) {
+    setClockSpeed(10000);
+    const Duration start = now();
+    sleepFor(20s);
+    EXPECT_GE(now() - start, 20s);
+    setClockSpeed(0);
+    const Duration standing = now();
+    EXPECT_EQ(now(), standing);
+}
+
+}  // namespace
+}  // namespace vexa::platform
