@@ -7,15 +7,22 @@
 namespace vexa::client {
 
 CredentialSession::CredentialSession(const HotspotOptions& options)
-    : m_options(options),
-      m_number(options.port.find()),
-      m_port(m_number, m_signals, options.limit()),
-      m_store(m_port) {}
+    : m_options(options), m_number(options.port.find()) {
+    connect();
+}
 
+void CredentialSession::connect() {
+    m_store.reset();
+    m_port.emplace(m_number, m_signals, m_options.limit());
+    m_store.emplace(*m_port);
+}
+
+// The first connection has heard what was answered to those before us; a new one hears only what comes now.
 CredentialStore& CredentialSession::begin() {
     m_turn.emplace(m_number, m_signals, m_options.limit());
-    m_store.read();
-    return m_store;
+    connect();
+    m_store->read();
+    return *m_store;
 }
 
 void CredentialSession::report(const std::string& verb, const std::string& sentence,

@@ -11,7 +11,8 @@
 
 namespace vexa::client {
 
-/// A command that changes credentials: connected from the start, and from begin() on the only one.
+/// A command that changes credentials: it knows from the start that there is a service, and from begin() on
+/// it is the only one that talks to it of changes.
 class CredentialSession {
 public:
     explicit CredentialSession(const HotspotOptions& options);
@@ -26,12 +27,14 @@ public:
                 std::size_t position) const;
 
 private:
+    void connect();
+
     HotspotOptions m_options;
     std::uint16_t m_number;
     Signals m_signals;
-    HotspotPort m_port;
-    CredentialStore m_store;
     std::optional<ChangeTurn> m_turn;
+    std::optional<HotspotPort> m_port;
+    std::optional<CredentialStore> m_store;
 };
 
 }  // namespace vexa::client

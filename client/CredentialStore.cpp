@@ -14,6 +14,7 @@ namespace {
 
 constexpr const char* kListEvent = "GET_ALL_CREDENTIAL_LIST";
 constexpr const char* kNoList = "the service tells of no credentials: it has no adapter";
+constexpr const char* kNotKnown = "; whether the change was made is not known";
 constexpr const char* kUnknownReason = "the service refused it; its log may say why";
 
 std::string idData(int id) {
@@ -122,8 +123,10 @@ bool CredentialStore::change(const std::string& command, const std::string& data
         });
         if (!answer.payload) throw ClientError(kNoList);
         return answer.isAccepted;
+    } catch (const StoppedByUser& error) {
+        throw StoppedByUser(error.what() + std::string(kNotKnown));
     } catch (const NoAnswer& error) {
-        throw ClientError(error.what() + std::string("; whether the change was made is not known"));
+        throw NoAnswer(error.what() + std::string(kNotKnown));
     }
 }
 

@@ -1,23 +1,64 @@
+#include <json/value.h>
+
 #include <CLI/CLI.hpp>
+#include <iostream>
 #include <memory>
 
 #include "client/ClientError.h"
 #include "client/Commands.h"
+#include "client/CredentialText.h"
+#include "client/DemoCredentials.h"
+#include "client/JsonLine.h"
 #include "client/MachineFolder.h"
 #include "client/ServiceParent.h"
+#include "client/SpectralText.h"
 #include "client/SpectrumWatch.h"
+#include "client/Text.h"
 
 namespace vexa::client {
 
 namespace {
 
 constexpr int kDefaultSeconds = 20;
+constexpr std::chrono::seconds kAnswerLimit{10};
 
 struct DemoOptions {
     int seconds = kDefaultSeconds;
     std::string service;
     bool json = false;
 };
+
+SpectrumOutput::Form formOf(const DemoOptions& options) {
+    return options.json ? SpectrumOutput::Form::Json : SpectrumOutput::Form::Readable;
+}
+
+std::vector<std::string> credentialLines(const CredentialList& list, bool json) {
+    if (json) {
+        Json::Value object(Json::objectValue);
+        object["credentials"] = credentialsJson(list, Passwords::Hidden);
+        return {jsonLine(object)};
+    }
+    auto lines = credentialTable(list, Passwords::Hidden);
+    lines.insert(lines.begin(),
+                 "Stored " + counted(list.size(), "credential") + ", in the order of priority:");
+    return lines;
+}
+
+CredentialList storedCredentials(const ServicePorts& ports, Signals& signals) {
+    HotspotPort hotspot(ports.hs20, signals, kAnswerLimit);
+    return storeDemoCredentials(hotspot);
+}
+
+/// False if the user has ended it before there was anything to see.
+bool showAll(const DemoOptions& options, const ServicePorts& ports, Signals& signals) try {
+    const auto end = std::chrono::steady_clock::now() + std::chrono::seconds(options.seconds);
+    SpectrumOutput output(formOf(options), credentialLines(storedCredentials(ports, signals), options.json));
+    SpectralScan scan(ports.sa);
+    watchSpectrum(scan, signals, output, end);
+    return true;
+} catch (const StoppedByUser&) {
+    return false;
+}
 
 int runDemo(const DemoOptions& options) {
     Signals signals;
@@ -30,21 +71,19 @@ int runDemo(const DemoOptions& options) {
     ServiceParent parent(request, stop);
     const auto state = parent.waitUntilReady();
     if (state == ServiceParent::State::Ended) return kExitFailed;
-    if (state == ServiceParent::State::Ready) {
-        SpectralScan scan(parent.ports().sa);
-        watchSpectrum(scan, signals,
-                      options.json ? SpectrumOutput::Form::Json : SpectrumOutput::Form::Readable,
-                      std::chrono::seconds(options.seconds));
-    }
-    return parent.stop();
+    if (state == ServiceParent::State::Ready && showAll(options, parent.ports(), signals))
+        return parent.stop();
+    parent.stop();
+    std::cout << (options.json ? summaryJson(SpectralView()) : summaryText(SpectralView())) << '\n';
+    return kExitOk;
 }
 
 }  // namespace
 
 void addDemoCommand(CLI::App& app, int& exitCode) {
     auto options = std::make_shared<DemoOptions>();
-    CLI::App* command =
-        app.add_subcommand("demo", "Start a service of its own and show the spectrum for a while");
+    CLI::App* command = app.add_subcommand(
+        "demo", "Start a service of its own, store credentials and show the spectrum for a while");
     command->add_option("--seconds", options->seconds, "How long; default 20")
         ->type_name("N")
         ->check(CLI::Range(1, 86400));

@@ -44,10 +44,10 @@ void print(const std::vector<LogFiles::Line>& lines, std::size_t from, bool json
         if (json) {
             Json::Value object(Json::objectValue);
             object["file"] = lines[i].file;
-            object["line"] = printable(lines[i].text);
+            object["line"] = asUtf8(lines[i].text);
             std::cout << jsonLine(object) << '\n';
         } else {
-            std::cout << printable(lines[i].text) << '\n';
+            std::cout << printable(lines[i].text, Tabs::Kept) << '\n';
         }
     }
     std::cout << std::flush;

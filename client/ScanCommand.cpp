@@ -73,9 +73,8 @@ int runScan(const ScanOptions& options) {
     Signals signals;
     SpectralScan scan(options.port.find());
     if (options.watch) {
-        watchSpectrum(scan, signals,
-                      options.json ? SpectrumOutput::Form::Json : SpectrumOutput::Form::Readable,
-                      std::nullopt);
+        SpectrumOutput output(options.json ? SpectrumOutput::Form::Json : SpectrumOutput::Form::Readable);
+        watchSpectrum(scan, signals, output, std::nullopt);
         return kExitOk;
     }
     scanOnce(scan, signals, seconds(options.timeout));

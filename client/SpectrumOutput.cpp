@@ -9,6 +9,7 @@
 #include "client/Signals.h"
 #include "client/SpectralPicture.h"
 #include "client/SpectralText.h"
+#include "client/Text.h"
 
 namespace vexa::client {
 
@@ -26,11 +27,21 @@ std::string secondsSince(steady_clock::time_point start) {
     return out.str();
 }
 
+void printLines(const std::vector<std::string>& lines) {
+    for (const auto& line : lines)
+        std::cout << line << '\n';
+    std::cout << std::flush;
+}
+
 }  // namespace
 
-SpectrumOutput::SpectrumOutput(Form form)
-    : m_form(form), m_start(steady_clock::now()), m_nextDrawing(m_start) {
-    if (form == Form::Readable && TerminalScreen::isUsable()) m_screen.emplace();
+SpectrumOutput::SpectrumOutput(Form form, std::vector<std::string> side)
+    : m_form(form), m_side(std::move(side)), m_start(steady_clock::now()), m_nextDrawing(m_start) {
+    if (form == Form::Readable && TerminalScreen::isUsable()) {
+        m_screen.emplace();
+    } else {
+        printLines(m_side);
+    }
 }
 
 void SpectrumOutput::show(const std::vector<SpectralScan::Told>& told, const SpectralView& view) {
@@ -66,14 +77,18 @@ void SpectrumOutput::finish(const SpectralView& view) {
     if (m_screen) {
         const auto lines = picture(view);
         m_screen.reset();
-        for (const auto& line : lines)
-            std::cout << line << '\n';
+        printLines(lines);
     }
     std::cout << (m_form == Form::Json ? summaryJson(view) : summaryText(view)) << std::endl;
 }
 
 std::vector<std::string> SpectrumOutput::picture(const SpectralView& view) const {
-    return drawSpectrum(view, {m_screen->columns(), TerminalScreen::wantsColour(), TerminalScreen::isUtf8()});
+    auto lines =
+        drawSpectrum(view, {m_screen->columns(), TerminalScreen::wantsColour(), TerminalScreen::isUtf8()});
+    if (!m_side.empty()) lines.emplace_back();
+    for (const auto& line : m_side)
+        lines.push_back(cutToColumns(line, m_screen->columns() - 1));
+    return lines;
 }
 
 void SpectrumOutput::handleSignal(int signal) {

@@ -2,6 +2,7 @@
 
 #include <chrono>
 #include <optional>
+#include <string>
 #include <vector>
 
 #include "client/SpectralScan.h"
@@ -14,7 +15,8 @@ class SpectrumOutput {
 public:
     enum class Form { Readable, Json };
 
-    explicit SpectrumOutput(Form form);
+    /// `side`: lines that stand under the picture, or before the first event.
+    explicit SpectrumOutput(Form form, std::vector<std::string> side = {});
 
     void show(const std::vector<SpectralScan::Told>& told, const SpectralView& view);
 
@@ -41,6 +43,7 @@ private:
     std::vector<std::string> picture(const SpectralView& view) const;
 
     Form m_form;
+    std::vector<std::string> m_side;
     std::optional<TerminalScreen> m_screen;
     std::chrono::steady_clock::time_point m_start;
     std::chrono::steady_clock::time_point m_nextDrawing;

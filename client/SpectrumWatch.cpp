@@ -12,28 +12,16 @@ using std::chrono::steady_clock;
 
 namespace {
 
-/// The moment at which the watch is over; without a limit it never comes.
-class Deadline {
-public:
-    explicit Deadline(std::optional<milliseconds> limit) : m_limited(limit.has_value()) {
-        m_end = steady_clock::now() + limit.value_or(milliseconds(0));
-    }
+bool isOver(std::optional<steady_clock::time_point> end) {
+    return end && steady_clock::now() >= *end;
+}
 
-    bool isOver() const { return m_limited && steady_clock::now() >= m_end; }
-
-    /// For poll(): the shorter of the wait for the end and the wait for the next drawing, -1 if there is
-    /// none.
-    int pollTimeout(std::optional<milliseconds> redraw) const {
-        if (!m_limited) return redraw ? static_cast<int>(redraw->count()) : -1;
-        const auto left =
-            std::max(milliseconds(0), std::chrono::ceil<milliseconds>(m_end - steady_clock::now()));
-        return static_cast<int>(std::min(left, redraw.value_or(left)).count());
-    }
-
-private:
-    bool m_limited;
-    steady_clock::time_point m_end;
-};
+/// For poll(): the shorter of the wait for the end and the wait for the next drawing, -1 if there is none.
+int pollTimeout(std::optional<steady_clock::time_point> end, std::optional<milliseconds> redraw) {
+    if (!end) return redraw ? static_cast<int>(redraw->count()) : -1;
+    const auto left = std::max(milliseconds(0), std::chrono::ceil<milliseconds>(*end - steady_clock::now()));
+    return static_cast<int>(std::min(left, redraw.value_or(left)).count());
+}
 
 bool stopAsked(Signals& signals, SpectrumOutput& output) {
     while (const auto signal = signals.take()) {
@@ -45,17 +33,15 @@ bool stopAsked(Signals& signals, SpectrumOutput& output) {
 
 }  // namespace
 
-void watchSpectrum(SpectralScan& scan, Signals& signals, SpectrumOutput::Form form,
-                   std::optional<milliseconds> limit) {
-    SpectrumOutput output(form);
-    const Deadline deadline(limit);
+void watchSpectrum(SpectralScan& scan, Signals& signals, SpectrumOutput& output,
+                   std::optional<steady_clock::time_point> end) {
     scan.start();
-    while (!output.isGone() && !deadline.isOver()) {
+    while (!output.isGone() && !isOver(end)) {
         const auto redraw = output.refresh(scan.view());
         std::array<pollfd, 3> watched{{{scan.descriptor(), scan.events(), 0},
                                        {signals.descriptor(), POLLIN, 0},
                                        {output.keyDescriptor(), POLLIN, 0}}};
-        ::poll(watched.data(), watched.size(), deadline.pollTimeout(redraw));
+        ::poll(watched.data(), watched.size(), pollTimeout(end, redraw));
         if (stopAsked(signals, output)) break;
         if (watched[2].revents != 0 && output.isQuitKey()) break;
         output.show(scan.process(), scan.view());

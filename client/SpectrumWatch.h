@@ -9,9 +9,9 @@
 
 namespace vexa::client {
 
-/// Scans and shows what is told until the user has had enough, or for as long as `limit` says; then the scan
-/// is stopped and the last word printed. Throws ClientError when the connection is lost.
-void watchSpectrum(SpectralScan& scan, Signals& signals, SpectrumOutput::Form form,
-                   std::optional<std::chrono::milliseconds> limit);
+/// Scans and shows what is told until the user has had enough, or until `end`; then the scan is stopped and
+/// the last word printed. Throws ClientError when the connection is lost.
+void watchSpectrum(SpectralScan& scan, Signals& signals, SpectrumOutput& output,
+                   std::optional<std::chrono::steady_clock::time_point> end);
 
 }  // namespace vexa::client

@@ -92,19 +92,22 @@ std::size_t utf16Length(std::string_view text) {
     return length;
 }
 
-std::string printable(std::string_view text) {
-    const bool utf8 = isUtf8(text);
+std::string asUtf8(std::string_view text) {
+    if (isUtf8(text)) return std::string(text);
+    std::string converted;
+    for (const char byte : text)
+        converted += fromLatin1(static_cast<unsigned char>(byte));
+    return converted;
+}
+
+std::string printable(std::string_view text, Tabs tabs) {
+    const std::string whole = asUtf8(text);
+    std::string_view rest = whole;
     std::string shown;
-    while (!text.empty()) {
-        const auto point =
-            utf8 ? *firstCodePoint(text) : CodePoint{static_cast<unsigned char>(text.front()), 1};
-        if (isControl(point.value)) {
-            shown += escaped(point.value);
-        } else {
-            shown += utf8 ? std::string(text.substr(0, point.bytes))
-                          : fromLatin1(static_cast<unsigned char>(text.front()));
-        }
-        text.remove_prefix(point.bytes);
+    while (const auto point = firstCodePoint(rest)) {
+        const bool isKept = !isControl(point->value) || (point->value == U'\t' && tabs == Tabs::Kept);
+        shown += isKept ? std::string(rest.substr(0, point->bytes)) : escaped(point->value);
+        rest.remove_prefix(point->bytes);
     }
     return shown;
 }

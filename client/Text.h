@@ -13,9 +13,13 @@ bool isUtf8(std::string_view text);
 /// The length of UTF-8 text as the service counts it: in UTF-16 units.
 std::size_t utf16Length(std::string_view text);
 
-/// UTF-8 text that a terminal shows and that does nothing to it: control characters are written as \xNN, and
-/// what is no UTF-8 is taken for Latin-1.
-std::string printable(std::string_view text);
+/// The text itself, or if it is no UTF-8, the text that it is in Latin-1.
+std::string asUtf8(std::string_view text);
+
+enum class Tabs { Escaped, Kept };
+
+/// UTF-8 text that a terminal shows and that does nothing to it: control characters are written as \xNN.
+std::string printable(std::string_view text, Tabs tabs = Tabs::Escaped);
 
 /// How many columns of a terminal printable UTF-8 text takes.
 int columnsOf(std::string_view text);

@@ -18,6 +18,7 @@ from harness import PATIENCE, Program, children_of, clean_environment, is_runnin
 
 SUMMARY = re.compile(r"Seen: (\d+) channels, (\d+) events, busiest channel (\d+) \(congestion (\d+)\)")
 ENTERED, LEFT = b"\x1b[?1049h", b"\x1b[?1049l"
+STORED = ["Airport Lounge", "Work", "City Wi-Fi"]
 COLOUR = re.compile(rb"\x1b\[3\dm")
 
 
@@ -63,12 +64,23 @@ class InPipe(DemoTest):
         demo = self.demo("--seconds", "3")
         demo.wait()
         events = int(SUMMARY.fullmatch(demo.lines[-1]).group(2))
-        self.assertEqual(events, len(demo.lines) - 1)
+        self.assertEqual(events, sum("  channel " in line or " channels: " in line or "  radio " in line for line in demo.lines))
+
+    def test_credentials_are_stored_before_the_spectrum(self):
+        demo = self.demo("--seconds", "1")
+        demo.wait()
+        told, heading, *rows = demo.lines[:5]
+        self.assertRegex(told, "Stored 3 credentials")
+        starts = [heading.index(word) for word in ("Name", "Realm")]
+        self.assertEqual([row[slice(*starts)].strip() for row in rows], STORED)
+        self.assertNotIn("only for the demo", "".join(demo.lines))
+        self.assertRegex(demo.lines[5], "radio on|channels")
 
     def test_json_lines(self):
         demo = self.demo("--seconds", "3", "--json")
         self.assertEqual(demo.wait(), 0)
-        *events, summary = map(json.loads, demo.lines)
+        stored, *events, summary = map(json.loads, demo.lines)
+        self.assertEqual([entry["name"] for entry in stored["credentials"]], STORED)
         self.assertTrue(all(event["Source"] == "SpectralAnalyser" for event in events))
         self.assertEqual(summary["events"], len(events))
         self.assertGreater(summary["busiest"]["congestion"], 0)
@@ -83,6 +95,15 @@ class InPipe(DemoTest):
                 self.assert_summary(demo.lines[-1])
                 self.assertFalse(is_running(service))
                 self.assert_nothing_is_left()
+
+    def test_one_that_is_stopped_at_once_is_a_good_end_too(self):
+        for number in (signal.SIGINT, signal.SIGTERM):
+            demo = self.demo("--seconds", "600")
+            wait_until(lambda: os.listdir(self.temporary), "its machine")
+            self.assertEqual(demo.stop(number), 0)
+            self.assertTrue(demo.lines[-1].startswith("Seen: "), demo.lines)
+            self.assertEqual(demo.errors, [])
+            self.assert_nothing_is_left()
 
     def test_it_ends_when_nobody_reads_any_more(self):
         reader, writer = os.pipe()
@@ -181,6 +202,8 @@ class InTerminal(DemoTest):
         terminal.read_until("█".encode())
         self.assertNotEqual(terminal.settings(), terminal.before)
         self.assertRegex(terminal.screen, COLOUR)
+        for name in STORED:
+            self.assertIn(name.encode(), terminal.screen)
         terminal.press(b"x")
         terminal.press(b"q")
         self.assert_good_end(terminal)
