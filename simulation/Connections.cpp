@@ -177,7 +177,6 @@ Ticket Connections::take(const ConnectionStep& step, DWORD reason) {
     std::function<void(Bytes&)> before;
     if (step.state) {
         m_link.state = *step.state;
-        if (m_link.state == wlan_interface_state_disconnected) m_link.channel = 0;
         ++m_untold;
         before = [this, link = m_link](Bytes&) { show(link); };
     }

@@ -61,7 +61,7 @@ DWORD queryInterfaceValue(Machine& machine, std::size_t adapter, WLAN_INTF_OPCOD
             answer = bytesOf(machine.interfaceState(adapter));
             return ERROR_SUCCESS;
         case wlan_intf_opcode_channel_number:
-            answer = bytesOf(machine.connections().shown(adapter).channel);
+            answer = bytesOf(channelInUse(machine.connections().shown(adapter)));
             return ERROR_SUCCESS;
         case wlan_intf_opcode_current_connection:
             return currentConnection(machine, adapter, answer);

@@ -34,6 +34,12 @@ bool isUp(const Link& link) {
            link.state == wlan_interface_state_authenticating;
 }
 
+ULONG channelInUse(const Link& link) {
+    const bool isInUse =
+        link.state == wlan_interface_state_connected || link.state == wlan_interface_state_disconnecting;
+    return isInUse ? link.channel : 0;
+}
+
 Bytes connectionMessage(const Link& link, DWORD reason) {
     WLAN_CONNECTION_NOTIFICATION_DATA block{};
     block.wlanConnectionMode = link.mode;

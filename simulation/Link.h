@@ -17,11 +17,14 @@ struct Link {
     std::u16string profileName;
     Bytes ssid;
     Bytes bssid = Bytes(sizeof(DOT11_MAC_ADDRESS));  ///< Zero while no BSS is known.
-    ULONG channel = 0;                               ///< Of a connection; else 0.
+    ULONG channel = 0;                               ///< Of that BSS.
 };
 
 /// Whether there is something to ask about: an attempt or a connection.
 bool isUp(const Link& link);
+
+/// The channel of a connection until it has ended; else 0.
+ULONG channelInUse(const Link& link);
 
 /// The data of the ACM notifications of a connection.
 Bytes connectionMessage(const Link& link, DWORD reason);
