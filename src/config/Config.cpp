@@ -111,9 +111,11 @@ void Config::deriveDumpFilePath() {
     }
     std::wstring name = cutToUtf16Units(m_dumpFilePath, kMaxDumpName);
     name.resize(std::min(name.find(L".txt"), name.size()));
+    const std::wstring beginning = folder + name + L"_" + user + L"_";
     for (int number = 0; number < kDumpNumbers; ++number) {
-        const std::wstring candidate = cutToUtf16Units(
-            folder + name + L"_" + user + L"_" + std::to_wstring(number) + L".txt", kMaxDumpPath);
+        std::wstring whole = beginning;
+        whole.append(std::to_wstring(number)).append(L".txt");
+        const std::wstring candidate = cutToUtf16Units(whole, kMaxDumpPath);
         if (platform::canOpenFile(candidate)) continue;
         m_dumpFilePath = candidate;
         return;

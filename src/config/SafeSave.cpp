@@ -46,8 +46,12 @@ bool isTemporaryOf(const std::wstring& name, const std::wstring& candidate) {
 
 void removeLeftovers(const std::wstring& path) {
     const auto [folder, name] = split(path);
-    for (const std::wstring& candidate : platform::filesIn(folder))
-        if (isTemporaryOf(name, candidate)) NewFile::removeIfAbandoned(folder + L"\\" + candidate);
+    for (const std::wstring& candidate : platform::filesIn(folder)) {
+        if (!isTemporaryOf(name, candidate)) continue;
+        std::wstring leftover = folder;
+        leftover.append(L"\\").append(candidate);
+        NewFile::removeIfAbandoned(leftover);
+    }
 }
 
 std::optional<NewFile> createTemporary(const std::wstring& path) {

@@ -30,7 +30,7 @@ std::wstring profileNameOf(const WLAN_CONNECTION_NOTIFICATION_DATA& data) {
 std::wstring logReason(const WLAN_CONNECTION_NOTIFICATION_DATA& data) {
     WCHAR text[kReasonCapacity] = {};
     WlanReasonCodeToString(data.wlanReasonCode, kReasonCapacity, text, nullptr);
-    const std::wstring reason = fromWlanText({text, kReasonCapacity});
+    std::wstring reason = fromWlanText({text, kReasonCapacity});
     Log(3, "Reason code desc=%s", narrowByLocale(reason).text.c_str());
     return reason;
 }

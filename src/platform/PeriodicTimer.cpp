@@ -6,9 +6,9 @@
 
 namespace vexa::platform {
 
-PeriodicTimer::PeriodicTimer(std::string name, Duration period, std::function<void()> callback)
+PeriodicTimer::PeriodicTimer(const std::string& name, Duration period, std::function<void()> callback)
     : m_period(period), m_callback(std::move(callback)), m_deadline(now() + period) {
-    m_thread.start(std::move(name), [this] { run(); });
+    m_thread.start(name, [this] { run(); });
 }
 
 PeriodicTimer::~PeriodicTimer() {

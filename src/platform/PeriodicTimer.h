@@ -14,7 +14,7 @@ namespace vexa::platform {
 /// overlap.
 class PeriodicTimer {
 public:
-    PeriodicTimer(std::string name, Duration period, std::function<void()> callback);
+    PeriodicTimer(const std::string& name, Duration period, std::function<void()> callback);
 
     /// Waits for a callback that is running. REQUIRES: the caller holds no lock that the callback takes.
     ~PeriodicTimer();

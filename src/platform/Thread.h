@@ -17,7 +17,7 @@ public:
     Thread& operator=(Thread&&) noexcept = default;
 
     /// Runs `body` on a new thread; `name` is for debuggers and reports. False if none could be created.
-    bool start(std::string name, std::function<void()> body);
+    bool start(const std::string& name, std::function<void()> body);
 
     bool isStarted() const { return m_state != nullptr; }
     bool isCurrent() const;

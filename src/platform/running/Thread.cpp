@@ -32,7 +32,7 @@ Thread::~Thread() {
     if (m_state && m_state->thread.joinable()) join();
 }
 
-bool Thread::start(std::string /*name*/, std::function<void()> body) {
+bool Thread::start(const std::string& /*name*/, std::function<void()> body) {
     m_state = std::make_shared<State>();
     Scheduler::get().beginWork();
     try {

@@ -16,9 +16,9 @@ Thread::~Thread() {
     if (m_state && !m_state->isJoined) join();
 }
 
-bool Thread::start(std::string name, std::function<void()> body) {
+bool Thread::start(const std::string& name, std::function<void()> body) {
     m_state = std::make_shared<State>();
-    m_state->task = Scheduler::get().start(std::move(name), [state = m_state, body = std::move(body)] {
+    m_state->task = Scheduler::get().start(name, [state = m_state, body = std::move(body)] {
         body();
         state->ended.set();
     });
