@@ -1,6 +1,7 @@
 #include "connection/NetworkRetryHelper.h"
 
 #include <algorithm>
+#include <set>
 
 #include "base/DiagnosticLog.h"
 #include "config/CredentialTable.h"
@@ -102,16 +103,19 @@ void NetworkRetryHelper::resetAllNumRetries() {
         entry.numRetries = 0;
 }
 
+// Names are compared as everywhere: it is enough that one begins with what is looked for. In order, all of
+// those follow the place where it would stand itself.
 void NetworkRetryHelper::eraseUnavailableNetworks(const Hs20NetworkList& networks) {
-    Entries available;
-    for (Cred2SsidEntry& entry : m_cred2ssid) {
-        if (networks.findBySsid(entry.ssid) != nullptr)
-            available.push_back(std::move(entry));
-        else
-            Log(3, "BSS with ssid=%s is no longer available, erase the corresponding retry history",
-                entry.ssid.c_str());
-    }
-    m_cred2ssid = std::move(available);
+    std::set<std::string_view> names;
+    for (const Hs20Network* network : networks.copyPointers())
+        names.emplace(network->m_ssid.data(), network->m_ssid.size());
+    std::erase_if(m_cred2ssid, [&](const Cred2SsidEntry& entry) {
+        const auto next = names.lower_bound(entry.ssid);
+        if (!entry.ssid.empty() && next != names.end() && next->starts_with(entry.ssid)) return false;
+        Log(3, "BSS with ssid=%s is no longer available, erase the corresponding retry history",
+            entry.ssid.c_str());
+        return true;
+    });
 }
 
 }  // namespace vexa

@@ -1,0 +1,51 @@
+#pragma once
+
+#include <cstdint>
+#include <random>
+#include <string>
+#include <vector>
+
+#include "engine/World.h"
+
+namespace vexa::test {
+
+/// A random walk through what can happen to a machine and its service: the air, the adapter, connections,
+/// faults, notifications of any form, and the commands of both ports. It keeps account of the networks in
+/// range, so that the list shown can be held to the list last reported.
+class Storm {
+public:
+    /// The scenario that a storm needs. `speed` as in a scenario file.
+    static std::string scenario(double speed);
+
+    Storm(World& world, std::uint64_t seed);
+
+    /// One action of the machine and some commands of its clients.
+    void step();
+
+    /// Brings the adapter, its radio and the hotspot function back, has the networks reported, and compares
+    /// what the client is shown. Gives what is wrong, empty if nothing is.
+    std::string check();
+
+private:
+    struct Bss {
+        std::string name;
+        bool isVisible = true;
+        bool isReported = true;
+    };
+
+    bool chance(unsigned oneIn) { return m_random() % oneIn == 0; }
+    std::string changeOfTheAir();
+    std::string action();
+    void sendCommands();
+    std::string lastListNames();
+    std::string namesInRange() const;
+
+    World& m_world;
+    std::mt19937_64 m_random;
+    std::vector<Bss> m_air;
+};
+
+/// A whole storm of this many steps, with a check now and then. Gives what is wrong.
+std::string storm(World& world, std::uint64_t seed, int steps);
+
+}  // namespace vexa::test
