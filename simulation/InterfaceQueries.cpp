@@ -31,8 +31,9 @@ WLAN_RADIO_STATE radioState(Machine& machine, std::size_t adapter) {
 }
 
 DWORD currentConnection(Machine& machine, std::size_t adapter, Bytes& answer) {
-    const Link link = machine.connections().shown(adapter);
+    Link link = machine.connections().shown(adapter);
     if (!isUp(link)) return ERROR_INVALID_STATE;
+    link.state = machine.interfaceState(adapter);
     answer = connectionAttributes(link);
     return ERROR_SUCCESS;
 }

@@ -40,6 +40,20 @@ std::string fullPath(RegistryRoot root, const std::string& path) {
     return path.empty() ? name : std::string(name) + "\\" + path;
 }
 
+// What is there keeps its spelling: another case names the same.
+Json::Value& memberNoCase(Json::Value& object, const std::string& name) {
+    for (const std::string& present : object.getMemberNames()) {
+        if (equalsNoCase(present, name)) return object[present];
+    }
+    return object[name];
+}
+
+Json::Value& valuesOf(Json::Value& keys, const std::string& path) {
+    Json::Value& values = memberNoCase(keys, path);
+    if (!values.isObject()) values = Json::Value(Json::objectValue);
+    return values;
+}
+
 bool liesBelow(const std::string& key, const std::string& path) {
     return key.size() > path.size() && startsWithNoCase(key, path) && key[path.size()] == '\\';
 }
@@ -97,8 +111,7 @@ std::optional<std::string> MachineRegistry::value(RegistryRoot root, const std::
 bool MachineRegistry::setAutoConnect(const std::optional<std::string>& text) {
     const LockGuard<Mutex> lock(m_mutex);
     Json::Value keys = readContent();
-    Json::Value& values = keys[kProductKey];
-    if (!values.isObject()) values = Json::Value(Json::objectValue);
+    Json::Value& values = valuesOf(keys, kProductKey);
     if (text) {
         values[kAutoConnect] = *text;
     } else {
@@ -110,10 +123,7 @@ bool MachineRegistry::setAutoConnect(const std::optional<std::string>& text) {
 bool MachineRegistry::setNumber(const std::string& path, const std::string& name, std::uint32_t number) {
     const LockGuard<Mutex> lock(m_mutex);
     Json::Value keys = readContent();
-    Json::Value& values = keys[fullPath(RegistryRoot::CurrentUser, path)];
-    if (!values.isObject()) values = Json::Value(Json::objectValue);
-    if (values[name] == Json::Value(number)) return true;
-    values[name] = number;
+    memberNoCase(valuesOf(keys, fullPath(RegistryRoot::CurrentUser, path)), name) = number;
     return replaceFile(m_file, indentedJson(keys));
 }
 

@@ -181,6 +181,9 @@ TEST(ConnectionCalls, TheCurrentConnectionIsAnsweredWhileThereIsOne) {
               "01000000"
               "06000000"
               "04000000");
+    station.perform("{'do': 'interfaceState', 'value': 3}");
+    ASSERT_EQ(station.query(wlan_intf_opcode_current_connection, answer), ERROR_SUCCESS);
+    EXPECT_EQ(at(answer, 0, 4), "03000000");
     station.disconnect();
     station.told();
     EXPECT_EQ(station.query(wlan_intf_opcode_current_connection, answer), ERROR_INVALID_STATE);

@@ -11,6 +11,7 @@
 #include "TestMachine.h"
 #include "platform/DebugOutput.h"
 #include "platform/PeerAccount.h"
+#include "platform/Session.h"
 #include "platform/TcpTable.h"
 #include "platform/simulated/MachineFolder.h"
 #include "simulation/OwnerFiles.h"
@@ -92,6 +93,13 @@ TEST(PeerAccount, KnowsOnlyConnectionsOfThisAccount) {
     EXPECT_TRUE(platform::isPeerOfSameAccount(connection.client.port(), connection.server.port()));
     EXPECT_FALSE(platform::isPeerOfSameAccount(connection.server.port(), connection.server.port()));
     EXPECT_FALSE(platform::isPeerOfSameAccount(connection.client.port(), connection.client.port()));
+}
+
+TEST(Session, IsActiveWhenTheMachinesIs) {
+    TestMachine machine("{'session': 'disconnected'}");
+    EXPECT_FALSE(platform::isSessionActive());
+    machine.ask("{'do': 'setSession', 'session': 'active'}");
+    EXPECT_TRUE(platform::isSessionActive());
 }
 
 TEST(DebugOutput, IsOneLineForEachCall) {

@@ -61,6 +61,26 @@ TEST(MachineRegistry, TheUsersChoiceIsKeptInTheFile) {
               R"({"HKEY_CURRENT_USER\\Software\\Korvane\\Vexa":{}})");
 }
 
+TEST(MachineRegistry, ANumberIsANumberInTheFile) {
+    TestMachine machine;
+    const auto content = [&] { return compactJson(machine.query("{'query': 'registry'}")); };
+    EXPECT_TRUE(platform::writeRegistryNumber("Software\\Korvane\\Vexa", "EapMethod", 2));
+    EXPECT_EQ(content(), R"({"HKEY_CURRENT_USER\\Software\\Korvane\\Vexa":{"EapMethod":2}})");
+    machine.ask("{'do': 'setRegistry', 'value': '0'}");
+    EXPECT_TRUE(platform::writeRegistryNumber("software\\korvane\\vexa", "eapmethod", 0xFFFFFFFF));
+    EXPECT_EQ(content(), R"({"HKEY_CURRENT_USER\\Software\\Korvane\\Vexa":{"EapMethod":4294967295,)"
+                         R"("IsHotSpotAutoConnect":"0"}})");
+    const auto key = RegistryKey::open(RegistryRoot::CurrentUser, "Software\\Korvane\\Vexa");
+    ASSERT_TRUE(key);
+    EXPECT_EQ(key->value("EapMethod", 5), "\xFF\xFF\xFF\xFF");
+}
+
+TEST(MachineRegistry, ANumberThatCanNotBeWrittenIsAFailure) {
+    TestMachine machine;
+    std::filesystem::create_directory(machine->folder() / "registry.json");
+    EXPECT_FALSE(platform::writeRegistryNumber("Software\\Korvane\\Vexa", "EapMethod", 2));
+}
+
 TEST(MachineRegistry, ReadsWhatOthersWroteToTheFile) {
     TestMachine machine;
     EXPECT_FALSE(RegistryKey::open(RegistryRoot::CurrentUser, "Software\\Korvane\\Vexa"));
