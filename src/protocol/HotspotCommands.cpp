@@ -21,6 +21,7 @@ using Action = bool (*)(Server& server, const Json::Value& data);
 struct Command {
     std::string_view id;
     Action act;
+    bool listsAlways = false;  // answers with the list of credentials whatever its data is
 };
 
 template <void (Server::*Send)()>
@@ -69,11 +70,11 @@ constexpr std::array<Command, 14> kCommands = {{
     {"SET_HOTSPOT_AUTO_CONNECT", autoConnect},
     {"GET_IS_CARD_IN", answer<&Server::SendCardState>},
     {"READ_CREDENTIAL_FROM_FILE", reload},
-    {"GET_ALL_CREDENTIAL_LIST", answer<&Server::SendCredentialList>},
-    {"ADD_CREDENTIAL", changeCredentials<addCredential>},
-    {"DELETE_CREDENTIAL", changeCredentials<deleteCredential>},
-    {"EDIT_CREDENTIAL", changeCredentials<editCredential>},
-    {"SET_POSITION_CREDENTIAL", changeCredentials<setCredentialPosition>},
+    {"GET_ALL_CREDENTIAL_LIST", answer<&Server::SendCredentialList>, true},
+    {"ADD_CREDENTIAL", changeCredentials<addCredential>, true},
+    {"DELETE_CREDENTIAL", changeCredentials<deleteCredential>, true},
+    {"EDIT_CREDENTIAL", changeCredentials<editCredential>, true},
+    {"SET_POSITION_CREDENTIAL", changeCredentials<setCredentialPosition>, true},
     {"CONNECT_NETWORK", withNetwork<&Server::connectNetworkByName>},
     {"DISCONNECT_NETWORK", withNetwork<&Server::disconnectNetworkByName>},
     {"GET_ALL_NETWORK_LIST", networkList},
@@ -96,10 +97,11 @@ void SAHotSpotPortlink::HandleCommand(const Json::Value& root) {
     if (!id) return logInvalidCommand("");
     const auto command = std::find_if(kCommands.begin(), kCommands.end(),
                                       [&](const Command& candidate) { return candidate.id == *id; });
+    if (command == kCommands.end()) return logInvalidCommand(*id);
     const auto dataText = readText(root, "Data");
-    if (command == kCommands.end() || !dataText) return logInvalidCommand(*id);
-    if (!command->act(*this, parseJsonText(*dataText)))
-        Log(6, "ERROR: Invalid data received from UI, command=%s", id->c_str());
+    if (dataText && command->act(*this, parseJsonText(*dataText))) return;
+    Log(6, "ERROR: Invalid data received from UI, command=%s", id->c_str());
+    if (!dataText && command->listsAlways) SendCredentialList();
 }
 
 }  // namespace vexa

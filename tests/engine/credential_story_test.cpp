@@ -144,6 +144,29 @@ TEST(Credentials, ACommandThatCannotBeCarriedOutChangesNothingAndStillTellsTheLi
     EXPECT_EQ(ending.text, "");
 }
 
+// Data comes as text. A client that sends it otherwise learns so by the list, and the log has one line of it.
+TEST(Credentials, DataThatIsNoTextIsTheSame) {
+    for (const char* const command : {"GET_ALL_CREDENTIAL_LIST", "ADD_CREDENTIAL", "EDIT_CREDENTIAL",
+                                      "DELETE_CREDENTIAL", "SET_POSITION_CREDENTIAL"}) {
+        const Ending ending = runStory(1, "{}", [&](World& world) {
+            const std::string before = list(world, "ADD_CREDENTIAL", ttlsData("a.example"));
+            std::string told;
+            for (const std::string data : {R"({"Id":1,"Order":0})", "7", "[]", "1.5"}) {
+                world.hotspot().sendRaw(std::string(R"({"CommandId":")") + command + R"(","Data":)" + data +
+                                        "}");
+                world.advance(0ms);
+                const auto events = world.hotspot().events();
+                told +=
+                    events.size() == 1 && events[0].id == "GET_ALL_CREDENTIAL_LIST" ? "list " : "no list ";
+            }
+            told += list(world, "GET_ALL_CREDENTIAL_LIST") == before ? "" : "changed ";
+            return told + count(world.log(), "ERROR: ");
+        });
+        EXPECT_TRUE(ending.isOrderly) << ending.errors;
+        EXPECT_EQ(ending.text, "list list list list 4 ") << command;
+    }
+}
+
 // A member that isn't there, is null or, for one of them, an empty container.
 TEST(Credentials, MissingMembersAreEmpty) {
     const char* const inputs[] = {
