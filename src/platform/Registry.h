@@ -36,7 +36,8 @@ private:
     std::unique_ptr<State> m_state;
 };
 
-/// Sets a number (REG_DWORD) in a key of the current user, which is created if it is missing. False if that fails.
+/// Sets a number (REG_DWORD) in a key of the current user, which is created if it is missing. False if that
+/// fails.
 bool writeRegistryNumber(const std::string& path, const std::string& name, std::uint32_t number);
 
 }  // namespace vexa::platform

@@ -133,7 +133,9 @@ RenameResult NewFile::rename(const std::wstring& to, Existing existing) {
     return RenameResult::Done;
 }
 
-void NewFile::remove() { ::unlink(m_state->path.c_str()); }
+void NewFile::remove() {
+    ::unlink(m_state->path.c_str());
+}
 
 // Its holder's lock ends with the holder.
 void NewFile::removeIfAbandoned(const std::wstring& path) {

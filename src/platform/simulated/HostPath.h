@@ -8,12 +8,12 @@
 
 namespace vexa::platform {
 
-/// The folder that all users of the simulated machine share, as its programs see it. On the host it lies in the
-/// machine's folder, wherever that is.
+/// The folder that all users of the simulated machine share, as its programs see it. On the host it lies in
+/// the machine's folder, wherever that is.
 inline constexpr const wchar_t* kPublicFolder = L"C:\\Users\\Public";
 
-/// Where a file of the simulated machine lies on the host. A path that is none of the machine's is taken as one of
-/// the host.
+/// Where a file of the simulated machine lies on the host. A path that is none of the machine's is taken as
+/// one of the host.
 std::filesystem::path hostPath(const std::wstring& path);
 
 /// The same for a path in the narrow code page, Latin-1.
