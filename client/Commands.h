@@ -19,5 +19,10 @@ void addCredentialsCommand(CLI::App& app, int& exitCode);
 void addCredentialCommand(CLI::App& app, int& exitCode);
 void addReloadCommand(CLI::App& app, int& exitCode);
 void addLogCommand(CLI::App& app, int& exitCode);
+void addStatusCommand(CLI::App& app, int& exitCode);
+void addNetworksCommand(CLI::App& app, int& exitCode);
+void addEnableCommand(CLI::App& app, int& exitCode);
+void addDisableCommand(CLI::App& app, int& exitCode);
+void addRefreshCommand(CLI::App& app, int& exitCode);
 
 }  // namespace vexa::client

@@ -22,6 +22,9 @@ namespace {
 constexpr int kDefaultSeconds = 20;
 constexpr std::chrono::seconds kAnswerLimit{10};
 
+// A service may sleep for ten seconds before it looks whether it is to stop. The user has seen all by then.
+constexpr std::chrono::milliseconds kStopPatience{500};
+
 struct DemoOptions {
     int seconds = kDefaultSeconds;
     std::string service;
@@ -72,8 +75,8 @@ int runDemo(const DemoOptions& options) {
     const auto state = parent.waitUntilReady();
     if (state == ServiceParent::State::Ended) return kExitFailed;
     if (state == ServiceParent::State::Ready && showAll(options, parent.ports(), signals))
-        return parent.stop();
-    parent.stop();
+        return parent.stopSoon(kStopPatience);
+    parent.stopSoon(kStopPatience);
     std::cout << (options.json ? summaryJson(SpectralView()) : summaryText(SpectralView())) << '\n';
     return kExitOk;
 }

@@ -13,7 +13,6 @@ using std::chrono::steady_clock;
 namespace {
 
 constexpr const char* kCheckCommand = "GET_IS_CARD_IN";
-constexpr const char* kCardIn = "CARD_PLUG_IN";
 constexpr const char* kCardOut = "CARD_PLUG_OUT";
 constexpr const char* kSource = "HotSpot20";
 
@@ -29,8 +28,9 @@ bool isCheckAnswer(const Event& event) {
     return event.source == kSource && (event.id == kCardIn || event.id == kCardOut);
 }
 
-std::string secondsText(milliseconds limit) {
-    return std::to_string(std::chrono::ceil<std::chrono::seconds>(limit).count()) + " s";
+std::string silenceText(milliseconds limit) {
+    return "the service did not answer within " +
+           std::to_string(std::chrono::ceil<std::chrono::seconds>(limit).count()) + " s";
 }
 
 }  // namespace
@@ -49,16 +49,14 @@ HotspotPort::Answer HotspotPort::ask(const std::string& command, const std::opti
     int asked = 0;
     int answered = 0;
     const auto checkNow = [&] {
-        tell(kCheckCommand);
-        ++m_checksOwed;
+        check();
         ++asked;
         wake = end;
     };
     while (answered < kChecks) {
         const auto told = next(wake);
         if (!told) {
-            if (steady_clock::now() >= end)
-                throw NoAnswer("the service did not answer within " + secondsText(m_limit));
+            if (steady_clock::now() >= end) throw NoAnswer(silenceText(m_limit));
             checkNow();
         } else if (told->id == event) {
             answer.payload = parseJson(told->data).value_or(Json::Value());
@@ -78,6 +76,20 @@ HotspotPort::Answer HotspotPort::ask(const std::string& command, const std::opti
         }
     }
     return answer;
+}
+
+bool HotspotPort::hasAdapter() {
+    const auto end = steady_clock::now() + m_limit;
+    check();
+    while (const auto told = next(end)) {
+        if (isCheckAnswer(*told) && --m_checksOwed == 0) return told->id == kCardIn;
+    }
+    throw NoAnswer(silenceText(m_limit));
+}
+
+void HotspotPort::check() {
+    tell(kCheckCommand);
+    ++m_checksOwed;
 }
 
 void HotspotPort::tell(const std::string& command, const std::optional<std::string>& data) {

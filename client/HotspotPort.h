@@ -15,6 +15,8 @@
 
 namespace vexa::client {
 
+inline constexpr const char* kCardIn = "CARD_PLUG_IN";
+
 /// The service has gone, or says nothing: what was asked of it may be done or not.
 class NoAnswer : public ClientError {
 public:
@@ -52,6 +54,10 @@ public:
     Answer ask(const std::string& command, const std::optional<std::string>& data, const std::string& event,
                const Accepts& accepts);
 
+    /// Whether the service has an adapter. Everything that was told before has been handled then. Throws
+    /// NoAnswer.
+    bool hasAdapter();
+
     /// Sends a command that nothing answers.
     void tell(const std::string& command, const std::optional<std::string>& data = std::nullopt);
 
@@ -62,6 +68,8 @@ public:
     void close();
 
 private:
+    void check();
+
     WebSocketClient m_client;
     Signals& m_signals;
     std::chrono::milliseconds m_limit;

@@ -17,6 +17,7 @@ public:
     const std::filesystem::path& path() const { return m_path; }
     std::filesystem::path portsFile() const { return m_path / "ports.json"; }
     std::filesystem::path outputFile() const { return m_path / "stdout.log"; }
+    std::filesystem::path registryFile() const { return m_path / "registry.json"; }
     std::filesystem::path configFile() const { return storeFolder() / "config.xml"; }
 
     /// Where the service writes its diagnostic log.

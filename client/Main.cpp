@@ -10,8 +10,9 @@ namespace {
 using namespace vexa::client;
 
 constexpr std::array kCommands{
-    &addStartCommand,      &addDemoCommand,   &addScanCommand, &addChannelsCommand, &addCredentialsCommand,
-    &addCredentialCommand, &addReloadCommand, &addLogCommand,  &addSendCommand,     &addListenCommand};
+    &addStartCommand,      &addDemoCommand,   &addStatusCommand,  &addScanCommand,    &addChannelsCommand,
+    &addNetworksCommand,   &addEnableCommand, &addDisableCommand, &addRefreshCommand, &addCredentialsCommand,
+    &addCredentialCommand, &addReloadCommand, &addLogCommand,     &addSendCommand,    &addListenCommand};
 
 int report(const std::exception& error, int exitCode) {
     std::cerr << "vexa: " << error.what() << '\n';
@@ -25,7 +26,7 @@ int reportWrongUse(const CLI::ParseError& error) {
 }
 
 int run(int argc, char** argv) {
-    CLI::App app("The Vexa wireless service: start it, look at the spectrum, keep its credentials.", "vexa");
+    CLI::App app("The Vexa wireless service: start it, look at the air, keep its credentials.", "vexa");
     app.require_subcommand(1);
     int exitCode = kExitOk;
     for (const auto add : kCommands)

@@ -48,4 +48,13 @@ std::uint16_t PortOption::find() const {
     return (*ports).*namesOf(m_half).port;
 }
 
+std::optional<MachineFolder> PortOption::machine() const try {
+    MachineFolder folder(m_machine);
+    const auto ports = readPortsFile(folder.portsFile());
+    if (!ports || (*ports).*namesOf(m_half).port != find()) return std::nullopt;
+    return folder;
+} catch (const ClientError&) {  // nothing tells of a folder
+    return std::nullopt;
+}
+
 }  // namespace vexa::client

@@ -1,7 +1,10 @@
 #pragma once
 
 #include <cstdint>
+#include <optional>
 #include <string>
+
+#include "client/MachineFolder.h"
 
 namespace CLI {
 class App;
@@ -22,6 +25,10 @@ public:
     /// The port that was given; else that of the environment; else what the parent left in the machine's
     /// folder. Throws ClientError if none tells.
     std::uint16_t find() const;
+
+    /// The machine whose service has that port; nothing if it is not the one that was given or the default
+    /// one.
+    std::optional<MachineFolder> machine() const;
 
 private:
     Half m_half;

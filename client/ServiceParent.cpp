@@ -142,6 +142,13 @@ int ServiceParent::stop() {
     return m_process->exitCode().value_or(kExitFailed);
 }
 
+int ServiceParent::stopSoon(milliseconds patience) {
+    letGo();
+    if (waitForExit(patience)) return m_process->exitCode().value_or(kExitFailed);
+    m_process->kill();
+    return kExitOk;
+}
+
 std::optional<int> ServiceParent::exitCode() {
     return m_process->exitCode();
 }

@@ -1,12 +1,11 @@
 #include "client/ServicePorts.h"
 
-#include <fcntl.h>
 #include <json/json.h>
 
 #include <fstream>
 
-#include "client/Descriptor.h"
 #include "client/JsonLine.h"
+#include "client/OwnerFile.h"
 
 namespace vexa::client {
 
@@ -34,17 +33,7 @@ std::string portsAsJson(const ServicePorts& ports) {
 }
 
 bool writePortsFile(const std::filesystem::path& file, const ServicePorts& ports) {
-    const std::string text = portsAsJson(ports) + "\n";
-    const std::filesystem::path draft = file.string() + ".new";
-    {
-        const Descriptor output(::open(draft.c_str(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0600));
-        if (!output) return false;
-        if (::write(output.get(), text.data(), text.size()) != static_cast<ssize_t>(text.size()))
-            return false;
-    }
-    std::error_code error;
-    std::filesystem::rename(draft, file, error);
-    return !error;
+    return replaceOwnerFile(file, portsAsJson(ports) + "\n");
 }
 
 std::optional<ServicePorts> readPortsFile(const std::filesystem::path& file) {

@@ -1,0 +1,35 @@
+#include "client/HotspotQuestions.h"
+
+#include "client/HotspotSwitch.h"
+
+namespace vexa::client {
+
+namespace {
+
+std::optional<bool> askFlag(HotspotPort& port, const char* name) {
+    const auto isFlag = [](const Json::Value& payload) { return payload.isBool(); };
+    const auto answer = port.ask(name, std::nullopt, name, isFlag);
+    return answer.isAccepted ? std::optional(answer.payload->asBool()) : std::nullopt;
+}
+
+}  // namespace
+
+std::optional<NetworkList> askNetworks(HotspotPort& port) {
+    const auto answer = port.ask(kNetworkList, std::nullopt, kNetworkList, acceptsAny);
+    return answer.payload ? std::optional(networkList(*answer.payload)) : std::nullopt;
+}
+
+bool askRadio(HotspotPort& port) {
+    return askFlag(port, "GET_RADIO").value_or(false);
+}
+
+std::optional<bool> askInternet(HotspotPort& port) {
+    return askFlag(port, "GET_IS_INTERNET_ACCESS");
+}
+
+std::optional<bool> hotspotSwitch(const HotspotOptions& options) {
+    const auto machine = options.port.machine();
+    return machine ? std::optional(readHotspotSwitch(*machine)) : std::nullopt;
+}
+
+}  // namespace vexa::client

@@ -1,0 +1,42 @@
+#pragma once
+
+#include <json/value.h>
+
+#include <string>
+#include <vector>
+
+namespace vexa::client {
+
+/// A network of the hotspot list.
+struct Network {
+    struct Realm {
+        int method = 0;
+        std::string name;
+        bool operator==(const Realm&) const = default;
+    };
+    enum class Internet { None, Offered, Missing, Reached };
+
+    std::string name;
+    bool isConnected = false;
+    Internet internet = Internet::None;
+    /// Its realms have been told to the service.
+    bool hasRealms = false;
+    std::vector<Realm> realms;
+
+    bool operator==(const Network&) const = default;
+};
+
+using NetworkList = std::vector<Network>;
+
+/// The list out of the payload of its event, in its order; entries that are none are left out.
+NetworkList networkList(const Json::Value& payload);
+
+/// Nothing if none is connected.
+const Network* connectedNetwork(const NetworkList& list);
+
+/// One row per network; a heading first. Lines have no line end.
+std::vector<std::string> networkTable(const NetworkList& list);
+
+Json::Value networksJson(const NetworkList& list);
+
+}  // namespace vexa::client

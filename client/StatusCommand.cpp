@@ -1,0 +1,91 @@
+#include <CLI/CLI.hpp>
+#include <iostream>
+#include <memory>
+
+#include "client/Commands.h"
+#include "client/HotspotOptions.h"
+#include "client/HotspotPort.h"
+#include "client/HotspotQuestions.h"
+#include "client/JsonLine.h"
+#include "client/Text.h"
+
+namespace vexa::client {
+
+namespace {
+
+struct Status {
+    bool hasAdapter = false;
+    bool isRadioOn = false;
+    std::optional<bool> hotspot;
+    std::optional<NetworkList> networks;
+    std::optional<bool> internet;
+};
+
+Status askStatus(HotspotPort& port, const HotspotOptions& options) {
+    Status status;
+    status.hotspot = hotspotSwitch(options);
+    status.hasAdapter = port.hasAdapter();
+    if (!status.hasAdapter) return status;
+    status.isRadioOn = askRadio(port);
+    status.networks = askNetworks(port);
+    status.internet = askInternet(port);
+    return status;
+}
+
+std::string flagText(const std::optional<bool>& flag, const char* yes, const char* no) {
+    if (!flag) return "not known";
+    return *flag ? yes : no;
+}
+
+std::vector<std::string> statusLines(const Status& status) {
+    const NetworkList networks = status.networks.value_or(NetworkList());
+    const Network* connected = connectedNetwork(networks);
+    return alignedLines({{"Adapter", status.hasAdapter ? "in" : "out"},
+                         {"Radio", status.isRadioOn ? "on" : "off"},
+                         {"Hotspot", flagText(status.hotspot, "enabled", "disabled")},
+                         {"Networks", std::to_string(networks.size())},
+                         {"Connection", connected == nullptr ? "none" : connected->name},
+                         {"Internet", status.internet.value_or(false) ? "yes" : "no"}});
+}
+
+Json::Value flagJson(const std::optional<bool>& flag) {
+    return flag ? Json::Value(*flag) : Json::Value();
+}
+
+Json::Value statusJson(const Status& status) {
+    const NetworkList networks = status.networks.value_or(NetworkList());
+    const Network* connected = connectedNetwork(networks);
+    Json::Value object(Json::objectValue);
+    object["adapter"] = status.hasAdapter;
+    object["radio"] = status.isRadioOn;
+    object["hotspot"] = flagJson(status.hotspot);
+    object["networks"] = static_cast<Json::UInt64>(networks.size());
+    object["connection"] = connected == nullptr ? Json::Value() : Json::Value(connected->name);
+    object["internet"] = status.internet.value_or(false);
+    return object;
+}
+
+int runStatus(const HotspotOptions& options) {
+    Signals signals;
+    HotspotPort port(options.port.find(), signals, options.limit());
+    const Status status = askStatus(port, options);
+    if (options.json) {
+        std::cout << jsonLine(statusJson(status)) << '\n';
+    } else {
+        for (const auto& line : statusLines(status))
+            std::cout << line << '\n';
+    }
+    return kExitOk;
+}
+
+}  // namespace
+
+void addStatusCommand(CLI::App& app, int& exitCode) {
+    auto options = std::make_shared<HotspotOptions>();
+    CLI::App* command =
+        app.add_subcommand("status", "Tell of the adapter, its radio, the hotspot switch and the connection");
+    options->addTo(*command);
+    command->callback([options, &exitCode] { exitCode = runStatus(*options); });
+}
+
+}  // namespace vexa::client

@@ -1,0 +1,56 @@
+#include <gtest/gtest.h>
+
+#include "client/Text.h"
+
+namespace vexa::client {
+namespace {
+
+TEST(Text, WhatIsNoUtf8IsKnown) {
+    for (const char* text : {"", "plain", "é", "空港", "😀", "\xEF\xBF\xBD", "\xF4\x8F\xBF\xBF"})
+        EXPECT_TRUE(isUtf8(text)) << text;
+    for (const char* text : {"\x80", "caf\xE9", "\xC3", "\xC0\x80", "\xE0\x80\x80", "\xED\xA0\x80",
+                             "\xF4\x90\x80\x80", "\xF8\x88\x80\x80\x80", "a\xFF", "\xE2\x98"})
+        EXPECT_FALSE(isUtf8(text)) << text;
+}
+
+TEST(Text, LengthCountsUtf16Units) {
+    EXPECT_EQ(utf16Length(""), 0U);
+    EXPECT_EQ(utf16Length("aé空"), 3U);
+    EXPECT_EQ(utf16Length("😀😀x"), 5U);
+}
+
+TEST(Text, PrintableTextHasNoControlCharacters) {
+    EXPECT_EQ(printable("a\x1B[31mb"), "a\\x1b[31mb");
+    EXPECT_EQ(printable("\x7F\xC2\x9B"), "\\x7f\\x9b");
+    EXPECT_EQ(printable(std::string_view("a\0b", 3)), "a\\x00b");
+    EXPECT_EQ(printable("a\tb"), "a\\x09b");
+    EXPECT_EQ(printable("a\tb\n", Tabs::Kept), "a\tb\\x0a");
+    EXPECT_EQ(printable("空港 é"), "空港 é");
+    EXPECT_EQ(printable("caf\xE9 \x9B"), "café \\x9b");
+}
+
+TEST(Text, ColumnsFollowTheWidthOfCharacters) {
+    EXPECT_EQ(columnsOf("abc"), 3);
+    EXPECT_EQ(columnsOf("空港"), 4);
+    EXPECT_EQ(columnsOf("e\xCC\x81"), 1) << "an accent of its own takes no column";
+    EXPECT_EQ(cutToColumns("abc", 2), "ab");
+    EXPECT_EQ(cutToColumns("abc", 9), "abc");
+    EXPECT_EQ(cutToColumns("空港", 3), "空");
+    EXPECT_EQ(cutToColumns("abc", 0), "");
+}
+
+TEST(Text, RowsAreAlignedByColumns) {
+    const std::vector<std::string> lines =
+        alignedLines({{"Name", "X"}, {"空港", "1"}, {"long name", ""}, {"a"}});
+    EXPECT_EQ(lines, (std::vector<std::string>{"Name       X", "空港       1", "long name", "a"}));
+    EXPECT_TRUE(alignedLines({}).empty());
+}
+
+TEST(Text, CountsHaveTheirNumber) {
+    EXPECT_EQ(counted(0, "channel"), "0 channels");
+    EXPECT_EQ(counted(1, "channel"), "1 channel");
+    EXPECT_EQ(counted(2, "channel"), "2 channels");
+}
+
+}  // namespace
+}  // namespace vexa::client
