@@ -215,6 +215,12 @@ bool onHs20IhvNotification(const WLAN_NOTIFICATION_DATA* pNotifData) {
         case IhvNotification::AnqpQueryCompleted:
             supplicant->onAnqpQueryCompleted();
             break;
+        case IhvNotification::UserDisconnected:
+            supplicant->onUserDisconnected(message.payload);
+            break;
+        case IhvNotification::SessionChanged:
+            supplicant->onSessionChanged(message.payload);
+            break;
         default:
             break;
     }
