@@ -52,6 +52,7 @@ private:
     /// One attempt: chooses, finds or builds the profile, and asks for the connection. `result` is
     /// kConnectStarted, kConnectNothingLeft, or 0 with the failure that is given.
     int connectNetwork(int& result) EXCLUDES(g_hs20Lock);
+    int leaveToRunningAttempt(int& result) REQUIRES(g_hs20Lock);
     NetworkChoice findBestMatchBssAndCredential() REQUIRES(g_hs20Lock);
     Credential* selectCredential(const Hs20Network& network, const std::vector<Credential*>& found)
         REQUIRES(g_hs20Lock);

@@ -128,11 +128,20 @@ NetworkProfile* InterworkingMgr::profileFor(const NetworkChoice& choice, const s
     return profile;
 }
 
+// The gates are passed without the lock: the next step of an attempt may have begun since. Its profile and
+// its count are not to be touched.
+int InterworkingMgr::leaveToRunningAttempt(int& result) {
+    Log(3, "###Connection already started, skip connecting again.###");
+    result = kConnectStarted;
+    return kSuccess;
+}
+
 int InterworkingMgr::connectNetwork(int& result) {
     const LockGuard lock(g_hs20Lock);
     result = 0;
     Log(3, "\n>>>> Enter connectNetwork");
     if (m_pSupplicant->m_pMgr == nullptr) return kFailure;
+    if (m_pSupplicant->m_bConnectionStarted) return leaveToRunningAttempt(result);
     Log(3, "\n\tIterate over all BSS list to find if any matches with any stored credential.");
     Log(3, "Enter findBestMatchBssAndCredential...");
     const NetworkChoice choice = findBestMatchBssAndCredential();
