@@ -1,3 +1,7 @@
+#include <algorithm>
+#include <iterator>
+#include <string_view>
+
 #include "base/DiagnosticLog.h"
 #include "base/TextConversion.h"
 #include "base/WlanText.h"
@@ -11,31 +15,31 @@ namespace vexa {
 
 namespace {
 
-DOT11_SSID ssidOf(const Hs20Network& network) {
+DOT11_SSID ssidField(std::string_view bytes) {
     DOT11_SSID ssid{};
-    ssid.uSSIDLength = network.m_ssidLength;
-    for (std::size_t i = 0; i < network.m_ssidLength; ++i)
-        ssid.ucSSID[i] = static_cast<UCHAR>(network.m_ssid[i]);
+    ssid.uSSIDLength = static_cast<ULONG>(std::min(bytes.size(), kMaxSsidLength));
+    std::transform(bytes.begin(), bytes.begin() + static_cast<std::ptrdiff_t>(ssid.uSSIDLength),
+                   std::begin(ssid.ucSSID), [](char byte) { return static_cast<UCHAR>(byte); });
     return ssid;
 }
 
 }  // namespace
 
 // Null: the operating system chooses the profile.
-DWORD Supplicant::requestConnection(const Hs20Network& network, const NetworkProfile* profile) {
+DWORD Supplicant::requestConnection(std::string_view ssid, const NetworkProfile* profile) {
     const std::basic_string<WCHAR> text =
         profile == nullptr ? std::basic_string<WCHAR>() : toWlanText(profile->m_profileXml);
-    DOT11_SSID ssid = ssidOf(network);
+    DOT11_SSID field = ssidField(ssid);
     WLAN_CONNECTION_PARAMETERS parameters{};
     parameters.wlanConnectionMode =
         profile == nullptr ? wlan_connection_mode_discovery_secure : wlan_connection_mode_temporary_profile;
     parameters.strProfile = profile == nullptr ? nullptr : text.c_str();
-    parameters.pDot11Ssid = profile == nullptr ? &ssid : nullptr;
+    parameters.pDot11Ssid = profile == nullptr ? &field : nullptr;
     parameters.dot11BssType = dot11_BSS_type_infrastructure;
     parameters.dwFlags = WLAN_CONNECTION_HIDDEN_NETWORK;
     const DWORD result = WlanConnect(m_hWlan, &m_interfaceGuid, &parameters, nullptr);
     if (result != ERROR_SUCCESS) return result;
-    m_connectingSsid = network.ssid();
+    m_connectingSsid = ssid;
     m_bConnectionStarted = true;
     return result;
 }
@@ -64,7 +68,7 @@ int Supplicant::connectToNetwork(const Hs20Network* network, const NetworkProfil
     Log(2, "Network profile for ssid=%s", network->ssidText().c_str());
     Log(2, "\tInterworking: Connect with %s", toText(network->m_macAddress).c_str());
     if (network->m_ssidLength == 0) return kFailure;
-    const DWORD result = requestConnection(*network, profile);
+    const DWORD result = requestConnection(network->ssid(), profile);
     if (result == ERROR_SUCCESS) return kSuccess;
     Log(2, "WlanConnect call failed with error code=%d.", static_cast<int>(result));
     return kFailure;

@@ -37,7 +37,7 @@ int Supplicant::connectBssNow(const std::string& ssid) {
     m_blockedNetworks.unblockNetwork(network->ssid());
     Log(3, "Unblocked network with ssid=%s and mac address=%s due to user has manually connected to it.",
         network->ssidText().c_str(), toText(network->m_macAddress).c_str());
-    if (!network->m_bHs20) return connectPlainly(*network);
+    if (!network->m_bHs20) return connectPlainly(ssid);
     if (!network->hasRealmData()) {
         Log(3,
             "The ANQP info of the network to be connected has no realm info,which should be fetched "
@@ -60,12 +60,12 @@ int Supplicant::connectBssNow(const std::string& ssid) {
         Log(3, "No credential found for this HS20 network, turn to use normal routine");
     else
         Log(6, "ERROR: invalid ret code.");
-    return connectPlainly(*network);
+    return connectPlainly(ssid);
 }
 
 // The operating system chooses the profile; the connection counts as own all the same.
-int Supplicant::connectPlainly(const Hs20Network& network) {
-    return requestConnection(network, nullptr) == ERROR_SUCCESS ? kSuccess : kFailure;
+int Supplicant::connectPlainly(const std::string& ssid) {
+    return requestConnection(ssid, nullptr) == ERROR_SUCCESS ? kSuccess : kFailure;
 }
 
 int Supplicant::tryConnectHs20BssUsingNextCredential(std::string_view ssid, int& connResult) {

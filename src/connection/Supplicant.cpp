@@ -45,6 +45,9 @@ bool isClaim(SupplicantState state) {
            state == SupplicantState::Disconnected || state == SupplicantState::Authenticating;
 }
 
+// Seconds: no report soon after the start may count as one soon after a switch.
+constexpr std::int32_t kLongBeforeStart = 100;
+
 const char* onOrOff(bool on) {
     return on ? "On" : "Off";
 }
@@ -56,7 +59,9 @@ const char* nameOf(SupplicantState state) {
 }
 
 Supplicant::Supplicant(const GUID& interfaceGuid, SupplicantMgr* mgr)
-    : m_interfaceGuid(interfaceGuid), m_pMgr(mgr) {}
+    : m_interfaceGuid(interfaceGuid), m_pMgr(mgr), m_lastHs20ToggleTime(getTimeValue()) {
+    m_lastHs20ToggleTime.seconds -= kLongBeforeStart;
+}
 
 Supplicant::~Supplicant() {
     closeWlanHandle();

@@ -160,7 +160,7 @@ public:
     bool isRadioOnCached() const { return m_bRadioOn; }
     bool isThreadLate() const { return m_interworkingMgr.isThreadLate(); }
 
-    /// When the client last switched the hotspot function. Starts long ago.
+    /// When the client last switched the hotspot function; at first 100 s before the object was made.
     TimeValue m_lastHs20ToggleTime GUARDED_BY(g_hs20Lock);
 
 private:
@@ -182,11 +182,11 @@ private:
         REQUIRES(g_hs20Lock);
 
     int connectBssNow(const std::string& ssid) REQUIRES(g_hs20Lock);
-    int connectPlainly(const Hs20Network& network) REQUIRES(g_hs20Lock);
+    int connectPlainly(const std::string& ssid) REQUIRES(g_hs20Lock);
     int tryConnectHs20BssUsingNextCredential(std::string_view ssid, int& connResult) REQUIRES(g_hs20Lock);
     const Credential* nextUntried(const Hs20Network& network) REQUIRES(g_hs20Lock);
     int connectFreshly(const Hs20Network& network, const Credential& credential) REQUIRES(g_hs20Lock);
-    DWORD requestConnection(const Hs20Network& network, const NetworkProfile* profile) REQUIRES(g_hs20Lock);
+    DWORD requestConnection(std::string_view ssid, const NetworkProfile* profile) REQUIRES(g_hs20Lock);
     const char* reasonNotToBlock() const REQUIRES(g_hs20Lock);
 
     DWORD callIhv(std::vector<std::byte> request, std::vector<std::byte>* reply) const;
