@@ -8,6 +8,7 @@
 #include "client/Commands.h"
 #include "client/CredentialText.h"
 #include "client/DemoCredentials.h"
+#include "client/HotspotNews.h"
 #include "client/JsonLine.h"
 #include "client/MachineFolder.h"
 #include "client/ServiceParent.h"
@@ -56,8 +57,9 @@ CredentialList storedCredentials(const ServicePorts& ports, Signals& signals) {
 bool showAll(const DemoOptions& options, const ServicePorts& ports, Signals& signals) try {
     const auto end = std::chrono::steady_clock::now() + std::chrono::seconds(options.seconds);
     SpectrumOutput output(formOf(options), credentialLines(storedCredentials(ports, signals), options.json));
+    HotspotNews news(ports.hs20);
     SpectralScan scan(ports.sa);
-    watchSpectrum(scan, signals, output, end);
+    watchSpectrum(scan, signals, output, end, &news);
     return true;
 } catch (const StoppedByUser&) {
     return false;

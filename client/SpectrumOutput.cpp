@@ -53,6 +53,20 @@ void SpectrumOutput::show(const std::vector<SpectralScan::Told>& told, const Spe
     std::cout << std::flush;
 }
 
+void SpectrumOutput::showNews(const std::vector<HotspotNews::Item>& items, std::vector<std::string> lines) {
+    if (items.empty()) return;
+    m_changed = true;
+    m_news = std::move(lines);
+    if (m_screen) return;
+    for (const auto& item : items) {
+        if (m_form == Form::Json)
+            std::cout << jsonLine(parseJson(item.text).value_or(Json::Value())) << '\n';
+        else if (!item.sentence.empty())
+            std::cout << secondsSince(m_start) << "  " << item.sentence << '\n';
+    }
+    std::cout << std::flush;
+}
+
 void SpectrumOutput::printLine(const SpectralScan::Told& told, const SpectralView& view) const {
     if (m_form == Form::Json) {
         std::cout << jsonLine(parseJson(told.text).value_or(Json::Value())) << '\n';
@@ -85,9 +99,11 @@ void SpectrumOutput::finish(const SpectralView& view) {
 std::vector<std::string> SpectrumOutput::picture(const SpectralView& view) const {
     auto lines =
         drawSpectrum(view, {m_screen->columns(), TerminalScreen::wantsColour(), TerminalScreen::isUtf8()});
-    if (!m_side.empty()) lines.emplace_back();
-    for (const auto& line : m_side)
-        lines.push_back(cutToColumns(line, m_screen->columns() - 1));
+    for (const auto* block : {&m_side, &m_news}) {
+        if (!block->empty()) lines.emplace_back();
+        for (const auto& line : *block)
+            lines.push_back(cutToColumns(line, m_screen->columns() - 1));
+    }
     return lines;
 }
 

@@ -5,6 +5,7 @@
 #include <string>
 #include <vector>
 
+#include "client/HotspotNews.h"
 #include "client/SpectralScan.h"
 #include "client/TerminalScreen.h"
 
@@ -19,6 +20,9 @@ public:
     explicit SpectrumOutput(Form form, std::vector<std::string> side = {});
 
     void show(const std::vector<SpectralScan::Told>& told, const SpectralView& view);
+
+    /// What is told beside the spectrum, and how things stand now.
+    void showNews(const std::vector<HotspotNews::Item>& items, std::vector<std::string> lines);
 
     /// Draws what has changed, but not too often. Gives the time until it should be called again; nothing:
     /// not before something has happened.
@@ -44,6 +48,7 @@ private:
 
     Form m_form;
     std::vector<std::string> m_side;
+    std::vector<std::string> m_news;
     std::optional<TerminalScreen> m_screen;
     std::chrono::steady_clock::time_point m_start;
     std::chrono::steady_clock::time_point m_nextDrawing;

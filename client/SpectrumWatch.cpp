@@ -23,6 +23,11 @@ int pollTimeout(std::optional<steady_clock::time_point> end, std::optional<milli
     return static_cast<int>(std::min(left, redraw.value_or(left)).count());
 }
 
+pollfd watchedNews(const HotspotNews* news) {
+    if (news == nullptr) return {-1, 0, 0};
+    return {news->descriptor(), news->events(), 0};
+}
+
 bool stopAsked(Signals& signals, SpectrumOutput& output) {
     while (const auto signal = signals.take()) {
         if (Signals::isStop(*signal)) return true;
@@ -34,17 +39,19 @@ bool stopAsked(Signals& signals, SpectrumOutput& output) {
 }  // namespace
 
 void watchSpectrum(SpectralScan& scan, Signals& signals, SpectrumOutput& output,
-                   std::optional<steady_clock::time_point> end) {
+                   std::optional<steady_clock::time_point> end, HotspotNews* news) {
     scan.start();
     while (!output.isGone() && !isOver(end)) {
         const auto redraw = output.refresh(scan.view());
-        std::array<pollfd, 3> watched{{{scan.descriptor(), scan.events(), 0},
+        std::array<pollfd, 4> watched{{{scan.descriptor(), scan.events(), 0},
                                        {signals.descriptor(), POLLIN, 0},
-                                       {output.keyDescriptor(), POLLIN, 0}}};
+                                       {output.keyDescriptor(), POLLIN, 0},
+                                       watchedNews(news)}};
         ::poll(watched.data(), watched.size(), pollTimeout(end, redraw));
         if (stopAsked(signals, output)) break;
         if (watched[2].revents != 0 && output.isQuitKey()) break;
         output.show(scan.process(), scan.view());
+        if (news != nullptr) output.showNews(news->process(), news->lines());
     }
     scan.stop();
     output.finish(scan.view());

@@ -23,7 +23,26 @@ std::string_view demoScenario() {
             "161": {"congestion": 5,  "power": 14, "spread": 3}
         }
     },
+    "connectMs": 700,
+    "networks": [
+        {"bssid": "02:c1:7e:00:00:01", "ssid": "City Free", "channel": 6,
+         "realms": [{"names": ["city.example"], "eapMethods": [21]}]},
+        {"bssid": "02:c1:7e:00:00:02", "ssid": "Departures", "channel": 36, "visible": false,
+         "realms": [{"names": ["lounge.example", "partner.example"], "eapMethods": [21, 13]}],
+         "accepts": [{"eapMethod": 21, "username": "anna"}]},
+        {"bssid": "02:c1:7e:00:00:03", "ssid": "Departures", "channel": 44, "visible": false,
+         "realms": [{"names": ["staff.example"], "eapMethods": [13]}]},
+        {"bssid": "02:c1:7e:00:00:04", "ssid": "Gate 12", "channel": 149, "visible": false,
+         "realms": [{"names": ["corp.example"], "eapMethods": [13]}]}
+    ],
     "timeline": [
+        {"atMs": 4000, "do": "show", "bssid": "02:c1:7e:00:00:02"},
+        {"atMs": 4000, "do": "show", "bssid": "02:c1:7e:00:00:03"},
+        {"atMs": 4001, "do": "reportNetworks"},
+        {"atMs": 7000, "do": "hide", "bssid": "02:c1:7e:00:00:01"},
+        {"atMs": 7001, "do": "reportNetworks"},
+        {"atMs": 14500, "do": "show", "bssid": "02:c1:7e:00:00:04"},
+        {"atMs": 14501, "do": "reportNetworks"},
         {"atMs": 3500, "do": "levels", "levels": {
             "6":  {"congestion": 48, "power": 66, "spread": 9},
             "11": {"congestion": 39, "power": 61, "spread": 9}}},
