@@ -3,6 +3,7 @@
 #include <array>
 #include <set>
 #include <string_view>
+#include <utility>
 
 #include "engine/AirStory.h"
 #include "engine/StoreStory.h"
@@ -19,6 +20,8 @@ constexpr std::array<const char*, 8> kNames = {"Airport", "Cafe", "Airport", "Ha
 constexpr std::array<const char*, 3> kRealms = {"a.example", "b.example", "a.example;c.example"};
 constexpr int kStepsBetweenChecks = 12;
 constexpr int kTriesToHeal = 8;
+constexpr auto kBeat = 100ms;
+constexpr int kBeatsOfPatience = 300000;
 
 template <class Container>
 auto oneOf(Random& random, const Container& container) {
@@ -128,14 +131,19 @@ constexpr std::array<Make, 24> kActions = {
     },
 };
 
-std::string credential(Random& random) {
-    const std::string realm = oneOf(random, kRealms);
-    return random() % 2 == 0 ? ttlsData(realm.substr(0, 9)) : tlsData(realm.substr(0, 9));
+std::string withMember(std::string data, const std::string& member) {
+    data.insert(data.find('{') + 1, member + ",");
+    return data;
 }
 
-std::string withId(Random& random, std::string data) {
-    data.insert(data.find('{') + 1, "\"Id\":" + numberBelow(random, 6) + ",");
-    return data;
+std::string credential(Random& random) {
+    const std::string realm = std::string(oneOf(random, kRealms)).substr(0, 9);
+    return withMember(random() % 2 == 0 ? ttlsData(realm) : tlsData(realm),
+                      std::string(R"("AutoConnect":)") + (random() % 4 == 0 ? "false" : "true"));
+}
+
+std::string withId(Random& random, const std::string& data) {
+    return withMember(data, "\"Id\":" + numberBelow(random, 6));
 }
 
 std::string networkName(Random& random) {
@@ -198,7 +206,10 @@ std::string Storm::scenario(double speed) {
     return air(networks, R"("speed":)" + std::to_string(speed));
 }
 
-Storm::Storm(World& world, std::uint64_t seed) : m_world(world), m_random(seed) {
+Storm::Storm(World& world, std::uint64_t seed, Pass pass)
+    : m_world(world),
+      m_random(seed),
+      m_pass(pass ? std::move(pass) : [&world](platform::Duration span) { world.advance(span); }) {
     for (const char* name : kNames)
         m_air.push_back({name});
 }
@@ -242,42 +253,53 @@ void Storm::sendCommands() {
 void Storm::step() {
     m_world.perform(action());
     sendCommands();
-    if (chance(3)) m_world.advance(std::chrono::milliseconds(m_random() % 15000));
+    if (chance(3)) m_pass(std::chrono::milliseconds(m_random() % 15000));
 }
 
 // A fault that still waits for its call can stand in the way of each of these, but not for ever.
 std::string Storm::check() {
     const std::string expected = namesInRange();
-    std::string names;
     for (int tries = 0; tries < kTriesToHeal; ++tries) {
         for (const char* heal :
              {R"({"do":"insertAdapter"})", R"({"do":"radio","hardware":"on","software":"on"})"})
             m_world.perform(heal);
         m_world.hotspot().send("SET_HOTSPOT_AUTO_CONNECT", "true");
-        m_world.advance(0ms);
-        m_world.hotspot().events();
+        if (!waitForAnswers()) return "no answer to a command\n";
+        m_shown = "nothing";
         m_world.perform(R"({"do":"reportNetworks"})");
-        m_world.advance(0ms);
-        const std::string pushed = lastListNames();
+        hear();
+        const std::string told = m_shown;
         m_world.hotspot().send("GET_ALL_NETWORK_LIST");
-        m_world.advance(0ms);
-        names = lastListNames();
+        if (!waitForAnswers()) return "no answer to a command\n";
         if (expected.empty()) return {};  // a report of nothing is refused, and the list stays
-        if (pushed == expected && names == expected) return {};
+        if (told == expected && m_shown == expected) return {};
     }
-    return "in range: " + expected + "; shown: " + names + "\n";
+    return "in range: " + expected + "; shown: " + m_shown + "\n";
 }
 
-std::string Storm::lastListNames() {
-    std::string names = "nothing";
+// Takes in what the client got. True if an answer about the card was among it.
+bool Storm::hear() {
+    bool isAnswered = false;
     for (const ClientEvent& event : m_world.hotspot().events()) {
+        isAnswered |= event.id.starts_with("CARD_PLUG") && event.hasData;
         if (event.id != "GET_ALL_NETWORK_LIST") continue;
-        std::multiset<std::string> shown;
+        std::multiset<std::string> names;
         for (const Json::Value& entry : event.data)
-            shown.insert(entry["NetWorkName"].asString());
-        names = joined(shown);
+            names.insert(entry["NetWorkName"].asString());
+        m_shown = joined(names);
     }
-    return names;
+    return isAnswered;
+}
+
+// Commands are answered in their order, and the one about the card always.
+bool Storm::waitForAnswers() {
+    hear();
+    m_world.hotspot().send("GET_IS_CARD_IN");
+    for (int beats = 0; beats < kBeatsOfPatience; ++beats) {
+        m_pass(kBeat);
+        if (hear()) return true;
+    }
+    return false;
 }
 
 // One entry for each name, however many BSSs share it.
@@ -288,8 +310,8 @@ std::string Storm::namesInRange() const {
     return joined({names.begin(), names.end()});
 }
 
-std::string storm(World& world, std::uint64_t seed, int steps) {
-    Storm storm(world, seed);
+std::string storm(World& world, std::uint64_t seed, int steps, Storm::Pass pass) {
+    Storm storm(world, seed, std::move(pass));
     for (int step = 1; step <= steps; ++step) {
         storm.step();
         if (step % kStepsBetweenChecks != 0 && step != steps) continue;

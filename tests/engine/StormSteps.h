@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <functional>
 #include <random>
 #include <string>
 #include <vector>
@@ -17,7 +18,10 @@ public:
     /// The scenario that a storm needs. `speed` as in a scenario file.
     static std::string scenario(double speed);
 
-    Storm(World& world, std::uint64_t seed);
+    /// Lets time pass. Without one the world's clock is moved on; real threads need time that goes by itself.
+    using Pass = std::function<void(platform::Duration)>;
+
+    Storm(World& world, std::uint64_t seed, Pass pass = nullptr);
 
     /// One action of the machine and some commands of its clients.
     void step();
@@ -37,15 +41,18 @@ private:
     std::string changeOfTheAir();
     std::string action();
     void sendCommands();
-    std::string lastListNames();
+    bool hear();
+    bool waitForAnswers();
     std::string namesInRange() const;
 
     World& m_world;
     std::mt19937_64 m_random;
+    const Pass m_pass;
+    std::string m_shown;
     std::vector<Bss> m_air;
 };
 
 /// A whole storm of this many steps, with a check now and then. Gives what is wrong.
-std::string storm(World& world, std::uint64_t seed, int steps);
+std::string storm(World& world, std::uint64_t seed, int steps, Storm::Pass pass = nullptr);
 
 }  // namespace vexa::test

@@ -34,11 +34,10 @@ std::vector<std::string> LogCapture::lines() {
     const std::string text = content.str();
     static const std::regex kNumber(R"(\[\d+\] (\d\d/\d\d \d\d:\d\d:\d\d  )?)");
     std::vector<std::string> lines;
-    for (std::sregex_token_iterator part(text.begin(), text.end(), kNumber, -1), end; part != end; ++part) {
-        std::string line = *part;
-        if (lines.empty() && line.empty() && !text.empty() && text[0] == '[' && part->first == text.begin()) {
-            continue;
-        }
+    for (std::sregex_iterator head(text.begin(), text.end(), kNumber), end; head != end;) {
+        const auto from = (*head)[0].second;
+        ++head;
+        std::string line(from, head == end ? text.end() : (*head)[0].first);
         if (!line.empty() && line.back() == '\n') line.pop_back();
         lines.push_back(std::move(line));
     }

@@ -23,11 +23,11 @@ protected:
             std::make_unique<Credential>(id, L"PC\\user", CRED_TYPE_EAP_TTLS, CRED_ACCESS_ALL_USER);
         credential->m_realm = realm;
         credential->m_eapMethod = method;
-        credential->m_priority = priority;
         credential->m_username = L"u";
         credential->m_password = L"p";
         Credential& stored = *credential;
         m_table.appendUnplaced(std::move(credential));
+        stored.m_priority = priority;
         return stored;
     }
 
@@ -164,7 +164,7 @@ TEST_F(Matching, TheSearchForAHomeProviderLeavesItsLines) {
     EXPECT_FALSE(isHomeSpNetwork(m_table, bytesOfHex("02 6162")));
     EXPECT_EQ(log.text(),
               "Interworking: Search for match with home SP FQDN home.example\n"
-              "Interworking: AP domain name\n 61 62\n"
+              "Interworking: AP domain name 61 62\n"
               "Interworking: AP domain nameab\n");
     EXPECT_FALSE(isHomeSpNetwork(m_table, {}));
     EXPECT_TRUE(log.lines().empty());

@@ -156,13 +156,11 @@ TEST(NaiRealms, BytesBehindTheLastEntryAreIgnored) {
 }
 
 TEST(NaiRealms, ParametersMayRunBeyondTheirMethodButNotBeyondTheEntry) {
-    // The first method claims 2 bytes; its parameter reads the next method's bytes as its own.
-    const Block list = bytesOfHex("0100 0a00 00 01 61 02 02 15 01 02 0d 00");
-    EXPECT_EQ(realmsAfter(list), kKept);
-    const Block longer = bytesOfHex("0100 0b00 00 01 61 02 02 15 01 02 0d 00 00");
-    EXPECT_EQ(realmsAfter(longer), kKept);
-    const Block fits = bytesOfHex("0100 0c00 00 01 61 02 02 15 01 02 01 00 00 00");
-    EXPECT_EQ(realmsAfter(fits), kKept) << "the second method has length 2 and fits, but is of type 1";
+    // The first method claims 2 bytes, so that its parameter shares its bytes with the second method.
+    EXPECT_EQ(realmsAfter(bytesOfHex("0100 0c00 00 01 61 02 02 15 01 02 0d 00 00 00")), kKept);
+    EXPECT_EQ(realmsAfter(bytesOfHex("0100 0a00 00 01 61 02 02 15 01 02 01 00")), "a TTLS");
+    EXPECT_EQ(realmsAfter(bytesOfHex("0100 0a00 00 01 61 02 02 15 01 02 00 0d")), kKept)
+        << "the second method claims 13 parameters and has room for none";
 }
 
 TEST(NaiRealms, TheNextMethodBeginsWhereTheLengthSays) {
@@ -188,7 +186,7 @@ TEST(NaiRealms, ParametersAreReadAndUnknownOnesNamed) {
     EXPECT_EQ((*realms)[0].eap[1].innerMethod, 0);
     const std::string text = log.text();
     EXPECT_NE(text.find("Unsupported Authentication Parameter: id=9 len=2\n"
-                        "Authentication Parameter Value\n aa bb"),
+                        "Authentication Parameter Value aa bb\n"),
               std::string::npos)
         << text;
     EXPECT_NE(text.find("Unsupported Authentication Parameter: id=1 len=0\n"), std::string::npos) << text;
