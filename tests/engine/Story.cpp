@@ -7,6 +7,8 @@
 #include <cstdio>
 #include <exception>
 #include <filesystem>
+#include <fstream>
+#include <sstream>
 
 #include "platform/seeded/Seeded.h"
 
@@ -43,11 +45,16 @@ public:
         return text;
     }
 
-    int writeEnd() const { return m_ends[1]; }
-
 private:
     std::array<int, 2> m_ends{};
 };
+
+std::string contentOf(const fs::path& file) {
+    const std::ifstream stream(file, std::ios::binary);
+    std::ostringstream content;
+    content << stream.rdbuf();
+    return content.str();
+}
 
 // On standard error, where the parent finds it beside reports of the sanitizers.
 void tell(const std::string& text) {
@@ -76,19 +83,19 @@ Ending runStory(std::uint64_t seed, const std::string& scenario,
                 const std::function<std::string(World&)>& story) {
     std::string pattern = (fs::temp_directory_path() / "vexa-story-XXXXXX").string();
     const fs::path folder = mkdtemp(pattern.data());
+    const fs::path errors = folder / "stderr.txt";
     Pipe result;
-    Pipe errors;
     const pid_t child = fork();
     if (child == 0) {
         if (std::freopen("/dev/null", "w", stdout) == nullptr) _exit(1);
-        dup2(errors.writeEnd(), STDERR_FILENO);
+        if (std::freopen(errors.c_str(), "w", stderr) == nullptr) _exit(1);
         live(seed, scenario, folder, story, result);
     }
     Ending ending;
     ending.text = result.readAll();
-    ending.errors = errors.readAll();
     int status = 0;
     waitpid(child, &status, 0);
+    ending.errors = contentOf(errors);
     ending.isOrderly = WIFEXITED(status) && WEXITSTATUS(status) == 0;
     if (!ending.isOrderly)
         ending.errors += "\nSeed " + std::to_string(seed) + " ended with status " + std::to_string(status);
