@@ -62,7 +62,7 @@ std::wstring withWideStrings(std::wstring_view format) {
 }  // namespace
 
 void Log(int level, const char* format, ...) {
-    if (!DiagnosticLog::instance().isEnabled() || level < kLowestWrittenLevel) return;
+    if (!DiagnosticLog::isEnabled() || level < kLowestWrittenLevel) return;
     std::array<char, kBufferSize> text{};
     std::va_list arguments;
     va_start(arguments, format);
@@ -72,7 +72,7 @@ void Log(int level, const char* format, ...) {
 }
 
 void LogWide(int level, const wchar_t* format, ...) {
-    if (!DiagnosticLog::instance().isEnabled() || level < kLowestWrittenLevel) return;
+    if (!DiagnosticLog::isEnabled() || level < kLowestWrittenLevel) return;
     std::vector<wchar_t> text(kBufferSize);
     std::va_list arguments;
     va_start(arguments, format);
@@ -83,8 +83,7 @@ void LogWide(int level, const wchar_t* format, ...) {
 }
 
 void LogHex(int /*level*/, const char* title, const void* data, std::size_t length) {
-    DiagnosticLog& log = DiagnosticLog::instance();
-    if (!log.isEnabled() || title == nullptr || data == nullptr || length == 0) return;
+    if (!DiagnosticLog::isEnabled() || title == nullptr || data == nullptr || length == 0) return;
     constexpr std::size_t kTextPerByte = 3;
     const auto* const bytes = static_cast<const unsigned char*>(data);
     std::string hex;
@@ -93,19 +92,21 @@ void LogHex(int /*level*/, const char* title, const void* data, std::size_t leng
         std::snprintf(text, sizeof text, " %02x", byte);
         hex += text;
     }
+    DiagnosticLog& log = DiagnosticLog::instance();
     log.addLine(title, true);
     log.addLine(hex, false);
 }
 
 void LogBytes(int level, const char* title, const void* data, std::int64_t length, bool appendNewline) {
-    DiagnosticLog& log = DiagnosticLog::instance();
-    if (!log.isEnabled() || title == nullptr || data == nullptr || length <= 0 || level < kLowestWrittenLevel)
+    if (!DiagnosticLog::isEnabled() || title == nullptr || data == nullptr || length <= 0 ||
+        level < kLowestWrittenLevel)
         return;
     std::string text = timePrefix() + title;
     const auto* const bytes = static_cast<const unsigned char*>(data);
     for (const unsigned char byte : std::span(bytes, std::min(static_cast<std::size_t>(length), kMaxText)))
         text += std::isprint(byte) != 0 ? static_cast<char>(byte) : '_';
     if (text.size() > kMaxText) text.resize(kMaxText);
+    DiagnosticLog& log = DiagnosticLog::instance();
     log.addLine(text, true);
     if (appendNewline) log.addLine("\n", false);
 }

@@ -36,9 +36,9 @@ class DiagnosticLog {
 public:
     static DiagnosticLog& instance();
 
-    /// The live switch: off, nothing is queued, and it may change at any time.
-    void setEnableDump(bool enable) { m_bEnableDump = enable; }
-    bool isEnabled() const { return m_bEnableDump; }
+    /// The live switch of all logging: off, nothing is queued, and it may change at any time.
+    static void setEnableDump(bool enable) { m_bEnableDump = enable; }
+    static bool isEnabled() { return m_bEnableDump; }
 
     /// Starts the thread; from now on lines are queued. An empty path is like a file that can't be opened.
     void start(std::string filePath);
@@ -57,7 +57,7 @@ private:
     void runThread();
     std::string nextNumber() REQUIRES(g_hs20Lock);
 
-    std::atomic<bool> m_bEnableDump{false};
+    static inline std::atomic<bool> m_bEnableDump{false};
     std::atomic<bool> m_bEnabled{false};
     std::atomic<bool> m_bStop{false};
     std::atomic<std::size_t> m_lineCount{0};

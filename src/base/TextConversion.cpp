@@ -65,7 +65,12 @@ void appendUtf8(std::string& text, char32_t c) {
 template <class Char>
 std::string encodeUtf8(std::basic_string_view<Char> text) {
     std::string utf8;
+    utf8.reserve(text.size());
     for (std::size_t i = 0; i < text.size();) {
+        if (unitAt(text, i) < 0x80) {
+            utf8 += static_cast<char>(text[i++]);
+            continue;
+        }
         const WideCharacter character = characterAt(text, i);
         appendUtf8(utf8, character.codePoint);
         i += character.length;
@@ -111,6 +116,13 @@ WideCharacter decodeUtf8(std::string_view text) {
     return isCodePointOfLength(c, length) ? WideCharacter{c, length} : WideCharacter{kReplacement, 0};
 }
 
+// What most texts are made of can be taken in one go.
+std::size_t asciiLength(std::string_view text) {
+    const auto end = std::find_if(text.begin(), text.end(),
+                                  [](char byte) { return static_cast<unsigned char>(byte) >= 0x80; });
+    return static_cast<std::size_t>(end - text.begin());
+}
+
 template <class Char>
 Char foldCase(Char c) {
     return c >= 'A' && c <= 'Z' ? static_cast<Char>(c + ('a' - 'A')) : c;
@@ -137,7 +149,12 @@ std::string utf8FromUtf16(std::u16string_view text) {
 
 std::wstring wideFromUtf8(std::string_view text) {
     std::wstring wide;
+    wide.reserve(text.size());
     while (!text.empty()) {
+        const std::size_t ascii = asciiLength(text);
+        wide.append(text.begin(), text.begin() + static_cast<std::ptrdiff_t>(ascii));
+        text.remove_prefix(ascii);
+        if (text.empty()) break;
         const WideCharacter character = decodeUtf8(text);
         appendWide(wide, character.codePoint);
         text.remove_prefix(std::max<std::size_t>(character.length, 1));
@@ -145,16 +162,16 @@ std::wstring wideFromUtf8(std::string_view text) {
     return wide;
 }
 
-std::optional<std::u32string> codePointsFromUtf8(std::string_view text) {
-    std::u32string codePoints;
-    codePoints.reserve(text.size());
+bool isValidUtf8(std::string_view text) {
     while (!text.empty()) {
-        const WideCharacter character = decodeUtf8(text);
-        if (character.length == 0) return std::nullopt;
-        codePoints += character.codePoint;
-        text.remove_prefix(character.length);
+        const auto ascii = asciiLength(text);
+        text.remove_prefix(ascii);
+        if (text.empty()) break;
+        const std::size_t length = decodeUtf8(text).length;
+        if (length == 0) return false;
+        text.remove_prefix(length);
     }
-    return codePoints;
+    return true;
 }
 
 std::wstring cutToUtf16Units(std::wstring_view text, std::size_t units) {

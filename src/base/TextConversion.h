@@ -1,7 +1,6 @@
 #pragma once
 
 #include <cstdint>
-#include <optional>
 #include <string>
 #include <string_view>
 
@@ -17,8 +16,7 @@ std::wstring wideFromUtf8(std::string_view text);
 std::string utf8FromUtf16(std::u16string_view text);
 std::u16string utf16FromWide(std::wstring_view text);
 
-/// The code points of UTF-8 text; nothing if it isn't valid.
-std::optional<std::u32string> codePointsFromUtf8(std::string_view text);
+bool isValidUtf8(std::string_view text);
 
 /// At most `units` 16-bit units of the text, never half a surrogate pair.
 std::wstring cutToUtf16Units(std::wstring_view text, std::size_t units);

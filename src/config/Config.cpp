@@ -94,7 +94,7 @@ int Config::readGlobalSettings() {
     deriveDumpFilePath();
     m_bAutoConnect = readFlag("/*/global/autoconnect", true);
     m_bEnableDump = readFlag("/*/global/enabledump", false);
-    DiagnosticLog::instance().setEnableDump(m_bEnableDump);
+    DiagnosticLog::setEnableDump(m_bEnableDump);
     if (m_bEnableDump) m_dumpLevel = readNumber("/*/global/dumplevel");
     m_homeRealm = m_xmlDoc.getText("/*/global/homerealm", Node()).value_or(L"");
     m_nextCredId = readNumber("/*/global/nextcredid");

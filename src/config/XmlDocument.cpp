@@ -2,6 +2,7 @@
 
 #include <cstring>
 #include <string_view>
+#include <utility>
 
 #include "base/TextConversion.h"
 #include "config/ResultCodes.h"
@@ -15,6 +16,7 @@ namespace {
 
 constexpr unsigned kParse = (pugi::parse_full | pugi::parse_ws_pcdata) & ~pugi::parse_trim_pcdata;
 constexpr unsigned kFormat = pugi::format_raw | pugi::format_write_bom | pugi::format_no_empty_element_tags;
+constexpr std::size_t kUsualGrowth = 4096;
 constexpr std::string_view kUtf8Mark = "\xEF\xBB\xBF";
 
 bool arePaired(std::u16string_view units) {
@@ -56,7 +58,8 @@ EncodedText decode(const std::string& content) {
 
 // A line end is one line feed, in whatever form it was written. After this a carriage return is one that was
 // meant.
-std::string withPlainLineEnds(const std::string& text) {
+std::string withPlainLineEnds(std::string text) {
+    if (text.find('\r') == text.npos) return text;
     std::string plain;
     plain.reserve(text.size());
     for (std::size_t i = 0; i < text.size(); ++i) {
@@ -108,11 +111,12 @@ int XmlDocument::load(const std::wstring& path) {
     if (!m_document) return kNoDocument;
     const auto content = platform::readFile(path);
     if (!content) return kFailure;
-    const auto [utf8, encoding] = decode(*content);
-    const std::string text = withPlainLineEnds(utf8);
-    if (!isWellFormedXml(text, encoding)) return kFailure;
-    return m_document->load_buffer(text.data(), text.size(), kParse, pugi::encoding_utf8) ? kSuccess
-                                                                                          : kFailure;
+    auto [utf8, encoding] = decode(*content);
+    m_text = withPlainLineEnds(std::move(utf8));
+    if (!isWellFormedXml(m_text, encoding)) return kFailure;
+    const auto result =
+        m_document->load_buffer_inplace(m_text.data(), m_text.size(), kParse, pugi::encoding_utf8);
+    return result ? kSuccess : kFailure;
 }
 
 int XmlDocument::save(const std::wstring& path) const {
@@ -121,6 +125,7 @@ int XmlDocument::save(const std::wstring& path) const {
     if (first.type() == pugi::node_declaration && first.attribute("encoding"))
         first.attribute("encoding").set_value("UTF-8");
     StringWriter writer;
+    writer.text.reserve(m_text.size() + kUsualGrowth);
     m_document->save(writer, "", kFormat, pugi::encoding_utf8);
     return saveSafely(path, writer.text) ? kSuccess : kFailure;
 }
@@ -189,6 +194,7 @@ int XmlDocument::setChild(const char* tag, const std::wstring& text, Node parent
 
 void XmlDocument::release() {
     m_document.reset();
+    m_text.clear();
 }
 
 }  // namespace vexa

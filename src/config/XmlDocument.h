@@ -46,6 +46,7 @@ public:
 private:
     Node root() const;
 
+    std::string m_text;  // what the document's nodes point into
     std::optional<pugi::xml_document> m_document;
 };
 

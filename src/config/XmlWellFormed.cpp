@@ -11,7 +11,7 @@ namespace vexa {
 
 namespace {
 
-constexpr std::u32string_view kWhiteSpace = U" \t\r\n";
+constexpr std::string_view kWhiteSpace = " \t\r\n";
 
 struct Range {
     char32_t first;
@@ -54,10 +54,9 @@ constexpr std::array<EncodingName, 5> kEncodings = {{{"", XmlEncoding::Utf8},
                                                      {"ISO-8859-1", XmlEncoding::Latin1},
                                                      {"US-ASCII", XmlEncoding::Ascii}}};
 
-XmlEncoding encodingOf(std::u32string_view name) {
-    const std::string narrow(name.begin(), name.end());
+XmlEncoding encodingOf(std::string_view name) {
     const auto found = std::find_if(kEncodings.begin(), kEncodings.end(), [&](const EncodingName& known) {
-        return compareNoCase(known.name, narrow) == 0;
+        return compareNoCase(known.name, name) == 0;
     });
     return found == kEncodings.end() ? XmlEncoding::Unknown : found->encoding;
 }
@@ -67,15 +66,41 @@ bool isAscii(std::string_view text) {
 }
 
 bool isCharacter(char32_t c) {
-    return c == 0x9 || c == 0xA || c == 0xD || (c >= 0x20 && c <= 0xD7FF) || (c >= 0xE000 && c <= 0xFFFD) ||
+    return (c >= 0x20 && c <= 0xD7FF) || c == 0x9 || c == 0xA || c == 0xD || (c >= 0xE000 && c <= 0xFFFD) ||
            (c >= 0x10000 && c <= 0x10FFFF);
+}
+
+struct Character {
+    char32_t value;
+    std::size_t length;
+};
+
+// Of UTF-8 that is known to be valid.
+Character characterAt(std::string_view text, std::size_t at) {
+    const auto byte = [&](std::size_t i) { return static_cast<unsigned char>(text[at + i]); };
+    const unsigned char first = byte(0);
+    if (first < 0x80) return {first, 1};
+    const std::size_t length = first < 0xE0 ? 2 : first < 0xF0 ? 3 : 4;
+    char32_t value = first & (0xFFU >> (length + 1));
+    for (std::size_t i = 1; i < length; ++i)
+        value = value << 6 | (byte(i) & 0x3FU);
+    return {value, length};
+}
+
+bool holdsCharactersOnly(std::string_view text) {
+    for (std::size_t at = 0; at < text.size();) {
+        const Character next = characterAt(text, at);
+        if (!isCharacter(next.value)) return false;
+        at += next.length;
+    }
+    return true;
 }
 
 /// Goes through a document once, from the front. Each reading operation is false if what it wants is not
 /// there.
 class Scanner {
 public:
-    explicit Scanner(std::u32string_view text) : m_rest(text) {}
+    explicit Scanner(std::string_view text) : m_rest(text) {}
 
     bool document() {
         return declaration() && miscellany() && documentType() && miscellany() && rootElement() &&
@@ -84,22 +109,22 @@ public:
 
     /// Also true if there is none.
     bool declaration() {
-        if (!m_rest.starts_with(U"<?xml") || m_rest.size() < 6 ||
+        if (!m_rest.starts_with("<?xml") || m_rest.size() < 6 ||
             kWhiteSpace.find(m_rest[5]) == kWhiteSpace.npos)
             return true;
-        take(U"<?xml");
-        std::u32string_view value;
-        if (!pseudoAttribute(U"version", value) || (value != U"1.0" && value != U"1.1")) return false;
-        if (pseudoAttribute(U"encoding", m_encoding) && m_encoding.empty()) return false;
-        if (pseudoAttribute(U"standalone", value) && value != U"yes" && value != U"no") return false;
+        take("<?xml");
+        std::string_view value;
+        if (!pseudoAttribute("version", value) || (value != "1.0" && value != "1.1")) return false;
+        if (pseudoAttribute("encoding", m_encoding) && m_encoding.empty()) return false;
+        if (pseudoAttribute("standalone", value) && value != "yes" && value != "no") return false;
         white();
-        return take(U"?>");
+        return take("?>");
     }
 
-    std::u32string_view encodingName() const { return m_encoding; }
+    std::string_view encodingName() const { return m_encoding; }
 
 private:
-    bool take(std::u32string_view expected) {
+    bool take(std::string_view expected) {
         if (!m_rest.starts_with(expected)) return false;
         m_rest.remove_prefix(expected.size());
         return true;
@@ -112,66 +137,65 @@ private:
     }
 
     // Everything up to and including an end mark; what comes before it is `content`.
-    bool takeUntil(std::u32string_view end, std::u32string_view& content) {
+    bool takeUntil(std::string_view end, std::string_view& content) {
         const std::size_t length = m_rest.find(end);
-        if (length == std::u32string_view::npos) return false;
+        if (length == std::string_view::npos) return false;
         content = m_rest.substr(0, length);
         m_rest.remove_prefix(length + end.size());
         return true;
     }
 
-    bool name(std::u32string_view& result) {
+    bool name(std::string_view& result) {
         std::size_t length = 0;
-        while (length < m_rest.size() &&
-               (isIn(kNameStart, m_rest[length]) || (length > 0 && isIn(kNameFurther, m_rest[length]))))
-            ++length;
+        while (length < m_rest.size()) {
+            const Character next = characterAt(m_rest, length);
+            if (!isIn(kNameStart, next.value) && (length == 0 || !isIn(kNameFurther, next.value))) break;
+            length += next.length;
+        }
         result = m_rest.substr(0, length);
         m_rest.remove_prefix(length);
         return length > 0;
     }
 
-    bool quoted(std::u32string_view& content) {
-        if (take(U"\"")) return takeUntil(U"\"", content);
-        return take(U"'") && takeUntil(U"'", content);
+    bool quoted(std::string_view& content) {
+        if (take("\"")) return takeUntil("\"", content);
+        return take("'") && takeUntil("'", content);
     }
 
     bool equals() {
         white();
-        const bool found = take(U"=");
+        const bool found = take("=");
         white();
         return found;
     }
 
-    bool pseudoAttribute(std::u32string_view wanted, std::u32string_view& value) {
-        const std::u32string_view before = m_rest;
+    bool pseudoAttribute(std::string_view wanted, std::string_view& value) {
+        const std::string_view before = m_rest;
         if (white() && take(wanted) && equals() && quoted(value)) return true;
         m_rest = before;
         return false;
     }
 
     bool comment() {
-        std::u32string_view content;
-        return take(U"<!--") && takeUntil(U"--", content) && take(U">");
+        std::string_view content;
+        return take("<!--") && takeUntil("--", content) && take(">");
     }
 
     bool processingInstruction() {
-        std::u32string_view target;
-        std::u32string_view content;
-        if (!take(U"<?") || !name(target) || isReserved(target)) return false;
-        return take(U"?>") || (white() && takeUntil(U"?>", content));
+        std::string_view target;
+        std::string_view content;
+        if (!take("<?") || !name(target) || isReserved(target)) return false;
+        return take("?>") || (white() && takeUntil("?>", content));
     }
 
-    static bool isReserved(std::u32string_view target) {
-        return target.size() == 3 && (target[0] | 0x20U) == 'x' && (target[1] | 0x20U) == 'm' &&
-               (target[2] | 0x20U) == 'l';
-    }
+    static bool isReserved(std::string_view target) { return compareNoCase(target, "xml") == 0; }
 
     bool miscellany() {
         for (;;) {
             white();
-            if (m_rest.starts_with(U"<!--")) {
+            if (m_rest.starts_with("<!--")) {
                 if (!comment()) return false;
-            } else if (m_rest.starts_with(U"<?")) {
+            } else if (m_rest.starts_with("<?")) {
                 if (!processingInstruction()) return false;
             } else {
                 return true;
@@ -180,25 +204,25 @@ private:
     }
 
     bool documentType() {
-        if (!take(U"<!DOCTYPE")) return true;
-        std::u32string_view ignored;
+        if (!take("<!DOCTYPE")) return true;
+        std::string_view ignored;
         if (!white() || !name(ignored)) return false;
         if (white()) {
-            if (take(U"SYSTEM") && !(white() && quoted(ignored))) return false;
-            if (take(U"PUBLIC") && !(white() && quoted(ignored) && white() && quoted(ignored))) return false;
+            if (take("SYSTEM") && !(white() && quoted(ignored))) return false;
+            if (take("PUBLIC") && !(white() && quoted(ignored) && white() && quoted(ignored))) return false;
         }
         white();
-        return take(U">");
+        return take(">");
     }
 
     bool reference() {
-        std::u32string_view content;
-        if (!take(U"&") || !takeUntil(U";", content) || content.empty()) return false;
+        std::string_view content;
+        if (!take("&") || !takeUntil(";", content) || content.empty()) return false;
         if (content[0] != '#')
-            return content == U"lt" || content == U"gt" || content == U"amp" || content == U"quot" ||
-                   content == U"apos";
+            return content == "lt" || content == "gt" || content == "amp" || content == "quot" ||
+                   content == "apos";
         content.remove_prefix(1);
-        const bool isHex = content.starts_with(U"x");
+        const bool isHex = content.starts_with("x");
         if (isHex) content.remove_prefix(1);
         return isCharacterNumber(content, isHex ? 16 : 10);
     }
@@ -210,25 +234,25 @@ private:
         return 16;
     }
 
-    static bool isCharacterNumber(std::u32string_view digits, char32_t base) {
+    static bool isCharacterNumber(std::string_view digits, char32_t base) {
         char32_t value = 0;
-        for (const char32_t c : digits) {
-            const char32_t digit = digitValue(c);
+        for (const char c : digits) {
+            const char32_t digit = digitValue(static_cast<unsigned char>(c));
             if (digit >= base) return false;
             value = std::min<char32_t>(value * base + digit, 0x110000);
         }
         return !digits.empty() && isCharacter(value);
     }
 
-    bool references(std::u32string_view content) {
+    bool references(std::string_view content) {
         for (std::size_t at = content.find('&'); at != content.npos; at = content.find('&', at + 1))
             if (!Scanner(content.substr(at)).reference()) return false;
         return true;
     }
 
-    bool attribute(std::vector<std::u32string_view>& seen) {
-        std::u32string_view attributeName;
-        std::u32string_view value;
+    bool attribute(std::vector<std::string_view>& seen) {
+        std::string_view attributeName;
+        std::string_view value;
         if (!name(attributeName) || !equals() || !quoted(value)) return false;
         if (value.find('<') != value.npos || !references(value)) return false;
         if (std::find(seen.begin(), seen.end(), attributeName) != seen.end()) return false;
@@ -237,13 +261,13 @@ private:
     }
 
     bool startTag() {
-        std::u32string_view tag;
-        std::vector<std::u32string_view> seen;
-        if (!take(U"<") || !name(tag)) return false;
+        std::string_view tag;
+        std::vector<std::string_view> seen;
+        if (!take("<") || !name(tag)) return false;
         for (;;) {
             const bool isApart = white();
-            if (take(U"/>")) return true;
-            if (take(U">")) {
+            if (take("/>")) return true;
+            if (take(">")) {
                 m_open.push_back(tag);
                 return true;
             }
@@ -252,27 +276,27 @@ private:
     }
 
     bool endTag() {
-        std::u32string_view tag;
-        if (!take(U"</") || !name(tag) || tag != m_open.back()) return false;
+        std::string_view tag;
+        if (!take("</") || !name(tag) || tag != m_open.back()) return false;
         m_open.pop_back();
         white();
-        return take(U">");
+        return take(">");
     }
 
     bool text() {
         const std::size_t length = std::min(m_rest.find('<'), m_rest.size());
-        const std::u32string_view content = m_rest.substr(0, length);
+        const std::string_view content = m_rest.substr(0, length);
         m_rest.remove_prefix(length);
-        return content.find(U"]]>") == content.npos && references(content);
+        return content.find("]]>") == content.npos && references(content);
     }
 
     bool contentItem() {
-        std::u32string_view ignored;
-        if (take(U"<![CDATA[")) return takeUntil(U"]]>", ignored);
-        if (m_rest.starts_with(U"<!--")) return comment();
-        if (m_rest.starts_with(U"<?")) return processingInstruction();
-        if (m_rest.starts_with(U"</")) return endTag();
-        if (m_rest.starts_with(U"<")) return startTag();
+        std::string_view ignored;
+        if (take("<![CDATA[")) return takeUntil("]]>", ignored);
+        if (m_rest.starts_with("<!--")) return comment();
+        if (m_rest.starts_with("<?")) return processingInstruction();
+        if (m_rest.starts_with("</")) return endTag();
+        if (m_rest.starts_with("<")) return startTag();
         return text();
     }
 
@@ -284,32 +308,32 @@ private:
         return true;
     }
 
-    std::u32string_view m_rest;
-    std::u32string_view m_encoding;
-    std::vector<std::u32string_view> m_open;
+    std::string_view m_rest;
+    std::string_view m_encoding;
+    std::vector<std::string_view> m_open;
 };
 
 }  // namespace
 
 XmlEncoding declaredXmlEncoding(std::string_view content) {
-    const std::string_view line = content.substr(0, content.find("?>") + 2);
-    const std::u32string wide(line.begin(), line.end());
-    Scanner scanner(wide);
+    Scanner scanner(content);
     return scanner.declaration() ? encodingOf(scanner.encodingName()) : XmlEncoding::Unknown;
 }
 
 bool isWellFormedXml(std::string_view text, XmlEncoding encoding) {
-    const auto codePoints = codePointsFromUtf8(text);
-    if (!codePoints || !std::all_of(codePoints->begin(), codePoints->end(), isCharacter)) return false;
-    Scanner scanner(*codePoints);
+    if (!isValidUtf8(text) || !holdsCharactersOnly(text)) return false;
+    Scanner scanner(text);
     if (!scanner.document()) return false;
     const bool isClaimed = scanner.encodingName().empty() || encodingOf(scanner.encodingName()) == encoding;
     return isClaimed && (encoding != XmlEncoding::Ascii || isAscii(text));
 }
 
+// Half a surrogate pair is no obstacle: it is written as another character.
 bool canStandInXml(std::wstring_view text) {
-    const auto codePoints = codePointsFromUtf8(utf8FromWide(text));
-    return codePoints && std::all_of(codePoints->begin(), codePoints->end(), isCharacter);
+    return std::all_of(text.begin(), text.end(), [](wchar_t unit) {
+        const auto c = static_cast<char32_t>(unit);
+        return isCharacter(c) || (c >= 0xD800 && c <= 0xDFFF) || c > 0x10FFFF;
+    });
 }
 
 }  // namespace vexa
