@@ -57,6 +57,10 @@ constexpr bool kMayReuseAddress = std::is_same_v<tcp::acceptor::native_handle_ty
 constexpr std::size_t kMaxUnhandledMessages = 256;
 constexpr std::size_t kMaxUnhandledBytes = IpcWebSocketServer::kMaxMessage;
 
+// What a client may leave unread before his further commands have to wait: one that asks faster than he reads
+// is slowed down, not dropped. What others cause to be sent to him still counts up to the limit.
+constexpr std::size_t kMaxUnreadBytes = IpcWebSocketServer::kMaxQueued / 2;
+
 constexpr std::size_t kMaxIdleBuffer = std::size_t{16} << 10;
 
 constexpr std::string_view kForbidden =
@@ -184,7 +188,7 @@ private:
     beast::flat_buffer m_buffer;
     std::optional<http::request_parser<http::empty_body>> m_request;
     std::deque<Text> m_queue;
-    std::size_t m_queuedBytes = 0;
+    std::atomic<std::size_t> m_queuedBytes{0};
     bool m_isOpen = false;
     bool m_isWriting = false;
     std::atomic<bool> m_isPaused{false};
@@ -431,7 +435,8 @@ void IpcSession::onMessage(error_code ec) {
 }
 
 bool IpcSession::isBehind() const {
-    return m_unhandledMessages >= kMaxUnhandledMessages || m_unhandledBytes > kMaxUnhandledBytes;
+    return m_unhandledMessages >= kMaxUnhandledMessages || m_unhandledBytes > kMaxUnhandledBytes ||
+           m_queuedBytes > kMaxUnreadBytes;
 }
 
 void IpcSession::resume() {
@@ -469,6 +474,7 @@ void IpcSession::onWritten(error_code ec) {
     if (ec) return leave();
     m_queuedBytes -= m_queue.front()->size();
     m_queue.pop_front();
+    if (m_isPaused && !isBehind()) resume();
     writeNext();
 }
 

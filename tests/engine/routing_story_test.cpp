@@ -161,27 +161,28 @@ TEST(Routing, RadioChangesReachBothPortsByTheirOwnRules) {
 }
 
 TEST(Routing, CommandsOfTheHotspotPortLeaveOneErrorLineWhenTheyCanNotBeRead) {
-    const char* const prefix = "ERROR: Invalid command received from UI, command=";
+    const std::string command = "ERROR: Invalid command received from UI, command=";
+    const std::string data = "ERROR: Invalid data received from UI, command=";
     const std::vector<std::pair<std::string, std::string>> cases = {
-        {"nonsense", ""},
-        {"[]", ""},
-        {"17", ""},
-        {"\"GET_RADIO\"", ""},
-        {R"({"CommandId":17})", ""},
-        {R"({"CommandId":["GET_RADIO"]})", ""},
-        {R"({"CommandId":"get_radio"})", "get_radio"},
-        {R"({"CommandId":"GET_RADIO","Data":{}})", "GET_RADIO"},
-        {R"({"CommandId":"GET_RADIO","Data":3})", "GET_RADIO"},
+        {"nonsense", command},
+        {"[]", command},
+        {"17", command},
+        {"\"GET_RADIO\"", command},
+        {R"({"CommandId":17})", command},
+        {R"({"CommandId":["GET_RADIO"]})", command},
+        {R"({"CommandId":"get_radio"})", command + "get_radio"},
+        {R"({"CommandId":"GET_RADIO","Data":{}})", data + "GET_RADIO"},
+        {R"({"CommandId":"GET_RADIO","Data":3})", data + "GET_RADIO"},
     };
     const Ending ending = runStory(7, "{}", [&](World& world) {
         std::string differences;
         settle(world);
-        for (const auto& [message, name] : cases) {
+        for (const auto& [message, line] : cases) {
             const std::size_t before = world.log().size();
             world.hotspot().sendRaw(message);
             world.advance(0ms);
             const std::string got = messagesOf(world.log().substr(before));
-            if (got != prefix + name + "\n") differences += message + " gave " + got;
+            if (got != line + "\n") differences += message + " gave " + got;
         }
         return differences + world.hotspot().ids();
     });
