@@ -25,8 +25,10 @@ std::string credentialFor(const std::string& realm, bool isTls) {
     return data.toStyledString();
 }
 
+// An adapter whose start failed twice stays as it is until it has been pulled.
 void heal(World& world) {
-    static constexpr std::array<const char*, 7> kActions = {
+    static constexpr std::array<const char*, 8> kActions = {
+        R"({"do":"pullAdapter"})",
         R"({"do":"insertAdapter"})",
         R"({"do":"radio","hardware":"on","software":"on"})",
         R"({"do":"interfaceState","value":null})",
