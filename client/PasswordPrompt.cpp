@@ -98,7 +98,7 @@ std::string askPassword(Signals& signals) {
     if (::isatty(STDIN_FILENO) == 0)
         throw ClientError("there is no terminal to ask for the password: give it with --password-stdin",
                           kExitWrongUse);
-    const std::string password = askOnce(signals, "Password: ");
+    std::string password = askOnce(signals, "Password: ");
     if (askOnce(signals, "Again: ") != password) throw ClientError("the two passwords differ");
     return password;
 }
