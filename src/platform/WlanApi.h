@@ -68,19 +68,21 @@ struct DOT11_SSID {
     UCHAR ucSSID[DOT11_SSID_MAX_LENGTH];
 };
 
-enum DOT11_RADIO_STATE {
+// Of a fixed type, since what comes in a notification may hold any number.
+
+enum DOT11_RADIO_STATE : int {
     dot11_radio_state_unknown,
     dot11_radio_state_on,
     dot11_radio_state_off,
 };
 
-enum DOT11_BSS_TYPE {
+enum DOT11_BSS_TYPE : int {
     dot11_BSS_type_infrastructure = 1,
     dot11_BSS_type_independent = 2,
     dot11_BSS_type_any = 3,
 };
 
-enum WLAN_INTERFACE_STATE {
+enum WLAN_INTERFACE_STATE : int {
     wlan_interface_state_not_ready,
     wlan_interface_state_connected,
     wlan_interface_state_ad_hoc_network_formed,
@@ -91,7 +93,7 @@ enum WLAN_INTERFACE_STATE {
     wlan_interface_state_authenticating,
 };
 
-enum WLAN_CONNECTION_MODE {
+enum WLAN_CONNECTION_MODE : int {
     wlan_connection_mode_profile,
     wlan_connection_mode_temporary_profile,
     wlan_connection_mode_discovery_secure,
@@ -100,16 +102,16 @@ enum WLAN_CONNECTION_MODE {
     wlan_connection_mode_invalid,
 };
 
-enum WLAN_INTF_OPCODE {
+enum WLAN_INTF_OPCODE : int {
     wlan_intf_opcode_radio_state = 4,
     wlan_intf_opcode_interface_state = 6,
     wlan_intf_opcode_current_connection = 7,
     wlan_intf_opcode_channel_number = 8,
 };
 
-enum WLAN_OPCODE_VALUE_TYPE { wlan_opcode_value_type_query_only };
+enum WLAN_OPCODE_VALUE_TYPE : int { wlan_opcode_value_type_query_only };
 
-enum WLAN_IHV_CONTROL_TYPE {
+enum WLAN_IHV_CONTROL_TYPE : int {
     wlan_ihv_control_type_service,
     wlan_ihv_control_type_driver,
 };
