@@ -22,11 +22,11 @@ Json::Value queryInterface(Machine& machine, const Json::Value& /*message*/) {
     const std::size_t adapter = machine.usualAdapter();
     const RadioState radio = machine.adapters().radio(adapter);
     Json::Value result;
-    result["state"] = kInterfaceStates.at(machine.interfaceState(adapter));
+    result["state"] = kInterfaceStates.at(static_cast<std::size_t>(machine.interfaceState(adapter)));
     const Link link = machine.connections().shown(adapter);
     result["ssid"] = isUp(link) ? Json::Value(textOfBytes(link.ssid)) : Json::Value();
-    result["radio"]["hardware"] = kRadioStates.at(radio.hardware);
-    result["radio"]["software"] = kRadioStates.at(radio.software);
+    result["radio"]["hardware"] = kRadioStates.at(static_cast<std::size_t>(radio.hardware));
+    result["radio"]["software"] = kRadioStates.at(static_cast<std::size_t>(radio.software));
     return result;
 }
 
