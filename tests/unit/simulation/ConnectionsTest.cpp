@@ -43,9 +43,10 @@ TEST(Connections, ARequestThatIsAcceptedGoesThroughAllStates) {
 }
 
 TEST(Connections, TheStateIsAssociatingWhenTheRequestReturns) {
-    Station station(kScenario);
+    // Before the station: its notification thread may still be in a wait that has just ended.
     platform::Event leave(platform::Reset::Manual);
     platform::Event entered(platform::Reset::Manual);
+    Station station(kScenario);
     station.listener.onNotification = [&](const WLAN_NOTIFICATION_DATA&) {
         entered.set();
         leave.wait();
