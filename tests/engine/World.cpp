@@ -72,7 +72,7 @@ std::int32_t unusedPort(std::int32_t from) {
 Client::Client(std::int32_t port) : m_client(InProcessClient::connect(port)) {
     for (int tries = 0; !m_client; ++tries) {
         if (tries == 1000) throw std::runtime_error("nothing serves port " + std::to_string(port));
-        platform::sleepFor(1ms);
+        platform::advance(1ms);
         m_client = InProcessClient::connect(port);
     }
 }
@@ -130,7 +130,18 @@ void World::advance(platform::Duration span) {
 
 std::string World::log() {
     DiagnosticLog::instance().flushToFile();
-    return contentOf(store() / "Dump" / "hs20log.txt_user.txt");
+    return contentOf(logFile());
+}
+
+std::size_t World::logSize() {
+    DiagnosticLog::instance().flushToFile();
+    std::error_code error;
+    const std::uintmax_t size = std::filesystem::file_size(logFile(), error);
+    return error ? 0 : size;
+}
+
+std::filesystem::path World::logFile() const {
+    return store() / "Dump" / "hs20log.txt_user.txt";
 }
 
 std::filesystem::path World::store() const {

@@ -60,6 +60,7 @@ public:
 
     /// Everything that the diagnostic log wrote so far.
     std::string log();
+    std::size_t logSize();
     /// The text of config.xml, and the folder that holds it.
     std::string config() const;
     std::filesystem::path store() const;
@@ -74,6 +75,8 @@ public:
     int stop();
 
 private:
+    std::filesystem::path logFile() const;
+
     std::filesystem::path m_folder;
     simulation::Machine m_machine;
     std::unique_ptr<platform::NamedMutex> m_stopMutex;

@@ -56,7 +56,7 @@ TEST(AirModule, AnAnswerAboutABssIsReadWithinItsBytes) {
             settle(world);
             for (const Case& c : cases) {
                 world.perform(kReport);
-                const std::size_t before = world.log().size();
+                const std::size_t before = world.logSize();
                 world.hotspot().events();
                 world.perform(reply("anqpInfo", c.reply));
                 world.perform(on("reportAnqp", 1));
@@ -94,7 +94,7 @@ TEST(AirModule, TheAnswerWithTheListIsReadByWholeRecords) {
         for (const Case& c : cases) {
             world.perform(moduleMessage(2, bssRecord("02aa00000009", "Airport")));
             world.hotspot().events();
-            const std::size_t before = world.log().size();
+            const std::size_t before = world.logSize();
             world.perform(
                 reply("bssList", Block(two.begin(), two.begin() + static_cast<std::ptrdiff_t>(c.size))));
             world.perform(moduleMessage(4, {}));
@@ -116,7 +116,7 @@ TEST(AirModule, ARequestThatFailsLeavesItsLineAndChangesNothing) {
                       network(2, "Cafe", realms("c.example", "21"))}),
                  [](World& world) {
                      settle(world);
-                     const std::size_t before = world.log().size();
+                     const std::size_t before = world.logSize();
                      world.perform(R"({"do":"fail","call":"WlanIhvControl","error":31,"match":"bssList"})");
                      world.perform(moduleMessage(4, {}));
                      std::string text = messagesSince(world, before) + heard(world) + "\n";
@@ -160,7 +160,7 @@ TEST(AirModule, AReportIsAsLongAsItClaimsAndNoLongerThanItsBlock) {
         settle(world);
         for (const Case& c : cases) {
             world.advance(0ms);
-            const std::size_t before = world.log().size();
+            const std::size_t before = world.logSize();
             world.perform(moduleMessage(
                 2, Block(two.begin(), two.begin() + static_cast<std::ptrdiff_t>(c.sent)), c.claimed));
             std::string got = heard(world);
@@ -204,7 +204,7 @@ TEST(AirModule, NewsOfOneBssNeedsItsAddressAndItsMark) {
         settle(world);
         for (const Case& c : cases) {
             world.perform(R"({"do":"clearCalls"})");
-            const std::size_t before = world.log().size();
+            const std::size_t before = world.logSize();
             world.perform(moduleMessage(3, c.payload, c.claimed));
             const std::string lines = messagesSince(world, before);
             if (moduleRequests(world, 8) != c.fetches ||
@@ -267,7 +267,7 @@ TEST(AirModule, TheDriversStateIsPassedOnWhereItsTwoNumbersAre) {
 TEST(AirModule, SubtypesThatNobodyKnowsAreIgnored) {
     const Ending ending = runStory(8, air({network(1, "Airport")}), [](World& world) {
         settle(world);
-        const std::size_t before = world.log().size();
+        const std::size_t before = world.logSize();
         for (const unsigned subtype : {0U, 7U, 8U, 0x80000001U, 0xFFFFFFFFU})
             world.perform(moduleMessage(subtype, bssRecord("02aa00000001", "Airport")));
         return messagesSince(world, before) + heard(world);
@@ -280,7 +280,7 @@ TEST(AirModule, AnUpdateRunsThroughItsStepsInOrder) {
     const Ending ending = runStory(
         9, air({network(1, "Airport"), network(2, "Airport", realms("a.example", "13"))}), [](World& world) {
             settle(world);
-            const std::size_t before = world.log().size();
+            const std::size_t before = world.logSize();
             world.perform(kReport);
             std::string text = messagesSince(world, before);
             const std::size_t end = text.find("Send all HS20 networks to vexa.\n");

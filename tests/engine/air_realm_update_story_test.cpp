@@ -31,7 +31,7 @@ TEST(RealmUpdate, DisconnectsFirstAndAsksWhenThatIsDone) {
             world.advance(1s);
             world.hotspot().events();
             world.perform(R"({"do":"clearCalls"})");
-            const std::size_t before = world.log().size();
+            const std::size_t before = world.logSize();
             world.hotspot().send("UPDATE_NETWORK_REALM");
             world.advance(100ms);
             std::string text = heard(world) + "/" + std::to_string(moduleRequests(world, 3));
@@ -49,7 +49,7 @@ TEST(RealmUpdate, KnowsAConnectionToANetworkThatIsNotListed) {
             settle(world);
             world.perform(R"({"do":"osConnect","ssid":"Legacy"})");
             world.advance(1s);
-            const std::size_t before = world.log().size();
+            const std::size_t before = world.logSize();
             world.hotspot().send("UPDATE_NETWORK_REALM");
             world.advance(0ms);
             return count(messagesSince(world, before), "Manually disconnect from a non-HS20 network.");
@@ -63,7 +63,7 @@ TEST(RealmUpdate, DoesNothingWithoutAnAdapter) {
         settle(world);
         world.perform(R"({"do":"pullAdapter"})");
         world.perform(R"({"do":"clearCalls"})");
-        const std::size_t before = world.log().size();
+        const std::size_t before = world.logSize();
         world.hotspot().send("UPDATE_NETWORK_REALM");
         world.advance(0ms);
         return messagesSince(world, before) + std::to_string(world.perform(R"({"query":"calls"})").size());

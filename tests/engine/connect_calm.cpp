@@ -17,6 +17,7 @@ constexpr int kNetworksOfTheStorm = 8;
 constexpr int kHavenNumber = 99;
 constexpr int kStepsOfAPart = 24;
 constexpr int kTriesToHeal = 5;
+constexpr auto kPatience = 60s;
 
 std::string credentialFor(const std::string& realm, bool isTls) {
     Json::Value data = parsed(isTls ? tlsData(realm) : ttlsData(realm));
@@ -57,23 +58,24 @@ void useUpFaults(World& world) {
     heal(world);
 }
 
-}  // namespace
-
-std::string joinsWhenLeftAlone(World& world, platform::Duration patience) {
+// Gives the log if nothing is connected after a minute.
+std::string joinsWhenLeftAlone(World& world) {
     world.perform(on("show", kHavenNumber));
     useUpFaults(world);
-    const std::size_t before = world.log().size();
+    const std::size_t before = world.logSize();
     world.perform(R"({"do":"dropConnection"})");
     std::string missing;
     platform::Duration passed{};
-    for (; passed < patience && connectedTo(world) == "-"; passed += 1s)
+    for (; passed < kPatience && connectedTo(world) == "-"; passed += 1s)
         world.advance(1s);
     if (connectedTo(world) == "-") missing = "not connected:\n" + messagesSince(world, before);
     world.perform(on("hide", kHavenNumber));
     return missing;
 }
 
-std::string stormOfConnections(World& world, std::uint64_t seed, int steps, platform::Duration patience) {
+}  // namespace
+
+std::string stormOfConnections(World& world, std::uint64_t seed, int steps) {
     Storm storm(world, seed);
     std::mt19937_64 random(seed);
     world.perform(
@@ -86,7 +88,7 @@ std::string stormOfConnections(World& world, std::uint64_t seed, int steps, plat
                                  credentialFor(random() % 2 == 0 ? "a.example" : "b.example", isTls));
         for (int i = 0; i < kStepsOfAPart; ++i)
             storm.step();
-        if (const std::string wrong = joinsWhenLeftAlone(world, patience); !wrong.empty())
+        if (const std::string wrong = joinsWhenLeftAlone(world); !wrong.empty())
             return "before step " + std::to_string(step + kStepsOfAPart) + " " + wrong;
     }
     return {};

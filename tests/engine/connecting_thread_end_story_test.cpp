@@ -43,7 +43,7 @@ TEST(ConnectingThread, EndsWhereverItIsWhenTheAdapterGoes) {
                 for (const std::string& action : c.before)
                     world.perform(action);
                 world.advance(std::chrono::milliseconds(c.pauseMs));
-                const std::size_t before = world.log().size();
+                const std::size_t before = world.logSize();
                 world.perform(R"({"do":"pullAdapter"})");
                 world.advance(30s);
                 world.perform(R"({"do":"insertAdapter"})");
@@ -66,7 +66,7 @@ TEST(ConnectingThread, OneThatIsLateLeavesItsLineAndEndsByItself) {
         const Ending ending = runStory(seed, air({fetched(1, "A")}), [](World& world) {
             addCredential(world);
             settle(world);
-            const std::size_t before = world.log().size();
+            const std::size_t before = world.logSize();
             world.perform(R"({"do":"radio","software":"off"})");
             world.perform(R"({"do":"pullAdapter"})");
             world.perform(R"({"do":"insertAdapter"})");

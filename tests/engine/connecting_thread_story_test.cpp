@@ -23,7 +23,7 @@ std::string fetched(int number, const std::string& ssid) {
 
 // What the log tells of the rounds while this time passes.
 std::string roundsIn(World& world, platform::Duration span) {
-    const std::size_t before = world.log().size();
+    const std::size_t before = world.logSize();
     world.advance(span);
     return roundsSince(world, before);
 }
@@ -175,7 +175,7 @@ TEST(ConnectingThread, RunsARoundEveryTenSecondsWhenNothingHappens) {
 TEST(ConnectingThread, AnUpdateWakesItTwiceOnceForTheListAndOnceForTheData) {
     const Ending ending = runStory(4, air({fetched(1, "A")}), [](World& world) {
         settle(world);
-        const std::size_t before = world.log().size();
+        const std::size_t before = world.logSize();
         world.perform(kReport);
         world.advance(0ms);
         const std::string lines = messagesSince(world, before);
@@ -193,7 +193,7 @@ TEST(ConnectingThread, TakesTheEventsThatWaitInTheirOrder) {
             settle(world);
             world.perform(R"({"do":"radio","software":"off"})");
             world.advance(1s);
-            const std::size_t before = world.log().size();
+            const std::size_t before = world.logSize();
             world.perform(R"({"do":"radio","software":"on"})");
             addCredential(world);
             world.perform(kReport);
@@ -217,7 +217,7 @@ TEST(ConnectingThread, SleepsTenSecondsAfterARadioEventBeforeItsGates) {
     const Ending ending = runStory(5, "{}", [](World& world) {
         settle(world);
         world.perform(R"({"do":"radio","software":"off"})");
-        const std::size_t before = world.log().size();
+        const std::size_t before = world.logSize();
         world.advance(9999ms);
         std::string text = roundsSince(world, before) + "---";
         world.advance(1ms);

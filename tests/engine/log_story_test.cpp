@@ -17,7 +17,7 @@ std::string logFile(World& world) {
 
 // What the log holds behind what the service itself wrote at its start.
 std::string written(World& world, const std::function<void()>& calls) {
-    const std::size_t before = world.log().size();
+    const std::size_t before = world.logSize();
     calls();
     return world.log().substr(before);
 }

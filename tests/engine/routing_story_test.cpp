@@ -38,7 +38,7 @@ constexpr const char* kIhv = "64";
 TEST(Routing, EveryKnownCodeLeavesItsLineAndOthersNone) {
     const Ending ending = runStory(3, "{}", [](World& world) {
         settle(world);
-        const std::size_t before = world.log().size();
+        const std::size_t before = world.logSize();
         for (const char* source : {kAcm, kMsm, "4", "32", "0"})
             for (int code = 0; code <= 25; ++code)
                 world.perform(notify(source, code));
@@ -104,7 +104,7 @@ TEST(Routing, BadIhvNotificationsEndInTheirLineAndChangeNothingElse) {
         std::string differences;
         settle(world);
         for (const auto& [dataHex, expected] : cases) {
-            const std::size_t before = world.log().size();
+            const std::size_t before = world.logSize();
             world.perform(notify(kIhv, 3, dataHex));
             const std::string got = messagesOf(world.log().substr(before));
             if (got != expected) differences += dataHex + " gave " + got;
@@ -178,7 +178,7 @@ TEST(Routing, CommandsOfTheHotspotPortLeaveOneErrorLineWhenTheyCanNotBeRead) {
         std::string differences;
         settle(world);
         for (const auto& [message, line] : cases) {
-            const std::size_t before = world.log().size();
+            const std::size_t before = world.logSize();
             world.hotspot().sendRaw(message);
             world.advance(0ms);
             const std::string got = messagesOf(world.log().substr(before));

@@ -4,16 +4,19 @@
 #include <charconv>
 #include <cstdint>
 #include <cstdio>
+#include <string>
 #include <string_view>
 
 #include "engine/StormSteps.h"
 #include "engine/Story.h"
+#include "engine/connect_calm.h"
 
 namespace {
 
 using namespace vexa::test;
 
 struct Options {
+    bool connections = false;
     std::uint64_t seeds = 100;
     std::uint64_t from = 1;
     std::uint64_t steps = 48;
@@ -25,20 +28,28 @@ bool readNumber(std::string_view text, std::uint64_t& number) {
 }
 
 bool readOptions(int count, char** arguments, Options& options) {
-    for (int i = 1; i < count; i += 2) {
+    for (int i = 1; i < count; ++i) {
         const std::string_view name = arguments[i];
         std::uint64_t* const number = name == "--seeds"   ? &options.seeds
                                       : name == "--from"  ? &options.from
                                       : name == "--steps" ? &options.steps
                                                           : nullptr;
-        if (number == nullptr || i + 1 == count || !readNumber(arguments[i + 1], *number)) return false;
+        if (name == "--connections")
+            options.connections = true;
+        else if (number == nullptr || ++i == count || !readNumber(arguments[i], *number))
+            return false;
     }
     return true;
 }
 
-bool isCalm(std::uint64_t seed, int steps) {
+std::string happens(World& world, std::uint64_t seed, const Options& options) {
+    const int steps = static_cast<int>(options.steps);
+    return options.connections ? stormOfConnections(world, seed, steps) : storm(world, seed, steps);
+}
+
+bool isCalm(std::uint64_t seed, const Options& options) {
     const Ending ending =
-        runStory(seed, Storm::scenario(1), [&](World& world) { return storm(world, seed, steps); });
+        runStory(seed, Storm::scenario(1), [&](World& world) { return happens(world, seed, options); });
     if (ending.isOrderly && ending.text.empty()) return true;
     std::printf("seed %llu: %s%s\n", static_cast<unsigned long long>(seed), ending.text.c_str(),
                 ending.errors.c_str());
@@ -51,12 +62,12 @@ bool isCalm(std::uint64_t seed, int steps) {
 int main(int count, char** arguments) {
     Options options;
     if (!readOptions(count, arguments, options)) {
-        std::fputs("usage: storm [--seeds N] [--from S] [--steps N]\n", stderr);
+        std::fputs("usage: storm [--connections] [--seeds N] [--from S] [--steps N]\n", stderr);
         return 2;
     }
     std::uint64_t failed = 0;
     for (std::uint64_t i = 0; i < options.seeds; ++i)
-        if (!isCalm(options.from + i, static_cast<int>(options.steps))) ++failed;
+        if (!isCalm(options.from + i, options)) ++failed;
     std::printf("%llu storms, %llu failed\n", static_cast<unsigned long long>(options.seeds),
                 static_cast<unsigned long long>(failed));
     return failed == 0 ? 0 : 1;
