@@ -238,7 +238,7 @@ int Config::writeCredential(const Credential& credential, Node section) {
 int Config::saveUsers() {
     if (m_userName.empty()) return kFailure;
     const ScopeGuard release([this]() NO_THREAD_SAFETY_ANALYSIS { m_xmlDoc.release(); });
-    if (openDocument() != kSuccess) return kFailure;
+    if (m_xmlDoc.create() != kSuccess || m_xmlDoc.load(m_configPath) != kSuccess) return kFailure;
     Node section;
     std::vector<Node> users;
     if (m_xmlDoc.selectSingleNode("/*/users", Node(), section) != kSuccess || !section ||

@@ -1,24 +1,17 @@
 #include "config/SafeSave.h"
 
 #include <array>
-#include <chrono>
 #include <optional>
 #include <random>
-
-#include "platform/Clock.h"
 
 namespace vexa {
 
 namespace {
 
-using namespace std::chrono_literals;
 using platform::NewFile;
-using platform::RenameResult;
 
 constexpr std::wstring_view kTemporaryEnding = L".tmp";
 constexpr int kNameTries = 16;
-constexpr int kRenameTries = 5;
-constexpr auto kRenamePause = 50ms;
 
 struct SplitPath {
     std::wstring folder;
@@ -61,25 +54,13 @@ std::optional<NewFile> createTemporary(const std::wstring& path) {
     return file;
 }
 
-// Somebody may be reading the old file at this moment: a virus scanner, a backup.
-RenameResult renameWithPatience(NewFile& file, const std::wstring& path, platform::Existing existing) {
-    RenameResult result = file.rename(path, existing);
-    for (int i = 1; result == RenameResult::InUse && i < kRenameTries; ++i) {
-        platform::sleepFor(kRenamePause);
-        result = file.rename(path, existing);
-    }
-    return result;
-}
-
 }  // namespace
 
 bool saveSafely(const std::wstring& path, std::string_view content, platform::Existing existing) {
     removeLeftovers(path);
     auto file = createTemporary(path);
     if (!file) return false;
-    if (file->write(content) && file->flush() &&
-        renameWithPatience(*file, path, existing) == RenameResult::Done)
-        return true;
+    if (file->write(content) && file->flush() && file->rename(path, existing)) return true;
     file->remove();
     return false;
 }

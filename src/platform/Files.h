@@ -24,7 +24,6 @@ bool createFolder(const std::wstring& path);
 std::vector<std::wstring> filesIn(const std::wstring& folder);
 
 enum class Existing { Replace, Keep };
-enum class RenameResult { Done, InUse, Failed };
 
 /// A file that did not exist before, held by this process until it is destroyed.
 class NewFile {
@@ -45,8 +44,9 @@ public:
     bool flush();
 
     /// Gives it another name in its folder, at once: there is no moment without a file of that name if there
-    /// was one before. InUse: another process has the existing file open.
-    RenameResult rename(const std::wstring& to, Existing existing);
+    /// was one before. A process that has the existing file open, a virus scanner or a backup, is waited for
+    /// a fraction of a second, by the wall clock.
+    bool rename(const std::wstring& to, Existing existing);
 
     void remove();
 

@@ -13,6 +13,7 @@
 
 #include "base/TextConversion.h"
 #include "platform/simulated/HostPath.h"
+#include "simulation/OwnerFiles.h"
 
 namespace vexa::platform {
 
@@ -23,6 +24,7 @@ namespace fs = std::filesystem;
 constexpr mode_t kOwnerOnlyFile = 0600;
 constexpr mode_t kOwnerOnlyFolder = 0700;
 constexpr std::uint32_t kErrorSharingViolation = 32;
+constexpr int kRenameTries = 5;
 
 /// A descriptor that is closed at the end of its scope.
 class Descriptor {
@@ -47,6 +49,16 @@ private:
 Descriptor openFile(const fs::path& path, int flags) {
     if (fileFault("open", path)) return Descriptor(-1);
     return Descriptor(::open(path.c_str(), flags | O_CLOEXEC, kOwnerOnlyFile));
+}
+
+// The process that has the file open is one of the scenario's faults; the next try meets the next of them.
+bool isRenameRefused(const fs::path& target) {
+    for (int tries = 0; tries < kRenameTries; ++tries) {
+        const auto error = fileFault("rename", target);
+        if (!error) return false;
+        if (*error != kErrorSharingViolation) return true;
+    }
+    return true;
 }
 
 bool writeAll(const Descriptor& file, std::string_view content) {
@@ -82,8 +94,7 @@ std::optional<std::string> readFile(const std::wstring& path) {
 bool createFolder(const std::wstring& path) {
     const fs::path folder = hostPath(path);
     if (fileFault("CreateDirectory", folder)) return false;
-    std::error_code ignored;
-    fs::create_directories(folder.parent_path(), ignored);
+    if (!simulation::createOwnerFolder(folder.parent_path())) return false;
     return ::mkdir(folder.c_str(), kOwnerOnlyFolder) == 0 || errno == EEXIST;
 }
 
@@ -121,16 +132,14 @@ bool NewFile::flush() {
     return !fileFault("sync", m_state->path) && ::fsync(m_state->file.get()) == 0;
 }
 
-RenameResult NewFile::rename(const std::wstring& to, Existing existing) {
+bool NewFile::rename(const std::wstring& to, Existing existing) {
     const fs::path target = hostPath(to);
-    if (const auto error = fileFault("rename", target))
-        return *error == kErrorSharingViolation ? RenameResult::InUse : RenameResult::Failed;
+    if (isRenameRefused(target)) return false;
     const fs::path& source = m_state->path;
-    if (existing == Existing::Replace)
-        return ::rename(source.c_str(), target.c_str()) == 0 ? RenameResult::Done : RenameResult::Failed;
-    if (::link(source.c_str(), target.c_str()) != 0) return RenameResult::Failed;
+    if (existing == Existing::Replace) return ::rename(source.c_str(), target.c_str()) == 0;
+    if (::link(source.c_str(), target.c_str()) != 0) return false;
     remove();
-    return RenameResult::Done;
+    return true;
 }
 
 void NewFile::remove() {
