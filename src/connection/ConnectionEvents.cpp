@@ -27,11 +27,18 @@ std::wstring profileNameOf(const WLAN_CONNECTION_NOTIFICATION_DATA& data) {
     return fromWlanText({data.strProfileName, WLAN_MAX_NAME_LENGTH});
 }
 
+// The default code page has a question mark for what it lacks.
+std::string inCodePage(std::wstring text) {
+    std::replace_if(
+        text.begin(), text.end(), [](wchar_t unit) { return unit > 0xFF; }, L'?');
+    return narrowByLocale(text).text;
+}
+
 std::wstring logReason(const WLAN_CONNECTION_NOTIFICATION_DATA& data) {
     WCHAR text[kReasonCapacity] = {};
     WlanReasonCodeToString(data.wlanReasonCode, kReasonCapacity, text, nullptr);
-    std::wstring reason = fromWlanText({text, kReasonCapacity});
-    Log(3, "Reason code desc=%s", narrowByLocale(reason).text.c_str());
+    const std::wstring reason = fromWlanText({text, kReasonCapacity});
+    Log(3, "Reason code desc=%s", inCodePage(reason).c_str());
     return reason;
 }
 
@@ -120,7 +127,7 @@ int Supplicant::onSuccess(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const N
     clearNumRetriesOnConnSuccess(profile.m_name, ssid);
     const Hs20Network* const network = m_networkList.findBySsid(ssid);
     if (network == nullptr) return kFailure;
-    if (m_history.addConnection(ssid, network->m_macAddress, m_networkList) != kSuccess)
+    if (m_history.addConnection(data.dot11Ssid, network->m_macAddress, m_networkList) != kSuccess)
         Log(6, "ERROR: Create connection history failed.");
     eapMethod = static_cast<std::uint32_t>(profile.m_eapMethod);
     return endAttempt(data, ConnectionResult::kSucceeded);
@@ -248,15 +255,17 @@ int Supplicant::onDisconnected(const WLAN_CONNECTION_NOTIFICATION_DATA* data) {
     Log(3, "Received Wlan disconnected event.");
     if (data == nullptr) return kFailure;
     logReason(*data);
-    const LockGuard lock(g_hs20Lock);
-    setState(SupplicantState::Disconnected);
     bool isRealmUpdatePending = false;
-    tellClient([&](const ClientEvents& events) { isRealmUpdatePending = events.takePendingRealmUpdate(); });
-    if (isRealmUpdatePending)
-        queryHs20NetworkAnqpInfo();
-    else
-        sendNetworkList();
-    if (m_history.updateDisconnection(bytesOf(data->dot11Ssid), m_networkList) != kSuccess)
+    {
+        const LockGuard lock(g_hs20Lock);
+        setState(SupplicantState::Disconnected);
+        tellClient(
+            [&](const ClientEvents& events) { isRealmUpdatePending = events.takePendingRealmUpdate(); });
+    }
+    if (isRealmUpdatePending) queryHs20NetworkAnqpInfo();
+    const LockGuard lock(g_hs20Lock);
+    if (!isRealmUpdatePending) sendNetworkList();
+    if (m_history.updateDisconnection(data->dot11Ssid, m_networkList) != kSuccess)
         Log(6, "ERROR: Update connection history failed.");
     m_bHs20Connected = false;
     return kSuccess;

@@ -1,5 +1,8 @@
 #include "connection/ConnectionHistory.h"
 
+#include <cstring>
+#include <string>
+
 #include "base/DiagnosticLog.h"
 #include "config/ResultCodes.h"
 #include "hotspot/Hs20NetworkList.h"
@@ -8,6 +11,10 @@ namespace vexa {
 
 namespace {
 
+std::string textOf(const DOT11_SSID& ssid) {
+    return std::string(bytesOf(ssid));
+}
+
 void close(ConnectionRecord& record) {
     record.m_disconnectedTime = getTimeValue();
     record.m_bDisconnectedTimeValid = true;
@@ -15,9 +22,9 @@ void close(ConnectionRecord& record) {
 
 }  // namespace
 
-int ConnectionHistory::addConnection(std::string_view ssid, const MacAddress& mac,
+int ConnectionHistory::addConnection(const DOT11_SSID& ssid, const MacAddress& mac,
                                      const Hs20NetworkList& networks) {
-    if (networks.findBySsid(ssid) == nullptr) {
+    if (networks.findBySsid(bytesOf(ssid)) == nullptr) {
         Log(3, "Not a HS20 network, don't adding history.");
         return kSuccess;
     }
@@ -27,7 +34,7 @@ int ConnectionHistory::addConnection(std::string_view ssid, const MacAddress& ma
     }
     if (!m_records.empty() && !m_records.back().m_bDisconnectedTimeValid) {
         Log(6, "Disconnected time not specified for last connection, ssid=%s",
-            m_records.back().m_ssid.c_str());
+            textOf(m_records.back().m_ssid).c_str());
         close(m_records.back());
     }
     ConnectionRecord record;
@@ -39,8 +46,8 @@ int ConnectionHistory::addConnection(std::string_view ssid, const MacAddress& ma
     return kSuccess;
 }
 
-int ConnectionHistory::updateDisconnection(std::string_view ssid, const Hs20NetworkList& networks) {
-    if (networks.findBySsid(ssid) == nullptr) {
+int ConnectionHistory::updateDisconnection(const DOT11_SSID& ssid, const Hs20NetworkList& networks) {
+    if (networks.findBySsid(bytesOf(ssid)) == nullptr) {
         Log(3, "Not a HS20 network, don't update history.");
         return kSuccess;
     }
@@ -48,9 +55,9 @@ int ConnectionHistory::updateDisconnection(std::string_view ssid, const Hs20Netw
         Log(6, "No connection history info while we disconnected from a network.");
         return kSuccess;
     }
-    if (m_records.back().m_ssid != ssid) {
+    if (std::memcmp(&m_records.back().m_ssid, &ssid, sizeof ssid) != 0) {
         Log(6, "ERROR: The ssid is not equal, last connection ssid=%s while disconnected ssid=%s",
-            m_records.back().m_ssid.c_str(), std::string(ssid).c_str());
+            textOf(m_records.back().m_ssid).c_str(), textOf(ssid).c_str());
         return kFailure;
     }
     close(m_records.back());
@@ -70,7 +77,7 @@ void ConnectionHistory::dump() const {
     for (std::size_t i = m_records.size(); i-- > 0;) {
         const ConnectionRecord& record = m_records[i];
         Log(0, "\t[%d] Ssid=%s MacAddr=%s connected time=%s, disconnected time=%s", static_cast<int>(i),
-            record.m_ssid.c_str(), toText(record.m_macAddress).c_str(),
+            textOf(record.m_ssid).c_str(), toText(record.m_macAddress).c_str(),
             formatTimeValue(record.m_connectedTime).c_str(),
             record.m_bDisconnectedTimeValid ? formatTimeValue(record.m_disconnectedTime).c_str()
                                             : "not specified");

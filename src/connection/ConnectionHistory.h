@@ -1,12 +1,11 @@
 #pragma once
 
-#include <string>
-#include <string_view>
 #include <vector>
 
 #include "base/NetworkListLock.h"
 #include "base/TimeValue.h"
 #include "hotspot/IhvMessages.h"
+#include "platform/WlanApi.h"
 
 namespace vexa {
 
@@ -20,17 +19,17 @@ struct ConnectionRecord {
     TimeValue m_disconnectedTime;
     bool m_bDisconnectedTimeValid = false;  // false while the connection is open
     MacAddress m_macAddress{};
-    std::string m_ssid;
+    DOT11_SSID m_ssid{};
 };
 
 /// The recent connections, oldest first. Only in memory; one more than its capacity wipes those before it.
 class ConnectionHistory {
 public:
     /// kSuccess, also for a network that isn't in the list and leaves no record.
-    int addConnection(std::string_view ssid, const MacAddress& mac, const Hs20NetworkList& networks)
+    int addConnection(const DOT11_SSID& ssid, const MacAddress& mac, const Hs20NetworkList& networks)
         REQUIRES(g_hs20Lock);
-    /// kFailure: the last record belongs to another SSID.
-    int updateDisconnection(std::string_view ssid, const Hs20NetworkList& networks) REQUIRES(g_hs20Lock);
+    /// kFailure: the last record belongs to another SSID, or to one with other bytes behind its end.
+    int updateDisconnection(const DOT11_SSID& ssid, const Hs20NetworkList& networks) REQUIRES(g_hs20Lock);
 
     /// The newest record; null if there is none.
     const ConnectionRecord* last() const REQUIRES(g_hs20Lock);

@@ -1,16 +1,10 @@
 #include <algorithm>
-#include <string_view>
 
 #include "base/WlanMemory.h"
 #include "config/ResultCodes.h"
 #include "connection/Supplicant.h"
 
 namespace vexa {
-
-std::string_view bytesOf(const DOT11_SSID& ssid) {
-    return {reinterpret_cast<const char*>(ssid.ucSSID),
-            std::min<std::size_t>(ssid.uSSIDLength, kMaxSsidLength)};
-}
 
 int Supplicant::queryCurrentConnection(DOT11_SSID& ssid, MacAddress& bssid, bool includeConnecting) const {
     const auto state = queryInterface<WLAN_INTERFACE_STATE>(
@@ -32,7 +26,6 @@ Hs20Network* Supplicant::getConnectedBss(bool includeConnecting) const {
     DOT11_SSID ssid{};
     MacAddress bssid{};
     if (queryCurrentConnection(ssid, bssid, includeConnecting) != kSuccess) return nullptr;
-    if (ssid.uSSIDLength > kMaxSsidLength) return nullptr;
     return m_networkList.findBySsid(bytesOf(ssid));
 }
 

@@ -113,6 +113,10 @@ constexpr std::array<Gate, 9> kGates = {{
 }  // namespace
 
 InterworkingMgr::~InterworkingMgr() {
+    stopIfInited();
+}
+
+void InterworkingMgr::stopIfInited() {
     if (!m_bInited) return;
     Log(2, "InterworkingMgr not deinited!");
     stop();

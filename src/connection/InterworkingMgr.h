@@ -38,6 +38,9 @@ public:
     /// Ends the thread, within 10 s. REQUIRES: the network list lock not held.
     void stop();
 
+    /// For an owner that is destroyed without an orderly end.
+    void stopIfInited();
+
     /// Whether stop() gave up waiting. The thread then ends by itself after its sleep, and the Supplicant
     /// must live until the process ends.
     bool isThreadLate() const { return m_isThreadLate; }

@@ -28,13 +28,20 @@ bool isPair(std::int32_t credId, std::string_view ssid) {
     return credId >= 1 && !ssid.empty();
 }
 
-}  // namespace
-
-NetworkRetryHelper::Entries::iterator NetworkRetryHelper::find(std::int32_t credId, std::string_view ssid) {
-    return std::find_if(m_cred2ssid.begin(), m_cred2ssid.end(), [&](const Cred2SsidEntry& entry) {
-        return entry.credId == credId && entry.ssid == textOf(ssid);
-    });
+template <class Entry>
+bool isEntryOf(const Entry& entry, std::int32_t credId, std::string_view ssid) {
+    return entry.credId == credId && entry.ssid == textOf(ssid);
 }
+
+// Null if the pair has no entry.
+template <class Entries>
+auto* entryOf(Entries& entries, std::int32_t credId, std::string_view ssid) {
+    const auto found = std::find_if(entries.begin(), entries.end(),
+                                    [&](const auto& entry) { return isEntryOf(entry, credId, ssid); });
+    return found == entries.end() ? nullptr : &*found;
+}
+
+}  // namespace
 
 bool NetworkRetryHelper::isRetryAllowed(const CredentialTable& credentials, std::int32_t credId,
                                         std::string_view ssid) const {
@@ -47,17 +54,14 @@ bool NetworkRetryHelper::isRetryAllowed(const CredentialTable& credentials, std:
 }
 
 std::uint32_t NetworkRetryHelper::getNumRetries(std::int32_t credId, std::string_view ssid) const {
-    const auto found = std::find_if(m_cred2ssid.begin(), m_cred2ssid.end(), [&](const Cred2SsidEntry& entry) {
-        return entry.credId == credId && entry.ssid == textOf(ssid);
-    });
-    return found == m_cred2ssid.end() ? 0 : found->numRetries;
+    const auto* const entry = entryOf(m_cred2ssid, credId, ssid);
+    return entry == nullptr ? 0 : entry->numRetries;
 }
 
 void NetworkRetryHelper::setNumRetries(std::int32_t credId, std::string_view ssid, std::uint32_t count) {
     if (!isPair(credId, ssid)) return;
-    const auto found = find(credId, ssid);
-    if (found != m_cred2ssid.end()) {
-        found->numRetries = count;
+    if (auto* const entry = entryOf(m_cred2ssid, credId, ssid)) {
+        entry->numRetries = count;
         return;
     }
     const std::string text(textOf(ssid));
@@ -70,11 +74,10 @@ void NetworkRetryHelper::increaseNumRetries(std::int32_t credId, std::string_vie
     const std::string text(textOf(ssid));
     Log(3, "Increase retry numbers for cred id=%d, ssid=%s", credId, text.c_str());
     if (!isPair(credId, ssid)) return;
-    const auto found = find(credId, ssid);
-    if (found != m_cred2ssid.end()) {
+    if (auto* const entry = entryOf(m_cred2ssid, credId, ssid)) {
         Log(3, "\tIncrease cred2ssid num retries: credId=%d, ssid=%s, numRetries=%d\n", credId, text.c_str(),
-            static_cast<int>(found->numRetries));
-        ++found->numRetries;
+            static_cast<int>(entry->numRetries));
+        ++entry->numRetries;
         return;
     }
     Log(3, "\tNot found entry for cred id=%d and ssid=%s, set retry number to 1.", credId, text.c_str());
@@ -83,8 +86,7 @@ void NetworkRetryHelper::increaseNumRetries(std::int32_t credId, std::string_vie
 
 void NetworkRetryHelper::removeNumRetryEntries(std::int32_t credId, std::string_view ssid) {
     if (!isPair(credId, ssid)) return;
-    const auto found = find(credId, ssid);
-    if (found != m_cred2ssid.end()) m_cred2ssid.erase(found);
+    std::erase_if(m_cred2ssid, [&](const Cred2SsidEntry& entry) { return isEntryOf(entry, credId, ssid); });
 }
 
 void NetworkRetryHelper::removeAllCredNumRetryEntries(std::int32_t credId) {

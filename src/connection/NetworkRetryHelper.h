@@ -38,11 +38,7 @@ private:
         std::string ssid;
         std::uint32_t numRetries;
     };
-    using Entries = std::vector<Cred2SsidEntry>;
-
-    Entries::iterator find(std::int32_t credId, std::string_view ssid) REQUIRES(g_hs20Lock);
-
-    Entries m_cred2ssid GUARDED_BY(g_hs20Lock);
+    std::vector<Cred2SsidEntry> m_cred2ssid GUARDED_BY(g_hs20Lock);
 };
 
 }  // namespace vexa

@@ -64,6 +64,7 @@ Supplicant::Supplicant(const GUID& interfaceGuid, SupplicantMgr* mgr)
 }
 
 Supplicant::~Supplicant() {
+    m_interworkingMgr.stopIfInited();
     closeWlanHandle();
 }
 
@@ -104,7 +105,7 @@ void Supplicant::recordConnectionAtStart() {
     MacAddress bssid{};
     if (queryCurrentConnection(ssid, bssid, false) != kSuccess) return;
     const LockGuard lock(g_hs20Lock);
-    m_history.addConnection(bytesOf(ssid), bssid, m_networkList);
+    m_history.addConnection(ssid, bssid, m_networkList);
 }
 
 void Supplicant::logInterfaceGuid() const {

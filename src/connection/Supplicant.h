@@ -44,9 +44,6 @@ enum class SupplicantState : std::int32_t {
 
 const char* nameOf(SupplicantState state);
 
-/// The bytes of an SSID, 32 at most.
-std::string_view bytesOf(const DOT11_SSID& ssid);
-
 /// All that belongs to one adapter. Made and ended by SupplicantMgr; notification and command threads come
 /// here with a reference that keeps the object alive, also beyond deinit(): its events and its handle stay
 /// members to the end.

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cstdlib>
+#include <new>
 #include <utility>
 
 #include "base/AdapterIdentity.h"
@@ -50,10 +51,11 @@ int SupplicantMgr::init() {
 }
 
 void SupplicantMgr::deinit() {
-    for (const auto& supplicant : takeAll()) {
+    for (const auto& supplicant : copyAll()) {
         if (supplicant->isInitialized()) supplicant->deinit();
         retireIfLate(supplicant);
     }
+    takeAll();
     if (m_config.isDumpEnabled()) DiagnosticLog::instance().stop();
     m_bInitialized = false;
 }
@@ -73,6 +75,15 @@ int SupplicantMgr::reloadData() {
     return kSuccess;
 }
 
+// Null if memory runs out.
+std::shared_ptr<Supplicant> SupplicantMgr::makeSupplicant(const GUID& guid) {
+    try {
+        return std::make_shared<Supplicant>(guid, this);
+    } catch (const std::bad_alloc&) {
+        return nullptr;
+    }
+}
+
 int SupplicantMgr::addSupplicantIfInterfaceExists() {
     const LockGuard changes(m_changes);
     Log(4, "Enter addSupplicantIfInterfaceExists...");
@@ -88,7 +99,8 @@ int SupplicantMgr::addSupplicantIfInterfaceExists() {
         return kSuccess;
     }
     Log(4, "Start to add a HS20 supplicant.");
-    auto supplicant = std::make_shared<Supplicant>(*guid, this);
+    auto supplicant = makeSupplicant(*guid);
+    if (!supplicant) return kFailure;
     supplicant->init();
     if (!supplicant->isInitialized()) supplicant->init();
     add(std::move(supplicant));
@@ -154,6 +166,11 @@ std::shared_ptr<Supplicant> SupplicantMgr::firstSupplicant() {
 void SupplicantMgr::add(std::shared_ptr<Supplicant> supplicant) {
     const LockGuard lock(m_listMutex);
     m_supplicants.push_back(std::move(supplicant));
+}
+
+std::vector<std::shared_ptr<Supplicant>> SupplicantMgr::copyAll() {
+    const LockGuard lock(m_listMutex);
+    return m_supplicants;
 }
 
 std::vector<std::shared_ptr<Supplicant>> SupplicantMgr::takeAll() {

@@ -59,6 +59,8 @@ private:
     void retireIfLate(const std::shared_ptr<Supplicant>& supplicant);
     std::shared_ptr<Supplicant> firstSupplicant();
     void add(std::shared_ptr<Supplicant> supplicant);
+    std::shared_ptr<Supplicant> makeSupplicant(const GUID& guid);
+    std::vector<std::shared_ptr<Supplicant>> copyAll();
     std::vector<std::shared_ptr<Supplicant>> takeAll();
 
     Config m_config;

@@ -93,7 +93,7 @@ int Supplicant::onUserDisconnected(Bytes payload) {
         Log(6, "ERROR: Not a HS20 network.");
         return kFailure;
     }
-    const std::string& active = m_history.last()->m_ssid;
+    const std::string active(bytesOf(m_history.last()->m_ssid));
     if (!record.ssid.starts_with(active)) {
         Log(3, "Windows disconnected network with ssid=%s while the active connection with ssid=%s",
             record.ssid.c_str(), active.c_str());

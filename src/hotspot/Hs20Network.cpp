@@ -6,6 +6,11 @@
 
 namespace vexa {
 
+std::string_view bytesOf(const DOT11_SSID& ssid) {
+    if (ssid.uSSIDLength > kMaxSsidLength) return {};
+    return {reinterpret_cast<const char*>(ssid.ucSSID), ssid.uSSIDLength};
+}
+
 Hs20Network::Hs20Network(const Hs20BssRecord& record)
     : m_bHs20(record.isHs20 == 1),
       m_macAddress(record.macAddress),

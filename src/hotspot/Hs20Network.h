@@ -9,11 +9,15 @@
 #include "base/NetworkListLock.h"
 #include "hotspot/IhvMessages.h"
 #include "hotspot/NaiRealmParser.h"
+#include "platform/WlanApi.h"
 
 namespace vexa {
 
 /// The raw bytes of one ANQP element; empty if nothing was stored.
 using ByteBuffer = std::vector<std::byte>;
+
+/// The bytes of an SSID; none if its length is impossible.
+std::string_view bytesOf(const DOT11_SSID& ssid);
 
 /// One network in range. After folding there is one for each SSID.
 class Hs20Network {

@@ -44,7 +44,7 @@ Hs20BssRecord parseBssRecord(Bytes bytes) {
     Hs20BssRecord record;
     for (std::size_t i = 0; i < record.macAddress.size(); ++i)
         record.macAddress[i] = std::to_integer<std::uint8_t>(whole[kMacOffset + i]);
-    for (std::size_t i = 0; i < kMaxSsidLength && whole[kSsidOffset + i] != std::byte{0}; ++i)
+    for (std::size_t i = 0; kSsidOffset + i < kIsHs20Offset && whole[kSsidOffset + i] != std::byte{0}; ++i)
         record.ssid += std::to_integer<char>(whole[kSsidOffset + i]);
     record.isHs20 = numberAt(whole, kIsHs20Offset);
     record.networkType = numberAt(whole, kNetworkTypeOffset);

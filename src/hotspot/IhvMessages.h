@@ -45,7 +45,7 @@ std::string toText(const MacAddress& mac);
 /// One BSS as the module describes it.
 struct Hs20BssRecord {
     MacAddress macAddress{};
-    std::string ssid;          ///< At most 32 bytes.
+    std::string ssid;          ///< Up to the first NUL: 34 bytes, where 32 are no SSID any more.
     std::uint32_t isHs20 = 0;  ///< 1: a Hotspot 2.0 network; any other value: none.
     std::uint32_t networkType = 0;
     std::uint32_t internetAccess = 0;  ///< Not 0: the network offers it.

@@ -60,7 +60,7 @@ template <void (Server::*Act)(const std::string& name)>
 bool withNetwork(Server& server, const Json::Value& data) {
     const auto name = readText(data, "NetWorkName");
     if (!name || (data.isObject() && data["NetWorkName"].isBool())) return false;
-    (server.*Act)(name->substr(0, name->find('\0')));
+    (server.*Act)(*name);
     return true;
 }
 
@@ -89,7 +89,8 @@ void logInvalidCommand(const std::string& id) {
 
 void SAHotSpotPortlink::OnIpcMessage(const char* bytes, std::uint32_t length, void* context) {
     if (context == nullptr || bytes == nullptr || length == 0) return;
-    static_cast<Server*>(context)->HandleCommand(parseJsonText({bytes, length}));
+    if (const auto message = parseReceived({bytes, length}))
+        static_cast<Server*>(context)->HandleCommand(*message);
 }
 
 void SAHotSpotPortlink::HandleCommand(const Json::Value& root) {

@@ -8,6 +8,8 @@
 #include <json/reader.h>
 #include <json/writer.h>
 
+#include <new>
+
 namespace vexa {
 
 std::string toStyledText(const Json::Value& value) {
@@ -15,8 +17,15 @@ std::string toStyledText(const Json::Value& value) {
     return writer.write(value);
 }
 
+std::optional<Json::Value> parseReceived(std::string_view bytes) {
+    try {
+        return parseJsonText(bytes.substr(0, bytes.find('\0')));
+    } catch (const std::bad_alloc&) {
+        return std::nullopt;
+    }
+}
+
 Json::Value parseJsonText(std::string_view text) {
-    text = text.substr(0, text.find('\0'));
     Json::Value root;
     Json::Reader reader;
     try {

@@ -12,9 +12,12 @@ namespace vexa {
 /// end.
 std::string toStyledText(const Json::Value& value);
 
-/// Reads text up to its first NUL. Comments are allowed and the root may be anything. Errors are not told:
+/// Comments are allowed and the root may be anything. Errors are not told:
 /// what was read before the error stays, text that isn't JSON and text nested too deeply give null.
 Json::Value parseJsonText(std::string_view text);
+
+/// The same for the bytes of a message, up to the first NUL. Nothing if memory runs out.
+std::optional<Json::Value> parseReceived(std::string_view bytes);
 
 /// A member as text: a string as it stands, a boolean as true or false, null or no member as empty. Nothing
 /// for other types.

@@ -82,7 +82,9 @@ SAPortlink::~SAPortlink() {
 
 void SAPortlink::OnIpcMessage(const char* bytes, std::uint32_t length, void* context) {
     if (bytes == nullptr || length == 0 || context == nullptr) return;
-    const std::string id = readText(parseJsonText({bytes, length}), "CommandId").value_or("");
+    const auto message = parseReceived({bytes, length});
+    if (!message) return;
+    const std::string id = readText(*message, "CommandId").value_or("");
     printToStandardOutput("Service request from client : request id = %s\n", id.c_str());
     for (const Command& command : kCommands)
         if (command.id == id) return command.act(*static_cast<SAPortlink*>(context));

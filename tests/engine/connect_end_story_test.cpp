@@ -54,10 +54,11 @@ TEST(Disconnect, KeepsAutoConnectAwayUntilTheUserAsksAgain) {
 
 TEST(Disconnect, OfWhatIsNotConnectedChangesNothing) {
     struct Case {
-        const char* name;
+        std::string name;
         const char* line;
     };
     const Case cases[] = {
+        {{"cafe\0x", 6}, "ERROR: Connected ssid=cafe while requesting disconnect from ssid=cafe"},
         {"hotel", "ERROR: Connected ssid=cafe while requesting disconnect from ssid=hotel"},
         {"caf", "ERROR: Connected ssid=cafe while requesting disconnect from ssid=caf"},
     };
@@ -160,7 +161,7 @@ TEST(UserLeavesBySystem, BlocksTheNetworkThatIsConnected) {
 struct NoBlock {
     const char* what;
     std::function<void(World&)> before;
-    const char* report;
+    std::string report;
     std::vector<std::string> log;
 };
 
@@ -211,6 +212,10 @@ const std::vector<NoBlock>& noBlocks() {
          R"({"do":"userDisconnect","ssid":"cafe","isHs20":0})",
          {"Check if the active connection is the connection to be disconnected.",
           "ERROR: Not a HS20 network."}},
+        {"its SSID is too long",
+         [](World&) {},
+         moduleMessage(5, bssRecord("02aa00000001", "cafe" + std::string(30, 'x'))),
+         {"Check if the active connection is the connection to be disconnected."}},
     };
     return all;
 }
@@ -222,7 +227,7 @@ TEST(UserLeavesBySystem, BlocksNothingThatMayBeASideEffect) {
         const Ending ending = runStory(47, scenario, [&](World& world) {
             world.advance(5s);
             c.before(world);
-            const std::size_t before = world.log().size();
+            const std::size_t before = world.logSize();
             world.perform(c.report);
             std::vector<std::string> expected = {
                 "### IHV reports HS20 network has been disconnected manually by user. ###"};
@@ -354,14 +359,14 @@ TEST(SessionChange, IsToldByItsKind) {
     const Ending ending = runStory(53, "{}", [&](World& world) {
         std::string missing;
         for (const auto& [type, text] : kinds) {
-            const std::size_t before = world.log().size();
+            const std::size_t before = world.logSize();
             world.perform(R"({"do":"sessionChange","sessionId":2,"eventType":)" + std::to_string(type) + "}");
             missing += missingInOrder(
                 world,
                 {"\tEventType=" + std::to_string(type) + ", sessionId=2", text, "Enter resetAllNumRetries."},
                 before);
         }
-        const std::size_t before = world.log().size();
+        const std::size_t before = world.logSize();
         world.perform(moduleMessage(6, bytesOfHex("01000000020000")));
         return missing + messagesSince(world, before);
     });

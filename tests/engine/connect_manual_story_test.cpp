@@ -14,7 +14,7 @@ struct ByHand {
     const char* what;
     std::vector<std::string> networks;
     std::vector<StoredCredential> credentials;
-    const char* name;
+    std::string name;
     std::string requests;
     std::string outcomes;
     std::string connected;
@@ -70,6 +70,7 @@ const std::vector<ByHand>& manualConnects() {
          "0",
          "-",
          -1},
+        {"a name that goes on behind a NUL", {kOpenCafe}, {byHand(1)}, {"cafe\0x", 6}, "", "0", "-", -1},
         {"no name", {kOpenCafe}, {byHand(1)}, "", "", "", "-", -1},
         {"a network without realm data",
          {network(1, "cafe", R"("anqp":"never",)" + lettingInAll())},

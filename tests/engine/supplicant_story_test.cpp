@@ -40,6 +40,13 @@ TEST(SupplicantStory, ComesAndGoesWithTheAdapterAndLeavesNoHandle) {
               "initialised, none -1, initialised 0, none -1, initialised 0, none -1, initialised 0");
 }
 
+TEST(SupplicantStory, AnAdapterIsKnownHoweverItsIdentifierIsWritten) {
+    const char* const scenario = R"({"adapters":[{"guid":"{6b1e8a4c-5d2f-4e0b-9c37-1f5d00000001}"}]})";
+    const Ending ending = runStory(7, scenario, [](World&) { return stateOf(kFirst); });
+    EXPECT_TRUE(ending.isOrderly) << ending.errors;
+    EXPECT_EQ(ending.text, "initialised");
+}
+
 TEST(SupplicantStory, ASecondArrivalResetsIt) {
     const Ending ending = runStory(1, "{}", [](World& world) {
         const auto before = SupplicantMgr::instance().findSupplicantByGuid(kFirst);

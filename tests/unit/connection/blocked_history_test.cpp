@@ -132,13 +132,19 @@ TEST_F(Memory, ACredentialThatMayConnectNowOpensTheNetworksInRangeThatItFits) {
     EXPECT_EQ(m_blocked.onCredentialAutoConnectChanged(-1, m_table, m_networks), kInvalidArgument);
 }
 
+DOT11_SSID ssidOf(std::string_view name) {
+    DOT11_SSID ssid{static_cast<ULONG>(name.size()), {}};
+    std::copy(name.begin(), name.end(), std::begin(ssid.ucSSID));
+    return ssid;
+}
+
 TEST_F(Memory, AHistoryHoldsTheNetworksOfTheListAlone) {
     inRange({"cafe"});
     LogCapture log;
-    EXPECT_EQ(m_history.addConnection("home", {}, m_networks), kSuccess);
+    EXPECT_EQ(m_history.addConnection(ssidOf("home"), {}, m_networks), kSuccess);
     EXPECT_EQ(m_history.last(), nullptr);
-    EXPECT_EQ(m_history.updateDisconnection("home", m_networks), kSuccess);
-    EXPECT_EQ(m_history.updateDisconnection("cafe", m_networks), kSuccess);
+    EXPECT_EQ(m_history.updateDisconnection(ssidOf("home"), m_networks), kSuccess);
+    EXPECT_EQ(m_history.updateDisconnection(ssidOf("cafe"), m_networks), kSuccess);
     EXPECT_EQ(log.text(),
               "Not a HS20 network, don't adding history.\nNot a HS20 network, don't update history.\n"
               "No connection history info while we disconnected from a network.\n");
@@ -146,21 +152,36 @@ TEST_F(Memory, AHistoryHoldsTheNetworksOfTheListAlone) {
 
 TEST_F(Memory, AHistoryOpensAndClosesItsLastRecord) {
     inRange({"cafe", "hotel"});
-    m_history.addConnection("cafe", {1, 2, 3, 4, 5, 6}, m_networks);
-    EXPECT_EQ(m_history.last()->m_ssid, "cafe");
+    m_history.addConnection(ssidOf("cafe"), {1, 2, 3, 4, 5, 6}, m_networks);
+    EXPECT_EQ(bytesOf(m_history.last()->m_ssid), "cafe");
     EXPECT_FALSE(m_history.last()->m_bDisconnectedTimeValid);
     LogCapture log;
-    EXPECT_EQ(m_history.updateDisconnection("hotel", m_networks), kFailure);
+    EXPECT_EQ(m_history.updateDisconnection(ssidOf("hotel"), m_networks), kFailure);
     EXPECT_EQ(log.lines().front(),
               "ERROR: The ssid is not equal, last connection ssid=cafe while disconnected ssid=hotel");
     EXPECT_FALSE(m_history.last()->m_bDisconnectedTimeValid);
-    EXPECT_EQ(m_history.updateDisconnection("cafe", m_networks), kSuccess);
+    EXPECT_EQ(m_history.updateDisconnection(ssidOf("cafe"), m_networks), kSuccess);
     EXPECT_TRUE(m_history.last()->m_bDisconnectedTimeValid);
     log.text();
-    m_history.addConnection("hotel", {}, m_networks);
-    m_history.addConnection("cafe", {}, m_networks);
+    m_history.addConnection(ssidOf("hotel"), {}, m_networks);
+    m_history.addConnection(ssidOf("cafe"), {}, m_networks);
     EXPECT_NE(log.text().find("Disconnected time not specified for last connection, ssid=hotel\n"),
               std::string::npos);
+    EXPECT_FALSE(m_history.last()->m_bDisconnectedTimeValid);
+}
+
+// The service fills what it doesn't use with zeros; something else is not what was recorded.
+TEST_F(Memory, AHistoryComparesTheWholeFieldOfAnSsid) {
+    inRange({"cafe"});
+    m_history.addConnection(ssidOf("cafe"), {}, m_networks);
+    DOT11_SSID tooLong = ssidOf("cafe");
+    tooLong.uSSIDLength = 40;
+    LogCapture log;
+    EXPECT_EQ(m_history.updateDisconnection(tooLong, m_networks), kSuccess);
+    EXPECT_EQ(log.text(), "Not a HS20 network, don't update history.\n");
+    DOT11_SSID withRest = ssidOf("cafe");
+    withRest.ucSSID[31] = 1;
+    EXPECT_EQ(m_history.updateDisconnection(withRest, m_networks), kFailure);
     EXPECT_FALSE(m_history.last()->m_bDisconnectedTimeValid);
 }
 
@@ -169,7 +190,7 @@ TEST_F(Memory, TheHistoryBeginsAnewBehindItsFiftiethConnection) {
     LogCapture log;
     const std::string overflow = "Connection history entries overflow, clear all entries.\n";
     for (int i = 1; i <= 101; ++i) {
-        m_history.addConnection("cafe", {}, m_networks);
+        m_history.addConnection(ssidOf("cafe"), {}, m_networks);
         EXPECT_EQ(log.text().find(overflow) != std::string::npos, i == 51 || i == 101) << i;
     }
 }

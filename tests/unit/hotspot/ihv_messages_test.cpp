@@ -52,9 +52,10 @@ TEST(BssRecords, AreAsManyAsFitWhole) {
     EXPECT_EQ(parseBssRecords(Block(10240)).size(), 196U);
 }
 
-TEST(BssRecords, AnSsidEndsAtItsFirstNulAndAt32Bytes) {
-    const std::string full(34, 'y');
-    EXPECT_EQ(parseBssRecord(bssRecord("010203040506", full)).ssid, std::string(32, 'y'));
+TEST(BssRecords, AnSsidEndsAtItsFirstNulAndThatOfANetworkAt32Bytes) {
+    const Hs20BssRecord full = parseBssRecord(bssRecord("010203040506", std::string(34, 'y')));
+    EXPECT_EQ(full.ssid, std::string(34, 'y'));
+    EXPECT_EQ(Hs20Network(full).ssid(), std::string(32, 'y'));
     EXPECT_EQ(parseBssRecord(bssRecord("010203040506", std::string("ab\0cd", 5))).ssid, "ab");
     EXPECT_EQ(parseBssRecord(bssRecord("010203040506", "")).ssid, "");
 }
