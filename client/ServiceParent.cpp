@@ -191,10 +191,9 @@ void ServiceParent::giveUp() {
 }
 
 void ServiceParent::reportEarlyEnd(int exitCode) const {
+    if (exitCode == kScenarioRefused) return;  // it has said so itself
     std::cerr << "vexa: the service ended with exit code " << exitCode << " before it was ready: ";
-    if (exitCode == kScenarioRefused) {
-        std::cerr << "it refuses the scenario\n";
-    } else if (exitCode == 0) {
+    if (exitCode == 0) {
         std::cerr << "another one seems to run on the machine " << m_folder.path().string() << '\n';
     } else {
         std::cerr << "one of the ports " << portNames(m_ports) << " may be busy; its output is in "

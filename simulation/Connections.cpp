@@ -174,15 +174,12 @@ Ticket Connections::take(ConnectionSteps steps, DWORD reason) {
 }
 
 Ticket Connections::take(const ConnectionStep& step, DWORD reason) {
-    std::function<void(Bytes&)> before;
-    if (step.state) {
-        m_link.state = *step.state;
-        ++m_untold;
-        before = [this, link = m_link](Bytes&) { show(link); };
-    }
+    if (step.state) m_link.state = *step.state;
+    ++m_untold;
     const bool isAcm = step.source == WLAN_NOTIFICATION_SOURCE_ACM;
     Bytes data = isAcm ? connectionMessage(m_link, step.tellsReason ? reason : kSucceeded) : Bytes{};
-    return m_notifications.post({step.source, step.code, m_link.guid, std::move(data), std::move(before)});
+    return m_notifications.post({step.source, step.code, m_link.guid, std::move(data),
+                                 [this, link = m_link](Bytes&) { show(link); }});
 }
 
 Ticket Connections::postPresence(std::size_t adapter, DWORD code, std::function<void(Bytes&)> before) {

@@ -112,11 +112,9 @@ bool MachineRegistry::setAutoConnect(const std::optional<std::string>& text) {
     const LockGuard<Mutex> lock(m_mutex);
     Json::Value keys = readContent();
     Json::Value& values = valuesOf(keys, kProductKey);
-    if (text) {
-        values[kAutoConnect] = *text;
-    } else {
-        values.removeMember(kAutoConnect);
-    }
+    for (const std::string& name : values.getMemberNames())
+        if (equalsNoCase(name, kAutoConnect)) values.removeMember(name);
+    if (text) values[kAutoConnect] = *text;
     return replaceFile(m_file, indentedJson(keys));
 }
 

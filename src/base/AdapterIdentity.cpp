@@ -72,7 +72,8 @@ bool isVendorInterface(const GUID& guid) {
     for (std::uint32_t index = 0;; ++index) {
         const auto name = classKey->subkeyName(index, kRegistryBuffer);
         if (!name) return false;
-        if (isVendorInstance(std::string(kNetworkAdapterClass) + "\\" + *name, guid)) return true;
+        if (!name->empty() && isVendorInstance(std::string(kNetworkAdapterClass) + "\\" + *name, guid))
+            return true;
     }
 }
 

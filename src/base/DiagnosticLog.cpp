@@ -122,6 +122,7 @@ void DiagnosticLog::start(std::string filePath) {
         m_filePath = std::move(filePath);
     }
     m_bStop = false;
+    m_hStopEvent.reset();
     m_bEnabled = true;
     if (!m_thread.start("log", [this] { runThread(); })) m_bEnabled = false;
 }

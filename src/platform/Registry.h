@@ -19,8 +19,8 @@ public:
     RegistryKey(RegistryKey&&) noexcept;
     RegistryKey& operator=(RegistryKey&&) noexcept;
 
-    /// The name of subkey `index`, counted from 0; nothing past the last, or if it is too long for `capacity`
-    /// bytes with its terminator.
+    /// The name of subkey `index`, counted from 0; nothing past the last, empty if it is too long for
+    /// `capacity` bytes with its terminator.
     std::optional<std::string> subkeyName(std::uint32_t index, std::size_t capacity) const;
 
     /// The content of a value of any type, up to its first NUL; nothing if it is missing or doesn't fit

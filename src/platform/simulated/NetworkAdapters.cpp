@@ -1,5 +1,6 @@
 #include "platform/NetworkAdapters.h"
 
+#include "base/AdapterIdentity.h"
 #include "simulation/Machine.h"
 
 namespace vexa::platform {
@@ -24,8 +25,8 @@ AdapterList getAdaptersAddresses(std::uint32_t bufferSize) {
     for (const std::size_t index : machine->adapters().inserted()) {
         const simulation::AdapterSetup adapter = machine->adapters().snapshot(index);
         if (!adapter.listed) continue;
-        list.adapters.push_back(
-            {kInterfaceTypeIeee80211, interfaceIndexOf(index), adapter.guidText, adapter.macAddress});
+        list.adapters.push_back({kInterfaceTypeIeee80211, interfaceIndexOf(index), guidToString(adapter.guid),
+                                 adapter.macAddress});
     }
     return list;
 }

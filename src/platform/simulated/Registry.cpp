@@ -24,8 +24,8 @@ RegistryKey& RegistryKey::operator=(RegistryKey&&) noexcept = default;
 
 std::optional<std::string> RegistryKey::subkeyName(std::uint32_t index, std::size_t capacity) const {
     const auto names = m_state->registry.subkeys(m_state->root, m_state->path);
-    if (index >= names.size() || names[index].size() >= capacity) return std::nullopt;
-    return names[index];
+    if (index >= names.size()) return std::nullopt;
+    return names[index].size() < capacity ? names[index] : std::string();
 }
 
 std::optional<std::string> RegistryKey::value(const std::string& name, std::size_t capacity) const {

@@ -22,7 +22,7 @@ TEST(MachineRegistry, HasASubkeyForEachAdapter) {
     EXPECT_EQ(key->subkeyName(0, 256), "0000");
     EXPECT_EQ(key->subkeyName(1, 256), "0001");
     EXPECT_EQ(key->subkeyName(1, 5), "0001");
-    EXPECT_EQ(key->subkeyName(1, 4), std::nullopt);
+    EXPECT_EQ(key->subkeyName(1, 4), "");
     EXPECT_EQ(key->subkeyName(2, 256), std::nullopt);
     const auto second = RegistryKey::open(RegistryRoot::LocalMachine, kClassKey + "\\0001");
     ASSERT_TRUE(second);
@@ -92,6 +92,19 @@ TEST(MachineRegistry, ReadsWhatOthersWroteToTheFile) {
     EXPECT_EQ(key->value("EapMethod", 256), "\x15");
     EXPECT_EQ(key->value("EapMethod", 4), std::nullopt);
     EXPECT_EQ(key->value("Text", 2), "a");
+}
+
+TEST(MachineRegistry, TheUsersChoiceIsFoundHoweverItsNameIsWritten) {
+    const char* const none = R"({"HKEY_CURRENT_USER\\Software\\Korvane\\Vexa":{}})";
+    for (const char* value : {"null", "'true'"}) {
+        TestMachine machine;
+        ASSERT_TRUE(
+            replaceFile(machine->folder() / "registry.json",
+                        R"({"HKEY_CURRENT_USER\\Software\\Korvane\\Vexa": {"ishotspotautoconnect": "0"}})"));
+        machine.ask("{'do': 'setRegistry', 'value': " + std::string(value) + "}");
+        machine.ask("{'do': 'setRegistry', 'value': null}");
+        EXPECT_EQ(compactJson(machine.query("{'query': 'registry'}")), none) << value;
+    }
 }
 
 }  // namespace
