@@ -25,15 +25,6 @@ void Event::reset() {
     Scheduler::get().reset(*m_state);
 }
 
-bool Event::wait(Timeout limit) {
-    Event* const self = this;
-    return waitForAny({&self, 1}, limit) == 0;
-}
-
-int waitForAny(std::span<Event* const> events, Timeout limit) {
-    return waitForAnyUntil(events, limit ? Timeout(now() + *limit) : kForever);
-}
-
 int waitForAnyUntil(std::span<Event* const> events, Timeout deadline) {
     assert(events.size() <= kMaxEvents);
     std::array<Event::State*, kMaxEvents> states{};
