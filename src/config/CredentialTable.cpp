@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <limits>
+#include <new>
 #include <utility>
 
 #include "base/DiagnosticLog.h"
@@ -16,6 +17,16 @@ constexpr std::int32_t kLargest = std::numeric_limits<std::int32_t>::max();
 
 bool isPlaced(const Credential& credential) {
     return credential.m_priority != 0 && credential.m_priority != CRED_PRIORITY_LOWEST;
+}
+
+// Null if memory runs out.
+std::unique_ptr<Credential> makeRecord(std::int32_t id, const std::wstring& creator, std::int32_t type,
+                                       std::int32_t accessType) {
+    try {
+        return std::make_unique<Credential>(id, creator, type, accessType);
+    } catch (const std::bad_alloc&) {
+        return nullptr;
+    }
 }
 
 // The texts that a credential of its type has. False: the type has none.
@@ -64,7 +75,8 @@ int CredentialTable::addCredential(const CredentialInput& input, std::int32_t ne
     }
     if (nextId == kLargest) return kFailure;
     const std::int32_t accessType = input.accessType == 0 ? CRED_ACCESS_ALL_USER : input.accessType;
-    auto record = std::make_unique<Credential>(nextId, creator, input.type, accessType);
+    auto record = makeRecord(nextId, creator, input.type, accessType);
+    if (!record) return kOutOfMemory;
     if (!applyTexts(*record, input, name)) {
         Log(2, "Unknown credential type.");
         return kFailure;
