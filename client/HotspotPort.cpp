@@ -107,7 +107,8 @@ std::optional<Event> HotspotPort::next(std::optional<steady_clock::time_point> d
             left = std::chrono::ceil<milliseconds>(*deadline - steady_clock::now());
             if (*left <= milliseconds(0)) return std::nullopt;
         }
-        if (waitForActivity(m_client.descriptor(), m_client.events(), m_signals, left) == Activity::StopAsked)
+        const Awaited service{m_client.descriptor(), m_client.events()};
+        if (waitForActivity(std::span(&service, 1), m_signals, m_keys, left) == Activity::StopAsked)
             throw StoppedByUser("stopped before the service had answered");
         m_client.process();
     }

@@ -11,6 +11,7 @@
 #include "client/ClientError.h"
 #include "client/Event.h"
 #include "client/Signals.h"
+#include "client/TerminalKeys.h"
 #include "client/WebSocketClient.h"
 
 namespace vexa::client {
@@ -64,6 +65,9 @@ public:
     /// The next event. Nothing if none comes before the deadline. Throws NoAnswer.
     std::optional<Event> next(std::optional<std::chrono::steady_clock::time_point> deadline);
 
+    /// From now on `q` ends the waiting too.
+    void endWith(TerminalKeys& keys) { m_keys = &keys; }
+
     /// Sees to it that the service gets what was told.
     void close();
 
@@ -72,6 +76,7 @@ private:
 
     WebSocketClient m_client;
     Signals& m_signals;
+    TerminalKeys* m_keys = nullptr;
     std::chrono::milliseconds m_limit;
     int m_checksOwed = 0;
 };

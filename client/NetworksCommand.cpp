@@ -63,6 +63,8 @@ int runNetworks(const NetworksOptions& options) {
     if (list) print(*list, json);
     if (list && list->empty() && !json) explain(port, options.hotspot);
     if (!options.watch) return kExitOk;
+    std::optional<TerminalKeys> keys;
+    if (TerminalKeys::isUsable()) port.endWith(keys.emplace());
     try {
         watch(port, list.value_or(NetworkList()), json);
     } catch (const StoppedByUser&) {  // that is how it ends
@@ -77,7 +79,7 @@ void addNetworksCommand(CLI::App& app, int& exitCode) {
     CLI::App* command =
         app.add_subcommand("networks", "List the hotspot networks in range, with their realms");
     options->hotspot.addTo(*command);
-    command->add_flag("--watch", options->watch, "Go on with every list that differs, until Ctrl-C");
+    command->add_flag("--watch", options->watch, "Go on with every list that differs, until q or Ctrl-C");
     command->callback([options, &exitCode] { exitCode = runNetworks(*options); });
 }
 

@@ -118,8 +118,7 @@ void SpectrumOutput::handleSignal(int signal) {
 }
 
 bool SpectrumOutput::isQuitKey() {
-    const auto key = m_screen->takeKey();
-    return key && (*key == 'q' || *key == 'Q');
+    return m_screen->keys().takeQuit();
 }
 
 bool SpectrumOutput::isGone() const {

@@ -34,7 +34,7 @@ public:
     /// The terminal was resized, or this process is to be suspended.
     void handleSignal(int signal);
 
-    int keyDescriptor() const { return m_screen ? m_screen->keyDescriptor() : -1; }
+    int keyDescriptor() const { return m_screen ? m_screen->keys().descriptor() : -1; }
 
     /// Reads a key; true if it asks for the end.
     bool isQuitKey();

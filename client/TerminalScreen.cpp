@@ -56,14 +56,7 @@ TerminalScreen::~TerminalScreen() {
 
 void TerminalScreen::enter() {
     if (m_entered) return;
-    termios settings{};
-    if (::tcgetattr(STDIN_FILENO, &settings) == 0) {
-        m_before = settings;
-        settings.c_lflag &= ~static_cast<tcflag_t>(ICANON | ECHO);
-        settings.c_cc[VMIN] = 0;
-        settings.c_cc[VTIME] = 0;
-        m_keys = ::tcsetattr(STDIN_FILENO, TCSANOW, &settings) == 0;
-    }
+    m_keys.enter();
     std::cout << kEnter << std::flush;
     m_entered = true;
     resized();
@@ -72,9 +65,8 @@ void TerminalScreen::enter() {
 void TerminalScreen::leave() {
     if (!m_entered) return;
     std::cout << kLeave << std::flush;
-    if (m_before) ::tcsetattr(STDIN_FILENO, TCSANOW, &*m_before);
-    m_before.reset();
-    m_entered = m_keys = false;
+    m_keys.leave();
+    m_entered = false;
 }
 
 void TerminalScreen::draw(const std::vector<std::string>& lines) {
@@ -92,15 +84,6 @@ void TerminalScreen::resized() {
     if (::ioctl(STDOUT_FILENO, TIOCGWINSZ, &size) != 0 || size.ws_col == 0 || size.ws_row == 0) return;
     m_columns = size.ws_col;
     m_rows = size.ws_row;
-}
-
-std::optional<char> TerminalScreen::takeKey() {
-    char key = 0;
-    const ssize_t count = ::read(STDIN_FILENO, &key, 1);
-    if (count == 1) return key;
-    // With this terminal mode a readable descriptor without a key is a terminal that has gone.
-    m_keys = false;
-    return std::nullopt;
 }
 
 }  // namespace vexa::client

@@ -1,10 +1,9 @@
 #pragma once
 
-#include <termios.h>
-
-#include <optional>
 #include <string>
 #include <vector>
+
+#include "client/TerminalKeys.h"
 
 namespace vexa::client {
 
@@ -33,20 +32,18 @@ public:
     void draw(const std::vector<std::string>& lines);
 
     int columns() const { return m_columns; }
+    int rows() const { return m_rows; }
 
     /// Asks for the size again.
     void resized();
 
-    /// Where keys come from: a descriptor to poll, or -1 if standard input is no terminal.
-    int keyDescriptor() const { return m_keys ? 0 : -1; }
-
-    /// A key that was pressed, or nothing. To be called when the descriptor is readable.
-    std::optional<char> takeKey();
+    /// What is typed while the screen is ours.
+    TerminalKeys& keys() { return m_keys; }
+    const TerminalKeys& keys() const { return m_keys; }
 
 private:
-    std::optional<termios> m_before;
+    TerminalKeys m_keys;
     bool m_entered = false;
-    bool m_keys = false;
     int m_columns = 80;
     int m_rows = 24;
 };
