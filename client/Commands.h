@@ -20,6 +20,8 @@ void addCredentialCommand(CLI::App& app, int& exitCode);
 void addReloadCommand(CLI::App& app, int& exitCode);
 void addLogCommand(CLI::App& app, int& exitCode);
 void addStatusCommand(CLI::App& app, int& exitCode);
+void addConnectCommand(CLI::App& app, int& exitCode);
+void addDisconnectCommand(CLI::App& app, int& exitCode);
 void addNetworksCommand(CLI::App& app, int& exitCode);
 void addEnableCommand(CLI::App& app, int& exitCode);
 void addDisableCommand(CLI::App& app, int& exitCode);

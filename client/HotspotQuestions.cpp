@@ -1,6 +1,9 @@
 #include "client/HotspotQuestions.h"
 
+#include "client/CredentialStore.h"
+#include "client/Fitting.h"
 #include "client/HotspotSwitch.h"
+#include "client/MachineRegistry.h"
 
 namespace vexa::client {
 
@@ -25,6 +28,21 @@ bool askRadio(HotspotPort& port) {
 
 std::optional<bool> askInternet(HotspotPort& port) {
     return askFlag(port, "GET_IS_INTERNET_ACCESS");
+}
+
+void requireRadio(HotspotPort& port) {
+    if (!port.hasAdapter()) throw ClientError(kNoAdapter);
+    if (!askRadio(port)) throw ClientError("the radio is off");
+}
+
+CredentialList askCredentials(HotspotPort& port) {
+    return CredentialStore(port).read();
+}
+
+std::vector<std::string> credentialsOf(const Network& connected, const CredentialList& stored,
+                                       const HotspotOptions& options) {
+    const auto machine = options.port.machine();
+    return credentialsBehind(stored, connected, machine ? readConnectionMethod(*machine) : std::nullopt);
 }
 
 std::optional<bool> hotspotSwitch(const HotspotOptions& options) {

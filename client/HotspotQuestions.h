@@ -1,7 +1,10 @@
 #pragma once
 
 #include <optional>
+#include <string>
+#include <vector>
 
+#include "client/Credential.h"
 #include "client/HotspotOptions.h"
 #include "client/HotspotPort.h"
 #include "client/Network.h"
@@ -21,6 +24,16 @@ bool askRadio(HotspotPort& port);
 
 /// The connected network gives access to the internet. Nothing without an adapter.
 std::optional<bool> askInternet(HotspotPort& port);
+
+/// Throws ClientError if there is no adapter, or if its radio is off.
+void requireRadio(HotspotPort& port);
+
+/// The credentials that are stored. Throws ClientError without an adapter.
+CredentialList askCredentials(HotspotPort& port);
+
+/// The names of the credentials with which this connection can have been made, as credentialsBehind() tells.
+std::vector<std::string> credentialsOf(const Network& connected, const CredentialList& stored,
+                                       const HotspotOptions& options);
 
 /// The hotspot switch as it is written down in the machine. Nothing if the machine is not known.
 std::optional<bool> hotspotSwitch(const HotspotOptions& options);

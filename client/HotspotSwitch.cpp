@@ -3,30 +3,21 @@
 #include <json/value.h>
 #include <strings.h>
 
-#include <fstream>
-#include <iterator>
-
 #include "client/JsonLine.h"
+#include "client/MachineRegistry.h"
 #include "client/OwnerFile.h"
 
 namespace vexa::client {
 
 namespace {
 
-constexpr const char* kKey = "HKEY_CURRENT_USER\\Software\\Korvane\\Vexa";
 constexpr const char* kValue = "IsHotSpotAutoConnect";
-
-Json::Value readRegistry(const MachineFolder& machine) {
-    std::ifstream input(machine.registryFile());
-    const std::string text{std::istreambuf_iterator<char>(input), std::istreambuf_iterator<char>()};
-    return parseJsonObject(text).value_or(Json::Value(Json::objectValue));
-}
 
 }  // namespace
 
 bool readHotspotSwitch(const MachineFolder& machine) {
     const Json::Value registry = readRegistry(machine);
-    const Json::Value& values = registry[kKey];
+    const Json::Value& values = registry[kVexaKey];
     if (!values.isObject() || !values[kValue].isString()) return true;
     return ::strcasecmp(values[kValue].asCString(), "false") != 0;
 }
@@ -34,7 +25,7 @@ bool readHotspotSwitch(const MachineFolder& machine) {
 bool writeHotspotSwitch(const MachineFolder& machine, bool isOn) {
     if (readHotspotSwitch(machine) == isOn) return true;
     Json::Value registry = readRegistry(machine);
-    Json::Value& values = registry[kKey];
+    Json::Value& values = registry[kVexaKey];
     if (!values.isObject()) values = Json::Value(Json::objectValue);
     values[kValue] = isOn ? "true" : "false";
     return replaceOwnerFile(machine.registryFile(), jsonLine(registry) + "\n");

@@ -9,10 +9,12 @@ namespace {
 
 using namespace vexa::client;
 
-constexpr std::array kCommands{
-    &addStartCommand,      &addDemoCommand,   &addStatusCommand,  &addScanCommand,    &addChannelsCommand,
-    &addNetworksCommand,   &addEnableCommand, &addDisableCommand, &addRefreshCommand, &addCredentialsCommand,
-    &addCredentialCommand, &addReloadCommand, &addLogCommand,     &addSendCommand,    &addListenCommand};
+constexpr std::array kCommands{&addStartCommand,      &addDemoCommand,       &addStatusCommand,
+                               &addScanCommand,       &addChannelsCommand,   &addNetworksCommand,
+                               &addConnectCommand,    &addDisconnectCommand, &addEnableCommand,
+                               &addDisableCommand,    &addRefreshCommand,    &addCredentialsCommand,
+                               &addCredentialCommand, &addReloadCommand,     &addLogCommand,
+                               &addSendCommand,       &addListenCommand};
 
 int report(const std::exception& error, int exitCode) {
     std::cerr << "vexa: " << error.what() << '\n';

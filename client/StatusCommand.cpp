@@ -3,6 +3,7 @@
 #include <memory>
 
 #include "client/Commands.h"
+#include "client/Fitting.h"
 #include "client/HotspotOptions.h"
 #include "client/HotspotPort.h"
 #include "client/HotspotQuestions.h"
@@ -19,6 +20,8 @@ struct Status {
     std::optional<bool> hotspot;
     std::optional<NetworkList> networks;
     std::optional<bool> internet;
+    /// Those with which the connection can have been made.
+    std::vector<std::string> credentials;
 };
 
 Status askStatus(HotspotPort& port, const HotspotOptions& options) {
@@ -29,12 +32,20 @@ Status askStatus(HotspotPort& port, const HotspotOptions& options) {
     status.isRadioOn = askRadio(port);
     status.networks = askNetworks(port);
     status.internet = askInternet(port);
+    const NetworkList networks = status.networks.value_or(NetworkList());
+    if (const Network* connected = connectedNetwork(networks))
+        status.credentials = credentialsOf(*connected, askCredentials(port), options);
     return status;
 }
 
 std::string flagText(const std::optional<bool>& flag, const char* yes, const char* no) {
     if (!flag) return "not known";
     return *flag ? yes : no;
+}
+
+std::string credentialText(const Status& status, const Network* connected) {
+    if (connected != nullptr && status.credentials.empty()) return "none of ours";
+    return connected == nullptr ? "none" : alternatives(status.credentials);
 }
 
 std::vector<std::string> statusLines(const Status& status) {
@@ -45,6 +56,7 @@ std::vector<std::string> statusLines(const Status& status) {
                          {"Hotspot", flagText(status.hotspot, "enabled", "disabled")},
                          {"Networks", std::to_string(networks.size())},
                          {"Connection", connected == nullptr ? "none" : connected->name},
+                         {"Credential", credentialText(status, connected)},
                          {"Internet", status.internet.value_or(false) ? "yes" : "no"}});
 }
 
@@ -61,6 +73,11 @@ Json::Value statusJson(const Status& status) {
     object["hotspot"] = flagJson(status.hotspot);
     object["networks"] = static_cast<Json::UInt64>(networks.size());
     object["connection"] = connected == nullptr ? Json::Value() : Json::Value(connected->name);
+    object["credential"] = Json::Value();
+    if (status.credentials.size() == 1) object["credential"] = status.credentials.front();
+    object["possibleCredentials"] = Json::Value(Json::arrayValue);
+    for (const std::string& name : status.credentials)
+        object["possibleCredentials"].append(name);
     object["internet"] = status.internet.value_or(false);
     return object;
 }
