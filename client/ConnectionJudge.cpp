@@ -92,8 +92,8 @@ Outcome LeaveJudge::judge(const NetworkList& list, const std::vector<Result>& re
         return Outcome::Open;
     }
     if (m_isConnected) return Outcome::Left;
-    const bool isTold = std::any_of(results.begin(), results.end(),
-                                    [](const Result& result) { return result.isReport && result.isBehind; });
+    const bool isTold =
+        std::any_of(results.begin(), results.end(), [](const Result& result) { return result.isReport; });
     return isTold ? Outcome::Ended : Outcome::Open;
 }
 

@@ -33,7 +33,7 @@ constexpr std::array kReasons{Reason{Outcome::NotStarted, false, "the service co
 
 }  // namespace
 
-Outcome awaitOutcome(HotspotPort& port, ConnectionJudge& judge, milliseconds limit) {
+Outcome awaitOutcome(HotspotPort& port, ConnectionJudge& judge, milliseconds limit) try {
     const auto end = steady_clock::now() + limit;
     auto nextLook = steady_clock::now() + kBetweenLooks;
     ask(port, judge);
@@ -50,6 +50,8 @@ Outcome awaitOutcome(HotspotPort& port, ConnectionJudge& judge, milliseconds lim
         if (judge.wantsLists()) port.tell(kNetworkList);
         nextLook = now + kBetweenLooks;
     }
+} catch (const StoppedByUser&) {
+    throw StoppedByUser("not waited for: the service goes on with it");
 }
 
 std::string reasonOf(Outcome outcome, const std::string& network) {

@@ -84,6 +84,9 @@ private:
         m_stream.next_layer().async_connect(endpoint, [&](error_code error) {
             result = error;
             if (error) return;
+            // Else a second command waits until the first one is acknowledged.
+            error_code ignored;
+            m_stream.next_layer().set_option(tcp::no_delay(true), ignored);
             result = asio::error::timed_out;
             m_stream.async_handshake(placeName(port), "/", [&](error_code outcome) { result = outcome; });
         });
