@@ -13,6 +13,7 @@ void addStartCommand(CLI::App& app, int& exitCode);
 void addDemoCommand(CLI::App& app, int& exitCode);
 void addScanCommand(CLI::App& app, int& exitCode);
 void addChannelsCommand(CLI::App& app, int& exitCode);
+void addWatchCommand(CLI::App& app, int& exitCode);
 void addSendCommand(CLI::App& app, int& exitCode);
 void addListenCommand(CLI::App& app, int& exitCode);
 void addCredentialsCommand(CLI::App& app, int& exitCode);

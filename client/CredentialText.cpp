@@ -19,6 +19,15 @@ std::string identity(const Credential& credential) {
     return text;
 }
 
+/// The ids of a list, without those that the other one has not.
+std::vector<int> keptIds(const CredentialList& list, const CredentialList& other) {
+    std::vector<int> ids;
+    for (const Credential& credential : list) {
+        if (findById(other, credential.id) != nullptr) ids.push_back(credential.id);
+    }
+    return ids;
+}
+
 }  // namespace
 
 std::vector<std::string> credentialTable(const CredentialList& list, Passwords passwords) {
@@ -63,6 +72,23 @@ Json::Value credentialsJson(const CredentialList& list, Passwords passwords) {
 
 std::string nameOf(const Credential& credential) {
     return "credential " + std::to_string(credential.id) + " " + inQuotes(credential.name);
+}
+
+std::vector<std::string> credentialChanges(const CredentialList& before, const CredentialList& now) {
+    std::vector<std::string> told;
+    for (const Credential& credential : before) {
+        if (findById(now, credential.id) == nullptr) told.push_back(nameOf(credential) + " was deleted");
+    }
+    for (const Credential& credential : now) {
+        const Credential* const known = findById(before, credential.id);
+        if (known == nullptr)
+            told.push_back(nameOf(credential) + " was added");
+        else if (*known != credential)
+            told.push_back(nameOf(credential) + " was changed");
+    }
+    if (keptIds(before, now) != keptIds(now, before))
+        told.emplace_back("the credentials have another order of priority");
+    return told;
 }
 
 }  // namespace vexa::client

@@ -25,4 +25,7 @@ Json::Value credentialsJson(const CredentialList& list, Passwords passwords);
 /// Its id and its name.
 std::string nameOf(const Credential& credential);
 
+/// What is different between two lists, a sentence each.
+std::vector<std::string> credentialChanges(const CredentialList& before, const CredentialList& now);
+
 }  // namespace vexa::client

@@ -9,11 +9,14 @@
 namespace vexa::client {
 
 bool printEvents(WebSocketClient& client) {
-    while (const auto text = client.take()) {
-        // What is not JSON is shown all the same, as a JSON string.
-        std::cout << jsonLine(parseJson(*text).value_or(Json::Value(*text))) << '\n';
-    }
+    while (const auto text = client.take())
+        printEvent(*text);
     return static_cast<bool>(std::cout << std::flush);
+}
+
+// What is not JSON is shown all the same, as a JSON string.
+void printEvent(const std::string& text) {
+    std::cout << jsonLine(parseJson(text).value_or(Json::Value(text))) << '\n';
 }
 
 }  // namespace vexa::client

@@ -13,8 +13,8 @@ constexpr std::array kCommands{&addStartCommand,      &addDemoCommand,       &ad
                                &addScanCommand,       &addChannelsCommand,   &addNetworksCommand,
                                &addConnectCommand,    &addDisconnectCommand, &addEnableCommand,
                                &addDisableCommand,    &addRefreshCommand,    &addCredentialsCommand,
-                               &addCredentialCommand, &addReloadCommand,     &addLogCommand,
-                               &addSendCommand,       &addListenCommand};
+                               &addCredentialCommand, &addReloadCommand,     &addWatchCommand,
+                               &addLogCommand,        &addSendCommand,       &addListenCommand};
 
 int report(const std::exception& error, int exitCode) {
     std::cerr << "vexa: " << error.what() << '\n';

@@ -10,6 +10,8 @@ namespace vexa::client {
 
 namespace {
 
+constexpr const char* kMachineDescription = "Folder of the machine whose service is meant";
+
 struct HalfNames {
     const char* option;
     const char* variable;
@@ -28,13 +30,25 @@ const HalfNames& namesOf(Half half) {
 }  // namespace
 
 void PortOption::addTo(CLI::App& command) {
+    addPortTo(command, ",--port");
+    command.add_option("--machine", m_machine, kMachineDescription)->type_name("DIR");
+}
+
+void PortOption::addBothTo(CLI::App& command, PortOption& spectral, PortOption& hotspot) {
+    spectral.addPortTo(command, "");
+    hotspot.addPortTo(command, "");
+    const auto setMachine = [&spectral, &hotspot](const std::string& folder) {
+        spectral.m_machine = hotspot.m_machine = folder;
+    };
+    command.add_option_function<std::string>("--machine", setMachine, kMachineDescription)->type_name("DIR");
+}
+
+void PortOption::addPortTo(CLI::App& command, const std::string& alias) {
     const HalfNames& names = namesOf(m_half);
-    command.add_option(names.option + std::string(",--port"), m_port, names.description)
+    command.add_option(names.option + alias, m_port, names.description)
         ->type_name("N")
         ->check(CLI::Range(1, 65535))
         ->envname(names.variable);
-    command.add_option("--machine", m_machine, "Folder of the machine whose service is meant")
-        ->type_name("DIR");
 }
 
 std::uint16_t PortOption::find() const {

@@ -22,6 +22,9 @@ public:
 
     void addTo(CLI::App& command);
 
+    /// Adds the ports of both halves, of one machine.
+    static void addBothTo(CLI::App& command, PortOption& spectral, PortOption& hotspot);
+
     /// The port that was given; else that of the environment; else what the parent left in the machine's
     /// folder. Throws ClientError if none tells.
     std::uint16_t find() const;
@@ -31,6 +34,8 @@ public:
     std::optional<MachineFolder> machine() const;
 
 private:
+    void addPortTo(CLI::App& command, const std::string& alias);
+
     Half m_half;
     std::uint16_t m_port = 0;
     std::string m_machine;
