@@ -1,20 +1,17 @@
-#include <json/value.h>
-
 #include <CLI/CLI.hpp>
 #include <iostream>
 #include <memory>
 
 #include "client/ClientError.h"
 #include "client/Commands.h"
-#include "client/CredentialText.h"
 #include "client/DemoCredentials.h"
-#include "client/HotspotNews.h"
+#include "client/DemoScenario.h"
+#include "client/DemoStory.h"
 #include "client/JsonLine.h"
 #include "client/MachineFolder.h"
 #include "client/ServiceParent.h"
 #include "client/SpectralText.h"
 #include "client/SpectrumWatch.h"
-#include "client/Text.h"
 
 namespace vexa::client {
 
@@ -36,30 +33,19 @@ SpectrumOutput::Form formOf(const DemoOptions& options) {
     return options.json ? SpectrumOutput::Form::Json : SpectrumOutput::Form::Readable;
 }
 
-std::vector<std::string> credentialLines(const CredentialList& list, bool json) {
-    if (json) {
-        Json::Value object(Json::objectValue);
-        object["credentials"] = credentialsJson(list, Passwords::Hidden);
-        return {jsonLine(object)};
-    }
-    auto lines = credentialTable(list, Passwords::Hidden);
-    lines.insert(lines.begin(),
-                 "Stored " + counted(list.size(), "credential") + ", in the order of priority:");
-    return lines;
-}
-
 CredentialList storedCredentials(const ServicePorts& ports, Signals& signals) {
     HotspotPort hotspot(ports.hs20, signals, kAnswerLimit);
     return storeDemoCredentials(hotspot);
 }
 
 /// False if the user has ended it before there was anything to see.
-bool showAll(const DemoOptions& options, const ServicePorts& ports, Signals& signals) try {
+bool showAll(const DemoOptions& options, const ServicePorts& ports, const MachineFolder& machine,
+             Signals& signals) try {
     const auto end = std::chrono::steady_clock::now() + std::chrono::seconds(options.seconds);
-    SpectrumOutput output(formOf(options), credentialLines(storedCredentials(ports, signals), options.json));
-    HotspotNews news(ports.hs20);
+    DemoStory story(ports.hs20, machine, storedCredentials(ports, signals));
+    SpectrumOutput output(formOf(options), &story);
     SpectralScan scan(ports.sa);
-    watchSpectrum(scan, signals, output, end, &news);
+    watchSpectrum(scan, signals, output, end, &story);
     return true;
 } catch (const StoppedByUser&) {
     return false;
@@ -68,6 +54,8 @@ bool showAll(const DemoOptions& options, const ServicePorts& ports, Signals& sig
 int runDemo(const DemoOptions& options) {
     Signals signals;
     const TemporaryMachine machine;
+    const MachineFolder folder(machine.path().string());
+    prepareDemoMachine(folder);
     StopSource stop(signals, false);
     StartRequest request;
     request.machine = machine.path().string();
@@ -76,10 +64,10 @@ int runDemo(const DemoOptions& options) {
     ServiceParent parent(request, stop);
     const auto state = parent.waitUntilReady();
     if (state == ServiceParent::State::Ended) return kExitFailed;
-    if (state == ServiceParent::State::Ready && showAll(options, parent.ports(), signals))
+    if (state == ServiceParent::State::Ready && showAll(options, parent.ports(), folder, signals))
         return parent.stopSoon(kStopPatience);
     parent.stopSoon(kStopPatience);
-    std::cout << (options.json ? summaryJson(SpectralView()) : summaryText(SpectralView())) << '\n';
+    std::cout << (options.json ? jsonLine(summaryJson(SpectralView())) : summaryText(SpectralView())) << '\n';
     return kExitOk;
 }
 

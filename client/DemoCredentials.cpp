@@ -24,6 +24,7 @@ Credential certificateCredential(const char* name, const char* realm, const char
     credential.type = kTypeCertificate;
     credential.method = kMethodTls;
     credential.access = kPerUser;
+    credential.autoConnect = true;
     credential.name = name;
     credential.realm = realm;
     credential.clientCert = certificate;
@@ -38,8 +39,8 @@ CredentialList storeDemoCredentials(HotspotPort& port) {
     CredentialStore store(port);
     store.read();
     store.add(userCredential("City Wi-Fi", "city.example", "guest-4711"));
-    store.add(certificateCredential("Work", "corp.example", "anna@corp.example"));
     store.add(userCredential("Airport Lounge", "lounge.example", "anna"));
+    store.add(certificateCredential("Work", "corp.example", "anna@corp.example"));
     return store.list();
 }
 

@@ -36,13 +36,6 @@ std::string namesOf(const NetworkList& list) {
     return names.empty() ? "none" : names;
 }
 
-std::string realmNames(const Network& network) {
-    std::string names;
-    for (const auto& realm : network.realms)
-        names += (names.empty() ? "" : ", ") + printable(realm.name);
-    return names.empty() ? "none" : names;
-}
-
 /// Said when a flag has another value than before.
 std::vector<std::string> flagChange(std::optional<bool>& known, const Json::Value& payload, const char* yes,
                                     const char* no) {
@@ -130,10 +123,11 @@ HotspotNarrator::Sentences HotspotNarrator::newNetworks(const NetworkList& befor
     }
     for (const Network& network : m_networks) {
         const Network* const known = find(before, network.name);
-        const bool isNew = known == nullptr;
-        if (isNew) told.push_back(inQuotes(network.name) + " is in range");
-        if (network.hasRealms && (isNew || known->realms != network.realms || !known->hasRealms))
-            told.push_back(inQuotes(network.name) + " serves the realms " + realmNames(network));
+        const std::string realms = printable(realmsText(network));
+        if (known == nullptr)
+            told.push_back(inQuotes(network.name) + " is in range; realms: " + realms);
+        else if (realmsText(*known) != realmsText(network))
+            told.push_back("realms of " + inQuotes(network.name) + ": " + realms);
     }
     return told;
 }

@@ -17,6 +17,8 @@ public:
     const std::filesystem::path& path() const { return m_path; }
     std::filesystem::path portsFile() const { return m_path / "ports.json"; }
     std::filesystem::path outputFile() const { return m_path / "stdout.log"; }
+    /// The scenario of the machine, if none is named.
+    std::filesystem::path scenarioFile() const { return m_path / "scenario.json"; }
     std::filesystem::path registryFile() const { return m_path / "registry.json"; }
     std::filesystem::path configFile() const { return storeFolder() / "config.xml"; }
 

@@ -56,14 +56,6 @@ std::vector<Network::Realm> realmsOf(const Json::Value& value) {
     return realms;
 }
 
-std::string realmsText(const Network& network) {
-    if (!network.hasRealms) return "not known yet";
-    std::string text;
-    for (const auto& realm : network.realms)
-        text += (text.empty() ? "" : ", ") + realm.name + " (" + realmMethod(realm.method) + ")";
-    return text.empty() ? "none" : text;
-}
-
 }  // namespace
 
 NetworkList networkList(const Json::Value& payload) {
@@ -83,6 +75,14 @@ const Network* connectedNetwork(const NetworkList& list) {
     const auto found =
         std::find_if(list.begin(), list.end(), [](const Network& network) { return network.isConnected; });
     return found == list.end() ? nullptr : &*found;
+}
+
+std::string realmsText(const Network& network) {
+    if (!network.hasRealms) return "not known yet";
+    std::string text;
+    for (const auto& realm : network.realms)
+        text += (text.empty() ? "" : ", ") + realm.name + " (" + realmMethod(realm.method) + ")";
+    return text.empty() ? "none" : text;
 }
 
 std::vector<std::string> networkTable(const NetworkList& list) {

@@ -34,6 +34,9 @@ NetworkList networkList(const Json::Value& payload);
 /// Nothing if none is connected.
 const Network* connectedNetwork(const NetworkList& list);
 
+/// Its realms with their methods, in words.
+std::string realmsText(const Network& network);
+
 /// One row per network; a heading first. Lines have no line end.
 std::vector<std::string> networkTable(const NetworkList& list);
 

@@ -1,7 +1,5 @@
 #include "client/SpectralText.h"
 
-#include <json/value.h>
-
 #include <iomanip>
 #include <sstream>
 
@@ -13,6 +11,8 @@ namespace vexa::client {
 namespace {
 
 using Change = SpectralView::Change;
+
+constexpr const char* kCurrentChannel = "SPECTRAL_ANALYSER_CURRENT_CHANNEL_DATA";
 
 std::string describeSample(const SpectralView::Update& update, const SpectralView& view,
                            const char* quantity) {
@@ -56,6 +56,8 @@ std::string describeEvent(const Event& event, const SpectralView::Update& update
         case Change::None:
             break;
     }
+    if (event.id == kCurrentChannel)
+        return event.data == "0" ? "connected on no channel" : "connected on channel " + event.data;
     return event.data.empty() ? event.id : event.id + " " + event.data;
 }
 
@@ -95,7 +97,7 @@ std::string summaryText(const SpectralView& view) {
                     : "no congestion on any channel");
 }
 
-std::string summaryJson(const SpectralView& view) {
+Json::Value summaryJson(const SpectralView& view) {
     Json::Value object(Json::objectValue);
     object["channels"] = static_cast<Json::UInt64>(view.channels().size());
     object["events"] = static_cast<Json::UInt64>(view.eventCount());
@@ -105,7 +107,7 @@ std::string summaryJson(const SpectralView& view) {
         object["busiest"]["channel"] = busiest->number;
         object["busiest"]["congestion"] = *busiest->congestion;
     }
-    return jsonLine(object);
+    return object;
 }
 
 }  // namespace vexa::client

@@ -1,5 +1,7 @@
 #pragma once
 
+#include <json/value.h>
+
 #include <string>
 #include <vector>
 
@@ -21,6 +23,6 @@ std::string spectrumJson(const SpectralView& view);
 
 /// What was seen: channels, events, the busiest channel.
 std::string summaryText(const SpectralView& view);
-std::string summaryJson(const SpectralView& view);
+Json::Value summaryJson(const SpectralView& view);
 
 }  // namespace vexa::client

@@ -35,12 +35,12 @@ void printLines(const std::vector<std::string>& lines) {
 
 }  // namespace
 
-SpectrumOutput::SpectrumOutput(Form form, std::vector<std::string> side)
-    : m_form(form), m_side(std::move(side)), m_start(steady_clock::now()), m_nextDrawing(m_start) {
+SpectrumOutput::SpectrumOutput(Form form, const SideShow* side)
+    : m_form(form), m_side(side), m_start(steady_clock::now()), m_nextDrawing(m_start) {
     if (form == Form::Readable && TerminalScreen::isUsable()) {
         m_screen.emplace();
-    } else {
-        printLines(m_side);
+    } else if (m_side != nullptr) {
+        printLines(m_side->opening(form == Form::Json));
     }
 }
 
@@ -53,15 +53,14 @@ void SpectrumOutput::show(const std::vector<SpectralScan::Told>& told, const Spe
     std::cout << std::flush;
 }
 
-void SpectrumOutput::showNews(const std::vector<HotspotNews::Item>& items, std::vector<std::string> lines) {
+void SpectrumOutput::showSide(const std::vector<SideShow::Item>& items) {
     if (items.empty()) return;
     m_changed = true;
-    m_news = std::move(lines);
     if (m_screen) return;
     for (const auto& item : items) {
-        if (m_form == Form::Json)
-            std::cout << jsonLine(parseJson(item.text).value_or(Json::Value())) << '\n';
-        else if (!item.sentence.empty())
+        if (m_form == Form::Json && !item.json.empty())
+            std::cout << item.json << '\n';
+        else if (m_form == Form::Readable && !item.sentence.empty())
             std::cout << secondsSince(m_start) << "  " << item.sentence << '\n';
     }
     std::cout << std::flush;
@@ -93,17 +92,26 @@ void SpectrumOutput::finish(const SpectralView& view) {
         m_screen.reset();
         printLines(lines);
     }
-    std::cout << (m_form == Form::Json ? summaryJson(view) : summaryText(view)) << std::endl;
+    printSummary(view);
+}
+
+void SpectrumOutput::printSummary(const SpectralView& view) const {
+    if (m_form == Form::Json) {
+        Json::Value object = summaryJson(view);
+        if (m_side != nullptr) m_side->addSummary(object);
+        std::cout << jsonLine(object) << std::endl;
+    } else {
+        std::cout << summaryText(view) << (m_side != nullptr ? "; " + m_side->summary() : "") << std::endl;
+    }
 }
 
 std::vector<std::string> SpectrumOutput::picture(const SpectralView& view) const {
     auto lines =
         drawSpectrum(view, {m_screen->columns(), TerminalScreen::wantsColour(), TerminalScreen::isUtf8()});
-    for (const auto* block : {&m_side, &m_news}) {
-        if (!block->empty()) lines.emplace_back();
-        for (const auto& line : *block)
-            lines.push_back(cutToColumns(line, m_screen->columns() - 1));
-    }
+    if (m_side == nullptr) return lines;
+    const int left = m_screen->rows() - static_cast<int>(lines.size());
+    const auto below = m_side->lines({m_screen->columns(), left, TerminalScreen::wantsColour()});
+    lines.insert(lines.end(), below.begin(), below.end());
     return lines;
 }
 

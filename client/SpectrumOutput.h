@@ -5,7 +5,7 @@
 #include <string>
 #include <vector>
 
-#include "client/HotspotNews.h"
+#include "client/SideShow.h"
 #include "client/SpectralScan.h"
 #include "client/TerminalScreen.h"
 
@@ -16,13 +16,13 @@ class SpectrumOutput {
 public:
     enum class Form { Readable, Json };
 
-    /// `side`: lines that stand under the picture, or before the first event.
-    explicit SpectrumOutput(Form form, std::vector<std::string> side = {});
+    /// `side`, if not null, is shown under the picture, or between the events.
+    explicit SpectrumOutput(Form form, const SideShow* side = nullptr);
 
     void show(const std::vector<SpectralScan::Told>& told, const SpectralView& view);
 
-    /// What is told beside the spectrum, and how things stand now.
-    void showNews(const std::vector<HotspotNews::Item>& items, std::vector<std::string> lines);
+    /// What is told beside the spectrum.
+    void showSide(const std::vector<SideShow::Item>& items);
 
     /// Draws what has changed, but not too often. Gives the time until it should be called again; nothing:
     /// not before something has happened.
@@ -44,11 +44,11 @@ public:
 
 private:
     void printLine(const SpectralScan::Told& told, const SpectralView& view) const;
+    void printSummary(const SpectralView& view) const;
     std::vector<std::string> picture(const SpectralView& view) const;
 
     Form m_form;
-    std::vector<std::string> m_side;
-    std::vector<std::string> m_news;
+    const SideShow* m_side;
     std::optional<TerminalScreen> m_screen;
     std::chrono::steady_clock::time_point m_start;
     std::chrono::steady_clock::time_point m_nextDrawing;

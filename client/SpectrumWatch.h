@@ -3,7 +3,7 @@
 #include <chrono>
 #include <optional>
 
-#include "client/HotspotNews.h"
+#include "client/SideShow.h"
 #include "client/Signals.h"
 #include "client/SpectralScan.h"
 #include "client/SpectrumOutput.h"
@@ -11,9 +11,9 @@
 namespace vexa::client {
 
 /// Scans and shows what is told until the user has had enough, or until `end`; then the scan is stopped and
-/// the last word printed. `news`, if not null, is shown beside it. Throws ClientError when a connection is
+/// the last word printed. `side`, if not null, is shown beside it. Throws ClientError when a connection is
 /// lost.
 void watchSpectrum(SpectralScan& scan, Signals& signals, SpectrumOutput& output,
-                   std::optional<std::chrono::steady_clock::time_point> end, HotspotNews* news = nullptr);
+                   std::optional<std::chrono::steady_clock::time_point> end, SideShow* side = nullptr);
 
 }  // namespace vexa::client

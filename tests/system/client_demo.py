@@ -16,9 +16,23 @@ import unittest
 
 from harness import PATIENCE, Program, children_of, clean_environment, is_running, program, wait_until
 
-SUMMARY = re.compile(r"Seen: (\d+) channels, (\d+) events, busiest channel (\d+) \(congestion (\d+)\)")
+SUMMARY = re.compile(r"Seen: (\d+) channels, (\d+) events, busiest channel (\d+) \(congestion (\d+)\); (.+)")
+# What comes in this order, but for the log, which is written every some seconds.
+STORY = [
+    'joined "City Free" with the credential "City Wi-Fi"',
+    'the connection to "City Free" has ended',
+    'joined "Gate 12" with the credential "Work"',
+    "log: Connection using EAP-TLS with authMode=machineOrUser failed",
+    'the traveller leaves "Gate 12"',
+    "log: This network has been disconnected by user, skip auto connecting to ssid=Gate 12",
+    '"Departures" is in range',
+    "an attempt to connect has failed",
+    'joined "Departures" with the credential "Airport Lounge"',
+    "log: Retry number exceeds maximum retry limit",
+    'the traveller asks for "Gate 12"',
+]
 ENTERED, LEFT = b"\x1b[?1049h", b"\x1b[?1049l"
-STORED = ["Airport Lounge", "Work", "City Wi-Fi"]
+STORED = ["Work", "Airport Lounge", "City Wi-Fi"]
 COLOUR = re.compile(rb"\x1b\[3\dm")
 
 
@@ -38,7 +52,7 @@ class DemoTest(unittest.TestCase):
     def assert_summary(self, line):
         match = SUMMARY.fullmatch(line)
         self.assertIsNotNone(match, line)
-        channels, events, _, congestion = map(int, match.groups())
+        channels, events, _, congestion = map(int, match.groups()[:4])
         self.assertGreater(channels, 0)
         self.assertGreaterEqual(events, 3, "the radio, the channels and at least one value")
         self.assertLessEqual(congestion, 100)
@@ -80,11 +94,27 @@ class InPipe(DemoTest):
         demo = self.demo("--seconds", "3", "--json")
         self.assertEqual(demo.wait(), 0)
         stored, *events, summary = map(json.loads, demo.lines)
+        self.assertEqual(summary["joined"], [])
         self.assertEqual([entry["name"] for entry in stored["credentials"]], STORED)
         self.assertTrue(all(event["Source"] in ("SpectralAnalyser", "HotSpot20") for event in events))
         spectral = [event for event in events if event["Source"] == "SpectralAnalyser"]
         self.assertEqual(summary["events"], len(spectral))
         self.assertGreater(summary["busiest"]["congestion"], 0)
+
+    def test_the_story_of_the_traveller(self):
+        demo = self.demo()
+        self.assertEqual(demo.wait(), 0)
+        told = [line.partition(" s  ")[2] for line in demo.lines]
+        places = []
+        for part in STORY:
+            places.append(next((i for i, line in enumerate(told) if part in line), None))
+            self.assertIsNotNone(places[-1], f"{part!r} is not in {[t for t in told if not t.startswith('channel ')]}")
+        acts = [place for part, place in zip(STORY, places) if not part.startswith("log: ")]
+        self.assertEqual(acts, sorted(acts))
+        left, asked = (told.index(f'the traveller {act} "Gate 12"') for act in ("leaves", "asks for"))
+        self.assertNotIn('joined "Gate 12"', " ".join(told[left:asked]), "the service stays away")
+        self.assertIn('joined "Gate 12" with the credential "Work"', told[asked:])
+        self.assertEqual(SUMMARY.fullmatch(demo.lines[-1]).group(5), "joined City Free, Gate 12, Departures, Gate 12")
 
     def test_every_signal_that_asks_for_the_end_is_a_good_end(self):
         for number in (signal.SIGINT, signal.SIGTERM, signal.SIGHUP):
