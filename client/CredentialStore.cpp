@@ -63,7 +63,7 @@ std::string reasonAgainst(const CredentialList& list, const Credential& wanted) 
 }  // namespace
 
 const CredentialList& CredentialStore::read() {
-    const auto answer = m_port.ask(kListEvent, std::nullopt, kListEvent, acceptsAny);
+    const auto answer = m_port.question(kListEvent, acceptsAny);
     if (!answer.payload) throw ClientError(kNoList);
     return m_list = credentialList(*answer.payload);
 }

@@ -21,6 +21,7 @@ constexpr milliseconds kFirstCheck{200};
 // The answer to another client's question looks like the answer to ours. He would have to ask twice at the
 // very moment, ahead of our command, to mislead us.
 constexpr int kChecks = 2;
+constexpr milliseconds kStartLimit{5000};
 constexpr milliseconds kGoodbyeLimit{2000};
 
 /// An adapter that comes or goes makes the same event, from another source.
@@ -76,6 +77,14 @@ HotspotPort::Answer HotspotPort::ask(const std::string& command, const std::opti
         }
     }
     return answer;
+}
+
+HotspotPort::Answer HotspotPort::question(const std::string& command, const Accepts& accepts) {
+    const auto end = steady_clock::now() + std::min(m_limit, kStartLimit);
+    while (true) {
+        const Answer answer = ask(command, std::nullopt, command, accepts);
+        if (answer.payload || !answer.cardIn || steady_clock::now() >= end) return answer;
+    }
 }
 
 bool HotspotPort::hasAdapter() {

@@ -11,14 +11,14 @@ namespace {
 
 std::optional<bool> askFlag(HotspotPort& port, const char* name) {
     const auto isFlag = [](const Json::Value& payload) { return payload.isBool(); };
-    const auto answer = port.ask(name, std::nullopt, name, isFlag);
+    const auto answer = port.question(name, isFlag);
     return answer.isAccepted ? std::optional(answer.payload->asBool()) : std::nullopt;
 }
 
 }  // namespace
 
 std::optional<NetworkList> askNetworks(HotspotPort& port) {
-    const auto answer = port.ask(kNetworkList, std::nullopt, kNetworkList, acceptsAny);
+    const auto answer = port.question(kNetworkList, acceptsAny);
     return answer.payload ? std::optional(networkList(*answer.payload)) : std::nullopt;
 }
 

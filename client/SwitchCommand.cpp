@@ -25,9 +25,10 @@ void say(const HotspotOptions& options, const char* member, const Json::Value& v
     std::cout << jsonLine(object) << '\n';
 }
 
-// Without an adapter the service answers all the same, and turns nothing.
+// Without an adapter, or before it knows the adapter, the service answers all the same, and turns nothing. It
+// has a list when it knows it.
 void requireAdapter(HotspotPort& port) {
-    if (!port.hasAdapter()) throw ClientError(std::string(kNoAdapter) + ", and without one nothing was done");
+    if (!askNetworks(port)) throw ClientError(std::string(kNoAdapter) + ", and without one nothing was done");
 }
 
 int runSwitch(const HotspotOptions& options, bool isOn) {

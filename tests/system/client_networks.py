@@ -74,6 +74,8 @@ class Looking(NetworksTest):
         self.assertEqual(self.connected(), "Airport Free")
         (network,) = [n for n in self.networks() if n["connected"]]
         self.assertEqual((network["name"], network["internet"]), ("Airport Free", "reached"))
+        wait_until(lambda: self.status()["credential"] == "Roam", "the credential's name")
+        self.assertRegex(self.done("status"), r"Credential +Roam\n")
         self.assertTrue(self.status()["internet"])
         self.machine.control.do("setDns", dns=[])
         self.assertFalse(self.status()["internet"])
@@ -121,6 +123,7 @@ class Looking(NetworksTest):
 class Status(NetworksTest):
     def test_it_follows_what_happens(self):
         expected = {"adapter": True, "radio": True, "hotspot": True, "networks": 3, "connection": None, "internet": False}
+        expected |= {"credential": None, "possibleCredentials": []}
         self.all_reported()
         self.assertEqual(self.status(), expected)
         self.machine.control.do("radio", software="off")
@@ -131,7 +134,7 @@ class Status(NetworksTest):
 
     def test_in_words(self):
         lines = self.done("status").splitlines()
-        self.assertEqual([line.split()[0] for line in lines], ["Adapter", "Radio", "Hotspot", "Networks", "Connection", "Internet"])
+        self.assertEqual([line.split()[0] for line in lines], ["Adapter", "Radio", "Hotspot", "Networks", "Connection", "Credential", "Internet"])
         self.assertEqual([line.split()[1] for line in lines[:3]], ["in", "on", "enabled"])
 
     def test_the_switch_of_a_machine_that_is_not_known(self):

@@ -222,6 +222,22 @@ class InAnyOrder(unittest.TestCase):
         result, _ = self.add([("X", {}), (LIST, [7, {"Id": "x"}]), (LIST, 5), (LIST, stored("new"))])
         self.assertEqual(result.returncode, 0, result.stderr)
 
+    def test_a_service_that_has_just_started_is_asked_again(self):
+        starting = ["GET_ALL_CREDENTIAL_LIST", "GET_ALL_NETWORK_LIST"]
+
+        def answer(command):
+            name = command["CommandId"]
+            if name == "GET_IS_CARD_IN":
+                return [(IN, "")]
+            return [] if peer.commands.count(name) == 1 else [(name, None)]
+
+        for command, name in zip(("credentials", "networks"), starting):
+            peer = Peer(answer)
+            self.addCleanup(peer.close)
+            result = run_client(command, "--json", "--hs20-port", peer.port, "--timeout", 20)
+            self.assertEqual((result.returncode, result.stdout), (0, "[]\n"), result.stderr)
+            self.assertEqual(peer.commands.count(name), 2)
+
     def test_who_is_stopped_says_that_it_is_open(self):
         peer = Peer(lambda command: [(LIST, None)] if command["CommandId"] == LIST else [])
         self.addCleanup(peer.close)

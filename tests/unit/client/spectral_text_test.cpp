@@ -1,5 +1,7 @@
 #include <gtest/gtest.h>
 
+#include "client/JsonLine.h"
+
 #include "client/SpectralText.h"
 #include "unit/client/spectral_events.h"
 
@@ -21,8 +23,7 @@ TEST(SpectralText, EveryEventIsALine) {
     EXPECT_EQ(told(view, {"RADIO_OFF", ""}), "radio off");
     EXPECT_EQ(told(view, {"CARD_PLUG_IN", ""}), "adapter in");
     EXPECT_EQ(told(view, {"CARD_PLUG_OUT", ""}), "adapter out");
-    EXPECT_EQ(told(view, {"SPECTRAL_ANALYSER_CURRENT_CHANNEL_DATA", "36"}),
-              "SPECTRAL_ANALYSER_CURRENT_CHANNEL_DATA 36");
+    EXPECT_EQ(told(view, {"SPECTRAL_ANALYSER_CURRENT_CHANNEL_DATA", "36"}), "connected on channel 36");
     EXPECT_EQ(told(view, {"NEWS", ""}), "NEWS");
 }
 
@@ -41,11 +42,12 @@ TEST(SpectralText, AValueThatDidNotChangeIs0AndASilentChannelHasNone) {
 TEST(SpectralText, TheSummaryNamesTheBusiestChannel) {
     SpectralView view;
     EXPECT_EQ(summaryText(view), "Seen: 0 channels, 0 events, no congestion on any channel");
-    EXPECT_EQ(summaryJson(view), R"({"busiest":null,"channels":0,"events":0})");
+    EXPECT_EQ(jsonLine(summaryJson(view)), R"({"busiest":null,"channels":0,"events":0})");
     view.apply(channelList(kTwoChannels));
     view.apply(congestion(1, 42));
     EXPECT_EQ(summaryText(view), "Seen: 2 channels, 2 events, busiest channel 36 (congestion 42)");
-    EXPECT_EQ(summaryJson(view), R"({"busiest":{"channel":36,"congestion":42},"channels":2,"events":2})");
+    EXPECT_EQ(jsonLine(summaryJson(view)),
+              R"({"busiest":{"channel":36,"congestion":42},"channels":2,"events":2})");
 }
 
 }  // namespace
