@@ -1,15 +1,18 @@
 #include <benchmark/benchmark.h>
+#include <json/value.h>
 
 #include <cstdio>
 #include <cstdlib>
 #include <filesystem>
 #include <memory>
 #include <string>
+#include <unordered_map>
 #include <vector>
 
 #include "connection/Supplicant.h"
 #include "connection/SupplicantMgr.h"
 #include "protocol/IpcInProcess.h"
+#include "protocol/JsonText.h"
 #include "protocol/SAHotSpotPortlink.h"
 #include "simulation/Machine.h"
 #include "simulation/Scenario.h"
@@ -110,7 +113,64 @@ void update(benchmark::State& state) {
     rate(state);
 }
 
-BENCHMARK(update<1>)->Name("air_update/196_names")->Unit(benchmark::kMillisecond);
-BENCHMARK(update<4>)->Name("air_update/49_names")->Unit(benchmark::kMillisecond);
+struct BareNetwork {
+    std::string name;
+    std::vector<std::string> realms;
+};
+
+std::vector<BareNetwork> bareReport(int namesShared) {
+    std::vector<BareNetwork> networks;
+    for (int network = 0; network < kNetworks; ++network) {
+        auto& entry = networks.emplace_back();
+        entry.name = "Network " + std::to_string(network / namesShared);
+        for (int realm = 0; realm < kRealms; ++realm)
+            entry.realms.push_back(realmOf(network, realm));
+    }
+    return networks;
+}
+
+Json::Value asJson(const BareNetwork& network) {
+    Json::Value entry;
+    entry["NetWorkName"] = network.name;
+    entry["NetworkType"] = 2;
+    entry["IsConnected"] = false;
+    entry["IsInternetAccess"] = 0;
+    entry["RealmFetched"] = true;
+    for (const std::string& name : network.realms) {
+        Json::Value realm;
+        realm["CredentialEapMethod"] = 1;
+        realm["RealmName"] = name;
+        entry["SupportRealmList"].append(std::move(realm));
+    }
+    return entry;
+}
+
+// The same list from names at hand: folded, and written twice, as a text within the text of an event.
+template <int NamesShared>
+void bareUpdate(benchmark::State& state) {
+    const std::vector<BareNetwork> report = bareReport(NamesShared);
+    for (auto _ : state) {
+        std::vector<BareNetwork> folded;
+        std::unordered_map<std::string, std::size_t> places;
+        for (const BareNetwork& network : report) {
+            const auto [place, isNew] = places.emplace(network.name, folded.size());
+            if (isNew) folded.push_back({network.name, {}});
+            auto& realms = folded[place->second].realms;
+            realms.insert(realms.end(), network.realms.begin(), network.realms.end());
+        }
+        Json::Value list;
+        for (const BareNetwork& network : folded)
+            list.append(asJson(network));
+        Json::Value event;
+        event["Data"] = vexa::toStyledText(list);
+        benchmark::DoNotOptimize(vexa::toStyledText(event));
+    }
+    rate(state);
+}
+
+BENCHMARK(update<1>)->Name("air_update_196_names/ours")->Unit(benchmark::kMillisecond);
+BENCHMARK(bareUpdate<1>)->Name("air_update_196_names/bare")->Unit(benchmark::kMillisecond);
+BENCHMARK(update<4>)->Name("air_update_49_names/ours")->Unit(benchmark::kMillisecond);
+BENCHMARK(bareUpdate<4>)->Name("air_update_49_names/bare")->Unit(benchmark::kMillisecond);
 
 }  // namespace
