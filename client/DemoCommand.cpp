@@ -59,7 +59,7 @@ int runDemo(const DemoOptions& options) {
     StopSource stop(signals, false);
     StartRequest request;
     request.machine = machine.path().string();
-    request.builtInScenario = true;
+    request.ownScenario = true;
     request.service = options.service;
     ServiceParent parent(request, stop);
     const auto state = parent.waitUntilReady();

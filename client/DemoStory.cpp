@@ -42,7 +42,7 @@ constexpr std::array kReasons{"authMode=machineOrUser failed", "has been disconn
 constexpr const char* kReset = "\033[0m";
 constexpr std::array kColours{"", "\033[32m", "\033[1m", "\033[2m"};
 
-constexpr int kRowsForCredentials = 20;
+constexpr int kScreenRowsForCredentials = 34;
 constexpr int kFewestStoryRows = 4;
 
 /// What the other sentences tell as well.
@@ -176,7 +176,7 @@ std::vector<std::string> DemoStory::opening(bool json) const {
 
 std::vector<std::string> DemoStory::lines(const Room& room) const {
     std::vector<std::string> all;
-    if (room.rows >= kRowsForCredentials) append(all, opening(false));
+    if (room.screenRows >= kScreenRowsForCredentials) append(all, opening(false));
     append(all, networkTable(m_narrator.networks()));
     for (std::string& line : all)
         line = cutToColumns(line, room.columns - 1);

@@ -99,7 +99,7 @@ void ServiceParent::start(const StartRequest& request) {
     program.variables[kMachineVariable] = m_folder.path().string();
     auto& control = program.variables["VEXA_CONTROL_PORT"];
     if (request.controlPort) control = std::to_string(m_ports.control);
-    if (request.builtInScenario) {
+    if (request.ownScenario) {
         program.variables["VEXA_SCENARIO"] = std::nullopt;
     } else if (!request.scenario.empty()) {
         program.variables["VEXA_SCENARIO"] = fs::absolute(request.scenario).string();

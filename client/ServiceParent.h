@@ -23,7 +23,8 @@ class ServiceProcess;
 struct StartRequest {
     std::string machine;
     std::string scenario;
-    bool builtInScenario = false;
+    /// The machine has its own; the one of the environment is not for it.
+    bool ownScenario = false;
     std::uint16_t saPort = 0;
     std::uint16_t hs20Port = 0;
     std::optional<std::uint16_t> controlPort;

@@ -21,6 +21,8 @@ public:
     struct Room {
         int columns;
         int rows;
+        /// Of the whole terminal.
+        int screenRows;
         bool colour;
     };
 

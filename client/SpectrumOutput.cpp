@@ -110,7 +110,8 @@ std::vector<std::string> SpectrumOutput::picture(const SpectralView& view) const
         drawSpectrum(view, {m_screen->columns(), TerminalScreen::wantsColour(), TerminalScreen::isUtf8()});
     if (m_side == nullptr) return lines;
     const int left = m_screen->rows() - static_cast<int>(lines.size());
-    const auto below = m_side->lines({m_screen->columns(), left, TerminalScreen::wantsColour()});
+    const auto below =
+        m_side->lines({m_screen->columns(), left, m_screen->rows(), TerminalScreen::wantsColour()});
     lines.insert(lines.end(), below.begin(), below.end());
     return lines;
 }

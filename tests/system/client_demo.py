@@ -223,8 +223,8 @@ class Terminal:
 
 
 class InTerminal(DemoTest):
-    def demo(self, *arguments, columns=100, **variables):
-        terminal = Terminal([program("vexa"), "demo", *arguments], self.environment(**variables), columns)
+    def demo(self, *arguments, columns=100, rows=40, **variables):
+        terminal = Terminal([program("vexa"), "demo", *arguments], self.environment(**variables), columns, rows)
         self.addCleanup(terminal.close)
         return terminal
 
@@ -245,6 +245,16 @@ class InTerminal(DemoTest):
         terminal.press(b"x")
         terminal.press(b"q")
         self.assert_good_end(terminal)
+
+    def test_a_small_terminal_has_room_for_the_story(self):
+        terminal = self.demo("--seconds", "600", columns=80, rows=24)
+        terminal.read_until(rb'joined "City Free" with the credential "City Wi-Fi"')
+        self.assertFalse(b"Stored 3 credentials" in terminal.screen)
+        terminal.press(b"q")
+        self.assert_good_end(terminal)
+        last = re.sub(rb"\x1b\[[?0-9;]*[A-Za-z]", b"", terminal.screen.rpartition(LEFT)[2]).decode().splitlines()
+        self.assertLessEqual(len(last), 24)
+        self.assertLess(max(map(len, last[:-1])), 80)
 
     def test_ctrl_c_ends_it(self):
         terminal = self.demo("--seconds", "600")
