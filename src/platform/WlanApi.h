@@ -9,6 +9,11 @@
 // After <windows.h>.
 #include <wlanapi.h>
 
+// What WLAN_NOTIFICATION_SOURCE_ALL stands for; not every edition of <l2cmn.h> has it.
+#if !defined(L2_NOTIFICATION_SOURCE_ALL)
+#define L2_NOTIFICATION_SOURCE_ALL 0x0000FFFF
+#endif
+
 #else
 
 #include <cstdint>

@@ -1,0 +1,142 @@
+#include "platform/Files.h"
+
+#include <algorithm>
+#include <array>
+#include <cstdio>
+#include <limits>
+#include <utility>
+
+#include "platform/windows/Handle.h"
+
+namespace vexa::platform {
+
+// All files keep the access rights that they inherit from their folder, which is one that all users share:
+// the configuration is one file for all of them, and whichever user saves it replaces the file of another.
+// The log lies in a folder of the same tree, so that who supports a user can read it under his own account.
+
+namespace {
+
+constexpr DWORD kShareAll = FILE_SHARE_READ | FILE_SHARE_WRITE | FILE_SHARE_DELETE;
+
+// Without FILE_SHARE_WRITE: nobody writes the file meanwhile, and nobody else opens it for deletion without
+// sharing the writing. With FILE_SHARE_DELETE: it can be renamed while it is open.
+constexpr DWORD kShareWhileHeld = FILE_SHARE_READ | FILE_SHARE_DELETE;
+
+Handle open(const std::wstring& path, DWORD access, DWORD sharing, DWORD disposition, DWORD flags) {
+    return Handle(CreateFileW(path.c_str(), access, sharing, nullptr, disposition, flags, nullptr));
+}
+
+Handle openToRead(const std::wstring& path) {
+    return open(path, GENERIC_READ, kShareAll, OPEN_EXISTING, FILE_ATTRIBUTE_NORMAL);
+}
+
+bool writeAll(HANDLE file, std::string_view content) {
+    constexpr std::size_t kMost = std::numeric_limits<DWORD>::max();
+    while (!content.empty()) {
+        DWORD written = 0;
+        if (WriteFile(file, content.data(), static_cast<DWORD>(std::min(content.size(), kMost)), &written,
+                      nullptr) == 0 ||
+            written == 0)
+            return false;
+        content.remove_prefix(written);
+    }
+    return true;
+}
+
+// An open target shows itself in several ways, depending on how it was opened and on the file system.
+bool meansInUse(DWORD error) {
+    constexpr std::array kErrors = {DWORD{ERROR_ACCESS_DENIED}, DWORD{ERROR_SHARING_VIOLATION},
+                                    DWORD{ERROR_LOCK_VIOLATION}, DWORD{ERROR_USER_MAPPED_FILE}};
+    return std::find(kErrors.begin(), kErrors.end(), error) != kErrors.end();
+}
+
+struct CloseFile {
+    void operator()(std::FILE* file) const { std::fclose(file); }
+};
+
+}  // namespace
+
+bool canOpenFile(const std::wstring& path) {
+    return static_cast<bool>(openToRead(path));
+}
+
+std::optional<std::string> readFile(const std::wstring& path) {
+    const Handle file = openToRead(path);
+    if (!file) return std::nullopt;
+    std::string content;
+    std::array<char, 65536> buffer{};
+    for (;;) {
+        DWORD count = 0;
+        if (ReadFile(file.get(), buffer.data(), static_cast<DWORD>(buffer.size()), &count, nullptr) == 0)
+            return std::nullopt;
+        if (count == 0) return content;
+        content.append(buffer.data(), count);
+    }
+}
+
+bool createFolder(const std::wstring& path) {
+    return CreateDirectoryW(path.c_str(), nullptr) != 0 || GetLastError() == ERROR_ALREADY_EXISTS;
+}
+
+std::vector<std::wstring> filesIn(const std::wstring& folder) {
+    std::vector<std::wstring> names;
+    WIN32_FIND_DATAW entry{};
+    const std::wstring all = folder + L"\\*";
+    const Owned<HANDLE, &::FindClose> search(FindFirstFileW(all.c_str(), &entry));
+    if (!search) return names;
+    do {
+        if ((entry.dwFileAttributes & FILE_ATTRIBUTE_DIRECTORY) == 0) names.emplace_back(entry.cFileName);
+    } while (FindNextFileW(search.get(), &entry) != 0);
+    return names;
+}
+
+struct NewFile::State {
+    std::wstring path;
+    Handle file;
+};
+
+std::optional<NewFile> NewFile::create(const std::wstring& path) {
+    Handle file = open(path, GENERIC_WRITE, kShareWhileHeld, CREATE_NEW, FILE_ATTRIBUTE_NORMAL);
+    if (!file) return std::nullopt;
+    return NewFile(std::make_unique<State>(State{path, std::move(file)}));
+}
+
+NewFile::NewFile(std::unique_ptr<State> state) : m_state(std::move(state)) {}
+NewFile::~NewFile() = default;
+NewFile::NewFile(NewFile&&) noexcept = default;
+NewFile& NewFile::operator=(NewFile&&) noexcept = default;
+
+bool NewFile::write(std::string_view content) {
+    return writeAll(m_state->file.get(), content);
+}
+
+bool NewFile::flush() {
+    return FlushFileBuffers(m_state->file.get()) != 0;
+}
+
+RenameResult NewFile::rename(const std::wstring& to, Existing existing) {
+    const DWORD replace = existing == Existing::Replace ? MOVEFILE_REPLACE_EXISTING : 0;
+    if (MoveFileExW(m_state->path.c_str(), to.c_str(), replace | MOVEFILE_WRITE_THROUGH) != 0)
+        return RenameResult::Done;
+    return existing == Existing::Replace && meansInUse(GetLastError()) ? RenameResult::InUse
+                                                                       : RenameResult::Failed;
+}
+
+void NewFile::remove() {
+    DeleteFileW(m_state->path.c_str());
+}
+
+// Opened alone, it has no holder; and it goes with the handle.
+void NewFile::removeIfAbandoned(const std::wstring& path) {
+    open(path, DELETE, 0, OPEN_EXISTING, FILE_FLAG_DELETE_ON_CLOSE);
+}
+
+// By the C runtime, which ends the lines of a text file as this system's editors want it.
+bool appendToFile(const std::string& narrowPath, std::string_view text) {
+    const std::unique_ptr<std::FILE, CloseFile> file(std::fopen(narrowPath.c_str(), "a+"));
+    if (!file) return false;
+    std::fwrite(text.data(), 1, text.size(), file.get());
+    return true;
+}
+
+}  // namespace vexa::platform

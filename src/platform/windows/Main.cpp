@@ -1,0 +1,12 @@
+// The service as a process of Windows: without a window and without a console.
+
+#include <windows.h>
+
+#include <string>
+
+#include "service/Service.h"
+
+int WINAPI wWinMain(HINSTANCE /*instance*/, HINSTANCE /*previous*/, PWSTR arguments, int /*show*/) {
+    const std::wstring line = arguments != nullptr ? arguments : L"";
+    return vexa::runService(&line);
+}
