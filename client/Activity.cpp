@@ -1,9 +1,9 @@
 #include "client/Activity.h"
 
-#include <poll.h>
-
 #include <algorithm>
 #include <vector>
+
+#include "client/Poll.h"
 
 namespace vexa::client {
 
@@ -21,13 +21,13 @@ void suspend(TerminalKeys* keys) {
 bool stopAsked(Signals& signals, TerminalKeys* keys) {
     while (const auto signal = signals.take()) {
         if (Signals::isStop(*signal)) return true;
-        if (*signal == SIGTSTP) suspend(keys);
+        if (*signal == Signal::Suspend) suspend(keys);
     }
     return false;
 }
 
-bool anyReady(std::span<const pollfd> watched) {
-    return std::any_of(watched.begin(), watched.end(), [](const pollfd& one) { return one.revents != 0; });
+bool anyReady(std::span<const Polled> watched) {
+    return std::any_of(watched.begin(), watched.end(), [](const Polled& one) { return one.happened != 0; });
 }
 
 }  // namespace
@@ -41,20 +41,18 @@ Activity waitForActivity(std::span<const Awaited> awaited, Signals& signals, Ter
                          std::optional<milliseconds> limit) {
     const auto deadline = steady_clock::now() + limit.value_or(milliseconds(0));
     while (true) {
-        int timeout = -1;
-        if (limit) {
-            const auto left = std::chrono::ceil<milliseconds>(deadline - steady_clock::now());
-            timeout = static_cast<int>(std::max(left, milliseconds(0)).count());
-        }
-        std::vector<pollfd> watched{{signals.descriptor(), POLLIN, 0},
-                                    {keys == nullptr ? -1 : keys->descriptor(), POLLIN, 0}};
+        std::optional<milliseconds> left;
+        if (limit)
+            left = std::max(std::chrono::ceil<milliseconds>(deadline - steady_clock::now()), milliseconds(0));
+        std::vector<Polled> watched{{signals.descriptor(), kReadable},
+                                    {keys == nullptr ? -1 : keys->descriptor(), kReadable}};
         for (const Awaited& one : awaited)
-            watched.push_back({one.descriptor, one.events, 0});
-        const int count = ::poll(watched.data(), watched.size(), timeout);
+            watched.push_back({one.descriptor, one.events});
+        waitFor(watched, left);
         if (stopAsked(signals, keys)) return Activity::StopAsked;
-        if (watched[1].revents != 0 && keys->takeQuit()) return Activity::StopAsked;
+        if (watched[1].happened != 0 && keys->takeQuit()) return Activity::StopAsked;
         if (anyReady(std::span(watched).subspan(2))) return Activity::Ready;
-        if (count == 0) return Activity::Timeout;
+        if (limit && steady_clock::now() >= deadline) return Activity::Timeout;
     }
 }
 

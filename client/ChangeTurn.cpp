@@ -1,12 +1,9 @@
 #include "client/ChangeTurn.h"
 
-#include <unistd.h>
-
 #include <string>
 
 #include "client/Activity.h"
 #include "client/HotspotPort.h"
-#include "client/KernelName.h"
 
 namespace vexa::client {
 
@@ -19,7 +16,7 @@ constexpr milliseconds kBetweenAttempts{10};
 
 // Of the account too: others do not get into the service, and need no turn.
 std::string turnName(std::uint16_t port) {
-    return "vexa-credentials-" + std::to_string(::getuid()) + "-" + std::to_string(port);
+    return "vexa-credentials-" + accountTag() + "-" + std::to_string(port);
 }
 
 }  // namespace

@@ -3,7 +3,7 @@
 #include <chrono>
 #include <cstdint>
 
-#include "client/Descriptor.h"
+#include "client/KernelName.h"
 #include "client/Signals.h"
 
 namespace vexa::client {
@@ -18,7 +18,7 @@ public:
     ChangeTurn(std::uint16_t port, Signals& signals, std::chrono::milliseconds limit);
 
 private:
-    Descriptor m_holder;
+    NameHolder m_holder;
 };
 
 }  // namespace vexa::client

@@ -11,6 +11,10 @@ namespace vexa::client {
 
 void addStartCommand(CLI::App& app, int& exitCode);
 void addDemoCommand(CLI::App& app, int& exitCode);
+
+/// What there is on this kind of machine alone.
+void addHostCommands(CLI::App& app, int& exitCode);
+
 void addScanCommand(CLI::App& app, int& exitCode);
 void addChannelsCommand(CLI::App& app, int& exitCode);
 void addWatchCommand(CLI::App& app, int& exitCode);

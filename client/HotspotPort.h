@@ -55,8 +55,8 @@ public:
     Answer ask(const std::string& command, const std::optional<std::string>& data, const std::string& event,
                const Accepts& accepts);
 
-    /// The same for a question that changes nothing. A service that has just started listens before it knows its
-    /// adapter well enough to answer; it is asked again, for a while.
+    /// The same for a question that changes nothing. A service that has just started listens before it knows
+    /// its adapter well enough to answer; it is asked again, for a while.
     Answer question(const std::string& command, const Accepts& accepts);
 
     /// Whether the service has an adapter. Everything that was told before has been handled then. Throws

@@ -1,13 +1,18 @@
 #pragma once
 
+#include <memory>
 #include <string>
-
-#include "client/Descriptor.h"
 
 namespace vexa::client {
 
+/// Keeps a name as long as it exists; null: it has none.
+using NameHolder = std::shared_ptr<void>;
+
 /// Takes a name of this host that only one process can have. It is no file: it goes with its holder, however
-/// that ends. No descriptor if somebody has it.
-Descriptor takeKernelName(const std::string& name);
+/// that ends. Null if somebody has it.
+NameHolder takeKernelName(const std::string& name);
+
+/// Tells the account of this process apart from others in such names.
+std::string accountTag();
 
 }  // namespace vexa::client

@@ -11,6 +11,7 @@
 #include "client/JsonLine.h"
 #include "client/LogFiles.h"
 #include "client/MachineFolder.h"
+#include "client/ServiceHost.h"
 #include "client/Text.h"
 
 namespace vexa::client {
@@ -87,7 +88,8 @@ int runLog(const LogOptions& options, bool isLimited) {
 void addLogCommand(CLI::App& app, int& exitCode) {
     auto options = std::make_shared<LogOptions>();
     CLI::App* command = app.add_subcommand("log", "Print the diagnostic log of a machine, the newest last");
-    command->add_option("--machine", options->machine, "Folder of the machine")->type_name("DIR");
+    if (hasSimulatedMachines())
+        command->add_option("--machine", options->machine, "Folder of the machine")->type_name("DIR");
     CLI::Option* lines =
         command->add_option("-n,--lines", options->lines, "The last lines alone; default: all");
     lines->type_name("LINES")->check(CLI::NonNegativeNumber);

@@ -29,6 +29,12 @@ std::string readFrom(const fs::path& path, std::uintmax_t offset) {
     return {std::istreambuf_iterator<char>(file), std::istreambuf_iterator<char>()};
 }
 
+/// Windows ends a line with two characters.
+std::string withoutCarriageReturn(std::string line) {
+    if (line.ends_with('\r')) line.pop_back();
+    return line;
+}
+
 }  // namespace
 
 bool LogFiles::any() const {
@@ -49,7 +55,7 @@ std::vector<LogFiles::Line> LogFiles::takeLines() {
         place.rest += added;
         std::size_t begin = 0;
         for (std::size_t end = 0; (end = place.rest.find('\n', begin)) != std::string::npos; begin = end + 1)
-            lines.push_back({name, place.rest.substr(begin, end - begin)});
+            lines.push_back({name, withoutCarriageReturn(place.rest.substr(begin, end - begin))});
         place.rest.erase(0, begin);
     }
     return lines;

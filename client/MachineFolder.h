@@ -5,10 +5,11 @@
 
 namespace vexa::client {
 
-/// The folder of a simulated machine, as far as the client has to do with it.
+/// The folder of a simulated machine, or what stands for it on a real one, as far as the client has to do
+/// with it.
 class MachineFolder {
 public:
-    /// `path` empty: the machine of the environment, or the user's default one.
+    /// `path` empty: the machine of the environment, or the user's default one; always so on a real machine.
     explicit MachineFolder(const std::string& path);
 
     /// A new folder below the temporary one, for the owner only.
@@ -29,7 +30,7 @@ public:
     void create() const;
 
 private:
-    std::filesystem::path storeFolder() const { return m_path / "Public" / "Roaming" / "Korvane"; }
+    std::filesystem::path storeFolder() const;
 
     std::filesystem::path m_path;
 };

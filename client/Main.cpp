@@ -4,12 +4,13 @@
 
 #include "client/ClientError.h"
 #include "client/Commands.h"
+#include "client/Program.h"
 
 namespace {
 
 using namespace vexa::client;
 
-constexpr std::array kCommands{&addStartCommand,      &addDemoCommand,       &addStatusCommand,
+constexpr std::array kCommands{&addStartCommand,      &addHostCommands,      &addStatusCommand,
                                &addScanCommand,       &addChannelsCommand,   &addNetworksCommand,
                                &addConnectCommand,    &addDisconnectCommand, &addEnableCommand,
                                &addDisableCommand,    &addRefreshCommand,    &addCredentialsCommand,
@@ -43,7 +44,7 @@ int run(int argc, char** argv) {
 
 }  // namespace
 
-int main(int argc, char** argv) {
+int vexa::client::runProgram(int argc, char** argv) {
     try {
         return run(argc, argv);
     } catch (const CLI::ParseError& error) {

@@ -4,6 +4,7 @@
 
 #include "client/ClientError.h"
 #include "client/MachineFolder.h"
+#include "client/ServiceHost.h"
 #include "client/ServicePorts.h"
 
 namespace vexa::client {
@@ -31,12 +32,14 @@ const HalfNames& namesOf(Half half) {
 
 void PortOption::addTo(CLI::App& command) {
     addPortTo(command, ",--port");
+    if (!hasSimulatedMachines()) return;
     command.add_option("--machine", m_machine, kMachineDescription)->type_name("DIR");
 }
 
 void PortOption::addBothTo(CLI::App& command, PortOption& spectral, PortOption& hotspot) {
     spectral.addPortTo(command, "");
     hotspot.addPortTo(command, "");
+    if (!hasSimulatedMachines()) return;
     const auto setMachine = [&spectral, &hotspot](const std::string& folder) {
         spectral.m_machine = hotspot.m_machine = folder;
     };

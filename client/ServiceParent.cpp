@@ -1,10 +1,10 @@
 #include "client/ServiceParent.h"
 
 #include <algorithm>
-#include <cstdlib>
 #include <iostream>
 
 #include "client/ClientError.h"
+#include "client/ServiceHost.h"
 #include "client/ServiceProcess.h"
 
 namespace vexa::client {
@@ -17,8 +17,6 @@ using std::chrono::steady_clock;
 namespace {
 
 constexpr const char* kStopMutexName = "{39EAA3ED-1A26-46B7-90A7-AAFFECE80392}";
-constexpr const char* kServiceName = "vexa-service";
-constexpr const char* kMachineVariable = "VEXA_MACHINE";
 
 constexpr seconds kReadyLimit{10};
 constexpr milliseconds kFirstCheck{10};
@@ -29,8 +27,7 @@ constexpr seconds kGiveUpLimit{2};
 constexpr int kScenarioRefused = 2;
 
 fs::path servicePath(const std::string& given) {
-    if (!given.empty()) return fs::absolute(given);
-    return fs::read_symlink("/proc/self/exe").parent_path() / kServiceName;
+    return given.empty() ? serviceBesideThis() : fs::absolute(given);
 }
 
 std::set<std::uint16_t> wantedPorts(const ServicePorts& ports) {
@@ -64,8 +61,7 @@ ServiceParent::~ServiceParent() {
 }
 
 void ServiceParent::takeMutex() {
-    // The named mutexes live in the machine's folder, and find it here.
-    ::setenv(kMachineVariable, m_folder.path().c_str(), 1);
+    enterMachine(m_folder);
     m_mutex = std::make_unique<platform::NamedMutex>(kStopMutexName, platform::NamedMutex::Owner::Yes);
     if (!m_mutex->isValid()) {
         throw ClientError("the stop mutex cannot be made in " + m_folder.path().string(), kExitNotStarted);
@@ -96,14 +92,7 @@ void ServiceParent::start(const StartRequest& request) {
     ServiceProgram program;
     program.executable = servicePath(request.service);
     program.arguments = {std::to_string(m_ports.sa), std::to_string(m_ports.hs20)};
-    program.variables[kMachineVariable] = m_folder.path().string();
-    auto& control = program.variables["VEXA_CONTROL_PORT"];
-    if (request.controlPort) control = std::to_string(m_ports.control);
-    if (request.ownScenario) {
-        program.variables["VEXA_SCENARIO"] = std::nullopt;
-    } else if (!request.scenario.empty()) {
-        program.variables["VEXA_SCENARIO"] = fs::absolute(request.scenario).string();
-    }
+    describeMachine(program, m_folder, request, m_ports.control);
     program.outputFile = m_folder.outputFile();
     m_process = std::make_unique<ServiceProcess>(program);
 }

@@ -1,9 +1,8 @@
 #pragma once
 
-#include <sys/types.h>
-
 #include <filesystem>
 #include <map>
+#include <memory>
 #include <optional>
 #include <string>
 #include <vector>
@@ -18,8 +17,8 @@ struct ServiceProgram {
     std::filesystem::path outputFile;
 };
 
-/// The service as a child process. It gets standard error and nothing else of ours, and stands in a process
-/// group of its own, so that a Ctrl-C in the terminal reaches its parent alone.
+/// The service as a child process. It gets standard error and nothing else of ours; a Ctrl-C in the terminal
+/// reaches its parent alone.
 class ServiceProcess {
 public:
     /// Throws ClientError if the program cannot be started.
@@ -35,7 +34,8 @@ public:
     void kill();
 
 private:
-    pid_t m_pid = -1;
+    struct State;
+    std::unique_ptr<State> m_state;
     std::optional<int> m_exitCode;
 };
 

@@ -1,14 +1,16 @@
 #pragma once
 
-#include <csignal>
+#include <memory>
 #include <optional>
-
-#include "client/Descriptor.h"
 
 namespace vexa::client {
 
+/// What the operating system tells a command: the user wants it to end, a child has ended, the user wants it
+/// to pause, the terminal has another size.
+enum class Signal { Stop, Child, Suspend, Resize };
+
 /// Turns the signals that concern a command into things to read. From construction on they interrupt nothing;
-/// whoever polls descriptor() takes them one by one. One at a time exists in a process.
+/// whoever waits for descriptor() takes them one by one. One at a time exists in a process.
 class Signals {
 public:
     Signals();
@@ -16,20 +18,19 @@ public:
     Signals(const Signals&) = delete;
     Signals& operator=(const Signals&) = delete;
 
-    int descriptor() const { return m_descriptor.get(); }
+    int descriptor() const;
 
     /// The next signal, or nothing if none is waiting.
-    std::optional<int> take();
+    std::optional<Signal> take();
 
-    /// True for the signals that ask a command to end.
-    static bool isStop(int signal);
+    static bool isStop(Signal signal) { return signal == Signal::Stop; }
 
     /// Stops this process as Ctrl-Z does; returns when it is continued.
     static void suspend();
 
 private:
-    sigset_t m_before{};
-    Descriptor m_descriptor;
+    struct State;
+    std::unique_ptr<State> m_state;
 };
 
 }  // namespace vexa::client

@@ -1,12 +1,10 @@
 #include "client/SpectrumOutput.h"
 
-#include <csignal>
 #include <iomanip>
 #include <iostream>
 #include <sstream>
 
 #include "client/JsonLine.h"
-#include "client/Signals.h"
 #include "client/SpectralPicture.h"
 #include "client/SpectralText.h"
 #include "client/Text.h"
@@ -116,13 +114,13 @@ std::vector<std::string> SpectrumOutput::picture(const SpectralView& view) const
     return lines;
 }
 
-void SpectrumOutput::handleSignal(int signal) {
-    if (signal == SIGTSTP) {
+void SpectrumOutput::handleSignal(Signal signal) {
+    if (signal == Signal::Suspend) {
         if (m_screen) m_screen->leave();
         Signals::suspend();
         if (m_screen) m_screen->enter();
     }
-    if (signal == SIGWINCH && m_screen) m_screen->resized();
+    if (signal == Signal::Resize && m_screen) m_screen->resized();
     m_changed = true;
 }
 

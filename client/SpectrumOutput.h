@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "client/SideShow.h"
+#include "client/Signals.h"
 #include "client/SpectralScan.h"
 #include "client/TerminalScreen.h"
 
@@ -32,7 +33,7 @@ public:
     void finish(const SpectralView& view);
 
     /// The terminal was resized, or this process is to be suspended.
-    void handleSignal(int signal);
+    void handleSignal(Signal signal);
 
     int keyDescriptor() const { return m_screen ? m_screen->keys().descriptor() : -1; }
 

@@ -1,10 +1,10 @@
 #include "client/SpectrumWatch.h"
 
-#include <poll.h>
-
 #include <algorithm>
 #include <array>
 #include <initializer_list>
+
+#include "client/Poll.h"
 
 namespace vexa::client {
 
@@ -19,20 +19,21 @@ bool isOver(Moment end) {
     return end && steady_clock::now() >= *end;
 }
 
-/// For poll(): the shortest of the waits for these moments and for the next drawing, -1 if there is none.
-int pollTimeout(std::initializer_list<Moment> moments, std::optional<milliseconds> redraw) {
-    std::optional<milliseconds> timeout = redraw;
+/// The shortest of the waits for these moments and for the next drawing.
+std::optional<milliseconds> waitLimit(std::initializer_list<Moment> moments,
+                                      std::optional<milliseconds> redraw) {
+    std::optional<milliseconds> limit = redraw;
     for (const Moment& moment : moments) {
         if (!moment) continue;
         const auto left = std::chrono::ceil<milliseconds>(*moment - steady_clock::now());
-        timeout = std::min(timeout.value_or(left), left);
+        limit = std::min(limit.value_or(left), left);
     }
-    return timeout ? static_cast<int>(std::max(*timeout, milliseconds(0)).count()) : -1;
+    return limit ? std::optional(std::max(*limit, milliseconds(0))) : std::nullopt;
 }
 
-pollfd watchedSide(const SideShow* side) {
-    if (side == nullptr) return {-1, 0, 0};
-    return {side->descriptor(), side->events(), 0};
+Polled watchedSide(const SideShow* side) {
+    if (side == nullptr) return {-1, 0};
+    return {side->descriptor(), side->events()};
 }
 
 bool stopAsked(Signals& signals, SpectrumOutput& output) {
@@ -50,14 +51,13 @@ void watchSpectrum(SpectralScan& scan, Signals& signals, SpectrumOutput& output,
     scan.start();
     while (!output.isGone() && !isOver(end)) {
         const auto redraw = output.refresh(scan.view());
-        std::array<pollfd, 4> watched{{{scan.descriptor(), scan.events(), 0},
-                                       {signals.descriptor(), POLLIN, 0},
-                                       {output.keyDescriptor(), POLLIN, 0},
+        std::array<Polled, 4> watched{{{scan.descriptor(), scan.events()},
+                                       {signals.descriptor(), kReadable},
+                                       {output.keyDescriptor(), kReadable},
                                        watchedSide(side)}};
-        ::poll(watched.data(), watched.size(),
-               pollTimeout({end, side == nullptr ? std::nullopt : side->wake()}, redraw));
+        waitFor(watched, waitLimit({end, side == nullptr ? std::nullopt : side->wake()}, redraw));
         if (stopAsked(signals, output)) break;
-        if (watched[2].revents != 0 && output.isQuitKey()) break;
+        if (watched[2].happened != 0 && output.isQuitKey()) break;
         output.show(scan.process(), scan.view());
         if (side != nullptr) output.showSide(side->process());
     }

@@ -1,11 +1,10 @@
 #include "client/StopSource.h"
 
-#include <poll.h>
-#include <unistd.h>
-
 #include <algorithm>
 #include <array>
-#include <cerrno>
+
+#include "client/Poll.h"
+#include "client/StandardInput.h"
 
 namespace vexa::client {
 
@@ -19,16 +18,15 @@ StopSource::Wake StopSource::wait(std::optional<milliseconds> limit) {
     const auto deadline = steady_clock::now() + limit.value_or(milliseconds(0));
     while (true) {
         if (const auto wake = takeSignals()) return *wake;
-        int timeout = -1;
+        std::optional<milliseconds> left;
         if (limit) {
-            const auto left = std::chrono::ceil<milliseconds>(deadline - steady_clock::now());
-            if (left <= milliseconds(0)) return Wake::Timeout;
-            timeout = static_cast<int>(left.count());
+            left = std::chrono::ceil<milliseconds>(deadline - steady_clock::now());
+            if (*left <= milliseconds(0)) return Wake::Timeout;
         }
-        std::array<pollfd, 2> watched{
-            {{m_signals.descriptor(), POLLIN, 0}, {m_watchInput ? STDIN_FILENO : -1, POLLIN, 0}}};
-        if (::poll(watched.data(), watched.size(), timeout) < 0) continue;
-        if (watched[1].revents != 0 && inputEnded()) {
+        std::array<Polled, 2> watched{
+            {{m_signals.descriptor(), kReadable}, {m_watchInput ? kStandardInput : -1, kReadable}}};
+        waitFor(watched, left);
+        if (watched[1].happened != 0 && inputEnded()) {
             m_watchInput = false;
             return Wake::Stop;
         }
@@ -38,16 +36,15 @@ StopSource::Wake StopSource::wait(std::optional<milliseconds> limit) {
 std::optional<StopSource::Wake> StopSource::takeSignals() {
     while (const auto signal = m_signals.take()) {
         if (Signals::isStop(*signal)) return Wake::Stop;
-        if (*signal == SIGCHLD) return Wake::Child;
-        if (*signal == SIGTSTP) Signals::suspend();
+        if (*signal == Signal::Child) return Wake::Child;
+        if (*signal == Signal::Suspend) Signals::suspend();
     }
     return std::nullopt;
 }
 
 bool StopSource::inputEnded() {
     std::array<char, 512> dropped{};
-    const ssize_t count = ::read(STDIN_FILENO, dropped.data(), dropped.size());
-    return count == 0 || (count < 0 && errno != EINTR && errno != EAGAIN);
+    return readStandardInput(dropped) == 0;
 }
 
 }  // namespace vexa::client

@@ -2,10 +2,11 @@
 
 #include <cstdint>
 #include <set>
-#include <string>
+#include <utility>
 #include <vector>
 
-#include "client/Descriptor.h"
+#include "client/KernelName.h"
+#include "client/TcpEndpoints.h"
 
 namespace vexa::client {
 
@@ -13,32 +14,29 @@ namespace vexa::client {
 /// it.
 struct ReservedPort {
     std::uint16_t port;
-    Descriptor holder;
+    NameHolder holder;
 };
 
 /// The IPv4 TCP endpoints of this host at one moment. Nothing is connected to find out about a port: a trial
 /// connection would stay behind in the table and make the port busy for the service.
 class TcpPorts {
 public:
-    /// Throws ClientError if the table cannot be read.
-    static TcpPorts read(const std::string& table = "/proc/net/tcp");
+    explicit TcpPorts(std::vector<TcpEndpoint> endpoints) : m_endpoints(std::move(endpoints)) {}
 
-    /// Any row, in whatever state.
+    /// Those of now. Throws ClientError if they can't be read.
+    static TcpPorts read() { return TcpPorts(readTcpEndpoints()); }
+
+    /// Any endpoint, in whatever state.
     bool isBusy(std::uint16_t port) const;
 
-    /// The sockets that listen on the port.
+    /// The owners of those that listen on the port.
     std::set<std::uint64_t> listeners(std::uint16_t port) const;
 
-    /// Reserves a port without a row. Throws ClientError if there is none.
+    /// Reserves a port without an endpoint. Throws ClientError if there is none.
     ReservedPort reserveFree() const;
 
 private:
-    struct Row {
-        std::uint16_t port;
-        bool listens;
-        std::uint64_t socket;
-    };
-    std::vector<Row> m_rows;
+    std::vector<TcpEndpoint> m_endpoints;
 };
 
 }  // namespace vexa::client

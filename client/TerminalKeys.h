@@ -1,7 +1,6 @@
 #pragma once
 
-#include <termios.h>
-
+#include <memory>
 #include <optional>
 
 namespace vexa::client {
@@ -10,8 +9,8 @@ namespace vexa::client {
 /// or while it has left. Where standard input is no terminal there are no keys.
 class TerminalKeys {
 public:
-    TerminalKeys() { enter(); }
-    ~TerminalKeys() { leave(); }
+    TerminalKeys();
+    ~TerminalKeys();
     TerminalKeys(const TerminalKeys&) = delete;
     TerminalKeys& operator=(const TerminalKeys&) = delete;
 
@@ -21,8 +20,8 @@ public:
     void enter();
     void leave();
 
-    /// To be polled; -1 if there are no keys.
-    int descriptor() const { return m_isReading ? 0 : -1; }
+    /// To be waited for; -1 if there are no keys.
+    int descriptor() const;
 
     /// A key that was pressed, or nothing. To be called when the descriptor is readable.
     std::optional<char> take();
@@ -31,8 +30,8 @@ public:
     bool takeQuit();
 
 private:
-    std::optional<termios> m_before;
-    bool m_isReading = false;
+    struct State;
+    std::unique_ptr<State> m_state;
 };
 
 }  // namespace vexa::client

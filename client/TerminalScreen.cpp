@@ -1,13 +1,10 @@
 #include "client/TerminalScreen.h"
 
-#include <sys/ioctl.h>
-#include <unistd.h>
-
 #include <algorithm>
-#include <cctype>
 #include <cstdlib>
 #include <iostream>
-#include <string_view>
+
+#include "client/Terminal.h"
 
 namespace vexa::client {
 
@@ -19,31 +16,19 @@ constexpr const char* kHome = "\033[H";
 constexpr const char* kClearLine = "\033[K";
 constexpr const char* kClearBelow = "\033[J";
 
-std::string_view variable(const char* name) {
-    const char* value = std::getenv(name);
-    return value == nullptr ? "" : value;
-}
-
 }  // namespace
 
 bool TerminalScreen::isUsable() {
-    const std::string_view terminal = variable("TERM");
-    return ::isatty(STDOUT_FILENO) != 0 && !terminal.empty() && terminal != "dumb";
+    return canPlaceCursor();
 }
 
 bool TerminalScreen::wantsColour() {
-    return variable("NO_COLOR").empty();
+    const char* const refusal = std::getenv("NO_COLOR");
+    return refusal == nullptr || *refusal == '\0';
 }
 
 bool TerminalScreen::isUtf8() {
-    for (const char* name : {"LC_ALL", "LC_CTYPE", "LANG"}) {
-        std::string value(variable(name));
-        if (value.empty()) continue;
-        std::transform(value.begin(), value.end(), value.begin(),
-                       [](unsigned char c) { return static_cast<char>(std::toupper(c)); });
-        return value.find("UTF-8") != std::string::npos || value.find("UTF8") != std::string::npos;
-    }
-    return false;
+    return showsUtf8();
 }
 
 TerminalScreen::TerminalScreen() {
@@ -80,10 +65,10 @@ void TerminalScreen::draw(const std::vector<std::string>& lines) {
 }
 
 void TerminalScreen::resized() {
-    winsize size{};
-    if (::ioctl(STDOUT_FILENO, TIOCGWINSZ, &size) != 0 || size.ws_col == 0 || size.ws_row == 0) return;
-    m_columns = size.ws_col;
-    m_rows = size.ws_row;
+    const auto size = terminalSize();
+    if (!size) return;
+    m_columns = size->columns;
+    m_rows = size->rows;
 }
 
 }  // namespace vexa::client

@@ -1,10 +1,10 @@
 #include "client/Text.h"
 
-#include <locale.h>
 #include <algorithm>
 #include <array>
-#include <cwchar>
 #include <optional>
+
+#include "client/CharacterWidth.h"
 
 namespace vexa::client {
 
@@ -65,16 +65,6 @@ std::string fromLatin1(unsigned char byte) {
     return {static_cast<char>(0xC0U | (byte >> 6U)), static_cast<char>(0x80U | (byte & 0x3FU))};
 }
 
-// The C library knows the widths, but only in a locale with UTF-8.
-int widthOf(char32_t value) {
-    static const locale_t locale = ::newlocale(LC_CTYPE_MASK, "C.UTF-8", nullptr);
-    if (locale == nullptr) return 1;
-    const locale_t before = ::uselocale(locale);
-    const int width = ::wcwidth(static_cast<wchar_t>(value));
-    ::uselocale(before);
-    return width < 0 ? 1 : width;
-}
-
 }  // namespace
 
 bool isUtf8(std::string_view text) {
@@ -115,7 +105,7 @@ std::string printable(std::string_view text, Tabs tabs) {
 int columnsOf(std::string_view text) {
     int columns = 0;
     while (const auto point = firstCodePoint(text)) {
-        columns += widthOf(point->value);
+        columns += characterWidth(point->value);
         text.remove_prefix(point->bytes);
     }
     return columns;
@@ -124,7 +114,7 @@ int columnsOf(std::string_view text) {
 std::string cutToColumns(std::string_view text, int columns) {
     std::string cut;
     while (const auto point = firstCodePoint(text)) {
-        columns -= widthOf(point->value);
+        columns -= characterWidth(point->value);
         if (columns < 0) break;
         cut += text.substr(0, point->bytes);
         text.remove_prefix(point->bytes);

@@ -1,7 +1,5 @@
 #include "client/WebSocketClient.h"
 
-#include <poll.h>
-
 #include <boost/asio/connect.hpp>
 #include <boost/asio/io_context.hpp>
 #include <boost/asio/ip/tcp.hpp>
@@ -11,6 +9,7 @@
 #include <deque>
 
 #include "client/ClientError.h"
+#include "client/Poll.h"
 
 namespace vexa::client {
 
@@ -46,7 +45,8 @@ public:
         read();
     }
 
-    int descriptor() { return m_stream.next_layer().native_handle(); }
+    // Also where a socket is no small number, it fits: handles have 32 bits.
+    int descriptor() { return static_cast<int>(m_stream.next_layer().native_handle()); }
     bool isSending() const { return !m_outgoing.empty(); }
     bool isOpen() const { return m_open; }
 
@@ -147,7 +147,7 @@ int WebSocketClient::descriptor() const {
     return m_impl->descriptor();
 }
 short WebSocketClient::events() const {
-    return m_impl->isSending() ? POLLIN | POLLOUT : POLLIN;
+    return m_impl->isSending() ? kReadable | kWritable : kReadable;
 }
 void WebSocketClient::process() {
     m_impl->process();

@@ -20,7 +20,7 @@ public:
     WebSocketClient(const WebSocketClient&) = delete;
     WebSocketClient& operator=(const WebSocketClient&) = delete;
 
-    /// To be polled for poll()'s events().
+    /// To be waited for, for these events().
     int descriptor() const;
     short events() const;
 

@@ -7,9 +7,10 @@
 #include <vector>
 
 #include "client/ClientError.h"
-#include "client/Descriptor.h"
+#include "client/posix/Descriptor.h"
 #include "client/MachineFolder.h"
 #include "client/TcpPorts.h"
+#include "client/posix/TcpTable.h"
 
 namespace vexa::client {
 namespace {
@@ -28,7 +29,7 @@ TcpPorts fromText(const std::string& text) {
     const TemporaryMachine folder;
     const auto file = folder.path() / "tcp";
     std::ofstream(file) << text;
-    return TcpPorts::read(file.string());
+    return TcpPorts(readTcpTable(file.string()));
 }
 
 TEST(TcpPorts, ARowOfAnyStateMakesItsLocalPortBusy) {
@@ -47,7 +48,7 @@ TEST(TcpPorts, ListenersAreTheSocketsThatListen) {
 }
 
 TEST(TcpPorts, ATableThatIsNotThereIsAnError) {
-    EXPECT_THROW(TcpPorts::read("/nonexistent/tcp"), ClientError);
+    EXPECT_THROW(readTcpTable("/nonexistent/tcp"), ClientError);
 }
 
 /// The socket, if it could be made to listen.

@@ -4,6 +4,7 @@
 #include <iterator>
 
 #include "client/JsonLine.h"
+#include "client/posix/RegistryFile.h"
 
 namespace vexa::client {
 

@@ -81,12 +81,16 @@ int decoded(int status) {
 
 }  // namespace
 
-ServiceProcess::ServiceProcess(const ServiceProgram& program) {
+struct ServiceProcess::State {
+    pid_t pid = -1;
+};
+
+ServiceProcess::ServiceProcess(const ServiceProgram& program) : m_state(std::make_unique<State>()) {
     std::vector<std::string> arguments{program.executable.string()};
     arguments.insert(arguments.end(), program.arguments.begin(), program.arguments.end());
     std::vector<std::string> environment = childEnvironment(program);
     SpawnSetup setup(program.outputFile);
-    const int error = setup.spawn(m_pid, program.executable.string(), arguments, environment);
+    const int error = setup.spawn(m_state->pid, program.executable.string(), arguments, environment);
     if (error != 0) {
         throw ClientError(
             "the service " + program.executable.string() + " cannot be started: " + std::strerror(error),
@@ -101,15 +105,15 @@ ServiceProcess::~ServiceProcess() {
 std::optional<int> ServiceProcess::exitCode() {
     if (m_exitCode) return m_exitCode;
     int status = 0;
-    if (::waitpid(m_pid, &status, WNOHANG) == m_pid) m_exitCode = decoded(status);
+    if (::waitpid(m_state->pid, &status, WNOHANG) == m_state->pid) m_exitCode = decoded(status);
     return m_exitCode;
 }
 
 void ServiceProcess::kill() {
     if (m_exitCode) return;
-    ::kill(-m_pid, SIGKILL);
+    ::kill(-m_state->pid, SIGKILL);
     int status = 0;
-    while (::waitpid(m_pid, &status, 0) < 0 && errno == EINTR) {
+    while (::waitpid(m_state->pid, &status, 0) < 0 && errno == EINTR) {
     }
     m_exitCode = decoded(status);
 }

@@ -3,7 +3,7 @@
 #include <fcntl.h>
 #include <unistd.h>
 
-#include "client/Descriptor.h"
+#include "client/posix/Descriptor.h"
 
 namespace vexa::client {
 

@@ -45,6 +45,10 @@ void makeFolder(const fs::path& folder) {
 MachineFolder::MachineFolder(const std::string& path)
     : m_path(fs::absolute(path.empty() ? defaultFolder() : fs::path(path)).lexically_normal()) {}
 
+fs::path MachineFolder::storeFolder() const {
+    return m_path / "Public" / "Roaming" / "Korvane";
+}
+
 MachineFolder MachineFolder::makeTemporary() {
     std::string pattern = (fs::temp_directory_path() / "vexa-XXXXXX").string();
     if (::mkdtemp(pattern.data()) == nullptr) {

@@ -4,8 +4,8 @@
 #include <strings.h>
 
 #include "client/JsonLine.h"
-#include "client/MachineRegistry.h"
 #include "client/OwnerFile.h"
+#include "client/posix/RegistryFile.h"
 
 namespace vexa::client {
 

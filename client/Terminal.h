@@ -1,0 +1,24 @@
+#pragma once
+
+#include <optional>
+
+namespace vexa::client {
+
+/// Standard output goes to a terminal, of whatever kind.
+bool isOutputTerminal();
+
+/// It goes to one that can place a cursor.
+bool canPlaceCursor();
+
+/// It shows more than ASCII.
+bool showsUtf8();
+
+struct TerminalSize {
+    int columns;
+    int rows;
+};
+
+/// Of the terminal that standard output goes to; nothing if it does not tell.
+std::optional<TerminalSize> terminalSize();
+
+}  // namespace vexa::client

@@ -1,0 +1,11 @@
+#include "client/Commands.h"
+#include "client/Program.h"
+
+// The demo shows a machine that was made for it.
+void vexa::client::addHostCommands(CLI::App& app, int& exitCode) {
+    addDemoCommand(app, exitCode);
+}
+
+int main(int argc, char** argv) {
+    return vexa::client::runProgram(argc, argv);
+}

@@ -1,0 +1,62 @@
+#include "client/TerminalKeys.h"
+
+#include <termios.h>
+#include <unistd.h>
+
+#include "client/Poll.h"
+#include "client/StandardInput.h"
+#include "client/Terminal.h"
+
+namespace vexa::client {
+
+struct TerminalKeys::State {
+    std::optional<termios> before;
+    bool isReading = false;
+};
+
+TerminalKeys::TerminalKeys() : m_state(std::make_unique<State>()) {
+    enter();
+}
+
+TerminalKeys::~TerminalKeys() {
+    leave();
+}
+
+bool TerminalKeys::isUsable() {
+    return isInputTerminal() && isOutputTerminal();
+}
+
+void TerminalKeys::enter() {
+    termios settings{};
+    if (m_state->before || ::tcgetattr(STDIN_FILENO, &settings) != 0) return;
+    m_state->before = settings;
+    settings.c_lflag &= ~static_cast<tcflag_t>(ICANON | ECHO);
+    settings.c_cc[VMIN] = 0;
+    settings.c_cc[VTIME] = 0;
+    m_state->isReading = ::tcsetattr(STDIN_FILENO, TCSANOW, &settings) == 0;
+}
+
+void TerminalKeys::leave() {
+    if (m_state->before) ::tcsetattr(STDIN_FILENO, TCSANOW, &*m_state->before);
+    m_state->before.reset();
+    m_state->isReading = false;
+}
+
+int TerminalKeys::descriptor() const {
+    return m_state->isReading ? kStandardInput : -1;
+}
+
+std::optional<char> TerminalKeys::take() {
+    char key = 0;
+    if (::read(STDIN_FILENO, &key, 1) == 1) return key;
+    // With this terminal mode a readable descriptor without a key is a terminal that has gone.
+    m_state->isReading = false;
+    return std::nullopt;
+}
+
+bool TerminalKeys::takeQuit() {
+    const auto key = take();
+    return key && (*key == 'q' || *key == 'Q');
+}
+
+}  // namespace vexa::client

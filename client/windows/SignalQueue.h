@@ -1,0 +1,21 @@
+#pragma once
+
+#include <windows.h>
+
+#include <limits>
+
+#include "client/Signals.h"
+
+namespace vexa::client {
+
+/// What Signals::descriptor() gives; no socket has this number.
+inline constexpr int kSignalDescriptor = std::numeric_limits<int>::max();
+
+/// Puts a signal where Signals finds it. Any thread.
+void raiseSignal(Signal signal);
+
+/// Set while a signal waits to be taken.
+HANDLE signalEvent();
+bool isSignalWaiting();
+
+}  // namespace vexa::client

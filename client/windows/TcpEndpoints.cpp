@@ -1,0 +1,72 @@
+#include "client/TcpEndpoints.h"
+
+#include <winsock2.h>
+// After <winsock2.h>.
+#include <iphlpapi.h>
+
+#include <cstddef>
+#include <span>
+#include <string>
+
+#include "base/ScopeGuard.h"
+#include "client/ClientError.h"
+#include "platform/SocketLibrary.h"
+
+namespace vexa::client {
+
+namespace {
+
+constexpr std::uint16_t kSocketVersion = 0x0202;
+
+class Socket {
+public:
+    Socket() : m_socket(::socket(AF_INET, SOCK_STREAM, 0)) {}
+    ~Socket() {
+        if (m_socket != INVALID_SOCKET) closesocket(m_socket);
+    }
+    Socket(const Socket&) = delete;
+    Socket& operator=(const Socket&) = delete;
+
+    SOCKET get() const { return m_socket; }
+
+private:
+    const SOCKET m_socket;
+};
+
+std::vector<std::max_align_t> readTable() {
+    std::vector<std::max_align_t> table;
+    DWORD size = 0;
+    for (;;) {
+        table.resize(size / sizeof(std::max_align_t) + 1);
+        const DWORD result =
+            GetExtendedTcpTable(table.data(), &size, FALSE, AF_INET, TCP_TABLE_OWNER_PID_ALL, 0);
+        if (result == NO_ERROR) return table;
+        if (result != ERROR_INSUFFICIENT_BUFFER)
+            throw ClientError("the TCP table cannot be read: error " + std::to_string(result));
+    }
+}
+
+}  // namespace
+
+std::vector<TcpEndpoint> readTcpEndpoints() {
+    const auto storage = readTable();
+    const auto& table = *reinterpret_cast<const MIB_TCPTABLE_OWNER_PID*>(storage.data());
+    std::vector<TcpEndpoint> endpoints;
+    for (const MIB_TCPROW_OWNER_PID& row : std::span(table.table, table.dwNumEntries))
+        endpoints.push_back({ntohs(static_cast<u_short>(row.dwLocalPort)),
+                             row.dwState == MIB_TCP_STATE_LISTEN, row.dwOwningPid});
+    return endpoints;
+}
+
+bool canBind(std::uint16_t port) {
+    if (!platform::startSocketLibrary(kSocketVersion)) return false;
+    const ScopeGuard stop(&platform::stopSocketLibrary);
+    const Socket socket;
+    sockaddr_in address{};
+    address.sin_family = AF_INET;
+    address.sin_port = htons(port);
+    address.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
+    return ::bind(socket.get(), reinterpret_cast<const sockaddr*>(&address), sizeof address) == 0;
+}
+
+}  // namespace vexa::client

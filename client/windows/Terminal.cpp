@@ -1,0 +1,30 @@
+#include "client/Terminal.h"
+
+#include <windows.h>
+
+namespace vexa::client {
+
+bool isOutputTerminal() {
+    DWORD mode = 0;
+    return GetConsoleMode(GetStdHandle(STD_OUTPUT_HANDLE), &mode) != 0;
+}
+
+// The entry has asked for it.
+bool canPlaceCursor() {
+    DWORD mode = 0;
+    return GetConsoleMode(GetStdHandle(STD_OUTPUT_HANDLE), &mode) != 0 &&
+           (mode & ENABLE_VIRTUAL_TERMINAL_PROCESSING) != 0;
+}
+
+bool showsUtf8() {
+    return GetConsoleOutputCP() == CP_UTF8;
+}
+
+std::optional<TerminalSize> terminalSize() {
+    CONSOLE_SCREEN_BUFFER_INFO info{};
+    if (GetConsoleScreenBufferInfo(GetStdHandle(STD_OUTPUT_HANDLE), &info) == 0) return std::nullopt;
+    const SMALL_RECT& window = info.srWindow;
+    return TerminalSize{window.Right - window.Left + 1, window.Bottom - window.Top + 1};
+}
+
+}  // namespace vexa::client

@@ -1,0 +1,55 @@
+#include "client/TerminalKeys.h"
+
+#include <windows.h>
+
+#include "client/Poll.h"
+#include "client/StandardInput.h"
+#include "client/Terminal.h"
+#include "client/windows/ConsoleKeys.h"
+
+namespace vexa::client {
+
+struct TerminalKeys::State {
+    std::optional<DWORD> before;
+};
+
+TerminalKeys::TerminalKeys() : m_state(std::make_unique<State>()) {
+    enter();
+}
+
+TerminalKeys::~TerminalKeys() {
+    leave();
+}
+
+bool TerminalKeys::isUsable() {
+    return isInputTerminal() && isOutputTerminal();
+}
+
+void TerminalKeys::enter() {
+    const HANDLE input = GetStdHandle(STD_INPUT_HANDLE);
+    DWORD mode = 0;
+    if (m_state->before || GetConsoleMode(input, &mode) == 0) return;
+    if (SetConsoleMode(input, ENABLE_PROCESSED_INPUT | ENABLE_WINDOW_INPUT) != 0) m_state->before = mode;
+}
+
+void TerminalKeys::leave() {
+    if (m_state->before) SetConsoleMode(GetStdHandle(STD_INPUT_HANDLE), *m_state->before);
+    m_state->before.reset();
+}
+
+int TerminalKeys::descriptor() const {
+    return m_state->before ? kStandardInput : -1;
+}
+
+std::optional<char> TerminalKeys::take() {
+    const auto key = takeKey();
+    if (!key || *key >= 0x80) return std::nullopt;
+    return static_cast<char>(*key);
+}
+
+bool TerminalKeys::takeQuit() {
+    const auto key = take();
+    return key && (*key == 'q' || *key == 'Q');
+}
+
+}  // namespace vexa::client
