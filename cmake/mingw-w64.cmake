@@ -21,5 +21,7 @@ set(CMAKE_FIND_ROOT_PATH_MODE_LIBRARY ONLY)
 set(CMAKE_FIND_ROOT_PATH_MODE_PACKAGE ONLY)
 set(ENV{PKG_CONFIG_LIBDIR} ${VEXA_WINDOWS_PREFIX}/lib/pkgconfig:${VEXA_WINDOWS_PREFIX}/share/pkgconfig)
 
+set(CMAKE_CROSSCOMPILING_EMULATOR wine)
+
 # Boost's own CMake files name the host's folders.
 set(Boost_NO_BOOST_CMAKE ON)

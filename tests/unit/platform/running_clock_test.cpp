@@ -17,7 +17,7 @@ TEST(RunningClock, AJoinWithALimitMovesAStandingClockOnToTheEndOfTheThread) {
     const Duration start = now();
     Thread sleeper;
     ASSERT_TRUE(sleeper.start("sleeper", [] { sleepFor(10s); }));
-    EXPECT_TRUE(sleeper.join(10s));
+    EXPECT_TRUE(sleeper.join(11s)) << "also where it comes to its sleep after we come to the join";
     EXPECT_EQ(now() - start, 10s);
     Event never(Reset::Auto);
     EXPECT_FALSE(never.wait(0ms));
