@@ -16,6 +16,9 @@ namespace vexa::platform {
 
 namespace {
 
+constexpr int kRenameTries = 5;
+constexpr DWORD kRenamePauseMs = 50;
+
 constexpr DWORD kShareAll = FILE_SHARE_READ | FILE_SHARE_WRITE | FILE_SHARE_DELETE;
 
 // Without FILE_SHARE_WRITE: nobody writes the file meanwhile, and nobody else opens it for deletion without
@@ -114,12 +117,14 @@ bool NewFile::flush() {
     return FlushFileBuffers(m_state->file.get()) != 0;
 }
 
-RenameResult NewFile::rename(const std::wstring& to, Existing existing) {
+bool NewFile::rename(const std::wstring& to, Existing existing) {
     const DWORD replace = existing == Existing::Replace ? MOVEFILE_REPLACE_EXISTING : 0;
-    if (MoveFileExW(m_state->path.c_str(), to.c_str(), replace | MOVEFILE_WRITE_THROUGH) != 0)
-        return RenameResult::Done;
-    return existing == Existing::Replace && meansInUse(GetLastError()) ? RenameResult::InUse
-                                                                       : RenameResult::Failed;
+    for (int tries = 1;; ++tries) {
+        if (MoveFileExW(m_state->path.c_str(), to.c_str(), replace | MOVEFILE_WRITE_THROUGH) != 0)
+            return true;
+        if (replace == 0 || tries == kRenameTries || !meansInUse(GetLastError())) return false;
+        Sleep(kRenamePauseMs);
+    }
 }
 
 void NewFile::remove() {

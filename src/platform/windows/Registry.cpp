@@ -47,9 +47,9 @@ RegistryKey& RegistryKey::operator=(RegistryKey&&) noexcept = default;
 
 std::optional<std::string> RegistryKey::subkeyName(std::uint32_t index, std::size_t capacity) const {
     std::vector<char> name(capacity);
-    if (RegEnumKeyA(m_state->key.get(), index, name.data(), static_cast<DWORD>(capacity)) != ERROR_SUCCESS)
-        return std::nullopt;
-    return textOf(name, capacity);
+    const LONG result = RegEnumKeyA(m_state->key.get(), index, name.data(), static_cast<DWORD>(capacity));
+    if (result == ERROR_MORE_DATA) return std::string();
+    return result == ERROR_SUCCESS ? std::optional(textOf(name, capacity)) : std::nullopt;
 }
 
 std::optional<std::string> RegistryKey::value(const std::string& name, std::size_t capacity) const {

@@ -69,8 +69,7 @@ TEST_F(Files, ARenamedFileReplacesTheOldOneOrLeavesIt) {
             auto file = NewFile::create(path(L"draft"));
             ASSERT_TRUE(file && file->write("new"));
             const bool takesPlace = !hasOld || existing == Existing::Replace;
-            EXPECT_EQ(file->rename(path(target), existing),
-                      takesPlace ? RenameResult::Done : RenameResult::Failed);
+            EXPECT_EQ(file->rename(path(target), existing), takesPlace);
             EXPECT_EQ(canOpenFile(path(L"draft")), !takesPlace);
             file->remove();
             file.reset();
@@ -83,7 +82,7 @@ TEST_F(Files, ARenamedFileReplacesTheOldOneOrLeavesIt) {
 TEST_F(Files, ARenameToAFolderThatIsNotThereFails) {
     auto file = NewFile::create(path(L"draft"));
     ASSERT_TRUE(file);
-    EXPECT_EQ(file->rename(path(L"no folder\\target"), Existing::Replace), RenameResult::Failed);
+    EXPECT_FALSE(file->rename(path(L"no folder\\target"), Existing::Replace));
 }
 
 TEST_F(Files, AFileIsAbandonedWhenNobodyHoldsIt) {
