@@ -9,7 +9,8 @@
 namespace vexa::platform {
 
 // Files of the store and of the log. Paths are those of the operating system, with backslashes; what is
-// created is readable by those who may read its folder: on a simulated machine, by its owner only. Any thread.
+// created is readable by those who may read its folder: on a simulated machine, by its owner only. Any
+// thread.
 
 /// Whether the file can be opened for reading.
 bool canOpenFile(const std::wstring& path);

@@ -7,9 +7,9 @@
 #include <vector>
 
 #include "client/ClientError.h"
-#include "client/posix/Descriptor.h"
 #include "client/MachineFolder.h"
 #include "client/TcpPorts.h"
+#include "client/posix/Descriptor.h"
 #include "client/posix/TcpTable.h"
 
 namespace vexa::client {
