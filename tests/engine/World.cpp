@@ -108,7 +108,7 @@ World::World(const std::string& scenario, const std::filesystem::path& folder)
       m_machine(withLog(simulation::parseScenario(scenario)), folder),
       m_stopMutex(std::make_unique<platform::NamedMutex>("{39EAA3ED-1A26-46B7-90A7-AAFFECE80392}",
                                                          platform::NamedMutex::Owner::Yes)) {
-    const std::int32_t saPort = unusedPort(21000);
+    const std::int32_t saPort = unusedPort(2100);
     const std::int32_t hs20Port = unusedPort(saPort + 1);
     m_service.start("main", [this, commandLine = std::to_wstring(saPort) + L" " + std::to_wstring(hs20Port)] {
         m_exitCode = runService(&commandLine);

@@ -165,7 +165,12 @@ class ServiceThatDoesNotCome(unittest.TestCase):
                 parent = self.start("--service", self.stand_in(f"exit {code}\n"))
                 self.assertEqual(parent.wait(), code)
                 self.assertEqual(parent.lines, [])
-                self.assertEqual(len(parent.errors), 1, parent.errors)
+                self.assertEqual(len(parent.errors), 0 if code == 2 else 1, parent.errors)
+
+    def test_one_that_refuses_has_said_so_itself(self):
+        parent = self.start("--service", self.stand_in("echo speed: negative >&2\nexit 2\n"))
+        self.assertEqual(parent.wait(), 2)
+        self.assertEqual(parent.errors, ["speed: negative"])
 
     def test_one_that_listens_to_nothing_is_ended(self):
         service = self.stand_in(f'echo $$ >"{self.folder}/pids"\nsleep 600 & echo $! >>"{self.folder}/pids"\nwait\n')
