@@ -18,6 +18,7 @@ namespace {
 
 // The table may grow between the question for its size and the one for its rows.
 constexpr int kTableTries = 5;
+constexpr DWORD kSpareRows = 64;
 
 /// Memory for a structure whose size only the operating system knows.
 using Storage = std::vector<std::max_align_t>;
@@ -33,6 +34,7 @@ bool readTable(Storage& table) {
         const DWORD result =
             GetExtendedTcpTable(table.data(), &size, FALSE, AF_INET, TCP_TABLE_OWNER_PID_ALL, 0);
         if (result != ERROR_INSUFFICIENT_BUFFER) return result == NO_ERROR;
+        size += kSpareRows * static_cast<DWORD>(sizeof(MIB_TCPROW_OWNER_PID));
     }
     return false;
 }

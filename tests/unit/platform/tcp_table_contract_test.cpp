@@ -1,6 +1,7 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <array>
 #include <bit>
 #include <cstddef>
 #include <cstring>
@@ -49,6 +50,15 @@ TEST(TcpTable, HoldsWhoListensAndBothEndsOfAConnection) {
     }
     std::sort(found.begin(), found.end());
     EXPECT_EQ(found, (std::vector<std::string>{"client 5", "listens", "server 5"}));
+}
+
+TEST(TcpTable, ATableThatGrowsMeanwhileStillFits) {
+    const test::MachineWorld world;
+    std::uint32_t size = 0;
+    ASSERT_EQ(getTcpTable(nullptr, size, true), kErrorInsufficientBuffer);
+    const std::array<test::LocalConnection, 3> connections;
+    std::vector<std::uint32_t> memory(size / sizeof(std::uint32_t) + 1);
+    EXPECT_EQ(getTcpTable(reinterpret_cast<TcpTable*>(memory.data()), size, true), kNoError);
 }
 
 TEST(TcpTable, TooLittleMemoryIsToldWithWhatItTakes) {
