@@ -1,32 +1,32 @@
 #include <windows.h>
 
+#include <iostream>
 #include <string>
 #include <vector>
 
 #include "base/TextConversion.h"
 #include "client/Commands.h"
 #include "client/Program.h"
+#include "client/windows/ConsoleStream.h"
 
 namespace {
 
-/// A console that shows UTF-8 and understands the sequences that place a cursor; afterwards it is as before.
+/// A console that shows all characters and understands the sequences that place a cursor; afterwards it is as
+/// before.
 class Console {
 public:
-    Console() : m_output(GetStdHandle(STD_OUTPUT_HANDLE)), m_codePage(GetConsoleOutputCP()) {
-        SetConsoleOutputCP(CP_UTF8);
+    Console() : m_output(GetStdHandle(STD_OUTPUT_HANDLE)) {
         m_hasMode = GetConsoleMode(m_output, &m_mode) != 0;
         if (m_hasMode) SetConsoleMode(m_output, m_mode | ENABLE_VIRTUAL_TERMINAL_PROCESSING);
     }
     ~Console() {
         if (m_hasMode) SetConsoleMode(m_output, m_mode);
-        if (m_codePage != 0) SetConsoleOutputCP(m_codePage);
     }
     Console(const Console&) = delete;
     Console& operator=(const Console&) = delete;
 
 private:
     const HANDLE m_output;
-    const UINT m_codePage;
     DWORD m_mode = 0;
     bool m_hasMode = false;
 };
@@ -43,5 +43,7 @@ int wmain(int argc, wchar_t** argv) {
         arguments.push_back(texts.emplace_back(vexa::utf8FromWide(argv[i])).data());
     arguments.push_back(nullptr);
     const Console console;
+    const vexa::client::ConsoleStream output(std::cout, STD_OUTPUT_HANDLE);
+    const vexa::client::ConsoleStream errors(std::cerr, STD_ERROR_HANDLE);
     return vexa::client::runProgram(argc, arguments.data());
 }

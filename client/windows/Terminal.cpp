@@ -16,8 +16,9 @@ bool canPlaceCursor() {
            (mode & ENABLE_VIRTUAL_TERMINAL_PROCESSING) != 0;
 }
 
+// The entry writes characters to a console, whatever its code page.
 bool showsUtf8() {
-    return GetConsoleOutputCP() == CP_UTF8;
+    return isOutputTerminal();
 }
 
 std::optional<TerminalSize> terminalSize() {
