@@ -5,7 +5,7 @@
 #include "client/ClientError.h"
 #include "client/Commands.h"
 #include "client/DemoCredentials.h"
-#include "client/DemoScenario.h"
+#include "client/DemoMachine.h"
 #include "client/DemoStory.h"
 #include "client/JsonLine.h"
 #include "client/MachineFolder.h"
@@ -59,7 +59,7 @@ int runDemo(const DemoOptions& options) {
     StopSource stop(signals, false);
     StartRequest request;
     request.machine = machine.path().string();
-    request.ownScenario = true;
+    request.builtInScenario = true;
     request.service = options.service;
     ServiceParent parent(request, stop);
     const auto state = parent.waitUntilReady();

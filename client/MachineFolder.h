@@ -19,7 +19,6 @@ public:
     std::filesystem::path portsFile() const { return m_path / "ports.json"; }
     std::filesystem::path outputFile() const { return m_path / "stdout.log"; }
     /// The scenario of the machine, if none is named.
-    std::filesystem::path scenarioFile() const { return m_path / "scenario.json"; }
     std::filesystem::path registryFile() const { return m_path / "registry.json"; }
     std::filesystem::path configFile() const { return storeFolder() / "config.xml"; }
 

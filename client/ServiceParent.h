@@ -24,7 +24,7 @@ struct StartRequest {
     std::string machine;
     std::string scenario;
     /// The machine has its own; the one of the environment is not for it.
-    bool ownScenario = false;
+    bool builtInScenario = false;
     std::uint16_t saPort = 0;
     std::uint16_t hs20Port = 0;
     std::optional<std::uint16_t> controlPort;

@@ -35,7 +35,7 @@ void describeMachine(ServiceProgram& program, const MachineFolder& machine, cons
     program.variables[kMachineVariable] = machine.path().string();
     auto& control = program.variables["VEXA_CONTROL_PORT"];
     if (controlPort != 0) control = std::to_string(controlPort);
-    if (request.ownScenario) {
+    if (request.builtInScenario) {
         program.variables["VEXA_SCENARIO"] = std::nullopt;
     } else if (!request.scenario.empty()) {
         program.variables["VEXA_SCENARIO"] = fs::absolute(request.scenario).string();
