@@ -6,6 +6,7 @@
 
 #include "simulation/Actions.h"
 #include "simulation/AdapterSetup.h"
+#include "simulation/Reach.h"
 
 namespace vexa::simulation {
 
@@ -199,6 +200,7 @@ const Action& checkAction(const JsonPlace& place, std::size_t adapterCount) {
     const Action& action = actionNamed(name);
     if (!action.anyMembers) checkMembers(place, action, adapterCount);
     if (action.checkWhole) action.checkWhole(place);
+    checkReach(place.value());
     return action;
 }
 

@@ -66,8 +66,9 @@ DWORD queryInterfaceValue(Machine& machine, std::size_t adapter, WLAN_INTF_OPCOD
             return ERROR_SUCCESS;
         case wlan_intf_opcode_current_connection:
             return currentConnection(machine, adapter, answer);
+        default:
+            return ERROR_INVALID_PARAMETER;
     }
-    return ERROR_INVALID_PARAMETER;
 }
 
 }  // namespace vexa::simulation

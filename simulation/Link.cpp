@@ -10,14 +10,20 @@ namespace {
 
 constexpr ULONG kSignalQuality = 80;  // percent
 constexpr ULONG kRate = 150000;       // kbit/s
-constexpr DWORD kPhyHt = 7;
-constexpr DWORD kAuthenticationRsna = 6;
-constexpr DWORD kCipherCcmp = 4;
+constexpr int kPhyHt = 7;
+constexpr int kAuthenticationRsna = 6;
+constexpr int kCipherCcmp = 4;
 
 // A longer name is cut; its block ends with a NUL all the same.
 void storeName(WCHAR (&field)[WLAN_MAX_NAME_LENGTH], const std::u16string& name) {
     std::copy_n(name.begin(), std::min<std::size_t>(name.size(), WLAN_MAX_NAME_LENGTH - 1),
                 static_cast<WCHAR*>(field));
+}
+
+// An enumeration of the SDK, or a number where its names aren't used.
+template <class Field>
+void assign(Field& field, int value) {
+    field = static_cast<Field>(value);
 }
 
 DOT11_SSID ssidField(const Bytes& ssid) {
@@ -60,11 +66,15 @@ Bytes connectionAttributes(const Link& link) {
     association.dot11Ssid = ssidField(link.ssid);
     association.dot11BssType = dot11_BSS_type_infrastructure;
     std::copy(link.bssid.begin(), link.bssid.end(), static_cast<UCHAR*>(association.dot11Bssid));
-    association.dot11PhyType = kPhyHt;
+    assign(association.dot11PhyType, kPhyHt);
     association.wlanSignalQuality = kSignalQuality;
     association.ulRxRate = kRate;
     association.ulTxRate = kRate;
-    block.wlanSecurityAttributes = {TRUE, TRUE, kAuthenticationRsna, kCipherCcmp};
+    WLAN_SECURITY_ATTRIBUTES& security = block.wlanSecurityAttributes;
+    security.bSecurityEnabled = TRUE;
+    security.bOneXEnabled = TRUE;
+    assign(security.dot11AuthAlgorithm, kAuthenticationRsna);
+    assign(security.dot11CipherAlgorithm, kCipherCcmp);
     return bytesOf(block);
 }
 

@@ -24,11 +24,15 @@ Bytes ssidOf(const WLAN_CONNECTION_PARAMETERS& parameters) {
     return {bytes.begin(), bytes.end()};
 }
 
+std::string profileText(LPCWSTR profile) {
+    return vexa::utf8FromUtf16(reinterpret_cast<const char16_t*>(profile));
+}
+
 // A profile that is wrong, or none; the network that is wanted otherwise.
 DWORD readWish(const WLAN_CONNECTION_PARAMETERS& parameters, ConnectionWish& wish) {
     const WLAN_CONNECTION_MODE mode = parameters.wlanConnectionMode;
     if (mode == wlan_connection_mode_temporary_profile && parameters.strProfile) {
-        auto profile = vexa::simulation::readProfile(vexa::utf8FromUtf16(parameters.strProfile));
+        auto profile = vexa::simulation::readProfile(profileText(parameters.strProfile));
         if (!profile) return ERROR_BAD_PROFILE;
         wish = wishFor(*std::move(profile));
         return ERROR_SUCCESS;
@@ -66,11 +70,10 @@ DWORD disconnect(Machine& machine, HANDLE client, const GUID* guid) {
 Json::Value detailsOf(const WLAN_CONNECTION_PARAMETERS* parameters) {
     Json::Value details;
     details["mode"] = parameters ? static_cast<int>(parameters->wlanConnectionMode) : 0;
-    details["flags"] = parameters ? parameters->dwFlags : 0;
+    details["flags"] = parameters ? Json::Value::UInt{parameters->dwFlags} : 0;
     details["profile"] = Json::Value();
     details["ssid"] = Json::Value();
-    if (parameters && parameters->strProfile)
-        details["profile"] = vexa::utf8FromUtf16(parameters->strProfile);
+    if (parameters && parameters->strProfile) details["profile"] = profileText(parameters->strProfile);
     if (parameters && parameters->pDot11Ssid)
         details["ssid"] = vexa::simulation::textOfBytes(ssidOf(*parameters));
     return details;

@@ -148,7 +148,7 @@ DWORD WlanIhvControl(HANDLE handle, const GUID* guid, WLAN_IHV_CONTROL_TYPE type
     Json::Value details;
     details["type"] = static_cast<int>(type);
     details["inHex"] = vexa::simulation::hexText(call.request);
-    details["outSize"] = outSize;
+    details["outSize"] = Json::Value::UInt{outSize};
     const DWORD result = ihvControl(*machine, call, bytesReturned);
     machine->calls().add({"WlanIhvControl", machine->elapsed(), result, std::move(details), false});
     return result;

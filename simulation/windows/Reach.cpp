@@ -1,0 +1,36 @@
+// The simulated WLAN service in a process of Windows has the service's threads, clock and files before it,
+// not below it.
+
+#include "simulation/Reach.h"
+
+#include <algorithm>
+#include <string>
+#include <string_view>
+
+#include "simulation/JsonPlace.h"
+
+namespace vexa::simulation {
+
+namespace {
+
+constexpr std::string_view kActionsOnTime[] = {"advance", "shiftTime"};
+constexpr std::string_view kCallsOnFiles[] = {"CreateDirectory", "open", "write", "sync", "rename"};
+
+bool contains(std::span<const std::string_view> names, const Json::Value& name) {
+    return name.isString() && std::find(names.begin(), names.end(), name.asString()) != names.end();
+}
+
+}  // namespace
+
+void checkReach(const Json::Value& action) {
+    if (contains(kActionsOnTime, action["do"]))
+        throw JsonFault("do: the service has the clock of Windows, which stays as it is");
+    if (action["do"] == "fail" && contains(kCallsOnFiles, action["call"]))
+        throw JsonFault("call: the service has the files of Windows, which don't fail on request");
+}
+
+void checkReach(const Scenario& scenario) {
+    if (scenario.speed != 1.0) throw JsonFault("speed: only 1, since the service has the clock of Windows");
+}
+
+}  // namespace vexa::simulation
