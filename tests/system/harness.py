@@ -81,6 +81,16 @@ def clean_environment(**variables):
     return environment
 
 
+def open_connection(port, timeout=PATIENCE, receive_buffer=None):
+    """A socket that is connected to a port of the machine under test."""
+    connection = socket.socket()
+    if receive_buffer:
+        connection.setsockopt(socket.SOL_SOCKET, socket.SO_RCVBUF, receive_buffer)
+    connection.settimeout(timeout)
+    connection.connect(("127.0.0.1", port))
+    return connection
+
+
 class Refused(Exception):
     """The server did not take the client in; `status` is its HTTP status."""
 
@@ -97,11 +107,7 @@ class WebSocket:
         self.close_code = None
         self._arrival = threading.Condition()
         self._sending = threading.Lock()
-        self._socket = socket.socket()
-        if receive_buffer:
-            self._socket.setsockopt(socket.SOL_SOCKET, socket.SO_RCVBUF, receive_buffer)
-        self._socket.settimeout(timeout)
-        self._socket.connect(("127.0.0.1", port))
+        self._socket = open_connection(port, timeout, receive_buffer)
         self._input = self._socket.makefile("rb")
         self._handshake(host or f"127.0.0.1:{port}", headers)
         self._socket.settimeout(None)

@@ -4,6 +4,7 @@ import os
 import socket
 import unittest
 
+import harness
 from harness import PATIENCE, Machine, WebSocket
 
 NOBODY = 65534
@@ -16,9 +17,7 @@ UPGRADE = (
 def exchange(port, request):
     """All that the server answers until it closes the connection."""
     answer = b""
-    with socket.socket() as connection:
-        connection.settimeout(ANSWER_LIMIT)
-        connection.connect(("127.0.0.1", port))
+    with harness.open_connection(port, timeout=ANSWER_LIMIT) as connection:
         try:
             connection.sendall(request)
             while chunk := connection.recv(4096):

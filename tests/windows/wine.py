@@ -1,0 +1,229 @@
+"""The programs for Windows in Wine: what the stories on the native programs find in harness.py, for a prefix.
+
+VEXA_WINDOWS_BUILD names the folder with the programs and what stands in for the system's libraries, WINEPREFIX a
+prefix that prefix.py has made. One machine lives in it at a time. Its clock is that of the host: a scenario's
+`speed` is left out.
+"""
+
+import atexit
+import functools
+import json
+import os
+import pathlib
+import shutil
+import signal
+import socket
+import subprocess
+import sys
+import tempfile
+
+sys.path.insert(0, str(pathlib.Path(__file__).resolve().parent.parent / "system"))
+
+import harness
+from harness import PATIENCE, ControlClient, Program, clean_environment, is_running, wait_until
+
+STAND_INS = ("wlanapi", "iphlpapi", "wtsapi32", "secur32")
+STORE = pathlib.PurePath("Public", "Roaming", "Korvane")
+
+_direct_connection = harness.open_connection
+
+
+def build():
+    return pathlib.Path(os.environ["VEXA_WINDOWS_BUILD"])
+
+
+def prefix():
+    return pathlib.Path(os.environ["WINEPREFIX"])
+
+
+def users():
+    return prefix() / "drive_c" / "users"
+
+
+def store():
+    """The folder of config.xml."""
+    return users() / STORE
+
+
+def windows_path(path):
+    return "Z:" + str(pathlib.Path(path).resolve()).replace("/", "\\")
+
+
+def environment(**variables):
+    """Without a window, a menu or a word of Wine's own; the stand-ins go first where they stand beside a program."""
+    overrides = ";".join([f"{','.join(STAND_INS)}=n,b", "mscoree,mshtml,winemenubuilder.exe="])
+    return clean_environment(WINEPREFIX=str(prefix()), WINEDEBUG="-all", WINEDLLOVERRIDES=overrides, **variables)
+
+
+@functools.cache
+def stage():
+    """A folder with the programs by themselves in `plain`, and the service among the stand-ins in `simulated`."""
+    folder = pathlib.Path(tempfile.mkdtemp(prefix="vexa-wine-"))
+    atexit.register(shutil.rmtree, folder, ignore_errors=True)
+    plain, simulated = folder / "plain", folder / "simulated"
+    plain.mkdir()
+    simulated.mkdir()
+    for name in ("vexa.exe", "vexa-service.exe"):
+        shutil.copy(build() / "bin" / name, plain)
+    shutil.copy(build() / "bin" / "vexa-service.exe", simulated)
+    for name in STAND_INS:
+        shutil.copy(build() / "stand-ins" / f"{name}.dll", simulated)
+    return folder
+
+
+def client():
+    """The client's executable; the libraries beside it are the system's."""
+    return stage() / "plain" / "vexa.exe"
+
+
+def service(simulated=True):
+    return stage() / ("simulated" if simulated else "plain") / "vexa-service.exe"
+
+
+def scenario_file(scenario, folder):
+    path = pathlib.Path(folder) / "scenario-of-test.json"
+    path.write_text(json.dumps({name: value for name, value in scenario.items() if name != "speed"}))
+    return windows_path(path)
+
+
+def run(program, *arguments, timeout=PATIENCE, **variables):
+    """Runs a program to its end."""
+    relay()
+    return subprocess.run(
+        ["wine", str(program), *arguments],
+        env=environment(**variables),
+        stdin=subprocess.DEVNULL,
+        capture_output=True,
+        text=True,
+        errors="replace",
+        timeout=timeout,
+        check=False,
+    )
+
+
+def end_all():
+    """Ends whatever runs in the prefix, also what a story left that was killed."""
+    subprocess.run(["wineserver", "-k", "-w"], env=environment(), stderr=subprocess.DEVNULL, check=False)
+
+
+def forget_machine():
+    """As if no service had ever run here."""
+    run("reg", "delete", "HKCU\\Software\\Korvane", "/f")
+    shutil.rmtree(store().parent, ignore_errors=True)
+    for folder in users().glob("*/AppData/Local/Korvane"):
+        shutil.rmtree(folder, ignore_errors=True)
+
+
+@functools.cache
+def relay():
+    """The port of a program in Wine that connects on behalf of this process, whose account Wine can't tell. Wine's own
+    programs come up with the first one, and would hold its pipe open: so that is this one, and has none."""
+    end_all()
+    output = stage() / "relay"
+    with output.open("w") as file:
+        process = subprocess.Popen(
+            ["wine", str(build() / "stand-ins" / "vexa-test-relay.exe")],
+            env=environment(),
+            stdin=subprocess.PIPE,
+            stdout=file,
+            stderr=subprocess.DEVNULL,
+        )
+    atexit.register(lambda: (process.stdin.close(), process.wait(PATIENCE)))
+    line = wait_until(lambda: output.read_text().endswith("\n") and output.read_text(), "the relay's port")
+    return int(line.split()[1])
+
+
+def open_connection(port, timeout=PATIENCE, receive_buffer=None):
+    connection = _direct_connection(relay(), timeout, receive_buffer)
+    connection.sendall(f"{port}\n".encode())
+    return connection
+
+
+harness.open_connection = open_connection
+
+
+def open_direct(port, timeout=PATIENCE):
+    """A connection of a process that is not Wine's."""
+    return _direct_connection(port, timeout)
+
+
+def free_port():
+    with socket.create_server(("127.0.0.1", 0)) as server:
+        return server.getsockname()[1]
+
+
+def service_pid(port):
+    """The process of the service that was started with this spectral port, or None."""
+    for path in pathlib.Path("/proc").glob("[0-9]*/cmdline"):
+        try:
+            words = path.read_bytes().split(b"\0")
+        except OSError:
+            continue
+        if b"vexa-service.exe" in words[0] and str(port).encode() in words[1:2]:
+            return int(path.parent.name)
+    return None
+
+
+class Parent(Program):
+    """`vexa start` in Wine, which takes no signals from outside: it stops when its standard input ends."""
+
+    def __init__(self, arguments=(), simulated=True, **variables):
+        relay()
+        own = windows_path(service(simulated))
+        command = ["wine", str(client()), "start", "--stop-on-eof", "--service", own, *arguments]
+        super().__init__(command, environment(**variables), subprocess.PIPE)
+
+    def stop(self, number=signal.SIGTERM, timeout=PATIENCE):
+        self.process.stdin.close()
+        return self.wait(timeout)
+
+    def end(self):
+        if self.process.poll() is None:
+            self.process.kill()
+            self.process.wait()
+        super().end()
+
+
+class Machine(harness.Machine):
+    """A prefix with its service. At the end of the block what still runs is killed: only stop() waits for the
+    service's own end."""
+
+    def __init__(self, scenario=None, folder=None, control=True, arguments=(), simulated=True):
+        self._own_folder = folder is None
+        self._clients = []
+        self._port_for_control = free_port() if control and simulated else 0
+        self.folder = pathlib.Path(folder or tempfile.mkdtemp(prefix="vexa-test-"))
+        if self._own_folder:
+            forget_machine()
+            (self.folder / "Public").symlink_to(users() / "Public")
+        self.sa_port = self.hs20_port = self.control_port = 0
+        self.parent = Parent(
+            arguments,
+            simulated,
+            VEXA_SCENARIO=scenario_file(scenario or {}, self.folder),
+            VEXA_CONTROL_PORT=str(self._port_for_control) if self._port_for_control else None,
+        )
+
+    def __enter__(self):
+        super().__enter__()
+        if self._port_for_control:
+            self.control_port = self._port_for_control
+            self.control = self._kept(ControlClient(self.control_port))
+        return self
+
+    def __exit__(self, kind, *rest):
+        pid = self.service_pid()
+        if pid:
+            os.kill(pid, signal.SIGKILL)
+            wait_until(lambda: not is_running(pid), "the end of a killed service")
+        super().__exit__(kind, *rest)
+
+    def service_pid(self):
+        return service_pid(self.sa_port) if self.sa_port else None
+
+    def store(self):
+        return self.folder / STORE
+
+    def _content(self, name):
+        (path,) = list(users().glob(f"*/AppData/Local/Korvane/Vexa/{name}")) or (self.folder / name,)
+        return path.read_text(encoding="latin-1") if path.exists() else ""
