@@ -200,7 +200,7 @@ const Action& checkAction(const JsonPlace& place, std::size_t adapterCount) {
     const Action& action = actionNamed(name);
     if (!action.anyMembers) checkMembers(place, action, adapterCount);
     if (action.checkWhole) action.checkWhole(place);
-    checkReach(place.value());
+    checkReach(place);
     return action;
 }
 

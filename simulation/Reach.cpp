@@ -4,7 +4,7 @@ namespace vexa::simulation {
 
 // All of the machine is simulated.
 
-void checkReach(const Json::Value& /*action*/) {}
+void checkReach(const JsonPlace& /*action*/) {}
 
 void checkReach(const Scenario& /*scenario*/) {}
 

@@ -1,7 +1,6 @@
 #pragma once
 
-#include <json/value.h>
-
+#include "simulation/JsonPlace.h"
 #include "simulation/Scenario.h"
 
 namespace vexa::simulation {
@@ -10,7 +9,7 @@ namespace vexa::simulation {
 // believes in something that didn't happen.
 
 /// Throws JsonFault if the action, whose members have been checked, would change something out of reach.
-void checkReach(const Json::Value& action);
+void checkReach(const JsonPlace& action);
 
 /// The same for what a scenario begins with.
 void checkReach(const Scenario& scenario);

@@ -4,10 +4,8 @@
 #include "simulation/Reach.h"
 
 #include <algorithm>
-#include <string>
+#include <span>
 #include <string_view>
-
-#include "simulation/JsonPlace.h"
 
 namespace vexa::simulation {
 
@@ -22,11 +20,12 @@ bool contains(std::span<const std::string_view> names, const Json::Value& name) 
 
 }  // namespace
 
-void checkReach(const Json::Value& action) {
-    if (contains(kActionsOnTime, action["do"]))
-        throw JsonFault("do: the service has the clock of Windows, which stays as it is");
-    if (action["do"] == "fail" && contains(kCallsOnFiles, action["call"]))
-        throw JsonFault("call: the service has the files of Windows, which don't fail on request");
+void checkReach(const JsonPlace& action) {
+    const JsonPlace name = action.member("do");
+    if (contains(kActionsOnTime, name.value()))
+        name.fail("the service has the clock of Windows, which stays as it is");
+    if (name.value() == "fail" && contains(kCallsOnFiles, action.value()["call"]))
+        action.member("call").fail("the service has the files of Windows, which don't fail on request");
 }
 
 void checkReach(const Scenario& scenario) {
