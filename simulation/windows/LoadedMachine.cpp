@@ -46,17 +46,23 @@ std::wstring environment(const wchar_t* name) {
     return value;
 }
 
-std::string scenarioText() {
-    const fs::path path = environment(L"VEXA_SCENARIO");
-    if (path.empty()) return std::string(demoScenario());
+// The built-in scenario lives as fast as the clock lets it.
+Scenario builtInScenario() {
+    Scenario result = parseScenario(demoScenario());
+    result.speed = 1.0;
+    return result;
+}
+
+Scenario scenarioIn(const fs::path& path) {
     std::ifstream file(path, std::ios::binary);
     if (!file) throw JsonFault(utf8FromWide(path.wstring()) + ": can't be read");
-    return {std::istreambuf_iterator<char>(file), std::istreambuf_iterator<char>()};
+    return parseScenario(std::string(std::istreambuf_iterator<char>(file), std::istreambuf_iterator<char>()));
 }
 
 const Scenario& scenario() {
     static const Scenario read = [] {
-        Scenario result = parseScenario(scenarioText());
+        const fs::path path = environment(L"VEXA_SCENARIO");
+        Scenario result = path.empty() ? builtInScenario() : scenarioIn(path);
         checkReach(result);
         return result;
     }();
