@@ -41,7 +41,7 @@ int ConnectionHistory::addConnection(const DOT11_SSID& ssid, const MacAddress& m
     record.m_connectedTime = getTimeValue();
     record.m_macAddress = mac;
     record.m_ssid = ssid;
-    m_records.push_back(std::move(record));
+    m_records.push_back(record);
     dump();
     return kSuccess;
 }

@@ -51,6 +51,11 @@ Descriptor openFile(const fs::path& path, int flags) {
     return Descriptor(::open(path.c_str(), flags | O_CLOEXEC, kOwnerOnlyFile));
 }
 
+bool isRemoved(const Descriptor& file) {
+    struct stat status {};
+    return ::fstat(file.get(), &status) != 0 || status.st_nlink == 0;
+}
+
 // The process that has the file open is one of the scenario's faults; the next try meets the next of them.
 bool isRenameRefused(const fs::path& target) {
     for (int tries = 0; tries < kRenameTries; ++tries) {
@@ -112,10 +117,11 @@ struct NewFile::State {
     Descriptor file;
 };
 
+// Before the lock is taken another process can hold the file for a leftover, and remove it.
 std::optional<NewFile> NewFile::create(const std::wstring& path) {
     fs::path host = hostPath(path);
     Descriptor file = openFile(host, O_WRONLY | O_CREAT | O_EXCL);
-    if (!file.isOpen() || ::flock(file.get(), LOCK_EX) != 0) return std::nullopt;
+    if (!file.isOpen() || ::flock(file.get(), LOCK_EX) != 0 || isRemoved(file)) return std::nullopt;
     return NewFile(std::make_unique<State>(State{std::move(host), std::move(file)}));
 }
 
