@@ -82,7 +82,7 @@ HotspotPort::Answer HotspotPort::ask(const std::string& command, const std::opti
 HotspotPort::Answer HotspotPort::question(const std::string& command, const Accepts& accepts) {
     const auto end = steady_clock::now() + std::min(m_limit, kStartLimit);
     while (true) {
-        const Answer answer = ask(command, std::nullopt, command, accepts);
+        Answer answer = ask(command, std::nullopt, command, accepts);
         if (answer.payload || !answer.cardIn || steady_clock::now() >= end) return answer;
     }
 }
