@@ -119,6 +119,7 @@ class WithParent(unittest.TestCase):
             machine.parent.process.kill()
             machine.parent.process.wait()
             wait_until(lambda: not is_running(pid), "the end of the service", STOP_LIMIT)
+            self.assertEqual(os.waitstatus_to_exitcode(os.waitpid(pid, 0)[1]), 0)
             self.assertIn(f"port={machine.sa_port}\n", machine.output())
 
 

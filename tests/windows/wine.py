@@ -127,6 +127,20 @@ def run(program, *arguments, timeout=PATIENCE, **variables):
     )
 
 
+def run_client(*arguments, stdin=None, **_):
+    """Runs a command of the client on the service that runs here."""
+    relay()
+    return subprocess.run(
+        ["wine", str(client()), *map(str, arguments)],
+        env=environment(),
+        input=stdin or "",
+        capture_output=True,
+        timeout=60,
+        encoding="utf-8",
+        check=False,
+    )
+
+
 def end_all():
     """Ends whatever runs in the prefix, also what a story left that was killed."""
     subprocess.run(["wineserver", "-k", "-w"], env=environment(), stderr=subprocess.DEVNULL, check=False)
