@@ -4,8 +4,10 @@
 // After <winsock2.h>.
 #include <iphlpapi.h>
 
+#include <algorithm>
 #include <array>
-#include <cstring>
+#include <optional>
+#include <string>
 #include <vector>
 
 #include "simulation/windows/LoadedMachine.h"
