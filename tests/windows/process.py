@@ -73,7 +73,23 @@ class Alone(unittest.TestCase):
                 self.assertEqual((errors.count("\n"), errors[: len(member)]), (1, member))
 
 
+    def test_the_built_in_scenario_is_within_reach(self):
+        done = run(service(), timeout=STOP_LIMIT)
+        self.assertEqual((done.returncode, done.stdout, done.stderr), (1, "", ""))
+
+
 class WithParent(unittest.TestCase):
+    def test_an_action_that_is_out_of_reach_is_refused(self):
+        with Machine({"adapters": []}) as machine:
+            for action, member in (
+                ({"do": "advance", "ms": 1}, "do"),
+                ({"do": "shiftTime", "ms": 1}, "do"),
+                ({"do": "fail", "call": "rename", "error": 32}, "call"),
+            ):
+                answer = machine.control.ask(**action)
+                self.assertEqual((answer["ok"], answer["error"].partition(":")[0]), (False, member))
+            self.assertTrue(machine.control.ask(do="fail", call="GetPerAdapterInfo", error=111)["ok"])
+
     def test_stop_and_what_it_prints(self):
         with Machine({"adapters": []}) as machine:
             sa, hs20 = machine.sa_port, machine.hs20_port
