@@ -46,6 +46,7 @@ int main(int count, char** arguments) {
     const Options options = readOptions(count, arguments);
     std::string pattern = (std::filesystem::temp_directory_path() / "vexa-storm-XXXXXX").string();
     const std::filesystem::path folder = mkdtemp(pattern.data());
+    ::setenv("VEXA_MACHINE", folder.c_str(), 1);  // named mutexes live in it, and another storm has its own
     std::string wrong;
     int exitCode = 0;
     {

@@ -1,7 +1,10 @@
 #include "platform/simulated/ProcNetTcp.h"
 
 #include <fstream>
+#include <set>
 #include <sstream>
+#include <tuple>
+#include <utility>
 
 namespace vexa::platform {
 
@@ -29,16 +32,27 @@ bool readRow(const std::string& text, ProcNetTcpRow& row) {
     return static_cast<bool>(line);
 }
 
+using Connection = std::tuple<std::string, std::uint16_t, std::string, std::uint16_t>;
+
+Connection connectionOf(const ProcNetTcpRow& row) {
+    return {row.localAddress, row.localPort, row.remoteAddress, row.remotePort};
+}
+
 }  // namespace
 
+// The kernel gives the table piece by piece: while sockets come and go, one can stand in two of them.
 bool readProcNetTcp(const char* path, std::vector<ProcNetTcpRow>& rows) {
     std::ifstream table(path);
     std::string line;
     if (!std::getline(table, line)) return false;  // the headings
     rows.clear();
+    std::set<Connection> seen;
     while (std::getline(table, line)) {
         ProcNetTcpRow row;
-        if (readRow(line, row)) rows.push_back(std::move(row));
+        if (!readRow(line, row)) continue;
+        const bool isConnection = row.remotePort != 0;
+        if (isConnection && !seen.insert(connectionOf(row)).second) continue;
+        rows.push_back(std::move(row));
     }
     return !table.bad();
 }

@@ -16,7 +16,7 @@ struct ProcNetTcpRow {
     std::uint32_t uid = 0;
 };
 
-/// The rows of such a table. False if it can't be read.
+/// The rows of such a table, each connection once. False if it can't be read.
 bool readProcNetTcp(const char* path, std::vector<ProcNetTcpRow>& rows);
 
 }  // namespace vexa::platform

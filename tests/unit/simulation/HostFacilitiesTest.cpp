@@ -5,6 +5,7 @@
 #include "platform/DebugOutput.h"
 #include "platform/Session.h"
 #include "platform/simulated/MachineFolder.h"
+#include "platform/simulated/ProcNetTcp.h"
 #include "simulation/OwnerFiles.h"
 
 namespace vexa::simulation {
@@ -35,6 +36,22 @@ TEST(OwnerFiles, ReplacingLeavesNothingElseBehind) {
     EXPECT_EQ(std::distance(std::filesystem::directory_iterator(path.parent_path()), {}), 1);
     EXPECT_EQ(std::filesystem::status(path.parent_path()).permissions(), std::filesystem::perms::owner_all);
     EXPECT_FALSE(replaceFile(path / "below a file", "x"));
+}
+
+// The kernel gives the table in pieces, and a connection that moves meanwhile in two of them.
+TEST(ProcNetTcp, HoldsEachConnectionOnceAndEveryoneWhoListens) {
+    const TemporaryFolder folder;
+    const auto path = folder.path() / "tcp";
+    const std::string rest = " 00000000:00000000 00:00000000 00000000  1000        0 4711 1\n";
+    const std::string connection = "  1: 0100007F:1F90 0100007F:D431 01" + rest;
+    const std::string listener = "  0: 0100007F:1F90 00000000:0000 0A" + rest;
+    ASSERT_TRUE(replaceFile(path, "  sl  local_address\n" + listener + listener + connection + connection));
+    std::vector<platform::ProcNetTcpRow> rows;
+    ASSERT_TRUE(platform::readProcNetTcp(path.c_str(), rows));
+    ASSERT_EQ(rows.size(), 3U);
+    EXPECT_EQ(rows[2].localPort, 8080);
+    EXPECT_EQ(rows[2].remotePort, 54321);
+    EXPECT_EQ(rows[2].uid, 1000U);
 }
 
 TEST(MachineFolder, IsWhatTheEnvironmentSays) {
