@@ -37,7 +37,7 @@ std::string inCodePage(std::wstring text) {
 std::wstring logReason(const WLAN_CONNECTION_NOTIFICATION_DATA& data) {
     WCHAR text[kReasonCapacity] = {};
     WlanReasonCodeToString(data.wlanReasonCode, kReasonCapacity, text, nullptr);
-    const std::wstring reason = fromWlanText({text, kReasonCapacity});
+    std::wstring reason = fromWlanText({text, kReasonCapacity});
     Log(3, "Reason code desc=%s", inCodePage(reason).c_str());
     return reason;
 }

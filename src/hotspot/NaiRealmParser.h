@@ -31,7 +31,8 @@ struct RealmInfo {
     std::string m_realm;
 
     friend bool operator==(const RealmInfo&, const RealmInfo&) = default;
-    friend auto operator<=>(const RealmInfo&, const RealmInfo&) = default;
+    friend auto operator<=>(const RealmInfo&, const RealmInfo&) =
+        default;  // NOLINT(modernize-use-nullptr): it takes this for a 0
 };
 
 /// Takes an ANQP NAI Realm list apart (IEEE 802.11u). Nothing if it is empty, or bad at any place: one bad
