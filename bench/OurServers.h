@@ -3,15 +3,15 @@
 #include <cstdint>
 #include <string>
 
-#include "protocol/Ipc.h"
-#include "protocol/SAHotSpotPortlink.h"
+#include "channel/Ipc.h"
+#include "hotspotport/SAHotSpotPortlink.h"
 
 namespace vexa::bench {
 
 /// A port on which nothing listens.
 std::uint16_t freePort();
 
-/// A server of protocol/Ipc.h that answers each message with its own text.
+/// A server of channel/Ipc.h that answers each message with its own text.
 class EchoServer {
 public:
     EchoServer();

@@ -9,13 +9,13 @@
 #include <unordered_map>
 #include <vector>
 
+#include "channel/IpcInProcess.h"
+#include "channel/JsonText.h"
 #include "connection/Supplicant.h"
 #include "connection/SupplicantMgr.h"
-#include "protocol/IpcInProcess.h"
-#include "protocol/JsonText.h"
-#include "protocol/SAHotSpotPortlink.h"
+#include "hotspotport/SAHotSpotPortlink.h"
 #include "simulation/Machine.h"
-#include "simulation/Scenario.h"
+#include "simulation/scenario/Scenario.h"
 
 namespace {
 

@@ -9,8 +9,8 @@
 #include "bench/BareServer.h"
 #include "bench/BenchClient.h"
 #include "bench/OurServers.h"
-#include "protocol/Envelope.h"
-#include "protocol/JsonText.h"
+#include "channel/Envelope.h"
+#include "channel/JsonText.h"
 
 namespace {
 

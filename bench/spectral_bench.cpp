@@ -5,9 +5,9 @@
 #include <random>
 #include <vector>
 
-#include "base/LittleEndian.h"
 #include "bench/BareStatistics.h"
 #include "spectral/ChannelStatistics.h"
+#include "text/LittleEndian.h"
 
 namespace {
 

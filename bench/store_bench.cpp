@@ -13,9 +13,9 @@
 
 #include "config/Config.h"
 #include "connection/SupplicantMgr.h"
-#include "protocol/SAHotSpotPortlink.h"
+#include "hotspotport/SAHotSpotPortlink.h"
 #include "simulation/Machine.h"
-#include "simulation/Scenario.h"
+#include "simulation/scenario/Scenario.h"
 
 namespace {
 

@@ -1,9 +1,6 @@
 #include "simulation/Machine.h"
 
 #include <cassert>
-#include <iostream>
-
-#include "simulation/Queries.h"
 
 namespace vexa::simulation {
 
@@ -12,19 +9,6 @@ namespace {
 constexpr int kNoOverride = -1;
 
 std::atomic<Machine*> currentMachine{nullptr};
-
-Json::Value refusal(const std::string& error) {
-    Json::Value answer;
-    answer["ok"] = false;
-    answer["error"] = error;
-    return answer;
-}
-
-Ticket runAction(Machine& machine, const Json::Value& message, Asker asker) {
-    const JsonPlace place(message, "");
-    const Action& action = checkAction(place, machine.adapters().count());
-    return action.run(machine, message, asker);
-}
 
 }  // namespace
 
@@ -43,7 +27,6 @@ Machine::Machine(Scenario scenario, std::filesystem::path folder)
     [[maybe_unused]] Machine* const other = currentMachine.exchange(this);
     assert(!other);
     if (m_scenario.hotspotAutoConnect) m_registry.setAutoConnect(m_scenario.hotspotAutoConnect);
-    beginTimeline();
 }
 
 Machine::~Machine() {
@@ -53,22 +36,6 @@ Machine::~Machine() {
 
 Machine* Machine::current() {
     return currentMachine;
-}
-
-Json::Value Machine::perform(const Json::Value& message) {
-    if (!message.isObject()) return refusal("not an object");
-    try {
-        Json::Value answer;
-        answer["ok"] = true;
-        if (message.isMember("query") && !message.isMember("do")) {
-            answer["result"] = runQuery(*this, message);
-        } else {
-            m_notifications.waitDelivered(runAction(*this, message, Asker::Client));
-        }
-        return answer;
-    } catch (const JsonFault& fault) {
-        return refusal(fault.what());
-    }
 }
 
 void Machine::stop() {
@@ -91,26 +58,6 @@ std::size_t Machine::usualAdapter() const {
     const auto index = m_adapters.usual();
     if (!index) throw JsonFault("adapter: the machine has none");
     return *index;
-}
-
-void Machine::beginTimeline() {
-    for (const TimelineEntry& entry : m_scenario.timeline) {
-        if (entry.at > platform::Duration::zero()) {
-            m_agenda.add(m_start + entry.at, [this, &entry] { performEntry(entry.action); });
-        } else {
-            performEntry(entry.action);
-        }
-    }
-    m_notifications.waitDelivered(m_notifications.post({}));
-}
-
-// Nobody waits for the answer; a line on standard error is all there is to tell.
-void Machine::performEntry(const Json::Value& action) {
-    try {
-        runAction(*this, action, Asker::Timeline);
-    } catch (const JsonFault& fault) {
-        std::cerr << "timeline: " + std::string(fault.what()) + "\n";
-    }
 }
 
 }  // namespace vexa::simulation

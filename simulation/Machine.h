@@ -1,25 +1,22 @@
 #pragma once
 
-#include <json/value.h>
-
 #include <atomic>
 #include <filesystem>
 #include <optional>
 
 #include "platform/Clock.h"
-#include "simulation/ActionTable.h"
-#include "simulation/Adapters.h"
-#include "simulation/Agenda.h"
-#include "simulation/Airspace.h"
-#include "simulation/CallLog.h"
-#include "simulation/Connections.h"
-#include "simulation/Faults.h"
-#include "simulation/Handles.h"
-#include "simulation/HotspotModule.h"
-#include "simulation/MachineRegistry.h"
-#include "simulation/NotificationQueue.h"
-#include "simulation/Scenario.h"
-#include "simulation/SpectralModule.h"
+#include "simulation/modules/HotspotModule.h"
+#include "simulation/modules/SpectralModule.h"
+#include "simulation/parts/Adapters.h"
+#include "simulation/parts/Agenda.h"
+#include "simulation/parts/Airspace.h"
+#include "simulation/parts/CallLog.h"
+#include "simulation/parts/Connections.h"
+#include "simulation/parts/Faults.h"
+#include "simulation/parts/Handles.h"
+#include "simulation/parts/MachineRegistry.h"
+#include "simulation/parts/NotificationQueue.h"
+#include "simulation/scenario/Scenario.h"
 
 namespace vexa::simulation {
 
@@ -27,8 +24,7 @@ namespace vexa::simulation {
 /// used from any thread, and no lock of theirs is held while a callback runs.
 class Machine {
 public:
-    /// Begins the scenario's timeline: what is due at 0 has been done when this returns. REQUIRES: no other
-    /// machine lives.
+    /// REQUIRES: no other machine lives.
     Machine(Scenario scenario, std::filesystem::path folder);
     ~Machine();
     Machine(const Machine&) = delete;
@@ -37,14 +33,11 @@ public:
     /// The machine that lives, or null.
     static Machine* current();
 
-    /// Carries out an action or a query of the control channel and gives its answer. Returns when the
-    /// action's own notifications have been delivered. Not to be called by a callback of this machine.
-    Json::Value perform(const Json::Value& message);
-
     /// Ends timeline, scans, queries, connection attempts and notifications. Requests are still answered
     /// afterwards.
     void stop();
 
+    platform::Duration start() const { return m_start; }
     platform::Duration elapsed() const { return platform::now() - m_start; }
     const std::filesystem::path& folder() const { return m_folder; }
     const Scenario& scenario() const { return m_scenario; }
@@ -55,6 +48,7 @@ public:
     Faults& faults() { return m_faults; }
     CallLog& calls() { return m_calls; }
     NotificationQueue& notifications() { return m_notifications; }
+    Agenda& agenda() { return m_agenda; }
     SpectralModule& spectral() { return m_spectral; }
     HotspotModule& hotspot() { return m_hotspot; }
     Airspace& airspace() { return m_airspace; }
@@ -71,9 +65,6 @@ public:
     std::size_t usualAdapter() const;
 
 private:
-    void beginTimeline();
-    void performEntry(const Json::Value& action);
-
     const Scenario m_scenario;
     const std::filesystem::path m_folder;
     const platform::Duration m_start;

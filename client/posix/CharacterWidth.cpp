@@ -1,4 +1,4 @@
-#include "client/CharacterWidth.h"
+#include "client/terminal/CharacterWidth.h"
 
 #include <locale.h>
 #include <cwchar>

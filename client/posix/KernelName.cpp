@@ -1,4 +1,4 @@
-#include "client/KernelName.h"
+#include "client/machine/KernelName.h"
 
 #include <sys/socket.h>
 #include <sys/un.h>

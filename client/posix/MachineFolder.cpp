@@ -1,4 +1,4 @@
-#include "client/MachineFolder.h"
+#include "client/machine/MachineFolder.h"
 
 #include <sys/stat.h>
 
@@ -7,7 +7,7 @@
 #include <cstring>
 #include <vector>
 
-#include "client/ClientError.h"
+#include "client/terminal/ClientError.h"
 
 namespace vexa::client {
 

@@ -1,28 +1,50 @@
-#include "client/MachineRegistry.h"
+#include "client/machine/MachineRegistry.h"
+
+#include <json/value.h>
+#include <strings.h>
 
 #include <fstream>
 #include <iterator>
 
-#include "client/JsonLine.h"
-#include "client/posix/RegistryFile.h"
+#include "client/machine/OwnerFile.h"
+#include "client/port/JsonLine.h"
 
 namespace vexa::client {
 
 namespace {
 
+constexpr const char* kKey = "HKEY_CURRENT_USER\\Software\\Korvane\\Vexa";
+constexpr const char* kSwitchValue = "IsHotSpotAutoConnect";
 constexpr const char* kMethodValue = "EapMethod";
 
-}  // namespace
-
+// The whole registry of a simulated machine: key paths to values.
 Json::Value readRegistry(const MachineFolder& machine) {
     std::ifstream input(machine.registryFile());
     const std::string text{std::istreambuf_iterator<char>(input), std::istreambuf_iterator<char>()};
     return parseJsonObject(text).value_or(Json::Value(Json::objectValue));
 }
 
+}  // namespace
+
+bool readHotspotSwitch(const MachineFolder& machine) {
+    const Json::Value registry = readRegistry(machine);
+    const Json::Value& values = registry[kKey];
+    if (!values.isObject() || !values[kSwitchValue].isString()) return true;
+    return ::strcasecmp(values[kSwitchValue].asCString(), "false") != 0;
+}
+
+bool writeHotspotSwitch(const MachineFolder& machine, bool isOn) {
+    if (readHotspotSwitch(machine) == isOn) return true;
+    Json::Value registry = readRegistry(machine);
+    Json::Value& values = registry[kKey];
+    if (!values.isObject()) values = Json::Value(Json::objectValue);
+    values[kSwitchValue] = isOn ? "true" : "false";
+    return replaceOwnerFile(machine.registryFile(), jsonLine(registry) + "\n");
+}
+
 std::optional<int> readConnectionMethod(const MachineFolder& machine) {
     const Json::Value registry = readRegistry(machine);
-    const Json::Value& values = registry[kVexaKey];
+    const Json::Value& values = registry[kKey];
     if (!values.isObject() || !values[kMethodValue].isInt()) return std::nullopt;
     return values[kMethodValue].asInt();
 }

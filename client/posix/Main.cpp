@@ -1,5 +1,5 @@
-#include "client/Commands.h"
-#include "client/Program.h"
+#include "client/command/Commands.h"
+#include "client/command/Program.h"
 
 // The demo shows a machine that was made for it.
 void vexa::client::addHostCommands(CLI::App& app, int& exitCode) {

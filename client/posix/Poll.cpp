@@ -1,4 +1,4 @@
-#include "client/Poll.h"
+#include "client/terminal/Poll.h"
 
 #include <poll.h>
 

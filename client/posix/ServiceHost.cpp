@@ -1,11 +1,11 @@
-#include "client/ServiceHost.h"
+#include "client/machine/ServiceHost.h"
 
 #include <cstdlib>
 #include <string>
 
-#include "client/MachineFolder.h"
-#include "client/ServiceParent.h"
-#include "client/ServiceProcess.h"
+#include "client/machine/MachineFolder.h"
+#include "client/machine/ServiceParent.h"
+#include "client/machine/ServiceProcess.h"
 
 namespace vexa::client {
 

@@ -1,4 +1,4 @@
-#include "client/ServiceProcess.h"
+#include "client/machine/ServiceProcess.h"
 
 #include <fcntl.h>
 #include <spawn.h>
@@ -9,7 +9,7 @@
 #include <csignal>
 #include <cstring>
 
-#include "client/ClientError.h"
+#include "client/terminal/ClientError.h"
 
 namespace vexa::client {
 

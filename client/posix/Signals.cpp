@@ -1,4 +1,4 @@
-#include "client/Signals.h"
+#include "client/terminal/Signals.h"
 
 #include <sys/signalfd.h>
 #include <unistd.h>
@@ -6,8 +6,8 @@
 #include <array>
 #include <csignal>
 
-#include "client/ClientError.h"
 #include "client/posix/Descriptor.h"
+#include "client/terminal/ClientError.h"
 
 namespace vexa::client {
 

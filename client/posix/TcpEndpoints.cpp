@@ -1,4 +1,4 @@
-#include "client/TcpEndpoints.h"
+#include "client/machine/TcpEndpoints.h"
 
 #include <arpa/inet.h>
 #include <sys/socket.h>
@@ -7,9 +7,8 @@
 #include <sstream>
 #include <string_view>
 
-#include "client/ClientError.h"
 #include "client/posix/Descriptor.h"
-#include "client/posix/TcpTable.h"
+#include "client/terminal/ClientError.h"
 
 namespace vexa::client {
 

@@ -1,4 +1,4 @@
-#include "client/Terminal.h"
+#include "client/terminal/Terminal.h"
 
 #include <sys/ioctl.h>
 #include <unistd.h>

@@ -1,11 +1,11 @@
-#include "client/TerminalKeys.h"
+#include "client/terminal/TerminalKeys.h"
 
 #include <termios.h>
 #include <unistd.h>
 
-#include "client/Poll.h"
-#include "client/StandardInput.h"
-#include "client/Terminal.h"
+#include "client/terminal/Poll.h"
+#include "client/terminal/StandardInput.h"
+#include "client/terminal/Terminal.h"
 
 namespace vexa::client {
 

@@ -1,4 +1,4 @@
-#include "client/CharacterWidth.h"
+#include "client/terminal/CharacterWidth.h"
 
 #include <algorithm>
 #include <iterator>

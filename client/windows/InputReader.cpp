@@ -6,8 +6,8 @@
 #include <string>
 #include <thread>
 
-#include "base/NeverDestroyed.h"
 #include "platform/windows/Handle.h"
+#include "text/NeverDestroyed.h"
 
 namespace vexa::client {
 

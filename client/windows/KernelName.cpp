@@ -1,9 +1,9 @@
-#include "client/KernelName.h"
+#include "client/machine/KernelName.h"
 
 #include <windows.h>
 
-#include "base/TextConversion.h"
 #include "platform/windows/Handle.h"
+#include "text/TextConversion.h"
 
 namespace vexa::client {
 

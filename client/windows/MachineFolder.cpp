@@ -1,8 +1,8 @@
-#include "client/MachineFolder.h"
+#include "client/machine/MachineFolder.h"
 
 #include <shlobj.h>
 
-#include "client/ClientError.h"
+#include "client/terminal/ClientError.h"
 #include "platform/KnownFolders.h"
 #include "platform/windows/Handle.h"
 

@@ -1,14 +1,47 @@
-#include "client/MachineRegistry.h"
+#include "client/machine/MachineRegistry.h"
 
-#include <windows.h>
+#include <string>
+
+#include "platform/Registry.h"
+#include "platform/windows/Handle.h"
+#include "text/TextConversion.h"
 
 namespace vexa::client {
+
+namespace {
+
+constexpr const char* kKey = "Software\\Korvane\\Vexa";
+constexpr const char* kSwitchValue = "IsHotSpotAutoConnect";
+constexpr const char* kMethodValue = "EapMethod";
+constexpr std::size_t kMaxBytes = 260;
+
+using Key = platform::Owned<HKEY, &::RegCloseKey>;
+
+}  // namespace
+
+bool readHotspotSwitch(const MachineFolder& /*machine*/) {
+    const auto key = platform::RegistryKey::open(platform::RegistryRoot::CurrentUser, kKey);
+    const auto text = key ? key->wideValue(kSwitchValue, kMaxBytes) : std::nullopt;
+    return !text || compareNoCase(*text, L"false") != 0;
+}
+
+bool writeHotspotSwitch(const MachineFolder& machine, bool isOn) {
+    if (readHotspotSwitch(machine) == isOn) return true;
+    Key key;
+    if (RegCreateKeyExW(HKEY_CURRENT_USER, wideFromNarrow(kKey).c_str(), 0, nullptr, 0, KEY_SET_VALUE,
+                        nullptr, key.receive(), nullptr) != ERROR_SUCCESS)
+        return false;
+    const std::wstring text = isOn ? L"true" : L"false";
+    return RegSetValueExW(key.get(), wideFromNarrow(kSwitchValue).c_str(), 0, REG_SZ,
+                          reinterpret_cast<const BYTE*>(text.c_str()),
+                          static_cast<DWORD>((text.size() + 1) * sizeof(wchar_t))) == ERROR_SUCCESS;
+}
 
 std::optional<int> readConnectionMethod(const MachineFolder& /*machine*/) {
     DWORD method = 0;
     DWORD size = sizeof method;
-    if (RegGetValueW(HKEY_CURRENT_USER, L"Software\\Korvane\\Vexa", L"EapMethod", RRF_RT_REG_DWORD, nullptr,
-                     &method, &size) != ERROR_SUCCESS)
+    if (RegGetValueW(HKEY_CURRENT_USER, wideFromNarrow(kKey).c_str(), wideFromNarrow(kMethodValue).c_str(),
+                     RRF_RT_REG_DWORD, nullptr, &method, &size) != ERROR_SUCCESS)
         return std::nullopt;
     return static_cast<int>(method);
 }

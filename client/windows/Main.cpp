@@ -4,10 +4,10 @@
 #include <string>
 #include <vector>
 
-#include "base/TextConversion.h"
-#include "client/Commands.h"
-#include "client/Program.h"
+#include "client/command/Commands.h"
+#include "client/command/Program.h"
 #include "client/windows/ConsoleStream.h"
+#include "text/TextConversion.h"
 
 namespace {
 

@@ -1,4 +1,4 @@
-#include "client/OwnerFile.h"
+#include "client/machine/OwnerFile.h"
 
 #include <fstream>
 

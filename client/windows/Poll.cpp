@@ -1,11 +1,11 @@
-#include "client/Poll.h"
+#include "client/terminal/Poll.h"
 
 #include <winsock2.h>
 
 #include <algorithm>
 #include <vector>
 
-#include "client/StandardInput.h"
+#include "client/terminal/StandardInput.h"
 #include "client/windows/ConsoleKeys.h"
 #include "client/windows/InputReader.h"
 #include "client/windows/SignalQueue.h"

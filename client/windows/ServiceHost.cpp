@@ -1,4 +1,4 @@
-#include "client/ServiceHost.h"
+#include "client/machine/ServiceHost.h"
 
 #include <windows.h>
 

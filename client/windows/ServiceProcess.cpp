@@ -1,4 +1,4 @@
-#include "client/ServiceProcess.h"
+#include "client/machine/ServiceProcess.h"
 
 #include <windows.h>
 
@@ -6,10 +6,10 @@
 #include <span>
 #include <system_error>
 
-#include "base/TextConversion.h"
-#include "client/ClientError.h"
+#include "client/terminal/ClientError.h"
 #include "client/windows/SignalQueue.h"
 #include "platform/windows/Handle.h"
+#include "text/TextConversion.h"
 
 namespace vexa::client {
 

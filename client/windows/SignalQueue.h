@@ -4,7 +4,7 @@
 
 #include <limits>
 
-#include "client/Signals.h"
+#include "client/terminal/Signals.h"
 
 namespace vexa::client {
 

@@ -1,14 +1,14 @@
-#include "client/Signals.h"
+#include "client/terminal/Signals.h"
 
 #include <windows.h>
 
 #include <deque>
 #include <mutex>
 
-#include "base/NeverDestroyed.h"
-#include "client/ClientError.h"
+#include "client/terminal/ClientError.h"
 #include "client/windows/SignalQueue.h"
 #include "platform/windows/Handle.h"
+#include "text/NeverDestroyed.h"
 
 namespace vexa::client {
 

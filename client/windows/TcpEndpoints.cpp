@@ -1,4 +1,4 @@
-#include "client/TcpEndpoints.h"
+#include "client/machine/TcpEndpoints.h"
 
 #include <winsock2.h>
 // After <winsock2.h>.
@@ -8,9 +8,9 @@
 #include <span>
 #include <string>
 
-#include "base/ScopeGuard.h"
-#include "client/ClientError.h"
+#include "client/terminal/ClientError.h"
 #include "platform/SocketLibrary.h"
+#include "text/ScopeGuard.h"
 
 namespace vexa::client {
 

@@ -1,10 +1,10 @@
-#include "client/TerminalKeys.h"
+#include "client/terminal/TerminalKeys.h"
 
 #include <windows.h>
 
-#include "client/Poll.h"
-#include "client/StandardInput.h"
-#include "client/Terminal.h"
+#include "client/terminal/Poll.h"
+#include "client/terminal/StandardInput.h"
+#include "client/terminal/Terminal.h"
 #include "client/windows/ConsoleKeys.h"
 
 namespace vexa::client {

@@ -10,12 +10,13 @@
 #include <fstream>
 #include <iterator>
 
-#include "base/TextConversion.h"
 #include "platform/windows/Handle.h"
-#include "simulation/ControlServer.h"
-#include "simulation/DemoScenario.h"
-#include "simulation/Reach.h"
+#include "simulation/control/ControlServer.h"
+#include "simulation/control/Timeline.h"
+#include "simulation/scenario/DemoScenario.h"
+#include "simulation/scenario/Reach.h"
 #include "simulation/windows/SystemRegistry.h"
+#include "text/TextConversion.h"
 
 namespace vexa::simulation {
 
@@ -100,6 +101,7 @@ std::int32_t controlPort(const std::wstring& text) {
 // Neither is ever destroyed: the threads of both end with the process.
 Machine& makeMachine() {
     Machine& machine = *std::make_unique<Machine>(scenario(), fs::path()).release();
+    beginTimeline(machine);
     const std::wstring port = environment(L"VEXA_CONTROL_PORT");
     if (port.empty()) return machine;
     auto server = startControlServer(machine, controlPort(port));

@@ -1,7 +1,7 @@
 // The registry of a machine whose WLAN service alone is simulated: that of the system. The service reads it
 // without coming by here.
 
-#include "simulation/MachineRegistry.h"
+#include "simulation/parts/MachineRegistry.h"
 
 #include "simulation/windows/SystemRegistry.h"
 

@@ -1,7 +1,7 @@
 // The simulated WLAN service in a process of Windows has the service's threads, clock and files before it,
 // not below it.
 
-#include "simulation/Reach.h"
+#include "simulation/scenario/Reach.h"
 
 #include <algorithm>
 #include <span>

@@ -6,8 +6,8 @@
 #include <cstdio>
 #include <cstring>
 
-#include "base/TextConversion.h"
 #include "platform/windows/Handle.h"
+#include "text/TextConversion.h"
 
 namespace vexa::simulation {
 

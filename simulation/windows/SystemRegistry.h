@@ -6,7 +6,7 @@
 #include <string>
 #include <vector>
 
-#include "simulation/Scenario.h"
+#include "simulation/scenario/Scenario.h"
 
 namespace vexa::simulation {
 

@@ -8,9 +8,9 @@
 
 #include <algorithm>
 
-#include "base/TextConversion.h"
-#include "simulation/CallersMemory.h"
 #include "simulation/windows/LoadedMachine.h"
+#include "simulation/wlan/CallersMemory.h"
+#include "text/TextConversion.h"
 
 using vexa::simulation::loadedMachine;
 using vexa::simulation::SessionState;

@@ -1,8 +1,6 @@
 #pragma once
 
 #include <optional>
-#include <string>
-#include <string_view>
 
 #include "platform/Mutex.h"
 #include "platform/WlanApi.h"
@@ -20,15 +18,6 @@ std::optional<GUID> presentAdapter();
 
 /// Whether the registry names the maker's hardware for this interface.
 bool isVendorInterface(const GUID& guid);
-
-/// "{XXXXXXXX-XXXX-XXXX-XXXX-XXXXXXXXXXXX}", upper case.
-std::string guidToString(const GUID& guid);
-
-/// 0 if `text` is the text of the GUID in either case.
-int compareGuidText(std::string_view text, const GUID& guid);
-
-/// All 16 bytes.
-bool areGuidsEqual(const GUID& a, const GUID& b);
 
 /// A GUID that several threads read and write.
 class SharedGuid {

@@ -10,10 +10,10 @@
 #include <utility>
 #include <vector>
 
-#include "base/NeverDestroyed.h"
-#include "base/TextConversion.h"
 #include "platform/Clock.h"
 #include "platform/Files.h"
+#include "text/NeverDestroyed.h"
+#include "text/TextConversion.h"
 
 namespace vexa {
 

@@ -7,9 +7,9 @@
 #include <string_view>
 
 #include "base/NetworkListLock.h"
-#include "base/PrintfFormat.h"
 #include "platform/Event.h"
 #include "platform/Thread.h"
+#include "text/PrintfFormat.h"
 
 namespace vexa {
 

@@ -1,6 +1,6 @@
 #include "base/NetworkListLock.h"
 
-#include "base/NeverDestroyed.h"
+#include "text/NeverDestroyed.h"
 
 namespace vexa {
 

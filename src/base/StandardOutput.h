@@ -1,6 +1,6 @@
 #pragma once
 
-#include "base/PrintfFormat.h"
+#include "text/PrintfFormat.h"
 
 namespace vexa {
 

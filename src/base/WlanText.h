@@ -3,8 +3,8 @@
 #include <string>
 #include <string_view>
 
-#include "base/TextConversion.h"
 #include "platform/WlanApi.h"
+#include "text/TextConversion.h"
 
 namespace vexa {
 

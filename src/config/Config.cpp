@@ -4,13 +4,13 @@
 #include <string_view>
 
 #include "base/DiagnosticLog.h"
-#include "base/ScopeGuard.h"
-#include "base/TextConversion.h"
 #include "config/SafeSave.h"
 #include "platform/Account.h"
 #include "platform/Files.h"
 #include "platform/KnownFolders.h"
 #include "platform/Registry.h"
+#include "text/ScopeGuard.h"
+#include "text/TextConversion.h"
 
 namespace vexa {
 

@@ -5,9 +5,9 @@
 #include <unordered_set>
 
 #include "base/DiagnosticLog.h"
-#include "base/ScopeGuard.h"
-#include "base/TextConversion.h"
 #include "config/Config.h"
+#include "text/ScopeGuard.h"
+#include "text/TextConversion.h"
 
 namespace vexa {
 

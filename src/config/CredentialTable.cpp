@@ -6,8 +6,8 @@
 #include <utility>
 
 #include "base/DiagnosticLog.h"
-#include "base/TextConversion.h"
 #include "config/ResultCodes.h"
+#include "text/TextConversion.h"
 
 namespace vexa {
 

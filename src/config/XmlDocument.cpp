@@ -4,11 +4,11 @@
 #include <string_view>
 #include <utility>
 
-#include "base/TextConversion.h"
 #include "config/ResultCodes.h"
 #include "config/SafeSave.h"
-#include "config/XmlWellFormed.h"
 #include "platform/Files.h"
+#include "text/TextConversion.h"
+#include "text/XmlWellFormed.h"
 
 namespace vexa {
 

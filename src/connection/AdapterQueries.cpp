@@ -1,10 +1,10 @@
 #include <algorithm>
 #include <string_view>
 
-#include "base/AdapterIdentity.h"
 #include "base/DiagnosticLog.h"
 #include "config/ResultCodes.h"
 #include "connection/Supplicant.h"
+#include "platform/Guid.h"
 #include "platform/NetworkAdapters.h"
 
 namespace vexa {

@@ -3,13 +3,13 @@
 #include <string_view>
 
 #include "base/DiagnosticLog.h"
-#include "base/TextConversion.h"
 #include "base/WlanText.h"
 #include "config/Config.h"
 #include "config/ResultCodes.h"
 #include "connection/Supplicant.h"
 #include "connection/SupplicantMgr.h"
 #include "hotspot/CredentialMatching.h"
+#include "text/TextConversion.h"
 
 namespace vexa {
 

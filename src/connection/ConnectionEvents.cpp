@@ -2,14 +2,14 @@
 #include <string_view>
 
 #include "base/DiagnosticLog.h"
-#include "base/ScopeGuard.h"
-#include "base/TextConversion.h"
 #include "base/WlanText.h"
 #include "config/Config.h"
 #include "config/ResultCodes.h"
 #include "connection/Supplicant.h"
 #include "connection/SupplicantMgr.h"
 #include "platform/Registry.h"
+#include "text/ScopeGuard.h"
+#include "text/TextConversion.h"
 
 namespace vexa {
 

@@ -1,12 +1,12 @@
 #include <algorithm>
 
 #include "base/DiagnosticLog.h"
-#include "base/TextConversion.h"
 #include "config/Config.h"
 #include "config/ResultCodes.h"
 #include "connection/Supplicant.h"
 #include "connection/SupplicantMgr.h"
 #include "hotspot/CredentialMatching.h"
+#include "text/TextConversion.h"
 
 namespace vexa {
 

@@ -4,9 +4,9 @@
 #include <utility>
 
 #include "base/DiagnosticLog.h"
-#include "base/TextConversion.h"
 #include "config/ResultCodes.h"
 #include "connection/ProfileTemplates.h"
+#include "text/TextConversion.h"
 
 namespace vexa {
 

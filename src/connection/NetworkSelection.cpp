@@ -1,13 +1,13 @@
 #include <string>
 
 #include "base/DiagnosticLog.h"
-#include "base/TextConversion.h"
 #include "config/Config.h"
 #include "config/ResultCodes.h"
 #include "connection/InterworkingMgr.h"
 #include "connection/Supplicant.h"
 #include "connection/SupplicantMgr.h"
 #include "hotspot/CredentialMatching.h"
+#include "text/TextConversion.h"
 
 namespace vexa {
 

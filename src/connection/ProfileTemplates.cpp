@@ -3,7 +3,7 @@
 #include <cassert>
 #include <string_view>
 
-#include "base/TextConversion.h"
+#include "text/TextConversion.h"
 
 // The namespaces that the platform publishes for the schemas.
 #define NAMESPACE(path) L"http://www.microsoft.com" path

@@ -2,12 +2,12 @@
 
 #include <cassert>
 
-#include "base/AdapterIdentity.h"
 #include "base/DiagnosticLog.h"
 #include "base/WlanMemory.h"
 #include "config/Config.h"
 #include "config/ResultCodes.h"
 #include "connection/SupplicantMgr.h"
+#include "platform/Guid.h"
 
 namespace vexa {
 

@@ -7,10 +7,11 @@
 
 #include "base/AdapterIdentity.h"
 #include "base/DiagnosticLog.h"
-#include "base/NeverDestroyed.h"
-#include "base/TextConversion.h"
 #include "connection/Supplicant.h"
 #include "platform/DebugOutput.h"
+#include "platform/Guid.h"
+#include "text/NeverDestroyed.h"
+#include "text/TextConversion.h"
 
 namespace vexa {
 

@@ -4,7 +4,7 @@
 #include <unordered_map>
 
 #include "base/DiagnosticLog.h"
-#include "base/TextConversion.h"
+#include "text/TextConversion.h"
 
 namespace vexa {
 

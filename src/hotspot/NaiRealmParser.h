@@ -5,7 +5,7 @@
 #include <string>
 #include <vector>
 
-#include "base/LittleEndian.h"
+#include "text/LittleEndian.h"
 
 namespace vexa {
 

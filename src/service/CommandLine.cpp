@@ -9,8 +9,8 @@
 
 #include "base/DiagnosticLog.h"
 #include "base/StandardOutput.h"
-#include "base/TextConversion.h"
 #include "platform/TcpTable.h"
+#include "text/TextConversion.h"
 
 namespace vexa {
 

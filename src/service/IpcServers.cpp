@@ -3,7 +3,7 @@
 #include <memory>
 
 #include "base/StandardOutput.h"
-#include "protocol/SAHotSpotPortlink.h"
+#include "hotspotport/SAHotSpotPortlink.h"
 #include "service/NotificationRouter.h"
 #include "spectral/SAPortlink.h"
 

@@ -9,12 +9,12 @@
 #include <span>
 
 #include "base/DiagnosticLog.h"
-#include "base/LittleEndian.h"
 #include "connection/Supplicant.h"
 #include "connection/SupplicantMgr.h"
 #include "hotspot/IhvMessages.h"
-#include "protocol/SAHotSpotPortlink.h"
+#include "hotspotport/SAHotSpotPortlink.h"
 #include "spectral/SAPortlink.h"
+#include "text/LittleEndian.h"
 
 namespace vexa {
 

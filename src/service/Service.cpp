@@ -4,13 +4,13 @@
 
 #include "base/AdapterIdentity.h"
 #include "base/DiagnosticLog.h"
-#include "base/NeverDestroyed.h"
-#include "base/ScopeGuard.h"
 #include "connection/Supplicant.h"
 #include "connection/SupplicantMgr.h"
 #include "platform/NamedMutex.h"
 #include "service/CommandLine.h"
 #include "service/IpcServers.h"
+#include "text/NeverDestroyed.h"
+#include "text/ScopeGuard.h"
 
 namespace vexa {
 

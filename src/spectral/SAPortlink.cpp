@@ -8,9 +8,9 @@
 #include "base/NetworkListLock.h"
 #include "base/StandardOutput.h"
 #include "base/WlanMemory.h"
+#include "channel/JsonText.h"
 #include "platform/DebugOutput.h"
 #include "platform/SocketLibrary.h"
-#include "protocol/JsonText.h"
 
 namespace vexa {
 

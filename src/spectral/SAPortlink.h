@@ -8,10 +8,10 @@
 #include <vector>
 
 #include "base/AdapterIdentity.h"
+#include "channel/Ipc.h"
 #include "platform/Mutex.h"
 #include "platform/PeriodicTimer.h"
 #include "platform/WlanApi.h"
-#include "protocol/Ipc.h"
 #include "spectral/ChannelStatistics.h"
 #include "spectral/SpectralMessages.h"
 

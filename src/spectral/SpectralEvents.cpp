@@ -1,7 +1,7 @@
 #include "base/StandardOutput.h"
 #include "base/WlanMemory.h"
-#include "protocol/Envelope.h"
-#include "protocol/JsonText.h"
+#include "channel/Envelope.h"
+#include "channel/JsonText.h"
 #include "spectral/SAPortlink.h"
 
 namespace vexa {

@@ -6,7 +6,7 @@
 #include <span>
 #include <vector>
 
-#include "base/LittleEndian.h"
+#include "text/LittleEndian.h"
 
 namespace vexa {
 

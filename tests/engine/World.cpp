@@ -8,11 +8,13 @@
 #include <stdexcept>
 
 #include "base/DiagnosticLog.h"
+#include "hotspotport/SAHotSpotPortlink.h"
 #include "platform/ClockControl.h"
-#include "protocol/SAHotSpotPortlink.h"
 #include "service/CommandLine.h"
 #include "service/Service.h"
-#include "simulation/Scenario.h"
+#include "simulation/control/Performance.h"
+#include "simulation/control/Timeline.h"
+#include "simulation/scenario/Scenario.h"
 
 namespace vexa::test {
 
@@ -108,6 +110,7 @@ World::World(const std::string& scenario, const std::filesystem::path& folder)
       m_machine(withLog(simulation::parseScenario(scenario)), folder),
       m_stopMutex(std::make_unique<platform::NamedMutex>("{39EAA3ED-1A26-46B7-90A7-AAFFECE80392}",
                                                          platform::NamedMutex::Owner::Yes)) {
+    simulation::beginTimeline(m_machine);
     const std::int32_t saPort = unusedPort(2100);
     const std::int32_t hs20Port = unusedPort(saPort + 1);
     m_service.start("main", [this, commandLine = std::to_wstring(saPort) + L" " + std::to_wstring(hs20Port)] {
@@ -119,7 +122,7 @@ World::World(const std::string& scenario, const std::filesystem::path& folder)
 }
 
 Json::Value World::perform(const std::string& message) {
-    Json::Value answer = m_machine.perform(parse(message));
+    Json::Value answer = simulation::perform(m_machine, parse(message));
     if (!answer["ok"].asBool()) throw std::runtime_error(message + ": " + oneLine(answer));
     return answer["result"];
 }

@@ -7,10 +7,10 @@
 #include <string>
 #include <vector>
 
+#include "channel/IpcInProcess.h"
 #include "platform/Clock.h"
 #include "platform/NamedMutex.h"
 #include "platform/Thread.h"
-#include "protocol/IpcInProcess.h"
 #include "simulation/Machine.h"
 
 namespace vexa::test {

@@ -7,7 +7,8 @@
 
 #include "config/ResultCodes.h"
 #include "connection/SupplicantMgr.h"
-#include "protocol/SAHotSpotPortlink.h"
+#include "hotspotport/SAHotSpotPortlink.h"
+#include "simulation/control/Performance.h"
 #include "unit/hotspot/WireBytes.h"
 
 namespace vexa::test {
@@ -34,7 +35,8 @@ void AirService::answerNext(const char* request, Bytes bytes) {
     action["do"] = "reply";
     action["match"] = request;
     action["dataHex"] = hexOf(bytes);
-    require(simulation::Machine::current()->perform(action)["ok"].asBool(), "the machine takes the answer");
+    require(simulation::perform(*simulation::Machine::current(), action)["ok"].asBool(),
+            "the machine takes the answer");
 }
 
 void AirService::checkList() {

@@ -5,7 +5,7 @@
 #include <iostream>
 #include <iterator>
 
-#include "simulation/Scenario.h"
+#include "simulation/scenario/Scenario.h"
 
 namespace vexa::test {
 

@@ -8,7 +8,7 @@
 #include "config/ResultCodes.h"
 #include "connection/SupplicantMgr.h"
 #include "fuzz/FuzzMachine.h"
-#include "protocol/SAHotSpotPortlink.h"
+#include "hotspotport/SAHotSpotPortlink.h"
 
 namespace vexa::test {
 namespace {

@@ -1,7 +1,7 @@
 #include "platform/Account.h"
 
-#include "base/TextConversion.h"
 #include "simulation/Machine.h"
+#include "text/TextConversion.h"
 
 namespace vexa::platform {
 

@@ -4,8 +4,8 @@
 
 #include "platform/simulated/MachineFolder.h"
 #include "simulation/Machine.h"
-#include "simulation/OwnerFiles.h"
-#include "simulation/Text.h"
+#include "simulation/parts/OwnerFiles.h"
+#include "simulation/text/Text.h"
 
 namespace vexa::platform {
 

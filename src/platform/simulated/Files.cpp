@@ -11,9 +11,9 @@
 #include <filesystem>
 #include <utility>
 
-#include "base/TextConversion.h"
 #include "platform/simulated/HostPath.h"
-#include "simulation/OwnerFiles.h"
+#include "simulation/parts/OwnerFiles.h"
+#include "text/TextConversion.h"
 
 namespace vexa::platform {
 

@@ -3,8 +3,8 @@
 #include <algorithm>
 #include <string_view>
 
-#include "base/TextConversion.h"
 #include "platform/simulated/MachineFolder.h"
+#include "text/TextConversion.h"
 
 namespace vexa::platform {
 

@@ -4,7 +4,7 @@
 
 #include "platform/simulated/HostPath.h"
 #include "simulation/Machine.h"
-#include "simulation/OwnerFiles.h"
+#include "simulation/parts/OwnerFiles.h"
 
 namespace vexa::platform {
 

@@ -11,7 +11,7 @@
 
 #include "platform/Thread.h"
 #include "platform/simulated/MachineFolder.h"
-#include "simulation/OwnerFiles.h"
+#include "simulation/parts/OwnerFiles.h"
 
 namespace vexa::platform {
 

@@ -1,6 +1,6 @@
 #include "platform/NetworkAdapters.h"
 
-#include "base/AdapterIdentity.h"
+#include "platform/Guid.h"
 #include "simulation/Machine.h"
 
 namespace vexa::platform {

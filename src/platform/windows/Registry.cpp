@@ -3,8 +3,8 @@
 #include <algorithm>
 #include <vector>
 
-#include "base/TextConversion.h"
 #include "platform/windows/Handle.h"
+#include "text/TextConversion.h"
 
 namespace vexa::platform {
 

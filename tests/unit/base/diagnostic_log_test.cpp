@@ -7,8 +7,8 @@
 #include <fstream>
 #include <sstream>
 
-#include "base/TextConversion.h"
 #include "platform/KnownFolders.h"
+#include "text/TextConversion.h"
 #include "unit/simulation/TestMachine.h"
 
 namespace vexa::test {

@@ -1,4 +1,4 @@
-#include "client/ConnectionJudge.h"
+#include "client/hotspot/ConnectionJudge.h"
 
 #include <gtest/gtest.h>
 

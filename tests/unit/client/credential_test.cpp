@@ -1,10 +1,10 @@
-#include "client/Credential.h"
+#include "client/hotspot/Credential.h"
 
 #include <gtest/gtest.h>
 
-#include "client/ClientError.h"
-#include "client/CredentialText.h"
-#include "client/JsonLine.h"
+#include "client/hotspot/CredentialText.h"
+#include "client/port/JsonLine.h"
+#include "client/terminal/ClientError.h"
 
 namespace vexa::client {
 namespace {

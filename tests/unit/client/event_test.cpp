@@ -1,6 +1,6 @@
 #include <gtest/gtest.h>
 
-#include "client/Event.h"
+#include "client/port/Event.h"
 
 namespace vexa::client {
 namespace {

@@ -1,4 +1,4 @@
-#include "client/Fitting.h"
+#include "client/hotspot/Fitting.h"
 
 #include <gtest/gtest.h>
 

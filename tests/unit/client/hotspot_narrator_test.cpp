@@ -1,4 +1,4 @@
-#include "client/HotspotNarrator.h"
+#include "client/hotspot/HotspotNarrator.h"
 
 #include <gtest/gtest.h>
 

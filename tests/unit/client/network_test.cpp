@@ -1,9 +1,9 @@
-#include "client/Network.h"
+#include "client/hotspot/Network.h"
 
 #include <gtest/gtest.h>
 
-#include "client/HotspotSwitch.h"
-#include "client/JsonLine.h"
+#include "client/machine/MachineRegistry.h"
+#include "client/port/JsonLine.h"
 
 #include <fstream>
 

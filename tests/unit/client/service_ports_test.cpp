@@ -3,8 +3,8 @@
 
 #include <fstream>
 
-#include "client/MachineFolder.h"
-#include "client/ServicePorts.h"
+#include "client/machine/MachineFolder.h"
+#include "client/machine/ServicePorts.h"
 
 namespace vexa::client {
 namespace {

@@ -2,7 +2,7 @@
 
 #include <string>
 
-#include "client/Event.h"
+#include "client/port/Event.h"
 
 namespace vexa::client {
 

@@ -2,7 +2,7 @@
 
 #include <algorithm>
 
-#include "client/SpectralPicture.h"
+#include "client/spectrum/SpectralPicture.h"
 #include "unit/client/spectral_events.h"
 
 namespace vexa::client {

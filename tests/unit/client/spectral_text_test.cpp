@@ -1,8 +1,8 @@
 #include <gtest/gtest.h>
 
-#include "client/JsonLine.h"
+#include "client/port/JsonLine.h"
 
-#include "client/SpectralText.h"
+#include "client/spectrum/SpectralText.h"
 #include "unit/client/spectral_events.h"
 
 namespace vexa::client {

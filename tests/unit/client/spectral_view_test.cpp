@@ -1,6 +1,6 @@
 #include <gtest/gtest.h>
 
-#include "client/SpectralView.h"
+#include "client/spectrum/SpectralView.h"
 #include "unit/client/spectral_events.h"
 
 namespace vexa::client {

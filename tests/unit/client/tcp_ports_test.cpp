@@ -6,11 +6,11 @@
 #include <utility>
 #include <vector>
 
-#include "client/ClientError.h"
-#include "client/MachineFolder.h"
-#include "client/TcpPorts.h"
+#include "client/machine/MachineFolder.h"
+#include "client/machine/TcpEndpoints.h"
+#include "client/machine/TcpPorts.h"
 #include "client/posix/Descriptor.h"
-#include "client/posix/TcpTable.h"
+#include "client/terminal/ClientError.h"
 
 namespace vexa::client {
 namespace {

@@ -1,6 +1,6 @@
 #include <gtest/gtest.h>
 
-#include "client/Text.h"
+#include "client/terminal/Text.h"
 
 namespace vexa::client {
 namespace {

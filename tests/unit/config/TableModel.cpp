@@ -2,7 +2,7 @@
 
 #include <algorithm>
 
-#include "base/TextConversion.h"
+#include "text/TextConversion.h"
 
 namespace vexa::test {
 

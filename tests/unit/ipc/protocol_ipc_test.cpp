@@ -8,8 +8,8 @@
 #include <thread>
 #include <vector>
 
-#include "protocol/Ipc.h"
-#include "protocol/IpcWebSocketServer.h"
+#include "channel/Ipc.h"
+#include "channel/IpcWebSocketServer.h"
 #include "unit/ipc/TestClient.h"
 
 namespace {

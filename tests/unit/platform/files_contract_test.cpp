@@ -2,8 +2,8 @@
 
 #include <algorithm>
 
-#include "base/TextConversion.h"
 #include "platform/Files.h"
+#include "text/TextConversion.h"
 #include "unit/platform/MachineWorld.h"
 
 namespace vexa::platform {

@@ -2,10 +2,10 @@
 
 #include <sstream>
 
-#include "base/TextConversion.h"
 #include "platform/Files.h"
 #include "platform/KnownFolders.h"
-#include "simulation/OwnerFiles.h"
+#include "simulation/parts/OwnerFiles.h"
+#include "text/TextConversion.h"
 #include "unit/platform/MachineWorld.h"
 #include "unit/simulation/TestMachine.h"
 

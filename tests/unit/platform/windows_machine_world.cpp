@@ -3,7 +3,7 @@
 #include <filesystem>
 #include <random>
 
-#include "base/TextConversion.h"
+#include "text/TextConversion.h"
 #include "unit/platform/MachineWorld.h"
 
 namespace vexa::test {

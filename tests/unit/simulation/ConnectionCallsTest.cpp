@@ -1,7 +1,7 @@
 #include <gtest/gtest.h>
 
 #include "Station.h"
-#include "simulation/JsonText.h"
+#include "simulation/scenario/JsonText.h"
 
 namespace vexa::simulation {
 namespace {

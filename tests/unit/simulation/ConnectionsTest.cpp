@@ -3,7 +3,7 @@
 #include <functional>
 
 #include "Station.h"
-#include "simulation/JsonText.h"
+#include "simulation/scenario/JsonText.h"
 
 namespace vexa::simulation {
 namespace {

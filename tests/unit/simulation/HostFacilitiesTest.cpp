@@ -6,7 +6,7 @@
 #include "platform/Session.h"
 #include "platform/simulated/MachineFolder.h"
 #include "platform/simulated/ProcNetTcp.h"
-#include "simulation/OwnerFiles.h"
+#include "simulation/parts/OwnerFiles.h"
 
 namespace vexa::simulation {
 namespace {

@@ -3,8 +3,8 @@
 #include <gtest/gtest.h>
 
 #include "TestMachine.h"
-#include "simulation/JsonText.h"
-#include "simulation/OwnerFiles.h"
+#include "simulation/parts/OwnerFiles.h"
+#include "simulation/scenario/JsonText.h"
 
 namespace vexa::simulation {
 namespace {

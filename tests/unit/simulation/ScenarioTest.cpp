@@ -1,10 +1,10 @@
-#include "simulation/Scenario.h"
+#include "simulation/scenario/Scenario.h"
 
 #include <gtest/gtest.h>
 
 #include <algorithm>
 
-#include "simulation/DemoScenario.h"
+#include "simulation/scenario/DemoScenario.h"
 
 namespace vexa::simulation {
 namespace {

@@ -6,7 +6,9 @@
 #include <algorithm>
 
 #include "platform/ClockControl.h"
-#include "simulation/JsonText.h"
+#include "simulation/control/Performance.h"
+#include "simulation/control/Timeline.h"
+#include "simulation/scenario/JsonText.h"
 
 namespace vexa::simulation {
 
@@ -66,6 +68,7 @@ void Listener::callback(PWLAN_NOTIFICATION_DATA data, PVOID context) {
 TestMachine::TestMachine(const std::string& scenario) {
     platform::setClockSpeed(0);
     m_machine = std::make_unique<Machine>(parseScenario(compactJson(json(scenario))), m_folder.path());
+    beginTimeline(*m_machine);
 }
 
 TestMachine::~TestMachine() {
@@ -74,11 +77,11 @@ TestMachine::~TestMachine() {
 }
 
 std::string TestMachine::ask(const std::string& message) {
-    return compactJson(m_machine->perform(json(message)));
+    return compactJson(perform(*m_machine, json(message)));
 }
 
 Json::Value TestMachine::query(const std::string& message) {
-    const Json::Value answer = m_machine->perform(json(message));
+    const Json::Value answer = perform(*m_machine, json(message));
     EXPECT_TRUE(answer["ok"].asBool()) << compactJson(answer);
     return answer["result"];
 }

@@ -13,7 +13,7 @@
 #include "platform/Mutex.h"
 #include "platform/WlanApi.h"
 #include "simulation/Machine.h"
-#include "simulation/Text.h"
+#include "simulation/text/Text.h"
 
 namespace vexa::simulation {
 

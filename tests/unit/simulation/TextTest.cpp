@@ -1,8 +1,8 @@
-#include "simulation/Text.h"
+#include "simulation/text/Text.h"
 
 #include <gtest/gtest.h>
 
-#include "simulation/Guid.h"
+#include "simulation/text/Guid.h"
 
 namespace vexa::simulation {
 namespace {

@@ -1,0 +1,81 @@
+#include <json/value.h>
+
+#include <CLI/CLI.hpp>
+#include <iomanip>
+#include <iostream>
+#include <memory>
+
+#include "client/command/Commands.h"
+#include "client/command/PortOption.h"
+#include "client/port/Activity.h"
+#include "client/port/JsonLine.h"
+#include "client/spectrum/SpectralScan.h"
+#include "client/terminal/ClientError.h"
+
+namespace vexa::client {
+
+namespace {
+
+using std::chrono::steady_clock;
+
+constexpr std::chrono::seconds kAnswerLimit{10};
+
+struct ChannelsOptions {
+    PortOption port{Half::Spectral};
+    bool json = false;
+};
+
+bool waitForList(SpectralScan& scan, Signals& signals) {
+    const auto deadline = steady_clock::now() + kAnswerLimit;
+    while (!scan.view().hasChannelList()) {
+        const auto left = std::chrono::ceil<std::chrono::milliseconds>(deadline - steady_clock::now());
+        switch (waitForActivity(scan.descriptor(), scan.events(), signals, left)) {
+            case Activity::StopAsked:
+                return false;
+            case Activity::Timeout:
+                throw ClientError("the service did not answer");
+            case Activity::Ready:
+                scan.process();
+        }
+    }
+    return true;
+}
+
+void printTable(const SpectralView& view) {
+    std::cout << "Channel  Order\n";
+    for (const auto& channel : view.channels()) {
+        std::cout << std::setw(7) << channel.number << std::setw(7) << channel.order << '\n';
+    }
+}
+
+void printJson(const SpectralView& view) {
+    Json::Value list(Json::arrayValue);
+    for (const auto& channel : view.channels()) {
+        Json::Value entry(Json::objectValue);
+        entry["channel"] = channel.number;
+        entry["order"] = channel.order;
+        list.append(entry);
+    }
+    std::cout << jsonLine(list) << '\n';
+}
+
+int runChannels(const ChannelsOptions& options) {
+    Signals signals;
+    SpectralScan scan(options.port.find());
+    if (!waitForList(scan, signals)) return kExitOk;
+    options.json ? printJson(scan.view()) : printTable(scan.view());
+    if (scan.view().channels().empty()) std::cerr << "vexa: the service knows no channels\n";
+    return kExitOk;
+}
+
+}  // namespace
+
+void addChannelsCommand(CLI::App& app, int& exitCode) {
+    auto options = std::make_shared<ChannelsOptions>();
+    CLI::App* command = app.add_subcommand("channels", "List the channels of the adapter");
+    options->port.addTo(*command);
+    command->add_flag("--json", options->json, "Print JSON");
+    command->callback([options, &exitCode] { exitCode = runChannels(*options); });
+}
+
+}  // namespace vexa::client

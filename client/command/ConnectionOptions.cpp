@@ -1,0 +1,44 @@
+#include "client/command/ConnectionOptions.h"
+
+#include <CLI/CLI.hpp>
+#include <algorithm>
+#include <iostream>
+
+#include "client/port/JsonLine.h"
+
+namespace vexa::client {
+
+namespace {
+
+constexpr std::chrono::seconds kAnswerLimit{10};
+
+}  // namespace
+
+void ConnectionOptions::addTo(CLI::App& command, int timeout) {
+    hotspot.timeout = timeout;
+    hotspot.addTo(command);
+    command.add_flag("--no-wait", noWait, "Do not wait for what comes of it");
+}
+
+std::chrono::seconds ConnectionOptions::answerLimit() const {
+    return std::min(hotspot.limit(), kAnswerLimit);
+}
+
+void sayDone(const ConnectionOptions& options, const char* verb, const std::string& sentence,
+             Json::Value details) {
+    if (!options.hotspot.json) {
+        std::cout << sentence << '\n';
+        return;
+    }
+    details["done"] = verb;
+    details["network"] = options.network;
+    std::cout << jsonLine(details) << '\n';
+}
+
+void tellOfNetwork(HotspotPort& port, const char* command, const std::string& network) {
+    Json::Value data(Json::objectValue);
+    data["NetWorkName"] = network;
+    port.tell(command, jsonLine(data));
+}
+
+}  // namespace vexa::client

@@ -1,0 +1,41 @@
+#include <CLI/CLI.hpp>
+#include <memory>
+
+#include "client/command/Commands.h"
+#include "client/port/Activity.h"
+#include "client/port/EventLines.h"
+#include "client/terminal/ClientError.h"
+
+namespace vexa::client {
+
+namespace {
+
+struct ListenOptions {
+    std::uint16_t port = 0;
+    bool json = false;
+};
+
+int runListen(const ListenOptions& options) {
+    Signals signals;
+    WebSocketClient client(options.port);
+    while (waitForActivity(client.descriptor(), client.events(), signals, std::nullopt) == Activity::Ready) {
+        client.process();
+        if (!printEvents(client)) break;
+        if (!client.isOpen()) throw ClientError("the service has closed the connection");
+    }
+    return kExitOk;
+}
+
+}  // namespace
+
+void addListenCommand(CLI::App& app, int& exitCode) {
+    auto options = std::make_shared<ListenOptions>();
+    CLI::App* command = app.add_subcommand("listen", "Print the events of a port as they come, until Ctrl-C");
+    command->add_option("PORT", options->port, "Port of the spectral analyser or of the hotspot half")
+        ->required()
+        ->check(CLI::Range(1, 65535));
+    command->add_flag("--json", options->json, "Print JSON, as always: an event a line");
+    command->callback([options, &exitCode] { exitCode = runListen(*options); });
+}
+
+}  // namespace vexa::client

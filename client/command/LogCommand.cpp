@@ -1,0 +1,101 @@
+#include <json/value.h>
+
+#include <CLI/CLI.hpp>
+#include <iostream>
+#include <memory>
+#include <pugixml.hpp>
+
+#include "client/command/Commands.h"
+#include "client/machine/LogFiles.h"
+#include "client/machine/MachineFolder.h"
+#include "client/machine/ServiceHost.h"
+#include "client/port/Activity.h"
+#include "client/port/JsonLine.h"
+#include "client/terminal/ClientError.h"
+#include "client/terminal/Text.h"
+
+namespace vexa::client {
+
+namespace {
+
+constexpr std::chrono::milliseconds kBetweenLooks{200};
+
+struct LogOptions {
+    std::string machine;
+    std::size_t lines = 0;
+    bool follow = false;
+    bool json = false;
+};
+
+/// Why there may be nothing to read, in one line; empty if the log is on.
+std::string whyOff(const MachineFolder& machine) {
+    pugi::xml_document document;
+    const auto result = document.load_file(machine.configFile().c_str());
+    if (result.status == pugi::status_file_not_found)
+        return "no service has run on the machine " + machine.path().string() + " yet";
+    if (result.status != pugi::status_ok) return machine.configFile().string() + " cannot be read";
+    const std::string enabled = document.select_node("/*/global/enabledump").node().text().get();
+    if (enabled == "true") return "";
+    return "the log is off: set enabledump to true in " + machine.configFile().string() +
+           " and start the service again";
+}
+
+void print(const std::vector<LogFiles::Line>& lines, std::size_t from, bool json) {
+    for (std::size_t i = from; i < lines.size(); ++i) {
+        if (json) {
+            Json::Value object(Json::objectValue);
+            object["file"] = lines[i].file;
+            object["line"] = asUtf8(lines[i].text);
+            std::cout << jsonLine(object) << '\n';
+        } else {
+            std::cout << printable(lines[i].text, Tabs::Kept) << '\n';
+        }
+    }
+    std::cout << std::flush;
+}
+
+void follow(LogFiles& files, const LogOptions& options) {
+    Signals signals;
+    while (std::cout && waitForActivity(-1, 0, signals, kBetweenLooks) != Activity::StopAsked)
+        print(files.takeLines(), 0, options.json);
+}
+
+void explainSilence(const std::string& reason, bool hasFile, bool goesOn) {
+    if (hasFile && reason.empty()) return;
+    const std::string line =
+        reason.empty() ? "the log is on, but nothing is in it yet; lines come every 10 s" : reason;
+    if (!hasFile && !goesOn) throw ClientError(line);
+    std::cerr << "vexa: " << line << '\n';
+}
+
+int runLog(const LogOptions& options, bool isLimited) {
+    const MachineFolder machine(options.machine);
+    LogFiles files(machine.dumpFolder());
+    explainSilence(whyOff(machine), files.any(), options.follow);
+    auto lines = files.takeLines();
+    if (!options.follow) {
+        const auto rest = files.takeRest();
+        lines.insert(lines.end(), rest.begin(), rest.end());
+    }
+    const bool isCut = isLimited && lines.size() > options.lines;
+    print(lines, isCut ? lines.size() - options.lines : 0, options.json);
+    if (options.follow) follow(files, options);
+    return kExitOk;
+}
+
+}  // namespace
+
+void addLogCommand(CLI::App& app, int& exitCode) {
+    auto options = std::make_shared<LogOptions>();
+    CLI::App* command = app.add_subcommand("log", "Print the diagnostic log of a machine, the newest last");
+    if (hasSimulatedMachines())
+        command->add_option("--machine", options->machine, "Folder of the machine")->type_name("DIR");
+    CLI::Option* lines =
+        command->add_option("-n,--lines", options->lines, "The last lines alone; default: all");
+    lines->type_name("LINES")->check(CLI::NonNegativeNumber);
+    command->add_flag("-f,--follow", options->follow, "Go on with what is written, until Ctrl-C");
+    command->add_flag("--json", options->json, "Print JSON, an object a line");
+    command->callback([options, lines, &exitCode] { exitCode = runLog(*options, lines->count() > 0); });
+}
+
+}  // namespace vexa::client

@@ -1,0 +1,57 @@
+#include <CLI/CLI.hpp>
+#include <array>
+#include <iostream>
+
+#include "client/command/Commands.h"
+#include "client/command/Program.h"
+#include "client/terminal/ClientError.h"
+
+namespace {
+
+using namespace vexa::client;
+
+constexpr std::array kCommands{&addStartCommand,      &addHostCommands,      &addStatusCommand,
+                               &addScanCommand,       &addChannelsCommand,   &addNetworksCommand,
+                               &addConnectCommand,    &addDisconnectCommand, &addEnableCommand,
+                               &addDisableCommand,    &addRefreshCommand,    &addCredentialsCommand,
+                               &addCredentialCommand, &addReloadCommand,     &addWatchCommand,
+                               &addLogCommand,        &addSendCommand,       &addListenCommand};
+
+int report(const std::exception& error, int exitCode) {
+    std::cerr << "vexa: " << error.what() << '\n';
+    return exitCode;
+}
+
+int reportWrongUse(const CLI::ParseError& error) {
+    report(error, kExitWrongUse);
+    std::cerr << "vexa: --help tells how to use it\n";
+    return kExitWrongUse;
+}
+
+int run(int argc, char** argv) {
+    CLI::App app("The Vexa wireless service: start it, look at the air, keep its credentials.", "vexa");
+    app.require_subcommand(1);
+    int exitCode = kExitOk;
+    for (const auto add : kCommands)
+        add(app, exitCode);
+    try {
+        app.parse(argc, argv);
+    } catch (const CLI::Success& help) {
+        return app.exit(help);
+    }
+    return exitCode;
+}
+
+}  // namespace
+
+int vexa::client::runProgram(int argc, char** argv) {
+    try {
+        return run(argc, argv);
+    } catch (const CLI::ParseError& error) {
+        return reportWrongUse(error);
+    } catch (const ClientError& error) {
+        return report(error, error.exitCode());
+    } catch (const std::exception& error) {
+        return report(error, kExitFailed);
+    }
+}

@@ -1,0 +1,86 @@
+#include <CLI/CLI.hpp>
+#include <iostream>
+#include <memory>
+
+#include "client/command/Commands.h"
+#include "client/command/HotspotOptions.h"
+#include "client/hotspot/HotspotQuestions.h"
+#include "client/hotspot/Network.h"
+#include "client/port/HotspotPort.h"
+#include "client/port/JsonLine.h"
+
+namespace vexa::client {
+
+namespace {
+
+struct NetworksOptions {
+    HotspotOptions hotspot;
+    bool watch = false;
+};
+
+bool print(const NetworkList& list, bool json) {
+    if (json) {
+        std::cout << jsonLine(networksJson(list)) << '\n';
+    } else if (list.empty()) {
+        std::cout << "No hotspot networks.\n";
+    } else {
+        for (const auto& line : networkTable(list))
+            std::cout << line << '\n';
+    }
+    return static_cast<bool>(std::cout << std::flush);
+}
+
+/// An empty list has reasons that the list does not tell.
+void explain(HotspotPort& port, const HotspotOptions& options) {
+    const auto isOn = hotspotSwitch(options.port.machine());
+    if (!askRadio(port)) {
+        std::cerr << "vexa: the radio is off\n";
+    } else if (isOn && !*isOn) {
+        std::cerr << "vexa: hotspot networks are disabled: `vexa enable` enables them\n";
+    }
+}
+
+// An adapter that comes is asked for its list; all later lists come by themselves.
+void watch(HotspotPort& port, NetworkList shown, bool json) {
+    while (const auto event = port.next(std::nullopt)) {
+        if (event->id == kCardIn) port.tell(kNetworkList);
+        if (event->id != kNetworkList) continue;
+        NetworkList list = networkList(parseJson(event->data).value_or(Json::Value()));
+        if (list == shown) continue;
+        shown = std::move(list);
+        if (!json) std::cout << '\n';
+        if (!print(shown, json)) return;
+    }
+}
+
+int runNetworks(const NetworksOptions& options) {
+    Signals signals;
+    HotspotPort port(options.hotspot.port.find(), signals, options.hotspot.limit());
+    const bool json = options.hotspot.json;
+    const auto list = askNetworks(port);
+    if (!list && !options.watch) throw ClientError(kNoAdapter);
+    if (!list) std::cerr << "vexa: " << kNoAdapter << '\n';
+    if (list) print(*list, json);
+    if (list && list->empty() && !json) explain(port, options.hotspot);
+    if (!options.watch) return kExitOk;
+    std::optional<TerminalKeys> keys;
+    if (TerminalKeys::isUsable()) port.endWith(keys.emplace());
+    try {
+        watch(port, list.value_or(NetworkList()), json);
+    } catch (const StoppedByUser&) {  // that is how it ends
+    }
+    return kExitOk;
+}
+
+}  // namespace
+
+void addNetworksCommand(CLI::App& app, int& exitCode) {
+    auto options = std::make_shared<NetworksOptions>();
+    CLI::App* command =
+        app.add_subcommand("networks", "List the hotspot networks in range, with their realms");
+    options->hotspot.addTo(*command);
+    command->add_flag("--watch", options->watch, "Go on with every list that differs, until q or Ctrl-C");
+    command->callback([options, &exitCode] { exitCode = runNetworks(*options); });
+}
+
+}  // namespace vexa::client

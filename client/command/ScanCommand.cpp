@@ -1,0 +1,107 @@
+#include <CLI/CLI.hpp>
+#include <algorithm>
+#include <iostream>
+#include <memory>
+
+#include "client/command/Commands.h"
+#include "client/command/PortOption.h"
+#include "client/port/Activity.h"
+#include "client/spectrum/SpectralText.h"
+#include "client/spectrum/SpectrumWatch.h"
+#include "client/terminal/ClientError.h"
+
+namespace vexa::client {
+
+namespace {
+
+using std::chrono::milliseconds;
+using std::chrono::seconds;
+using std::chrono::steady_clock;
+
+constexpr int kDefaultTimeout = 15;
+
+// The values of one scan come in one burst.
+constexpr milliseconds kRestOfBurst{200};
+// Channels that have told nothing this long after the others have no values to tell.
+constexpr milliseconds kQuietLimit{3000};
+
+struct ScanOptions {
+    PortOption port{Half::Spectral};
+    int timeout = kDefaultTimeout;
+    bool watch = false;
+    bool json = false;
+};
+
+/// Decides when a scan has told enough.
+class Completeness {
+public:
+    explicit Completeness(seconds limit) : m_limit(steady_clock::now() + limit), m_end(m_limit) {}
+
+    /// To be called when the view has changed.
+    void update(const SpectralView& view) {
+        const std::size_t known = view.knownChannels();
+        if (known == m_known) return;
+        m_known = known;
+        const bool all = view.hasChannelList() && known == view.channels().size();
+        m_end = std::min(m_limit, steady_clock::now() + (all ? kRestOfBurst : kQuietLimit));
+    }
+
+    /// How long to wait for more; 0: it is enough.
+    milliseconds left() const {
+        return std::max(milliseconds(0), std::chrono::ceil<milliseconds>(m_end - steady_clock::now()));
+    }
+
+private:
+    steady_clock::time_point m_limit;
+    steady_clock::time_point m_end;
+    std::size_t m_known = 0;
+};
+
+void scanOnce(SpectralScan& scan, Signals& signals, seconds limit) {
+    Completeness completeness(limit);
+    scan.start();
+    while (completeness.left() > milliseconds(0)) {
+        const Activity activity =
+            waitForActivity(scan.descriptor(), scan.events(), signals, completeness.left());
+        if (activity == Activity::StopAsked) break;
+        if (!scan.process().empty()) completeness.update(scan.view());
+    }
+    scan.stop();
+}
+
+int runScan(const ScanOptions& options) {
+    Signals signals;
+    SpectralScan scan(options.port.find());
+    if (options.watch) {
+        SpectrumOutput output(options.json ? SpectrumOutput::Form::Json : SpectrumOutput::Form::Readable);
+        watchSpectrum(scan, signals, output, std::nullopt);
+        return kExitOk;
+    }
+    scanOnce(scan, signals, seconds(options.timeout));
+    if (options.json) {
+        std::cout << spectrumJson(scan.view()) << std::endl;
+    } else {
+        for (const auto& line : spectrumTable(scan.view()))
+            std::cout << line << '\n';
+    }
+    if (scan.view().knownChannels() > 0) return kExitOk;
+    throw ClientError("no channel told a value within " + std::to_string(options.timeout) + " s");
+}
+
+}  // namespace
+
+void addScanCommand(CLI::App& app, int& exitCode) {
+    auto options = std::make_shared<ScanOptions>();
+    CLI::App* command =
+        app.add_subcommand("scan", "Scan the spectrum and show congestion and interference per channel");
+    options->port.addTo(*command);
+    command->add_flag("--watch", options->watch,
+                      "Go on, as bars in the terminal or a line per event, until q or Ctrl-C");
+    command->add_option("--timeout", options->timeout, "Seconds to wait for values at most; default 15")
+        ->type_name("N")
+        ->check(CLI::Range(1, 3600));
+    command->add_flag("--json", options->json, "Print JSON");
+    command->callback([options, &exitCode] { exitCode = runScan(*options); });
+}
+
+}  // namespace vexa::client

@@ -1,0 +1,133 @@
+#include <CLI/CLI.hpp>
+#include <array>
+#include <ctime>
+#include <iomanip>
+#include <iostream>
+#include <memory>
+
+#include "client/command/Commands.h"
+#include "client/command/PortOption.h"
+#include "client/hotspot/HotspotNarrator.h"
+#include "client/machine/MachineRegistry.h"
+#include "client/port/Activity.h"
+#include "client/port/EventLines.h"
+#include "client/spectrum/SpectralScan.h"
+#include "client/spectrum/SpectralText.h"
+#include "client/terminal/ClientError.h"
+
+namespace vexa::client {
+
+namespace {
+
+using std::chrono::milliseconds;
+using std::chrono::steady_clock;
+
+struct WatchOptions {
+    PortOption spectral{Half::Spectral};
+    PortOption hotspot{Half::Hotspot};
+    int seconds = 0;
+    bool json = false;
+};
+
+void say(const char* half, const std::string& sentence) {
+    const std::time_t now = std::time(nullptr);
+    std::cout << std::put_time(std::localtime(&now), "%H:%M:%S") << "  " << half << "  " << sentence << '\n';
+}
+
+/// Both halves of a service, and what they tell.
+class Watch {
+public:
+    explicit Watch(const WatchOptions& options)
+        : m_options(options),
+          m_hotspot(options.hotspot.find()),
+          m_spectral(options.spectral.find()),
+          m_machine(options.hotspot.machine()),
+          m_narrator([this] { return m_machine ? readConnectionMethod(*m_machine) : std::nullopt; }) {
+        ask(HotspotNarrator::firstQuestions());
+    }
+
+    std::array<Awaited, 2> awaited() const {
+        return {Awaited{m_hotspot.descriptor(), m_hotspot.events()},
+                Awaited{m_spectral.descriptor(), m_spectral.events()}};
+    }
+
+    /// Tells what has come. False once nobody reads it.
+    bool tell() {
+        tellHotspot();
+        tellSpectral();
+        std::cout << std::flush;
+        return !std::cout.fail();
+    }
+
+private:
+    void tellHotspot() {
+        m_hotspot.process();
+        while (const auto text = m_hotspot.take()) {
+            const auto event = parseEvent(*text);
+            if (m_options.json) printEvent(*text);
+            if (!event) continue;
+            for (const std::string& sentence : m_narrator.tell(*event)) {
+                if (!m_options.json) say("hotspot ", sentence);
+            }
+            ask(m_narrator.takeQuestions());
+        }
+        if (!m_hotspot.isOpen()) throw ClientError("the service has closed the connection");
+    }
+
+    void tellSpectral() {
+        for (const auto& told : m_spectral.process()) {
+            if (m_options.json)
+                printEvent(told.text);
+            else
+                say("spectrum", describeEvent(told.event, told.update, m_spectral.view()));
+        }
+    }
+
+    void ask(const std::vector<const char*>& questions) {
+        for (const char* question : questions)
+            m_hotspot.send(commandText(question));
+    }
+
+    const WatchOptions& m_options;
+    WebSocketClient m_hotspot;
+    SpectralScan m_spectral;
+    std::optional<MachineFolder> m_machine;
+    HotspotNarrator m_narrator;
+};
+
+std::optional<milliseconds> leftUntil(std::optional<steady_clock::time_point> end) {
+    if (!end) return std::nullopt;
+    return std::chrono::ceil<milliseconds>(*end - steady_clock::now());
+}
+
+int runWatch(const WatchOptions& options) {
+    Signals signals;
+    Watch watch(options);
+    std::optional<steady_clock::time_point> end;
+    if (options.seconds > 0) end = steady_clock::now() + std::chrono::seconds(options.seconds);
+    std::optional<TerminalKeys> keys;
+    if (TerminalKeys::isUsable()) keys.emplace();
+    while (watch.tell()) {
+        const auto left = leftUntil(end);
+        if (left && *left <= milliseconds(0)) break;
+        const Activity activity = waitForActivity(watch.awaited(), signals, keys ? &*keys : nullptr, left);
+        if (activity == Activity::StopAsked) break;
+    }
+    return kExitOk;
+}
+
+}  // namespace
+
+void addWatchCommand(CLI::App& app, int& exitCode) {
+    auto options = std::make_shared<WatchOptions>();
+    CLI::App* command =
+        app.add_subcommand("watch", "Tell all that happens on both halves of the service, until q or Ctrl-C");
+    PortOption::addBothTo(*command, options->spectral, options->hotspot);
+    command->add_option("--for", options->seconds, "End after so many seconds; default: go on")
+        ->type_name("SECONDS")
+        ->check(CLI::Range(1, 86400));
+    command->add_flag("--json", options->json, "Print JSON: an event a line");
+    command->callback([options, &exitCode] { exitCode = runWatch(*options); });
+}
+
+}  // namespace vexa::client

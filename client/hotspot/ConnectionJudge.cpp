@@ -1,0 +1,100 @@
+#include "client/hotspot/ConnectionJudge.h"
+
+#include <algorithm>
+#include <utility>
+
+#include "client/port/JsonLine.h"
+
+namespace vexa::client {
+
+namespace {
+
+constexpr const char* kCheck = "GET_IS_CARD_IN";
+constexpr const char* kList = "GET_ALL_NETWORK_LIST";
+constexpr const char* kService = "HotSpot20";
+
+// A connection that nothing was told of counts once it was seen so long; so does a network that is missing.
+constexpr std::chrono::milliseconds kSettled{900};
+
+bool hasLasted(std::optional<ConnectionJudge::Time>& since, ConnectionJudge::Time now) {
+    if (!since) since = now;
+    return now - *since >= kSettled;
+}
+
+}  // namespace
+
+const Network* ConnectionJudge::find(const NetworkList& list) const {
+    const auto found =
+        std::find_if(list.begin(), list.end(), [this](const Network& one) { return one.name == m_network; });
+    return found == list.end() ? nullptr : &*found;
+}
+
+std::vector<const char*> ConnectionJudge::takeQuestions() {
+    return std::exchange(m_questions, {});
+}
+
+// The service tells of the end of an attempt, of the internet then, and sends no list in between: a list that
+// comes behind a result knows what kind of result it was.
+Outcome ConnectionJudge::apply(const Event& event, Time now) {
+    const Json::Value payload = parseJson(event.data).value_or(Json::Value());
+    if (event.id == "CARD_PLUG_IN" || event.id == "CARD_PLUG_OUT") return applyCard(event);
+    if (event.id == "GET_RADIO" && payload == Json::Value(false)) return Outcome::RadioOff;
+    if (event.id == "CONNECT_DISCONNECT") {
+        m_results.push_back({payload == Json::Value(1), m_answersOwed == 0, false});
+        if (wantsLists()) m_questions.push_back(kList);
+    } else if (event.id == "GET_IS_INTERNET_ACCESS" && !m_results.empty()) {
+        m_results.back().isReport = true;
+    } else if (event.id == kList) {
+        return judge(networkList(payload), std::exchange(m_results, {}), now);
+    }
+    return Outcome::Open;
+}
+
+// Another client's question has the same answer. He would have to ask twice at the very moment to mislead us.
+Outcome ConnectionJudge::applyCard(const Event& event) {
+    if (event.id == "CARD_PLUG_OUT") return Outcome::AdapterOut;
+    if (event.source != kService || m_answersOwed == 0) return Outcome::Open;
+    if (--m_answersOwed > 0) m_questions.push_back(kCheck);
+    return Outcome::Open;
+}
+
+Outcome JoinJudge::judge(const NetworkList& list, const std::vector<Result>& results, Time now) {
+    const Network* const wanted = find(list);
+    if (wanted == nullptr || !wanted->isConnected) return judgeAbsent(wanted != nullptr, results, now);
+    m_missingSince.reset();
+    const bool isTold =
+        std::any_of(results.begin(), results.end(), [](const Result& result) { return result.isSuccess; });
+    return hasLasted(m_connectedSince, now) || isTold ? Outcome::Joined : Outcome::Open;
+}
+
+Outcome JoinJudge::judgeAbsent(bool isInList, const std::vector<Result>& results, Time now) {
+    m_connectedSince.reset();
+    if (isInList) m_missingSince.reset();
+    for (const Result& result : results) {
+        if (const Outcome outcome = judgeFailure(isInList, result); outcome != Outcome::Open) return outcome;
+    }
+    return !isInList && hasLasted(m_missingSince, now) ? Outcome::OutOfRange : Outcome::Open;
+}
+
+// A report that came before the service had come to the request is that of an attempt before. An answer that
+// came later is to a request of somebody else, unless the network has gone.
+Outcome JoinJudge::judgeFailure(bool isInList, const Result& result) {
+    if (result.isSuccess) return Outcome::Open;
+    if (result.isReport) return result.isBehind ? Outcome::Refused : Outcome::Open;
+    if (!isInList) return Outcome::OutOfRange;
+    return result.isBehind ? Outcome::Open : Outcome::NotStarted;
+}
+
+Outcome LeaveJudge::judge(const NetworkList& list, const std::vector<Result>& results, Time /*now*/) {
+    const Network* const wanted = find(list);
+    if (wanted != nullptr && wanted->isConnected) {
+        m_isConnected = true;
+        return Outcome::Open;
+    }
+    if (m_isConnected) return Outcome::Left;
+    const bool isTold =
+        std::any_of(results.begin(), results.end(), [](const Result& result) { return result.isReport; });
+    return isTold ? Outcome::Ended : Outcome::Open;
+}
+
+}  // namespace vexa::client

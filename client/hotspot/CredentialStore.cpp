@@ -1,0 +1,133 @@
+#include "client/hotspot/CredentialStore.h"
+
+#include <json/value.h>
+
+#include <algorithm>
+
+#include "client/hotspot/CredentialText.h"
+#include "client/port/JsonLine.h"
+#include "client/terminal/Text.h"
+
+namespace vexa::client {
+
+namespace {
+
+constexpr const char* kListEvent = "GET_ALL_CREDENTIAL_LIST";
+constexpr const char* kNoList = "the service tells of no credentials: it has no adapter";
+constexpr const char* kNotKnown = "; whether the change was made is not known";
+constexpr const char* kUnknownReason = "the service refused it; its log may say why";
+
+std::string idData(int id) {
+    Json::Value data(Json::objectValue);
+    data["Id"] = id;
+    return jsonLine(data);
+}
+
+std::string positionData(int id, std::size_t position) {
+    Json::Value data(Json::objectValue);
+    data["Id"] = id;
+    data["Order"] = static_cast<Json::UInt64>(position - 1);
+    return jsonLine(data);
+}
+
+/// What the service makes of a credential that it adds, but for the id and a creator that it chooses.
+Credential asStored(Credential wanted, const Credential& stored) {
+    wanted.id = stored.id;
+    if (wanted.name.empty()) wanted.name = wanted.realm;
+    if (wanted.creator.empty()) wanted.creator = stored.creator;
+    return wanted;
+}
+
+const Credential* findAdded(const CredentialList& before, const CredentialList& after,
+                            const Credential& wanted) {
+    const auto isIt = [&](const Credential& candidate) {
+        return findById(before, candidate.id) == nullptr && candidate == asStored(wanted, candidate);
+    };
+    const auto found = std::find_if(after.begin(), after.end(), isIt);
+    return found == after.end() ? nullptr : &*found;
+}
+
+/// Why the service does not take another one like this.
+std::string reasonAgainst(const CredentialList& list, const Credential& wanted) {
+    const std::string& name = wanted.name.empty() ? wanted.realm : wanted.name;
+    for (const auto& other : list) {
+        if (other.type == wanted.type && other.realm == wanted.realm)
+            return nameOf(other) + " is for " + methodName(other) + " and this realm already";
+    }
+    for (const auto& other : list) {
+        if (other.name == name) return "the name is taken by " + nameOf(other);
+    }
+    return kUnknownReason;
+}
+
+}  // namespace
+
+const CredentialList& CredentialStore::read() {
+    const auto answer = m_port.question(kListEvent, acceptsAny);
+    if (!answer.payload) throw ClientError(kNoList);
+    return m_list = credentialList(*answer.payload);
+}
+
+// A list that another client has asked for may be older than the file, so that only the last one will do.
+const CredentialList& CredentialStore::reload() {
+    m_port.tell("READ_CREDENTIAL_FROM_FILE");
+    const auto answer =
+        m_port.ask(kListEvent, std::nullopt, kListEvent, [](const Json::Value&) { return false; });
+    if (!answer.payload) throw ClientError(kNoList);
+    return m_list = credentialList(*answer.payload);
+}
+
+const Credential& CredentialStore::add(const Credential& wanted) {
+    const CredentialList before = m_list;
+    const bool isMade = change("ADD_CREDENTIAL", credentialData(wanted), [&](const CredentialList& after) {
+        return findAdded(before, after, wanted) != nullptr;
+    });
+    if (!isMade) throw ClientError("not stored: " + reasonAgainst(m_list, wanted));
+    return *findAdded(before, m_list, wanted);
+}
+
+void CredentialStore::edit(const Credential& wanted) {
+    const bool isMade = change("EDIT_CREDENTIAL", credentialData(wanted), [&](const CredentialList& after) {
+        const Credential* now = findById(after, wanted.id);
+        return now != nullptr && *now == wanted;
+    });
+    if (isMade) return;
+    if (findById(m_list, wanted.id) == nullptr)
+        throw ClientError("not changed: there is no credential " + std::to_string(wanted.id) + " any more");
+    throw ClientError(std::string("not changed: ") + kUnknownReason);
+}
+
+void CredentialStore::erase(int id) {
+    const bool isMade = change("DELETE_CREDENTIAL", idData(id),
+                               [id](const CredentialList& after) { return findById(after, id) == nullptr; });
+    if (!isMade) throw ClientError(std::string("not deleted: ") + kUnknownReason);
+}
+
+std::size_t CredentialStore::move(int id, std::size_t position) {
+    const bool isMade =
+        change("SET_POSITION_CREDENTIAL", positionData(id, position), [&](const CredentialList& after) {
+            return findById(after, id) != nullptr &&
+                   positionOf(after, id) == std::min(position, after.size());
+        });
+    if (isMade) return positionOf(m_list, id);
+    if (findById(m_list, id) == nullptr)
+        throw ClientError("not moved: there is no credential " + std::to_string(id) + " any more");
+    throw ClientError("not moved as asked: it is in position " + std::to_string(positionOf(m_list, id)));
+}
+
+bool CredentialStore::change(const std::string& command, const std::string& data, const Shows& shows) {
+    try {
+        const auto answer = m_port.ask(command, data, kListEvent, [&](const Json::Value& payload) {
+            m_list = credentialList(payload);
+            return shows(m_list);
+        });
+        if (!answer.payload) throw ClientError(kNoList);
+        return answer.isAccepted;
+    } catch (const StoppedByUser& error) {
+        throw StoppedByUser(error.what() + std::string(kNotKnown));
+    } catch (const NoAnswer& error) {
+        throw NoAnswer(error.what() + std::string(kNotKnown));
+    }
+}
+
+}  // namespace vexa::client

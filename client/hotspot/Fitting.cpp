@@ -1,0 +1,47 @@
+#include "client/hotspot/Fitting.h"
+
+#include <algorithm>
+#include <iterator>
+
+namespace vexa::client {
+
+namespace {
+
+bool isComplete(const Credential& credential) {
+    return credential.method != kMethodTtls || !(credential.username.empty() || credential.password.empty());
+}
+
+bool fits(const Credential& credential, const Network& network) {
+    const Network::Realm wanted{credential.method, credential.realm};
+    return isComplete(credential) &&
+           std::find(network.realms.begin(), network.realms.end(), wanted) != network.realms.end();
+}
+
+}  // namespace
+
+CredentialList fittingCredentials(const CredentialList& all, const Network& network) {
+    CredentialList fitting;
+    std::copy_if(all.begin(), all.end(), std::back_inserter(fitting),
+                 [&](const Credential& credential) { return fits(credential, network); });
+    return fitting;
+}
+
+std::vector<std::string> credentialsBehind(const CredentialList& all, const Network& network,
+                                           std::optional<int> method) {
+    std::vector<std::string> names;
+    for (const Credential& credential : fittingCredentials(all, network)) {
+        if (credential.method == method.value_or(credential.method)) names.push_back(credential.name);
+    }
+    return names;
+}
+
+std::string alternatives(const std::vector<std::string>& names) {
+    std::string text;
+    for (std::size_t i = 0; i < names.size(); ++i) {
+        if (i > 0) text += i + 1 == names.size() ? " or " : ", ";
+        text += names[i];
+    }
+    return text;
+}
+
+}  // namespace vexa::client

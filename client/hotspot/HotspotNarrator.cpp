@@ -1,0 +1,184 @@
+#include "client/hotspot/HotspotNarrator.h"
+
+#include <json/value.h>
+
+#include <algorithm>
+#include <array>
+#include <utility>
+
+#include "client/hotspot/CredentialText.h"
+#include "client/hotspot/Fitting.h"
+#include "client/port/JsonLine.h"
+#include "client/terminal/Text.h"
+
+namespace vexa::client {
+
+namespace {
+
+constexpr const char* kNetworks = "GET_ALL_NETWORK_LIST";
+constexpr const char* kCredentials = "GET_ALL_CREDENTIAL_LIST";
+
+const Network* find(const NetworkList& list, const std::string& name) {
+    const auto found =
+        std::find_if(list.begin(), list.end(), [&](const Network& network) { return network.name == name; });
+    return found == list.end() ? nullptr : &*found;
+}
+
+std::string connectedName(const NetworkList& list) {
+    const Network* const network = connectedNetwork(list);
+    return network == nullptr ? "" : network->name;
+}
+
+std::string namesOf(const NetworkList& list) {
+    std::string names;
+    for (const Network& network : list)
+        names += (names.empty() ? "" : ", ") + inQuotes(network.name);
+    return names.empty() ? "none" : names;
+}
+
+/// Said when a flag has another value than before.
+std::vector<std::string> flagChange(std::optional<bool>& known, const Json::Value& payload, const char* yes,
+                                    const char* no) {
+    if (!payload.isBool() || known == payload.asBool()) return {};
+    known = payload.asBool();
+    return {*known ? yes : no};
+}
+
+}  // namespace
+
+struct HotspotNarrator::Entry {
+    const char* event;
+    Teller teller;
+};
+
+const HotspotNarrator::Entry* HotspotNarrator::entryOf(const std::string& event) {
+    static constexpr std::array kEntries{Entry{kNetworks, &HotspotNarrator::tellNetworks},
+                                         Entry{kCredentials, &HotspotNarrator::tellCredentials},
+                                         Entry{"GET_RADIO", &HotspotNarrator::tellRadio},
+                                         Entry{"SET_HOTSPOT_AUTO_CONNECT", &HotspotNarrator::tellSwitch},
+                                         Entry{"CARD_PLUG_IN", &HotspotNarrator::tellCardIn},
+                                         Entry{"CARD_PLUG_OUT", &HotspotNarrator::tellCardOut},
+                                         Entry{"CONNECT_DISCONNECT", &HotspotNarrator::tellResult},
+                                         Entry{"GET_IS_INTERNET_ACCESS", &HotspotNarrator::tellInternet},
+                                         Entry{"DETECTED_HOTSPOT", &HotspotNarrator::tellDetected},
+                                         Entry{"SUPPLICANT_STATE_CHANGE", &HotspotNarrator::tellModuleState}};
+    const auto found = std::find_if(kEntries.begin(), kEntries.end(),
+                                    [&](const Entry& entry) { return event == entry.event; });
+    return found == kEntries.end() ? nullptr : &*found;
+}
+
+std::vector<const char*> HotspotNarrator::firstQuestions() {
+    return {"GET_IS_CARD_IN", "GET_RADIO", kCredentials, kNetworks, "GET_IS_INTERNET_ACCESS"};
+}
+
+std::vector<std::string> HotspotNarrator::tell(const Event& event) {
+    const Json::Value payload = parseJson(event.data).value_or(Json::Value());
+    if (const Entry* const entry = entryOf(event.id)) return (this->*entry->teller)(payload);
+    return {printable(event.data.empty() ? event.id : event.id + " " + jsonLine(payload))};
+}
+
+std::vector<const char*> HotspotNarrator::takeQuestions() {
+    return std::exchange(m_questions, {});
+}
+
+// A success does not name its network; the list that was asked for then does. A connection of the system's
+// own is told as a success whatever came of it.
+HotspotNarrator::Sentences HotspotNarrator::tellResult(const Json::Value& payload) {
+    m_questions.push_back(kNetworks);
+    if (payload != Json::Value(1)) return {"an attempt to connect has failed"};
+    m_isResultOpen = true;
+    return {};
+}
+
+HotspotNarrator::Sentences HotspotNarrator::tellNetworks(const Json::Value& payload) {
+    const NetworkList before = std::exchange(m_networks, networkList(payload));
+    const bool isResultOpen = std::exchange(m_isResultOpen, false);
+    if (!std::exchange(m_hasNetworks, true)) return firstNetworks();
+    Sentences told = newNetworks(before);
+    const Network* const connected = connectedNetwork(m_networks);
+    if (connected == nullptr && isResultOpen && connectedNetwork(before) == nullptr)
+        told.emplace_back("the system has tried a connection of its own");
+    if (connected != nullptr && connected->name != connectedName(before)) {
+        m_joined.push_back(connected->name);
+        told.push_back("joined " + withCredential(*connected));
+    }
+    return told;
+}
+
+HotspotNarrator::Sentences HotspotNarrator::firstNetworks() const {
+    Sentences told{"hotspots in range: " + namesOf(m_networks)};
+    if (const Network* const connected = connectedNetwork(m_networks))
+        told.push_back("connected to " + withCredential(*connected));
+    return told;
+}
+
+HotspotNarrator::Sentences HotspotNarrator::newNetworks(const NetworkList& before) {
+    Sentences told;
+    const std::string connected = connectedName(before);
+    if (!connected.empty() && connected != connectedName(m_networks))
+        told.push_back("the connection to " + inQuotes(connected) + " has ended");
+    for (const Network& network : before) {
+        if (find(m_networks, network.name) == nullptr)
+            told.push_back(inQuotes(network.name) + " is out of range");
+    }
+    for (const Network& network : m_networks) {
+        const Network* const known = find(before, network.name);
+        const std::string realms = printable(realmsText(network));
+        if (known == nullptr)
+            told.push_back(inQuotes(network.name) + " is in range; realms: " + realms);
+        else if (realmsText(*known) != realmsText(network))
+            told.push_back("realms of " + inQuotes(network.name) + ": " + realms);
+    }
+    return told;
+}
+
+std::string HotspotNarrator::withCredential(const Network& network) const {
+    std::vector<std::string> names;
+    for (const std::string& name : credentialsBehind(m_credentials, network, m_method()))
+        names.push_back(inQuotes(name));
+    return inQuotes(network.name) +
+           (names.empty() ? ", with no credential of ours" : " with the credential " + alternatives(names));
+}
+
+HotspotNarrator::Sentences HotspotNarrator::tellCredentials(const Json::Value& payload) {
+    const CredentialList before = std::exchange(m_credentials, credentialList(payload));
+    if (!std::exchange(m_hasCredentials, true))
+        return {counted(m_credentials.size(), "credential") + " stored"};
+    return credentialChanges(before, m_credentials);
+}
+
+HotspotNarrator::Sentences HotspotNarrator::tellRadio(const Json::Value& payload) {
+    return flagChange(m_isRadioOn, payload, "the radio is on", "the radio is off");
+}
+
+HotspotNarrator::Sentences HotspotNarrator::tellSwitch(const Json::Value& payload) {
+    return {payload == Json::Value(true) ? "hotspot networks are enabled" : "hotspot networks are disabled"};
+}
+
+// One that comes has networks and credentials to tell; all later lists come by themselves.
+HotspotNarrator::Sentences HotspotNarrator::tellCardIn(const Json::Value& /*payload*/) {
+    if (m_isCardIn == true) return {};
+    if (m_isCardIn) m_questions.insert(m_questions.end(), {kCredentials, kNetworks});
+    return flagChange(m_isCardIn, true, "the adapter is in", "");
+}
+
+HotspotNarrator::Sentences HotspotNarrator::tellCardOut(const Json::Value& /*payload*/) {
+    m_networks.clear();
+    return flagChange(m_isCardIn, false, "", "the adapter is out");
+}
+
+HotspotNarrator::Sentences HotspotNarrator::tellInternet(const Json::Value& payload) {
+    return flagChange(m_hasInternet, payload, "the internet is reached", "the internet is not reached");
+}
+
+HotspotNarrator::Sentences HotspotNarrator::tellDetected(const Json::Value& /*payload*/) {
+    return {"new hotspots were detected"};
+}
+
+HotspotNarrator::Sentences HotspotNarrator::tellModuleState(const Json::Value& payload) {
+    if (!payload.isObject()) return {};
+    return {"the hotspot module went from state " + jsonLine(payload["PreviousState"]) + " to " +
+            jsonLine(payload["CurrentState"])};
+}
+
+}  // namespace vexa::client

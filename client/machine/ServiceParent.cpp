@@ -1,0 +1,193 @@
+#include "client/machine/ServiceParent.h"
+
+#include <algorithm>
+#include <iostream>
+
+#include "client/machine/ServiceHost.h"
+#include "client/machine/ServiceProcess.h"
+#include "client/terminal/ClientError.h"
+
+namespace vexa::client {
+
+namespace fs = std::filesystem;
+using std::chrono::milliseconds;
+using std::chrono::seconds;
+using std::chrono::steady_clock;
+
+namespace {
+
+constexpr const char* kStopMutexName = "{39EAA3ED-1A26-46B7-90A7-AAFFECE80392}";
+
+constexpr seconds kReadyLimit{10};
+constexpr milliseconds kFirstCheck{10};
+constexpr milliseconds kLongestCheck{100};
+constexpr seconds kStopLimit{30};
+constexpr seconds kGiveUpLimit{2};
+
+constexpr int kScenarioRefused = 2;
+
+fs::path servicePath(const std::string& given) {
+    return given.empty() ? serviceBesideThis() : fs::absolute(given);
+}
+
+std::set<std::uint16_t> wantedPorts(const ServicePorts& ports) {
+    std::set<std::uint16_t> wanted{ports.sa, ports.hs20, ports.control};
+    wanted.erase(0);
+    return wanted;
+}
+
+std::string portNames(const ServicePorts& ports) {
+    std::string names;
+    for (const std::uint16_t port : wantedPorts(ports))
+        names += (names.empty() ? "" : ", ") + std::to_string(port);
+    return names;
+}
+
+}  // namespace
+
+ServiceParent::ServiceParent(const StartRequest& request, StopSource& stop)
+    : m_stop(stop), m_folder(request.machine) {
+    m_folder.create();
+    takeMutex();
+    choosePorts(request);
+    start(request);
+}
+
+ServiceParent::~ServiceParent() {
+    try {
+        if (m_process && !m_process->exitCode()) stop();
+    } catch (const std::exception&) {  // the process kills what still runs when it goes
+    }
+}
+
+void ServiceParent::takeMutex() {
+    enterMachine(m_folder);
+    m_mutex = std::make_unique<platform::NamedMutex>(kStopMutexName, platform::NamedMutex::Owner::Yes);
+    if (!m_mutex->isValid()) {
+        throw ClientError("the stop mutex cannot be made in " + m_folder.path().string(), kExitNotStarted);
+    }
+    if (!m_mutex->isOwned()) {
+        throw ClientError(
+            "the machine " + m_folder.path().string() + " has a service already, started by another parent",
+            kExitNotStarted);
+    }
+}
+
+void ServiceParent::choosePorts(const StartRequest& request) {
+    const TcpPorts table = TcpPorts::read();
+    m_ports = {request.saPort, request.hs20Port, request.controlPort.value_or(0)};
+    const auto choose = [&](std::uint16_t& port) {
+        if (port != 0) return;
+        m_reserved.push_back(table.reserveFree());
+        port = m_reserved.back().port;
+    };
+    choose(m_ports.sa);
+    choose(m_ports.hs20);
+    if (request.controlPort) choose(m_ports.control);
+    for (const std::uint16_t port : wantedPorts(m_ports))
+        m_listenersBefore[port] = table.listeners(port);
+}
+
+void ServiceParent::start(const StartRequest& request) {
+    ServiceProgram program;
+    program.executable = servicePath(request.service);
+    program.arguments = {std::to_string(m_ports.sa), std::to_string(m_ports.hs20)};
+    describeMachine(program, m_folder, request, m_ports.control);
+    program.outputFile = m_folder.outputFile();
+    m_process = std::make_unique<ServiceProcess>(program);
+}
+
+ServiceParent::State ServiceParent::waitUntilReady() {
+    const auto deadline = steady_clock::now() + kReadyLimit;
+    for (milliseconds pause = kFirstCheck;; pause = std::min(pause + milliseconds(1), kLongestCheck)) {
+        if (const auto code = m_process->exitCode()) {
+            reportEarlyEnd(*code);
+            return State::Ended;
+        }
+        if (portsListen()) break;
+        if (steady_clock::now() >= deadline) giveUp();
+        if (m_stop.wait(pause) == StopSource::Wake::Stop) return State::StopRequested;
+    }
+    m_reserved.clear();
+    if (!writePortsFile(m_folder.portsFile(), m_ports)) {
+        std::cerr << "vexa: the ports cannot be written to " << m_folder.portsFile().string() << '\n';
+    }
+    return State::Ready;
+}
+
+ServiceParent::State ServiceParent::waitForEnd() {
+    while (!m_process->exitCode()) {
+        if (m_stop.wait(std::nullopt) == StopSource::Wake::Stop) return State::StopRequested;
+    }
+    return State::Ended;
+}
+
+int ServiceParent::stop() {
+    letGo();
+    if (!waitForExit(kStopLimit)) {
+        std::cerr << "vexa: the service did not stop within " << kStopLimit.count() << " s and was killed\n";
+        m_process->kill();
+    }
+    return m_process->exitCode().value_or(kExitFailed);
+}
+
+int ServiceParent::stopSoon(milliseconds patience) {
+    letGo();
+    if (waitForExit(patience)) return m_process->exitCode().value_or(kExitFailed);
+    m_process->kill();
+    return kExitOk;
+}
+
+std::optional<int> ServiceParent::exitCode() {
+    return m_process->exitCode();
+}
+
+// A listener that was there before belongs to somebody else, even if the port is the one that we want.
+bool ServiceParent::portsListen() const {
+    const TcpPorts table = TcpPorts::read();
+    for (const auto& [port, before] : m_listenersBefore) {
+        std::set<std::uint64_t> now = table.listeners(port);
+        for (const std::uint64_t socket : before)
+            now.erase(socket);
+        if (now.empty()) return false;
+    }
+    return true;
+}
+
+bool ServiceParent::waitForExit(milliseconds limit) {
+    const auto deadline = steady_clock::now() + limit;
+    while (!m_process->exitCode()) {
+        const auto left = std::chrono::ceil<milliseconds>(deadline - steady_clock::now());
+        if (left <= milliseconds(0)) return false;
+        m_stop.wait(left);
+    }
+    return true;
+}
+
+void ServiceParent::letGo() {
+    std::error_code ignored;
+    fs::remove(m_folder.portsFile(), ignored);
+    if (m_mutex->isOwned()) m_mutex->release();
+}
+
+void ServiceParent::giveUp() {
+    letGo();
+    if (!waitForExit(kGiveUpLimit)) m_process->kill();
+    throw ClientError("the service did not listen on the ports " + portNames(m_ports) + " within " +
+                          std::to_string(kReadyLimit.count()) + " s; its output is in " +
+                          m_folder.outputFile().string(),
+                      kExitNotStarted);
+}
+
+void ServiceParent::reportEarlyEnd(int exitCode) const {
+    if (exitCode == kScenarioRefused) return;  // it has said so itself
+    std::cerr << "vexa: the service ended with exit code " << exitCode << " before it was ready: ";
+    if (exitCode == 0) {
+        std::cerr << "another one seems to run on the machine " << m_folder.path().string() << '\n';
+    } else {
+        std::cerr << "one of the ports " << portNames(m_ports) << " may be busy; its output is in "
+                  << m_folder.outputFile().string() << '\n';
+    }
+}
+
+}  // namespace vexa::client

@@ -1,0 +1,33 @@
+#include "client/port/JsonLine.h"
+
+#include <json/reader.h>
+#include <json/writer.h>
+
+#include <memory>
+
+namespace vexa::client {
+
+std::string jsonLine(const Json::Value& value) {
+    Json::StreamWriterBuilder builder;
+    builder["indentation"] = "";
+    builder["emitUTF8"] = true;
+    return Json::writeString(builder, value);
+}
+
+std::optional<Json::Value> parseJson(std::string_view text) {
+    const std::unique_ptr<Json::CharReader> reader(Json::CharReaderBuilder().newCharReader());
+    Json::Value value;
+    try {
+        if (reader->parse(text.data(), text.data() + text.size(), &value, nullptr)) return value;
+    } catch (const Json::Exception&) {  // nested too deep
+    }
+    return std::nullopt;
+}
+
+std::optional<Json::Value> parseJsonObject(std::string_view text) {
+    auto value = parseJson(text);
+    if (!value || !value->isObject()) return std::nullopt;
+    return value;
+}
+
+}  // namespace vexa::client

@@ -1,0 +1,38 @@
+#include "client/spectrum/SpectralScan.h"
+
+#include "client/terminal/ClientError.h"
+
+namespace vexa::client {
+
+SpectralScan::SpectralScan(std::uint16_t port) : m_client(port) {
+    m_client.send(commandText("GET_CHANNEL_LIST"));
+}
+
+SpectralScan::~SpectralScan() {
+    stop();
+}
+
+void SpectralScan::start() {
+    m_client.send(commandText("FULL_SCAN"));
+    m_scanning = true;
+}
+
+void SpectralScan::stop() {
+    if (m_scanning) m_client.send(commandText("STOP_SCAN"));
+    m_scanning = false;
+}
+
+std::vector<SpectralScan::Told> SpectralScan::process() {
+    m_client.process();
+    std::vector<Told> told;
+    while (auto text = m_client.take()) {
+        const auto event = parseEvent(*text);
+        if (!event) continue;
+        const auto update = m_view.apply(*event);
+        told.push_back({std::move(*text), *event, update});
+    }
+    if (told.empty() && !m_client.isOpen()) throw ClientError("the service has closed the connection");
+    return told;
+}
+
+}  // namespace vexa::client

@@ -1,0 +1,135 @@
+#include "client/spectrum/SpectrumOutput.h"
+
+#include <iomanip>
+#include <iostream>
+#include <sstream>
+
+#include "client/port/JsonLine.h"
+#include "client/spectrum/SpectralPicture.h"
+#include "client/spectrum/SpectralText.h"
+#include "client/terminal/Text.h"
+
+namespace vexa::client {
+
+using std::chrono::milliseconds;
+using std::chrono::steady_clock;
+
+namespace {
+
+constexpr milliseconds kBetweenDrawings{100};
+
+std::string secondsSince(steady_clock::time_point start) {
+    std::ostringstream out;
+    out << std::fixed << std::setprecision(2) << std::setw(7)
+        << std::chrono::duration<double>(steady_clock::now() - start).count() << " s";
+    return out.str();
+}
+
+void printLines(const std::vector<std::string>& lines) {
+    for (const auto& line : lines)
+        std::cout << line << '\n';
+    std::cout << std::flush;
+}
+
+}  // namespace
+
+SpectrumOutput::SpectrumOutput(Form form, const SideShow* side)
+    : m_form(form), m_side(side), m_start(steady_clock::now()), m_nextDrawing(m_start) {
+    if (form == Form::Readable && TerminalScreen::isUsable()) {
+        m_screen.emplace();
+    } else if (m_side != nullptr) {
+        printLines(m_side->opening(form == Form::Json));
+    }
+}
+
+void SpectrumOutput::show(const std::vector<SpectralScan::Told>& told, const SpectralView& view) {
+    if (told.empty()) return;
+    m_changed = true;
+    if (m_screen) return;
+    for (const auto& event : told)
+        printLine(event, view);
+    std::cout << std::flush;
+}
+
+void SpectrumOutput::showSide(const std::vector<SideShow::Item>& items) {
+    if (items.empty()) return;
+    m_changed = true;
+    if (m_screen) return;
+    for (const auto& item : items) {
+        if (m_form == Form::Json && !item.json.empty())
+            std::cout << item.json << '\n';
+        else if (m_form == Form::Readable && !item.sentence.empty())
+            std::cout << secondsSince(m_start) << "  " << item.sentence << '\n';
+    }
+    std::cout << std::flush;
+}
+
+void SpectrumOutput::printLine(const SpectralScan::Told& told, const SpectralView& view) const {
+    if (m_form == Form::Json) {
+        std::cout << jsonLine(parseJson(told.text).value_or(Json::Value())) << '\n';
+    } else {
+        std::cout << secondsSince(m_start) << "  " << describeEvent(told.event, told.update, view) << '\n';
+    }
+}
+
+std::optional<milliseconds> SpectrumOutput::refresh(const SpectralView& view) {
+    if (!m_screen || !m_changed) return std::nullopt;
+    const auto now = steady_clock::now();
+    if (now < m_nextDrawing) return std::chrono::ceil<milliseconds>(m_nextDrawing - now);
+    auto lines = picture(view);
+    lines.front() += "   (q or Ctrl-C ends)";
+    m_screen->draw(lines);
+    m_changed = false;
+    m_nextDrawing = now + kBetweenDrawings;
+    return std::nullopt;
+}
+
+void SpectrumOutput::finish(const SpectralView& view) {
+    if (m_screen) {
+        const auto lines = picture(view);
+        m_screen.reset();
+        printLines(lines);
+    }
+    printSummary(view);
+}
+
+void SpectrumOutput::printSummary(const SpectralView& view) const {
+    if (m_form == Form::Json) {
+        Json::Value object = summaryJson(view);
+        if (m_side != nullptr) m_side->addSummary(object);
+        std::cout << jsonLine(object) << std::endl;
+    } else {
+        std::cout << summaryText(view) << (m_side != nullptr ? "; " + m_side->summary() : "") << std::endl;
+    }
+}
+
+std::vector<std::string> SpectrumOutput::picture(const SpectralView& view) const {
+    auto lines =
+        drawSpectrum(view, {m_screen->columns(), TerminalScreen::wantsColour(), TerminalScreen::isUtf8()});
+    if (m_side == nullptr) return lines;
+    const int left = m_screen->rows() - static_cast<int>(lines.size());
+    const auto below =
+        m_side->lines({m_screen->columns(), left, m_screen->rows(), TerminalScreen::wantsColour()});
+    lines.insert(lines.end(), below.begin(), below.end());
+    return lines;
+}
+
+void SpectrumOutput::handleSignal(Signal signal) {
+    if (signal == Signal::Suspend) {
+        if (m_screen) m_screen->leave();
+        Signals::suspend();
+        if (m_screen) m_screen->enter();
+    }
+    if (signal == Signal::Resize && m_screen) m_screen->resized();
+    m_changed = true;
+}
+
+bool SpectrumOutput::isQuitKey() {
+    return m_screen->keys().takeQuit();
+}
+
+bool SpectrumOutput::isGone() const {
+    return !std::cout;
+}
+
+}  // namespace vexa::client

@@ -1,0 +1,49 @@
+#include "channel/JsonText.h"
+
+// The styled writer's text is what clients know; the library's newer one indents otherwise.
+#if defined(__GNUC__)
+#pragma GCC diagnostic ignored "-Wdeprecated-declarations"
+#endif
+
+#include <json/reader.h>
+#include <json/writer.h>
+
+#include <new>
+
+namespace vexa {
+
+std::string toStyledText(const Json::Value& value) {
+    Json::StyledWriter writer;
+    return writer.write(value);
+}
+
+std::optional<Json::Value> parseReceived(std::string_view bytes) {
+    try {
+        return parseJsonText(bytes.substr(0, bytes.find('\0')));
+    } catch (const std::bad_alloc&) {
+        return std::nullopt;
+    }
+}
+
+Json::Value parseJsonText(std::string_view text) {
+    Json::Value root;
+    Json::Reader reader;
+    try {
+        reader.parse(text.data(), text.data() + text.size(), root);
+    } catch (const Json::Exception&) {
+        return {};
+    }
+    return root;
+}
+
+std::optional<std::string> readText(const Json::Value& object, const char* member) {
+    if (object.isNull()) return std::string();
+    if (!object.isObject()) return std::nullopt;
+    const Json::Value& value = object[member];
+    if (value.isNull()) return std::string();
+    if (value.isBool()) return value.asBool() ? "true" : "false";
+    if (value.isString()) return value.asString();
+    return std::nullopt;
+}
+
+}  // namespace vexa

@@ -1,0 +1,108 @@
+#include <algorithm>
+#include <array>
+#include <string_view>
+
+#include "base/DiagnosticLog.h"
+#include "channel/JsonText.h"
+#include "connection/Supplicant.h"
+#include "connection/SupplicantMgr.h"
+#include "hotspotport/CredentialCommands.h"
+#include "hotspotport/SAHotSpotPortlink.h"
+
+namespace vexa {
+
+namespace {
+
+using Server = SAHotSpotPortlink;
+
+/// False: the command's data can't be read.
+using Action = bool (*)(Server& server, const Json::Value& data);
+
+struct Command {
+    std::string_view id;
+    Action act;
+    bool listsAlways = false;  // answers with the list of credentials whatever its data is
+};
+
+template <void (Server::*Send)()>
+bool answer(Server& server, const Json::Value& /*data*/) {
+    (server.*Send)();
+    return true;
+}
+
+// The client learns of a change that failed by a list that is as it was.
+template <Action Change>
+bool changeCredentials(Server& server, const Json::Value& data) {
+    const bool isReadable = Change(server, data);
+    server.SendCredentialList();
+    return isReadable;
+}
+
+bool reload(Server& server, const Json::Value& /*data*/) {
+    const auto supplicant = hotspotSupplicant(server);
+    if (supplicant && supplicant->m_pMgr != nullptr) supplicant->m_pMgr->reloadData();
+    return true;
+}
+
+// Sends nothing while no adapter is present.
+bool networkList(Server& server, const Json::Value& /*data*/) {
+    if (server.m_bCardIn) server.SendNetworkList(nullptr);
+    return true;
+}
+
+bool autoConnect(Server& server, const Json::Value& data) {
+    if (!data.isNull() && !data.isBool()) return false;
+    server.setHotSpotAutoConnect(data.isBool() && data.asBool());
+    return true;
+}
+
+template <void (Server::*Act)(const std::string& name)>
+bool withNetwork(Server& server, const Json::Value& data) {
+    const auto name = readText(data, "NetWorkName");
+    if (!name || (data.isObject() && data["NetWorkName"].isBool())) return false;
+    (server.*Act)(*name);
+    return true;
+}
+
+constexpr std::array<Command, 14> kCommands = {{
+    {"UPDATE_NETWORK_REALM", answer<&Server::updateNetworkRealm>},
+    {"GET_RADIO", answer<&Server::SendRadioState>},
+    {"SET_HOTSPOT_AUTO_CONNECT", autoConnect},
+    {"GET_IS_CARD_IN", answer<&Server::SendCardState>},
+    {"READ_CREDENTIAL_FROM_FILE", reload},
+    {"GET_ALL_CREDENTIAL_LIST", answer<&Server::SendCredentialList>, true},
+    {"ADD_CREDENTIAL", changeCredentials<addCredential>, true},
+    {"DELETE_CREDENTIAL", changeCredentials<deleteCredential>, true},
+    {"EDIT_CREDENTIAL", changeCredentials<editCredential>, true},
+    {"SET_POSITION_CREDENTIAL", changeCredentials<setCredentialPosition>, true},
+    {"CONNECT_NETWORK", withNetwork<&Server::connectNetworkByName>},
+    {"DISCONNECT_NETWORK", withNetwork<&Server::disconnectNetworkByName>},
+    {"GET_ALL_NETWORK_LIST", networkList},
+    {"GET_IS_INTERNET_ACCESS", answer<&Server::SendInternetAccess>},
+}};
+
+void logInvalidCommand(const std::string& id) {
+    Log(6, "ERROR: Invalid command received from UI, command=%s", id.c_str());
+}
+
+}  // namespace
+
+void SAHotSpotPortlink::OnIpcMessage(const char* bytes, std::uint32_t length, void* context) {
+    if (context == nullptr || bytes == nullptr || length == 0) return;
+    if (const auto message = parseReceived({bytes, length}))
+        static_cast<Server*>(context)->HandleCommand(*message);
+}
+
+void SAHotSpotPortlink::HandleCommand(const Json::Value& root) {
+    const auto id = readText(root, "CommandId");
+    if (!id) return logInvalidCommand("");
+    const auto command = std::find_if(kCommands.begin(), kCommands.end(),
+                                      [&](const Command& candidate) { return candidate.id == *id; });
+    if (command == kCommands.end()) return logInvalidCommand(*id);
+    const auto dataText = readText(root, "Data");
+    if (dataText && command->act(*this, parseJsonText(*dataText))) return;
+    Log(6, "ERROR: Invalid data received from UI, command=%s", id->c_str());
+    if (!dataText && command->listsAlways) SendCredentialList();
+}
+
+}  // namespace vexa

@@ -1,0 +1,90 @@
+#include "base/DiagnosticLog.h"
+#include "base/NetworkListLock.h"
+#include "base/StandardOutput.h"
+#include "base/WlanMemory.h"
+#include "channel/JsonText.h"
+#include "config/Config.h"
+#include "connection/Supplicant.h"
+#include "connection/SupplicantMgr.h"
+#include "hotspotport/SAHotSpotPortlink.h"
+#include "text/TextConversion.h"
+
+namespace vexa {
+
+namespace {
+
+constexpr std::size_t kSupplicantStateSize = 8;
+
+Json::Value asJson(const Credential& credential) {
+    Json::Value object;
+    object["Id"] = credential.m_id;
+    object["Type"] = credential.m_type;
+    object["AccessType"] = credential.m_accessType;
+    object["CredentialEapMethod"] = credential.m_eapMethod;
+    object["AutoConnect"] = credential.m_bAutoConnect;
+    object["CredentialName"] = utf8FromWide(credential.m_credName);
+    object["RealName"] = utf8FromWide(credential.m_realm);
+    object["Creator"] = utf8FromWide(credential.m_creator);
+    object["CaCert"] = utf8FromWide(credential.m_caCert);
+    object["ClientCert"] = utf8FromWide(credential.m_clientCert);
+    object["Username"] = utf8FromWide(credential.m_username);
+    object["Password"] = utf8FromWide(credential.m_password);
+    return object;
+}
+
+}  // namespace
+
+void SAHotSpotPortlink::SendRadioState() {
+    const bool isOn = isSoftwareRadioOn(m_hClientHandle, m_interfaceGuid.get());
+    SendData(toStyledText(Json::Value(isOn)), "GET_RADIO");
+}
+
+void SAHotSpotPortlink::SendCardState() {
+    SendData("", m_bCardIn ? "CARD_PLUG_IN" : "CARD_PLUG_OUT");
+}
+
+void SAHotSpotPortlink::SendCredentialList() {
+    Log(3, "Send all credentials to vexa.");
+    const auto supplicant = hotspotSupplicant(*this);
+    if (!supplicant || supplicant->m_pMgr == nullptr) return;
+    const platform::LockGuard lock(g_hs20Lock);
+    Json::Value credentials;
+    for (const Credential* credential : supplicant->m_pMgr->config().credentials().copyCredentialPointers())
+        credentials.append(asJson(*credential));
+    SendData(toStyledText(credentials), "GET_ALL_CREDENTIAL_LIST");
+}
+
+void SAHotSpotPortlink::SendInternetAccess() {
+    const platform::LockGuard lock(g_hs20Lock);
+    Log(3, "Send connection status to vexa");
+    const auto supplicant = hotspotSupplicant(*this);
+    if (!supplicant) return;
+    bool hasAccess = false;
+    if (supplicant->getConnectedBss(false) != nullptr) supplicant->queryInternetAccess(hasAccess);
+    SendData(toStyledText(Json::Value(hasAccess)), "GET_IS_INTERNET_ACCESS");
+}
+
+void SAHotSpotPortlink::SendConnectionResult(const ConnectionResult& result) {
+    Log(3, "Send connection result to vexa.");
+    const int outcome = result.m_result == ConnectionResult::kSucceeded ? 1 : 0;
+    SendData(toStyledText(Json::Value(outcome)), "CONNECT_DISCONNECT");
+}
+
+void SAHotSpotPortlink::SendDetectedHotspot() {
+    Log(3, "Detected HS20 networks.");
+    SendData(toStyledText(Json::Value()), "DETECTED_HOTSPOT");
+}
+
+void SAHotSpotPortlink::SendSupplicantState(Bytes payload) {
+    if (payload.size() < kSupplicantStateSize) return;
+    const std::uint32_t current = numberAt(payload, 0);
+    const std::uint32_t previous = numberAt(payload, 4);
+    printToStandardOutput("PreviousState=%d \n", static_cast<int>(previous));
+    printToStandardOutput("CurrentState=%d \n", static_cast<int>(current));
+    Json::Value states;
+    states["PreviousState"] = static_cast<std::int32_t>(previous);
+    states["CurrentState"] = static_cast<std::int32_t>(current);
+    SendData(toStyledText(states), "SUPPLICANT_STATE_CHANGE");
+}
+
+}  // namespace vexa

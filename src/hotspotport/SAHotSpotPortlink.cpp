@@ -1,0 +1,58 @@
+#include "hotspotport/SAHotSpotPortlink.h"
+
+#include <cstdlib>
+
+#include "base/DiagnosticLog.h"
+#include "base/WlanMemory.h"
+#include "channel/Envelope.h"
+#include "connection/SupplicantMgr.h"
+#include "text/NeverDestroyed.h"
+
+namespace vexa {
+
+SAHotSpotPortlink& SAHotSpotPortlink::instance() {
+    static NeverDestroyed<SAHotSpotPortlink> server;
+    [[maybe_unused]] static const int registered = std::atexit([] { instance().close(); });
+    return server.get();
+}
+
+SAHotSpotPortlink::SAHotSpotPortlink() {
+    DWORD negotiated = 0;
+    HANDLE handle = nullptr;
+    WlanOpenHandle(kWlanClientVersion, nullptr, &negotiated, &handle);
+    m_hClientHandle = handle;
+
+    const platform::LockGuard lock(g_hs20Lock);
+    SupplicantMgr::instance().setClientEvents({
+        [this](Supplicant& supplicant) { SendNetworkList(&supplicant); },
+        [this] { SendDetectedHotspot(); },
+        [this](const ConnectionResult& result) { SendConnectionResult(result); },
+        [this] { SendInternetAccess(); },
+        [this] { return m_bRealmUpdatePending.exchange(false); },
+    });
+}
+
+void SAHotSpotPortlink::close() {
+    if (const HANDLE handle = m_hClientHandle.exchange(nullptr)) WlanCloseHandle(handle, nullptr);
+    if (const IpcHandle ipc = m_hIpc.exchange(0)) IpcClose(ipc);
+}
+
+void SAHotSpotPortlink::updateCardState() {
+    m_bCardIn = m_interfaceGuid.refresh(m_hClientHandle);
+}
+
+bool SAHotSpotPortlink::SendData(const std::string& data, const std::string& eventId) {
+    const std::string text = buildEnvelope(eventId, kHotspotSource, data);
+    const IpcHandle ipc = m_hIpc;
+    if (ipc == 0) {
+        Log(6, "ERROR: IPC handle is NULL in SAHotSpotPortlink::SendData.");
+        return false;
+    }
+    return IpcSend(ipc, text.data(), static_cast<std::uint32_t>(text.size())) == 1;
+}
+
+std::shared_ptr<Supplicant> hotspotSupplicant(const SAHotSpotPortlink& server) {
+    return SupplicantMgr::instance().findSupplicantByGuid(server.m_interfaceGuid.get());
+}
+
+}  // namespace vexa
