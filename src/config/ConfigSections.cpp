@@ -166,8 +166,7 @@ bool Config::applyReferences(const std::vector<Node>& references) {
             Log(2, "\t\t\tid=%d, priority=%d", id, priority);
         } else {
             Log(3,
-                "All-user credential deleted by others,we should delete this credential for current user, "
-                "cred id=%d",
+                "All-user credential deleted by others,we should delete this credential for current user, cred id=%d",
                 id);
             isChanged = true;
         }

@@ -96,9 +96,7 @@ int BlockedNetworkList::onCredentialAutoConnectChanged(std::int32_t credId,
     for (const Hs20Network* network : networks.copyPointers()) {
         if (!isBlocked(*network) || !fits(credential, *network, matcher)) continue;
         Log(3,
-            "Unblock network with ssid=%s and mac address=%s due to corresponding credential changed from "
-            "'manual "
-            "connect' to 'auto connect'",
+            "Unblock network with ssid=%s and mac address=%s due to corresponding credential changed from 'manual connect' to 'auto connect'",
             network->ssidText().c_str(), toText(network->m_macAddress).c_str());
         unblockNetwork(network->ssid());
     }

@@ -53,8 +53,7 @@ int Supplicant::connectToNetwork(const Hs20Network* network, const NetworkProfil
         if (connected == nullptr) Log(3, "Supplicant connected to a legacy network.");
         if (connected == network) {
             Log(3,
-                "Already in connected state while requesting to connect to the same network, skip connecting "
-                "again.");
+                "Already in connected state while requesting to connect to the same network, skip connecting again.");
             return kSuccess;
         }
     }

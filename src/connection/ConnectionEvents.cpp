@@ -178,8 +178,7 @@ int Supplicant::tryNextCredential(const WLAN_CONNECTION_NOTIFICATION_DATA& data)
 // Once per attempt: the new profile is one for the machine, and its failure goes on with the next credential.
 int Supplicant::tryMachineMode(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const NetworkProfile& failed) {
     Log(3,
-        "Connection using EAP-TLS with authMode=machineOrUser failed,trying to use EAP-TLS with "
-        "authMode=machine.");
+        "Connection using EAP-TLS with authMode=machineOrUser failed,trying to use EAP-TLS with authMode=machine.");
     const Hs20Network* const network = m_networkList.findBySsid(bytesOf(data.dot11Ssid));
     if (network == nullptr) {
         Log(6, "ERROR: Cannot get the BSS when connection failed.");

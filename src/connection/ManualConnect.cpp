@@ -22,9 +22,7 @@ int Supplicant::connectBss(std::string_view ssid) {
     if (ssid.empty()) return kInvalidArgument;
     if (!m_bConnectionStarted) return connectBssNow(std::string(ssid));
     Log(3,
-        "\tConnection has already been started, maybe by auto connecting thread, we will wait until the auto "
-        "connecting "
-        "completed, either succeed or fail.");
+        "\tConnection has already been started, maybe by auto connecting thread, we will wait until the auto connecting completed, either succeed or fail.");
     m_bManualConnectPending = true;
     m_pendingManualSsid = ssid;
     return kSuccess;
@@ -40,8 +38,7 @@ int Supplicant::connectBssNow(const std::string& ssid) {
     if (!network->m_bHs20) return connectPlainly(ssid);
     if (!network->hasRealmData()) {
         Log(3,
-            "The ANQP info of the network to be connected has no realm info,which should be fetched "
-            "earlier.");
+            "The ANQP info of the network to be connected has no realm info,which should be fetched earlier.");
         return kSuccess;
     }
     m_triedCredentialIds.clear();
@@ -122,8 +119,7 @@ int Supplicant::disconnectedBSS(bool blockNetwork, bool requireHs20) {
     const Hs20Network* const network = getConnectedBss(true);
     if (network == nullptr && requireHs20) {
         Log(6,
-            "ERROR: We are requested to disconnect from a HS20 network,but we cannot found a connected HS20 "
-            "network.");
+            "ERROR: We are requested to disconnect from a HS20 network,but we cannot found a connected HS20 network.");
         return kFailure;
     }
     Log(3, network != nullptr ? "Manually disconnect from a HS20 network."
@@ -131,9 +127,7 @@ int Supplicant::disconnectedBSS(bool blockNetwork, bool requireHs20) {
     if (blockNetwork && network != nullptr) {
         m_blockedNetworks.blockNetwork(network->ssid(), true);
         Log(3,
-            "The network with ssid=%s and mac address=%s has been blocked due to user manually disconnect "
-            "from this "
-            "network.",
+            "The network with ssid=%s and mac address=%s has been blocked due to user manually disconnect from this network.",
             network->ssidText().c_str(), toText(network->m_macAddress).c_str());
     }
     const bool isRequested = requestDisconnect() == ERROR_SUCCESS;

@@ -25,9 +25,7 @@ void logChoice(const NetworkChoice& best, const NetworkChoice& next) {
             narrow(next.credential->m_credName).c_str(), next.network->ssidText().c_str());
     else
         Log(3,
-            "\tSelecting credential with id=%d name=%s and bss with ssid=%s\tReplacing credential with id=%d "
-            "name=%s "
-            "and ssid=%s",
+            "\tSelecting credential with id=%d name=%s and bss with ssid=%s\tReplacing credential with id=%d name=%s and ssid=%s",
             next.credential->m_id, narrow(next.credential->m_credName).c_str(),
             next.network->ssidText().c_str(), best.credential->m_id,
             narrow(best.credential->m_credName).c_str(), best.network->ssidText().c_str());

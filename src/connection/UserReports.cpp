@@ -61,20 +61,15 @@ const char* Supplicant::reasonNotToBlock() const {
     if (!m_bRadioOn) return "Radio turned off, don't update the blocked network list.";
     if (!isHs20Enabled()) return "HS20 not enabled, don't update the blocked network list.";
     if (m_bManualConnectStarted)
-        return "Manually connect to HS20 network started, this network maybe disconnected for we are going "
-               "to connect "
-               "another network.";
+        return "Manually connect to HS20 network started, this network maybe disconnected for we are going to connect another network.";
     if (m_bConnectionStartedByOs)
-        return "Connection started by OS, HS20 network may be disconected,we should not block any HS20 "
-               "network from "
-               "auto connecting in this case.";
+        return "Connection started by OS, HS20 network may be disconected,we should not block any HS20 network from auto connecting in this case.";
     const ConnectionRecord* const last = m_history.last();
     if (last == nullptr) return "No last connection history.";
     Log(3,
         last->m_bDisconnectedTimeValid ? "Connection disconnected earlier." : "Connection still in active.");
     if (last->m_bDisconnectedTimeValid && millisecondsSince(last->m_disconnectedTime) > kLongDisconnected)
-        return "This network has been disconnected for a long time,not possible that user just disconnect "
-               "from it.";
+        return "This network has been disconnected for a long time,not possible that user just disconnect from it.";
     return nullptr;
 }
 
@@ -102,9 +97,7 @@ int Supplicant::onUserDisconnected(Bytes payload) {
     const std::uint32_t elapsed = millisecondsSince(m_lastHs20ToggleTime);
     if (elapsed < kJustToggled) {
         Log(3,
-            "Skip blocking the network with ssid=%s since we just toggled the enable/disable hs20, "
-            "millisecond "
-            "elapsed=%d",
+            "Skip blocking the network with ssid=%s since we just toggled the enable/disable hs20, millisecond elapsed=%d",
             record.ssid.c_str(), static_cast<int>(elapsed));
         return kSuccess;
     }

@@ -25,8 +25,7 @@ void SAHotSpotPortlink::switchHotspot(Supplicant& supplicant, bool enable) {
     }
     if (enable) return;
     Log(3,
-        "STA is in connected state when user turns of HS20,trying to disconnect from any connected HS20 "
-        "network.");
+        "STA is in connected state when user turns of HS20,trying to disconnect from any connected HS20 network.");
     if (supplicant.m_bHs20Connected) supplicant.disconnectedBSS(false, true);
 }
 
