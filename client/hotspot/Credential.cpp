@@ -7,6 +7,7 @@
 #include "client/port/JsonLine.h"
 #include "client/terminal/ClientError.h"
 #include "client/terminal/Text.h"
+#include "text/Utf8.h"
 
 namespace vexa::client {
 
@@ -120,7 +121,7 @@ std::optional<std::string> objectionTo(const Credential& credential) {
     for (const auto& member : kTexts) {
         const std::string& text = credential.*member.field;
         const std::string subject = std::string("the ") + member.noun + " ";
-        if (!isUtf8(text)) return subject + "is no UTF-8 text";
+        if (!isValidUtf8(text)) return subject + "is no UTF-8 text";
         if (std::any_of(text.begin(), text.end(), isControl)) return subject + "holds a control character";
         if (utf16Length(text) > member.limit)
             return subject + "is longer than " + std::to_string(member.limit) + " characters";

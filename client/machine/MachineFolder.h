@@ -3,6 +3,8 @@
 #include <filesystem>
 #include <string>
 
+#include "contract/Store.h"
+
 namespace vexa::client {
 
 /// The folder of a simulated machine, or what stands for it on a real one, as far as the client has to do
@@ -20,10 +22,10 @@ public:
     std::filesystem::path outputFile() const { return m_path / "stdout.log"; }
     /// The scenario of the machine, if none is named.
     std::filesystem::path registryFile() const { return m_path / "registry.json"; }
-    std::filesystem::path configFile() const { return storeFolder() / "config.xml"; }
+    std::filesystem::path configFile() const { return storeFolder() / contract::kConfigFile; }
 
     /// Where the service writes its diagnostic log.
-    std::filesystem::path dumpFolder() const { return storeFolder() / "Dump"; }
+    std::filesystem::path dumpFolder() const { return storeFolder() / contract::kDumpFolder; }
 
     /// Makes the folder, and those above it that are missing, for the owner only. Throws ClientError.
     void create() const;

@@ -6,6 +6,7 @@
 #include "client/machine/ServiceHost.h"
 #include "client/machine/ServiceProcess.h"
 #include "client/terminal/ClientError.h"
+#include "contract/Process.h"
 
 namespace vexa::client {
 
@@ -15,8 +16,6 @@ using std::chrono::seconds;
 using std::chrono::steady_clock;
 
 namespace {
-
-constexpr const char* kStopMutexName = "{39EAA3ED-1A26-46B7-90A7-AAFFECE80392}";
 
 constexpr seconds kReadyLimit{10};
 constexpr milliseconds kFirstCheck{10};
@@ -62,7 +61,7 @@ ServiceParent::~ServiceParent() {
 
 void ServiceParent::takeMutex() {
     enterMachine(m_folder);
-    m_mutex = std::make_unique<platform::NamedMutex>(kStopMutexName, platform::NamedMutex::Owner::Yes);
+    m_mutex = std::make_unique<platform::NamedMutex>(contract::kStopMutex, platform::NamedMutex::Owner::Yes);
     if (!m_mutex->isValid()) {
         throw ClientError("the stop mutex cannot be made in " + m_folder.path().string(), kExitNotStarted);
     }

@@ -1,7 +1,6 @@
 #pragma once
 
 #include <cstdint>
-#include <string>
 #include <vector>
 
 namespace vexa::client {
@@ -15,11 +14,5 @@ struct TcpEndpoint {
 
 /// All of them at this moment. Throws ClientError if they can't be read.
 std::vector<TcpEndpoint> readTcpEndpoints();
-
-/// The endpoints in a table as a Linux kernel writes it. Throws ClientError if it can't be read.
-std::vector<TcpEndpoint> readTcpTable(const std::string& file);
-
-/// A server can have this port of 127.0.0.1. Leaves no trace behind.
-bool canBind(std::uint16_t port);
 
 }  // namespace vexa::client

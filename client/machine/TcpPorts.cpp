@@ -1,6 +1,8 @@
 #include "client/machine/TcpPorts.h"
 
 #include <algorithm>
+#include <boost/asio/io_context.hpp>
+#include <boost/asio/ip/tcp.hpp>
 #include <random>
 #include <string>
 
@@ -10,11 +12,23 @@ namespace vexa::client {
 
 namespace {
 
+namespace asio = boost::asio;
+using asio::ip::tcp;
+
 // Below the range from which the operating system takes ports for outgoing connections: one of those, on the
 // port between our choice and the start of the service, would make it busy.
 constexpr int kFirstPort = 10000;
 constexpr int kLastPort = 32000;
 constexpr int kAttempts = 2000;
+
+// A server can have this port of the loopback address. Leaves no trace behind.
+bool canBind(std::uint16_t port) {
+    asio::io_context context;
+    tcp::socket socket(context, tcp::v4());
+    boost::system::error_code error;
+    socket.bind({asio::ip::address_v4::loopback(), port}, error);
+    return !error;
+}
 
 }  // namespace
 

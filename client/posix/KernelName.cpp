@@ -7,12 +7,12 @@
 #include <algorithm>
 #include <cstddef>
 
-#include "client/posix/Descriptor.h"
+#include "platform/posix/Descriptor.h"
 
 namespace vexa::client {
 
 NameHolder takeKernelName(const std::string& name) {
-    auto socket = std::make_shared<Descriptor>(::socket(AF_UNIX, SOCK_DGRAM | SOCK_CLOEXEC, 0));
+    auto socket = std::make_shared<posix::Descriptor>(::socket(AF_UNIX, SOCK_DGRAM | SOCK_CLOEXEC, 0));
     // A NUL in front makes it a name without a file.
     const std::string path = '\0' + name;
     sockaddr_un address{};

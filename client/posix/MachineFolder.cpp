@@ -1,13 +1,12 @@
 #include "client/machine/MachineFolder.h"
 
-#include <sys/stat.h>
-
 #include <cerrno>
 #include <cstdlib>
 #include <cstring>
-#include <vector>
 
 #include "client/terminal/ClientError.h"
+#include "platform/posix/MachineFolder.h"
+#include "platform/posix/OwnerFiles.h"
 
 namespace vexa::client {
 
@@ -15,29 +14,10 @@ namespace fs = std::filesystem;
 
 namespace {
 
-std::string variable(const char* name) {
-    const char* value = std::getenv(name);
-    return value == nullptr ? "" : value;
-}
-
 fs::path defaultFolder() {
-    if (const auto machine = variable("VEXA_MACHINE"); !machine.empty()) return machine;
-    if (const auto state = variable("XDG_STATE_HOME"); !state.empty())
-        return fs::path(state) / "vexa" / "machine";
-    if (const auto home = variable("HOME"); !home.empty()) {
-        return fs::path(home) / ".local" / "state" / "vexa" / "machine";
-    }
-    throw ClientError("no machine folder: give --machine, or set VEXA_MACHINE or HOME");
-}
-
-void makeFolder(const fs::path& folder) {
-    if (fs::is_directory(folder)) return;
-    if (folder.has_parent_path() && folder.parent_path() != folder) makeFolder(folder.parent_path());
-    if (::mkdir(folder.c_str(), 0700) != 0 && errno != EEXIST) {
-        throw ClientError(
-            "the machine folder " + folder.string() + " cannot be made: " + std::strerror(errno),
-            kExitNotStarted);
-    }
+    const fs::path folder = posix::machineFolder();
+    if (folder.empty()) throw ClientError("no machine folder: give --machine, or set VEXA_MACHINE or HOME");
+    return folder;
 }
 
 }  // namespace
@@ -46,7 +26,7 @@ MachineFolder::MachineFolder(const std::string& path)
     : m_path(fs::absolute(path.empty() ? defaultFolder() : fs::path(path)).lexically_normal()) {}
 
 fs::path MachineFolder::storeFolder() const {
-    return m_path / "Public" / "Roaming" / "Korvane";
+    return contract::storeFolder(m_path / "Public");
 }
 
 MachineFolder MachineFolder::makeTemporary() {
@@ -59,8 +39,13 @@ MachineFolder MachineFolder::makeTemporary() {
 }
 
 void MachineFolder::create() const {
+    const fs::path folder = m_path.has_filename() ? m_path : m_path.parent_path();
+    if (!posix::createOwnerFolder(folder)) {
+        throw ClientError(
+            "the machine folder " + folder.string() + " cannot be made: " + std::strerror(errno),
+            kExitNotStarted);
+    }
     std::error_code ignored;
-    makeFolder(m_path.has_filename() ? m_path : m_path.parent_path());
     if (!fs::is_directory(m_path, ignored)) {
         throw ClientError("the machine folder " + m_path.string() + " is not a folder", kExitNotStarted);
     }

@@ -8,14 +8,18 @@
 
 #include "client/machine/OwnerFile.h"
 #include "client/port/JsonLine.h"
+#include "contract/Registry.h"
 
 namespace vexa::client {
 
 namespace {
 
-constexpr const char* kKey = "HKEY_CURRENT_USER\\Software\\Korvane\\Vexa";
-constexpr const char* kSwitchValue = "IsHotSpotAutoConnect";
-constexpr const char* kMethodValue = "EapMethod";
+using contract::kEapMethodValue;
+using contract::kHotspotSwitchValue;
+
+std::string productKey() {
+    return std::string("HKEY_CURRENT_USER\\") + contract::kProductKey;
+}
 
 // The whole registry of a simulated machine: key paths to values.
 Json::Value readRegistry(const MachineFolder& machine) {
@@ -28,25 +32,25 @@ Json::Value readRegistry(const MachineFolder& machine) {
 
 bool readHotspotSwitch(const MachineFolder& machine) {
     const Json::Value registry = readRegistry(machine);
-    const Json::Value& values = registry[kKey];
-    if (!values.isObject() || !values[kSwitchValue].isString()) return true;
-    return ::strcasecmp(values[kSwitchValue].asCString(), "false") != 0;
+    const Json::Value& values = registry[productKey()];
+    if (!values.isObject() || !values[kHotspotSwitchValue].isString()) return true;
+    return ::strcasecmp(values[kHotspotSwitchValue].asCString(), "false") != 0;
 }
 
 bool writeHotspotSwitch(const MachineFolder& machine, bool isOn) {
     if (readHotspotSwitch(machine) == isOn) return true;
     Json::Value registry = readRegistry(machine);
-    Json::Value& values = registry[kKey];
+    Json::Value& values = registry[productKey()];
     if (!values.isObject()) values = Json::Value(Json::objectValue);
-    values[kSwitchValue] = isOn ? "true" : "false";
+    values[kHotspotSwitchValue] = isOn ? "true" : "false";
     return replaceOwnerFile(machine.registryFile(), jsonLine(registry) + "\n");
 }
 
 std::optional<int> readConnectionMethod(const MachineFolder& machine) {
     const Json::Value registry = readRegistry(machine);
-    const Json::Value& values = registry[kKey];
-    if (!values.isObject() || !values[kMethodValue].isInt()) return std::nullopt;
-    return values[kMethodValue].asInt();
+    const Json::Value& values = registry[productKey()];
+    if (!values.isObject() || !values[kEapMethodValue].isInt()) return std::nullopt;
+    return values[kEapMethodValue].asInt();
 }
 
 }  // namespace vexa::client

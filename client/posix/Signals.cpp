@@ -6,8 +6,8 @@
 #include <array>
 #include <csignal>
 
-#include "client/posix/Descriptor.h"
 #include "client/terminal/ClientError.h"
+#include "platform/posix/Descriptor.h"
 
 namespace vexa::client {
 
@@ -35,7 +35,7 @@ sigset_t handledSignals() {
 
 struct Signals::State {
     sigset_t before{};
-    Descriptor descriptor;
+    posix::Descriptor descriptor;
 };
 
 Signals::Signals() : m_state(std::make_unique<State>()) {

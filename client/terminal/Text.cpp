@@ -1,54 +1,24 @@
 #include "client/terminal/Text.h"
 
 #include <algorithm>
-#include <array>
 #include <optional>
 
 #include "client/terminal/CharacterWidth.h"
+#include "text/Utf8.h"
 
 namespace vexa::client {
 
 namespace {
 
-constexpr char32_t kFirstSupplementary = 0x10000;
 constexpr std::size_t kColumnGap = 2;
 
-struct CodePoint {
-    char32_t value;
-    std::size_t bytes;
-};
-
-/// The forms of UTF-8 by their first byte, with the lowest value that may take so many bytes.
-struct Form {
-    unsigned char mask;
-    unsigned char lead;
-    std::size_t bytes;
-    char32_t lowest;
-};
-constexpr std::array<Form, 4> kForms{{{0x80, 0x00, 1, 0},
-                                      {0xE0, 0xC0, 2, 0x80},
-                                      {0xF0, 0xE0, 3, 0x800},
-                                      {0xF8, 0xF0, 4, kFirstSupplementary}}};
-
-bool isScalar(char32_t value) {
-    return value <= 0x10FFFF && (value < 0xD800 || value > 0xDFFF);
-}
-
-/// The code point at the beginning of the text; nothing if there is no well-formed one.
-std::optional<CodePoint> firstCodePoint(std::string_view text) {
-    if (text.empty()) return std::nullopt;
-    const auto lead = static_cast<unsigned char>(text.front());
-    const auto form = std::find_if(kForms.begin(), kForms.end(), [lead](const Form& candidate) {
-        return (lead & candidate.mask) == candidate.lead;
-    });
-    if (form == kForms.end() || text.size() < form->bytes) return std::nullopt;
-    auto value = static_cast<char32_t>(lead & static_cast<unsigned char>(~form->mask));
-    for (const char next : text.substr(1, form->bytes - 1)) {
-        if ((static_cast<unsigned char>(next) & 0xC0U) != 0x80U) return std::nullopt;
-        value = (value << 6U) | (static_cast<unsigned char>(next) & 0x3FU);
-    }
-    if (value < form->lowest || !isScalar(value)) return std::nullopt;
-    return CodePoint{value, form->bytes};
+/// The first character of the text, and what comes behind it; nothing at its end, and where none begins.
+std::optional<Utf8Character> takeCharacter(std::string_view& rest) {
+    if (rest.empty()) return std::nullopt;
+    const Utf8Character character = firstUtf8Character(rest);
+    if (character.length == 0) return std::nullopt;
+    rest.remove_prefix(character.length);
+    return character;
 }
 
 bool isControl(char32_t value) {
@@ -60,33 +30,20 @@ std::string escaped(char32_t value) {
     return {'\\', 'x', kDigits[(value >> 4U) & 0xFU], kDigits[value & 0xFU]};
 }
 
-std::string fromLatin1(unsigned char byte) {
-    if (byte < 0x80) return {static_cast<char>(byte)};
-    return {static_cast<char>(0xC0U | (byte >> 6U)), static_cast<char>(0x80U | (byte & 0x3FU))};
-}
-
 }  // namespace
 
-bool isUtf8(std::string_view text) {
-    while (const auto point = firstCodePoint(text))
-        text.remove_prefix(point->bytes);
-    return text.empty();
-}
-
 std::size_t utf16Length(std::string_view text) {
-    std::size_t length = 0;
-    while (const auto point = firstCodePoint(text)) {
-        length += point->value < kFirstSupplementary ? 1 : 2;
-        text.remove_prefix(point->bytes);
-    }
-    return length;
+    std::u16string units;
+    while (const auto character = takeCharacter(text))
+        appendUtf16(units, character->codePoint);
+    return units.size();
 }
 
 std::string asUtf8(std::string_view text) {
-    if (isUtf8(text)) return std::string(text);
+    if (isValidUtf8(text)) return std::string(text);
     std::string converted;
     for (const char byte : text)
-        converted += fromLatin1(static_cast<unsigned char>(byte));
+        appendUtf8(converted, static_cast<unsigned char>(byte));
     return converted;
 }
 
@@ -94,30 +51,29 @@ std::string printable(std::string_view text, Tabs tabs) {
     const std::string whole = asUtf8(text);
     std::string_view rest = whole;
     std::string shown;
-    while (const auto point = firstCodePoint(rest)) {
-        const bool isKept = !isControl(point->value) || (point->value == U'\t' && tabs == Tabs::Kept);
-        shown += isKept ? std::string(rest.substr(0, point->bytes)) : escaped(point->value);
-        rest.remove_prefix(point->bytes);
+    while (const auto character = takeCharacter(rest)) {
+        const char32_t point = character->codePoint;
+        if (!isControl(point) || (point == U'\t' && tabs == Tabs::Kept))
+            appendUtf8(shown, point);
+        else
+            shown += escaped(point);
     }
     return shown;
 }
 
 int columnsOf(std::string_view text) {
     int columns = 0;
-    while (const auto point = firstCodePoint(text)) {
-        columns += characterWidth(point->value);
-        text.remove_prefix(point->bytes);
-    }
+    while (const auto character = takeCharacter(text))
+        columns += characterWidth(character->codePoint);
     return columns;
 }
 
 std::string cutToColumns(std::string_view text, int columns) {
     std::string cut;
-    while (const auto point = firstCodePoint(text)) {
-        columns -= characterWidth(point->value);
+    while (const auto character = takeCharacter(text)) {
+        columns -= characterWidth(character->codePoint);
         if (columns < 0) break;
-        cut += text.substr(0, point->bytes);
-        text.remove_prefix(point->bytes);
+        appendUtf8(cut, character->codePoint);
     }
     return cut;
 }

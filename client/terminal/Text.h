@@ -7,9 +7,6 @@
 
 namespace vexa::client {
 
-/// The text is well-formed UTF-8.
-bool isUtf8(std::string_view text);
-
 /// The length of UTF-8 text as the service counts it: in UTF-16 units.
 std::size_t utf16Length(std::string_view text);
 

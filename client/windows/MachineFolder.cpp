@@ -3,6 +3,7 @@
 #include <shlobj.h>
 
 #include "client/terminal/ClientError.h"
+#include "contract/Store.h"
 #include "platform/KnownFolders.h"
 #include "platform/windows/Handle.h"
 
@@ -17,7 +18,7 @@ fs::path ownFolder() {
     platform::Owned<PWSTR, &CoTaskMemFree> local;
     if (SHGetKnownFolderPath(FOLDERID_LocalAppData, 0, nullptr, local.receive()) != S_OK)
         throw ClientError("the folder of local application data is not known");
-    return fs::path(local.get()) / "Korvane" / "Vexa";
+    return fs::path(local.get()) / contract::kMakerFolder / "Vexa";
 }
 
 }  // namespace
@@ -28,7 +29,7 @@ MachineFolder::MachineFolder(const std::string& /*path*/) : m_path(ownFolder()) 
 fs::path MachineFolder::storeFolder() const {
     const auto shared = platform::publicFolder();
     if (!shared) throw ClientError("the public folder is not known");
-    return fs::path(*shared) / "Roaming" / "Korvane";
+    return contract::storeFolder(*shared);
 }
 
 void MachineFolder::create() const {

@@ -9,29 +9,10 @@
 #include <string>
 
 #include "client/terminal/ClientError.h"
-#include "platform/SocketLibrary.h"
-#include "text/ScopeGuard.h"
 
 namespace vexa::client {
 
 namespace {
-
-constexpr std::uint16_t kSocketVersion = 0x0202;
-
-class Socket {
-public:
-    Socket() : m_socket(::socket(AF_INET, SOCK_STREAM, 0)) {}
-    ~Socket() {
-        if (m_socket != INVALID_SOCKET) closesocket(m_socket);
-    }
-    Socket(const Socket&) = delete;
-    Socket& operator=(const Socket&) = delete;
-
-    SOCKET get() const { return m_socket; }
-
-private:
-    const SOCKET m_socket;
-};
 
 std::vector<std::max_align_t> readTable() {
     std::vector<std::max_align_t> table;
@@ -56,17 +37,6 @@ std::vector<TcpEndpoint> readTcpEndpoints() {
         endpoints.push_back({ntohs(static_cast<u_short>(row.dwLocalPort)),
                              row.dwState == MIB_TCP_STATE_LISTEN, row.dwOwningPid});
     return endpoints;
-}
-
-bool canBind(std::uint16_t port) {
-    if (!platform::startSocketLibrary(kSocketVersion)) return false;
-    const ScopeGuard stop(&platform::stopSocketLibrary);
-    const Socket socket;
-    sockaddr_in address{};
-    address.sin_family = AF_INET;
-    address.sin_port = htons(port);
-    address.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
-    return ::bind(socket.get(), reinterpret_cast<const sockaddr*>(&address), sizeof address) == 0;
 }
 
 }  // namespace vexa::client

@@ -1,6 +1,6 @@
 #include "simulation/parts/Adapters.h"
 
-#include "simulation/text/Guid.h"
+#include "platform/Guid.h"
 #include "simulation/text/Text.h"
 
 namespace vexa::simulation {
@@ -36,7 +36,7 @@ std::vector<std::size_t> Adapters::inserted() const {
 std::optional<std::size_t> Adapters::findInserted(const GUID& guid) const {
     const LockGuard<Mutex> lock(m_mutex);
     for (std::size_t i = 0; i < m_adapters.size(); ++i) {
-        if (m_adapters[i].inserted && sameGuid(m_adapters[i].guid, guid)) return i;
+        if (m_adapters[i].inserted && areGuidsEqual(m_adapters[i].guid, guid)) return i;
     }
     return std::nullopt;
 }

@@ -3,10 +3,12 @@
 #include <algorithm>
 #include <cstdio>
 
-#include "simulation/parts/OwnerFiles.h"
+#include "contract/Registry.h"
+#include "platform/posix/OwnerFiles.h"
 #include "simulation/scenario/JsonText.h"
 #include "simulation/text/Text.h"
 #include "simulation/text/Wire.h"
+#include "text/TextConversion.h"
 
 namespace vexa::simulation {
 
@@ -16,18 +18,21 @@ using platform::RegistryRoot;
 
 namespace {
 
-constexpr const char* kClassKey =
-    "HKEY_LOCAL_MACHINE\\SYSTEM\\CurrentControlSet\\Control\\Class\\{4D36E972-E325-11CE-BFC1-08002BE10318}";
-constexpr const char* kProductKey = "HKEY_CURRENT_USER\\Software\\Korvane\\Vexa";
-constexpr const char* kAutoConnect = "IsHotSpotAutoConnect";
+std::string classKeyPath() {
+    return std::string("HKEY_LOCAL_MACHINE\\") + contract::kNetworkAdapterClassKey;
+}
+
+std::string productKey() {
+    return std::string("HKEY_CURRENT_USER\\") + contract::kProductKey;
+}
 
 Json::Value localMachine(const std::vector<ClassKeyEntry>& classKey) {
     Json::Value keys(Json::objectValue);
-    keys[kClassKey] = Json::Value(Json::objectValue);
+    keys[classKeyPath()] = Json::Value(Json::objectValue);
     for (std::size_t i = 0; i < classKey.size(); ++i) {
         char number[16];
         std::snprintf(number, sizeof number, "%04u", static_cast<unsigned>(i));
-        Json::Value& values = keys[std::string(kClassKey) + "\\" + number];
+        Json::Value& values = keys[classKeyPath() + "\\" + number];
         values = Json::Value(Json::objectValue);
         if (classKey[i].netCfgInstanceId) values["NetCfgInstanceId"] = *classKey[i].netCfgInstanceId;
         if (classKey[i].matchingDeviceId) values["MatchingDeviceId"] = *classKey[i].matchingDeviceId;
@@ -43,7 +48,7 @@ std::string fullPath(RegistryRoot root, const std::string& path) {
 // What is there keeps its spelling: another case names the same.
 Json::Value& memberNoCase(Json::Value& object, const std::string& name) {
     for (const std::string& present : object.getMemberNames()) {
-        if (equalsNoCase(present, name)) return object[present];
+        if (compareNoCase(present, name) == 0) return object[present];
     }
     return object[name];
 }
@@ -76,7 +81,7 @@ bool MachineRegistry::hasKey(RegistryRoot root, const std::string& path) const {
     const std::string wanted = fullPath(root, path);
     const auto keys = keysOf(root).getMemberNames();
     return std::any_of(keys.begin(), keys.end(), [&](const std::string& key) {
-        return equalsNoCase(key, wanted) || liesBelow(key, wanted);
+        return compareNoCase(key, wanted) == 0 || liesBelow(key, wanted);
     });
 }
 
@@ -88,7 +93,7 @@ std::vector<std::string> MachineRegistry::subkeys(RegistryRoot root, const std::
         if (!liesBelow(key, parent)) continue;
         const std::string rest = key.substr(parent.size() + 1);
         const std::string name = rest.substr(0, rest.find('\\'));
-        const auto same = [&](const std::string& other) { return equalsNoCase(other, name); };
+        const auto same = [&](const std::string& other) { return compareNoCase(other, name) == 0; };
         if (std::none_of(names.begin(), names.end(), same)) names.push_back(name);
     }
     return names;
@@ -100,9 +105,9 @@ std::optional<std::string> MachineRegistry::value(RegistryRoot root, const std::
     const Json::Value keys = keysOf(root);
     const std::string wanted = fullPath(root, path);
     for (const std::string& key : keys.getMemberNames()) {
-        if (!equalsNoCase(key, wanted) || !keys[key].isObject()) continue;
+        if (compareNoCase(key, wanted) != 0 || !keys[key].isObject()) continue;
         for (const std::string& member : keys[key].getMemberNames()) {
-            if (equalsNoCase(member, name)) return rawValue(keys[key][member]);
+            if (compareNoCase(member, name) == 0) return rawValue(keys[key][member]);
         }
     }
     return std::nullopt;
@@ -111,18 +116,18 @@ std::optional<std::string> MachineRegistry::value(RegistryRoot root, const std::
 bool MachineRegistry::setAutoConnect(const std::optional<std::string>& text) {
     const LockGuard<Mutex> lock(m_mutex);
     Json::Value keys = readContent();
-    Json::Value& values = valuesOf(keys, kProductKey);
+    Json::Value& values = valuesOf(keys, productKey());
     for (const std::string& name : values.getMemberNames())
-        if (equalsNoCase(name, kAutoConnect)) values.removeMember(name);
-    if (text) values[kAutoConnect] = *text;
-    return replaceFile(m_file, indentedJson(keys));
+        if (compareNoCase(name, contract::kHotspotSwitchValue) == 0) values.removeMember(name);
+    if (text) values[contract::kHotspotSwitchValue] = *text;
+    return posix::replaceFile(m_file, indentedJson(keys));
 }
 
 bool MachineRegistry::setNumber(const std::string& path, const std::string& name, std::uint32_t number) {
     const LockGuard<Mutex> lock(m_mutex);
     Json::Value keys = readContent();
     memberNoCase(valuesOf(keys, fullPath(RegistryRoot::CurrentUser, path)), name) = number;
-    return replaceFile(m_file, indentedJson(keys));
+    return posix::replaceFile(m_file, indentedJson(keys));
 }
 
 Json::Value MachineRegistry::content() const {
@@ -136,7 +141,7 @@ Json::Value MachineRegistry::keysOf(RegistryRoot root) const {
 
 // Read anew each time: another process of the same machine may have written it.
 Json::Value MachineRegistry::readContent() const {
-    const auto text = readFile(m_file);
+    const auto text = posix::readFile(m_file);
     std::string error;
     const auto content = text ? parseJson(*text, error) : std::nullopt;
     return content && content->isObject() ? *content : Json::Value(Json::objectValue);

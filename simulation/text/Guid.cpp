@@ -39,9 +39,4 @@ std::optional<GUID> guidFromText(std::string_view text) {
     return guid;
 }
 
-bool sameGuid(const GUID& a, const GUID& b) {
-    return a.Data1 == b.Data1 && a.Data2 == b.Data2 && a.Data3 == b.Data3 &&
-           std::memcmp(a.Data4, b.Data4, sizeof a.Data4) == 0;
-}
-
 }  // namespace vexa::simulation

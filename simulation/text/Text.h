@@ -21,8 +21,6 @@ std::u16string utf16(std::string_view utf8);
 /// One byte for each code point, "?" for those above U+00FF.
 std::string latin1(std::string_view utf8);
 
-std::string utf8(std::u32string_view codePoints);
-
 /// Bytes that are meant to be UTF-8, such as an SSID, as text that is.
 std::string textOfBytes(std::span<const std::uint8_t> bytes);
 
@@ -33,7 +31,6 @@ std::string hexText(std::span<const std::uint8_t> bytes);
 std::optional<Bytes> bytesFromHex(std::string_view hex);
 
 /// ASCII letters count as equal in either case.
-bool equalsNoCase(std::string_view a, std::string_view b);
 bool startsWithNoCase(std::string_view text, std::string_view prefix);
 
 }  // namespace vexa::simulation

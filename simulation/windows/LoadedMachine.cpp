@@ -10,6 +10,8 @@
 #include <fstream>
 #include <iterator>
 
+#include "contract/Process.h"
+#include "contract/Store.h"
 #include "platform/windows/Handle.h"
 #include "simulation/control/ControlServer.h"
 #include "simulation/control/Timeline.h"
@@ -25,7 +27,6 @@ namespace {
 namespace fs = std::filesystem;
 
 constexpr UINT kBadSetup = 2;
-constexpr const char* kInstanceMutex = "{EB028547-0B5C-4BFF-A23E-78656D726C04}";
 
 // At once, in the middle of the loading of libraries too: nothing of the program has run yet, or nothing of
 // it can go on.
@@ -78,17 +79,17 @@ fs::path publicFolder() {
 }
 
 void writeConfiguration(const std::string& text) {
-    const fs::path folder = publicFolder() / "Roaming" / "Korvane";
+    const fs::path folder = contract::storeFolder(publicFolder());
     std::error_code error;
     fs::create_directories(folder, error);
-    std::ofstream file(folder / "config.xml", std::ios::binary | std::ios::trunc);
+    std::ofstream file(folder / contract::kConfigFile, std::ios::binary | std::ios::trunc);
     file << text;
     if (!file.flush()) throw JsonFault("config: can't be written");
 }
 
 // The program that finds another one at work leaves at once: what that one uses is not its own.
 bool isSecondInstance() {
-    return static_cast<bool>(platform::Handle(OpenMutexA(SYNCHRONIZE, FALSE, kInstanceMutex)));
+    return static_cast<bool>(platform::Handle(OpenMutexA(SYNCHRONIZE, FALSE, contract::kInstanceMutex)));
 }
 
 std::int32_t controlPort(const std::wstring& text) {

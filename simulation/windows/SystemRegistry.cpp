@@ -6,6 +6,7 @@
 #include <cstdio>
 #include <cstring>
 
+#include "contract/Registry.h"
 #include "platform/windows/Handle.h"
 #include "text/TextConversion.h"
 
@@ -15,15 +16,10 @@ namespace {
 
 using Key = platform::Owned<HKEY, &::RegCloseKey>;
 
-constexpr const wchar_t* kClassKey =
-    L"SYSTEM\\CurrentControlSet\\Control\\Class\\{4D36E972-E325-11CE-BFC1-08002BE10318}";
-constexpr const wchar_t* kProductKey = L"Software\\Korvane\\Vexa";
-constexpr const char* kProductPath = "HKEY_CURRENT_USER\\Software\\Korvane\\Vexa";
-constexpr const wchar_t* kAutoConnect = L"IsHotSpotAutoConnect";
-
-Key create(HKEY parent, const wchar_t* path) {
+Key create(HKEY parent, const char* path) {
     Key key;
-    RegCreateKeyExW(parent, path, 0, nullptr, 0, KEY_ALL_ACCESS, nullptr, key.receive(), nullptr);
+    RegCreateKeyExW(parent, wideFromNarrow(path).c_str(), 0, nullptr, 0, KEY_ALL_ACCESS, nullptr,
+                    key.receive(), nullptr);
     return key;
 }
 
@@ -77,8 +73,8 @@ Json::Value jsonOf(const Value& value) {
 }  // namespace
 
 bool writeClassKey(const std::vector<ClassKeyEntry>& entries) {
-    RegDeleteTreeW(HKEY_LOCAL_MACHINE, kClassKey);
-    const Key classKey = create(HKEY_LOCAL_MACHINE, kClassKey);
+    RegDeleteTreeW(HKEY_LOCAL_MACHINE, wideFromNarrow(contract::kNetworkAdapterClassKey).c_str());
+    const Key classKey = create(HKEY_LOCAL_MACHINE, contract::kNetworkAdapterClassKey);
     bool isWritten = static_cast<bool>(classKey);
     for (std::size_t i = 0; i < entries.size() && isWritten; ++i)
         isWritten = writeEntry(classKey, i, entries[i]);
@@ -86,19 +82,22 @@ bool writeClassKey(const std::vector<ClassKeyEntry>& entries) {
 }
 
 bool writeAutoConnect(const std::optional<std::string>& text) {
-    const Key key = create(HKEY_CURRENT_USER, kProductKey);
+    const Key key = create(HKEY_CURRENT_USER, contract::kProductKey);
     if (!key) return false;
-    if (text) return setText(key, kAutoConnect, *text);
-    const auto result = RegDeleteValueW(key.get(), kAutoConnect);
+    const std::wstring name = wideFromNarrow(contract::kHotspotSwitchValue);
+    if (text) return setText(key, name.c_str(), *text);
+    const auto result = RegDeleteValueW(key.get(), name.c_str());
     return result == ERROR_SUCCESS || result == ERROR_FILE_NOT_FOUND;
 }
 
 Json::Value readProductKey() {
     Json::Value keys(Json::objectValue);
     Key key;
-    if (RegOpenKeyExW(HKEY_CURRENT_USER, kProductKey, 0, KEY_READ, key.receive()) != ERROR_SUCCESS)
+    if (RegOpenKeyExW(HKEY_CURRENT_USER, wideFromNarrow(contract::kProductKey).c_str(), 0, KEY_READ,
+                      key.receive()) != ERROR_SUCCESS)
         return keys;
-    Json::Value& values = keys[kProductPath] = Json::Value(Json::objectValue);
+    Json::Value& values = keys[std::string("HKEY_CURRENT_USER\\") + contract::kProductKey] =
+        Json::Value(Json::objectValue);
     for (DWORD index = 0; const auto value = valueAt(key, index); ++index)
         values[utf8FromWide(value->name)] = jsonOf(*value);
     return keys;

@@ -6,6 +6,7 @@
 #include <string_view>
 
 #include "base/WlanMemory.h"
+#include "contract/Registry.h"
 #include "platform/Guid.h"
 #include "platform/Registry.h"
 #include "text/TextConversion.h"
@@ -18,8 +19,6 @@ using platform::RegistryKey;
 using platform::RegistryRoot;
 
 constexpr std::size_t kRegistryBuffer = 256;
-constexpr const char* kNetworkAdapterClass =
-    "SYSTEM\\CurrentControlSet\\Control\\Class\\{4D36E972-E325-11CE-BFC1-08002BE10318}";
 constexpr std::array<std::string_view, 2> kVendorPrefixes = {"pci\\ven_1f5d", "usb\\vid_2b7e"};
 constexpr std::size_t kPrefixLength = kVendorPrefixes[0].size();
 static_assert(kVendorPrefixes[1].size() == kPrefixLength);
@@ -68,12 +67,13 @@ std::optional<GUID> presentAdapter() {
 }
 
 bool isVendorInterface(const GUID& guid) {
-    const auto classKey = RegistryKey::open(RegistryRoot::LocalMachine, kNetworkAdapterClass);
+    const auto classKey = RegistryKey::open(RegistryRoot::LocalMachine, contract::kNetworkAdapterClassKey);
     if (!classKey) return false;
     for (std::uint32_t index = 0;; ++index) {
         const auto name = classKey->subkeyName(index, kRegistryBuffer);
         if (!name) return false;
-        if (!name->empty() && isVendorInstance(std::string(kNetworkAdapterClass) + "\\" + *name, guid))
+        if (!name->empty() &&
+            isVendorInstance(std::string(contract::kNetworkAdapterClassKey) + "\\" + *name, guid))
             return true;
     }
 }

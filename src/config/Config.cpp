@@ -5,6 +5,8 @@
 
 #include "base/DiagnosticLog.h"
 #include "config/SafeSave.h"
+#include "contract/Registry.h"
+#include "contract/Store.h"
 #include "platform/Account.h"
 #include "platform/Files.h"
 #include "platform/KnownFolders.h"
@@ -23,15 +25,9 @@ constexpr int kDumpNumbers = 100;
 constexpr std::size_t kMaxRegistryBytes = 260;
 
 constexpr const wchar_t* kDefaultDumpName = L"hs20log.txt";
-constexpr std::string_view kDefaultDocument =
-    "\xEF\xBB\xBF<?xml version=\"1.0\" encoding=\"UTF-8\"?><configurations>\t<global>\t\t"
-    "<dump_file_path>hs20log.txt</dump_file_path>\t\t<create_new_dump_file>true</create_new_dump_file>\t\t"
-    "<autoconnect>true</autoconnect>\t\t<enabledump>false</enabledump>\t\t<dumplevel>0</dumplevel>\t\t"
-    "<homerealm></homerealm>\t\t<nextcredid>1</nextcredid>\t</global>\t<credentials>\t</credentials>\t"
-    "<users>\t</users></configurations>";
 
-std::wstring path(const std::wstring& folder, const wchar_t* name) {
-    return cutToUtf16Units(folder + L"\\" + name, kMaxPath);
+std::wstring path(const std::wstring& folder, const char* name) {
+    return cutToUtf16Units(folder + L"\\" + wideFromNarrow(name), kMaxPath);
 }
 
 }  // namespace
@@ -42,11 +38,11 @@ int Config::initPaths() {
     m_userName = *user;
     const auto publicFolder = platform::publicFolder();
     if (!publicFolder) return kFailure;
-    const std::wstring roaming = path(*publicFolder, L"Roaming");
-    const std::wstring base = path(roaming, L"Korvane");
-    for (const std::wstring& folder : {roaming, base, path(base, L"Dump")})
+    const std::wstring roaming = path(*publicFolder, contract::kRoamingFolder);
+    const std::wstring base = path(roaming, contract::kMakerFolder);
+    for (const std::wstring& folder : {roaming, base, path(base, contract::kDumpFolder)})
         if (!platform::createFolder(folder)) return kFailure;
-    const std::wstring file = path(base, L"config.xml");
+    const std::wstring file = path(base, contract::kConfigFile);
     if (!platform::canOpenFile(file)) createDefaultFile(file);
     m_baseDir = base;
     m_configPath = file;
@@ -56,7 +52,7 @@ int Config::initPaths() {
 // A file that is there and could not be opened is left alone.
 int Config::createDefaultFile(const std::wstring& path) {
     if (!platform::createFolder(path.substr(0, path.rfind(L'\\')))) return kFailure;
-    return saveSafely(path, kDefaultDocument, platform::Existing::Keep) ? kSuccess : kFailure;
+    return saveSafely(path, contract::kDefaultDocument, platform::Existing::Keep) ? kSuccess : kFailure;
 }
 
 int Config::openDocument() {
@@ -124,10 +120,9 @@ void Config::deriveDumpFilePath() {
 
 void Config::readAutoConnectFromRegistry() {
     m_bHotSpotAutoConnect = true;
-    const auto key =
-        platform::RegistryKey::open(platform::RegistryRoot::CurrentUser, "Software\\Korvane\\Vexa");
+    const auto key = platform::RegistryKey::open(platform::RegistryRoot::CurrentUser, contract::kProductKey);
     if (!key) return;
-    const auto text = key->wideValue("IsHotSpotAutoConnect", kMaxRegistryBytes);
+    const auto text = key->wideValue(contract::kHotspotSwitchValue, kMaxRegistryBytes);
     if (text && compareNoCase(*text, L"false") == 0) m_bHotSpotAutoConnect = false;
 }
 

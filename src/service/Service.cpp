@@ -6,6 +6,7 @@
 #include "base/DiagnosticLog.h"
 #include "connection/Supplicant.h"
 #include "connection/SupplicantMgr.h"
+#include "contract/Process.h"
 #include "platform/NamedMutex.h"
 #include "service/CommandLine.h"
 #include "service/IpcServers.h"
@@ -18,15 +19,12 @@ namespace {
 
 using platform::NamedMutex;
 
-constexpr const char* kInstanceMutex = "{EB028547-0B5C-4BFF-A23E-78656D726C04}";
-constexpr const char* kStopMutex = "{39EAA3ED-1A26-46B7-90A7-AAFFECE80392}";
-
 constexpr int kExitNormal = 0;
 constexpr int kExitFailed = 1;
 
 // The process ends owning the mutex: a parent that waits for it learns of the end by the abandoned mutex.
 void waitForStop() {
-    static NeverDestroyed<NamedMutex> stopMutex(kStopMutex, NamedMutex::Owner::No);
+    static NeverDestroyed<NamedMutex> stopMutex(contract::kStopMutex, NamedMutex::Owner::No);
     stopMutex.get().wait();
 }
 
@@ -41,7 +39,7 @@ void removePresentSupplicant(SupplicantMgr& manager) {
 }  // namespace
 
 int runService(const std::wstring* commandLine) {
-    std::optional<NamedMutex> instanceMutex(std::in_place, kInstanceMutex, NamedMutex::Owner::Yes);
+    std::optional<NamedMutex> instanceMutex(std::in_place, contract::kInstanceMutex, NamedMutex::Owner::Yes);
     const ScopeGuard releaseInstance([&] { instanceMutex.reset(); });
     if (instanceMutex->existedBefore()) return kExitNormal;
 

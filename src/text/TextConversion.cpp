@@ -4,21 +4,15 @@
 #include <limits>
 #include <type_traits>
 
+#include "text/Utf8.h"
+
 namespace vexa {
 
 namespace {
 
 constexpr std::wstring_view kWhiteSpace = L" \t\n\v\f\r";
 
-constexpr char32_t kReplacement = 0xFFFD;
 constexpr bool kIsUtf16 = sizeof(wchar_t) == 2;
-
-bool isHighSurrogate(char32_t unit) {
-    return unit >= 0xD800 && unit < 0xDC00;
-}
-bool isLowSurrogate(char32_t unit) {
-    return unit >= 0xDC00 && unit < 0xE000;
-}
 
 char32_t unitAt(std::wstring_view text, std::size_t index) {
     return static_cast<std::make_unsigned_t<wchar_t>>(text[index]);
@@ -44,24 +38,6 @@ WideCharacter characterAt(std::basic_string_view<Char> text, std::size_t index) 
     return {unit, 1};
 }
 
-void appendUtf8(std::string& text, char32_t c) {
-    if (c > 0x10FFFF || isHighSurrogate(c) || isLowSurrogate(c)) c = kReplacement;
-    const auto byte = [&](char32_t bits) { text += static_cast<char>(static_cast<unsigned char>(bits)); };
-    if (c < 0x80) return byte(c);
-    if (c < 0x800) {
-        byte(0xC0 | c >> 6);
-    } else {
-        if (c < 0x10000) {
-            byte(0xE0 | c >> 12);
-        } else {
-            byte(0xF0 | c >> 18);
-            byte(0x80 | (c >> 12 & 0x3F));
-        }
-        byte(0x80 | (c >> 6 & 0x3F));
-    }
-    byte(0x80 | (c & 0x3F));
-}
-
 template <class Char>
 std::string encodeUtf8(std::basic_string_view<Char> text) {
     std::string utf8;
@@ -79,48 +55,10 @@ std::string encodeUtf8(std::basic_string_view<Char> text) {
 }
 
 void appendWide(std::wstring& text, char32_t c) {
-    if (kIsUtf16 && c >= 0x10000) {
-        text += static_cast<wchar_t>(0xD800 + ((c - 0x10000) >> 10));
-        text += static_cast<wchar_t>(0xDC00 + ((c - 0x10000) & 0x3FF));
-    } else {
+    if (kIsUtf16)
+        appendUtf16(text, c);
+    else
         text += static_cast<wchar_t>(c);
-    }
-}
-
-// How many bytes a sequence has that begins with this one; 0: none does.
-std::size_t sequenceLength(unsigned char first) {
-    if (first < 0x80) return 1;
-    if (first >= 0xC2 && first < 0xE0) return 2;
-    if (first >= 0xE0 && first < 0xF0) return 3;
-    if (first >= 0xF0 && first < 0xF5) return 4;
-    return 0;
-}
-
-// Overlong forms, surrogates and numbers past the last code point are no characters.
-bool isCodePointOfLength(char32_t c, std::size_t length) {
-    constexpr char32_t kLeast[] = {0, 0, 0x80, 0x800, 0x10000};
-    return c >= kLeast[length] && c <= 0x10FFFF && !isHighSurrogate(c) && !isLowSurrogate(c);
-}
-
-// The character at the beginning of the text, of length 0 if there is none.
-WideCharacter decodeUtf8(std::string_view text) {
-    const auto byteAt = [&](std::size_t i) { return static_cast<unsigned char>(text[i]); };
-    const std::size_t length = sequenceLength(byteAt(0));
-    if (length == 1) return {byteAt(0), 1};
-    if (length == 0 || length > text.size()) return {kReplacement, 0};
-    char32_t c = byteAt(0) & (0xFFU >> (length + 1));
-    for (std::size_t i = 1; i < length; ++i) {
-        if ((byteAt(i) & 0xC0) != 0x80) return {kReplacement, 0};
-        c = c << 6 | (byteAt(i) & 0x3FU);
-    }
-    return isCodePointOfLength(c, length) ? WideCharacter{c, length} : WideCharacter{kReplacement, 0};
-}
-
-// What most texts are made of can be taken in one go.
-std::size_t asciiLength(std::string_view text) {
-    const auto end = std::find_if(text.begin(), text.end(),
-                                  [](char byte) { return static_cast<unsigned char>(byte) >= 0x80; });
-    return static_cast<std::size_t>(end - text.begin());
 }
 
 template <class Char>
@@ -155,23 +93,11 @@ std::wstring wideFromUtf8(std::string_view text) {
         wide.append(text.begin(), text.begin() + static_cast<std::ptrdiff_t>(ascii));
         text.remove_prefix(ascii);
         if (text.empty()) break;
-        const WideCharacter character = decodeUtf8(text);
+        const Utf8Character character = firstUtf8Character(text);
         appendWide(wide, character.codePoint);
         text.remove_prefix(std::max<std::size_t>(character.length, 1));
     }
     return wide;
-}
-
-bool isValidUtf8(std::string_view text) {
-    while (!text.empty()) {
-        const auto ascii = asciiLength(text);
-        text.remove_prefix(ascii);
-        if (text.empty()) break;
-        const std::size_t length = decodeUtf8(text).length;
-        if (length == 0) return false;
-        text.remove_prefix(length);
-    }
-    return true;
 }
 
 std::wstring cutToUtf16Units(std::wstring_view text, std::size_t units) {
@@ -188,15 +114,8 @@ std::wstring cutToUtf16Units(std::wstring_view text, std::size_t units) {
 
 std::u16string utf16FromWide(std::wstring_view text) {
     std::u16string units;
-    for (std::size_t i = 0; i < text.size(); ++i) {
-        const char32_t unit = unitAt(text, i);
-        if (unit < 0x10000) {
-            units += static_cast<char16_t>(unit);
-        } else {
-            units += static_cast<char16_t>(0xD800 + ((unit - 0x10000) >> 10));
-            units += static_cast<char16_t>(0xDC00 + ((unit - 0x10000) & 0x3FF));
-        }
-    }
+    for (std::size_t i = 0; i < text.size(); ++i)
+        appendUtf16(units, unitAt(text, i));
     return units;
 }
 

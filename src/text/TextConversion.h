@@ -16,8 +16,6 @@ std::wstring wideFromUtf8(std::string_view text);
 std::string utf8FromUtf16(std::u16string_view text);
 std::u16string utf16FromWide(std::wstring_view text);
 
-bool isValidUtf8(std::string_view text);
-
 /// At most `units` 16-bit units of the text, never half a surrogate pair.
 std::wstring cutToUtf16Units(std::wstring_view text, std::size_t units);
 

@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "text/TextConversion.h"
+#include "text/Utf8.h"
 
 namespace vexa {
 

@@ -11,8 +11,9 @@
 #include <filesystem>
 #include <utility>
 
+#include "platform/posix/Descriptor.h"
+#include "platform/posix/OwnerFiles.h"
 #include "platform/simulated/HostPath.h"
-#include "simulation/parts/OwnerFiles.h"
 #include "text/TextConversion.h"
 
 namespace vexa::platform {
@@ -20,34 +21,15 @@ namespace vexa::platform {
 namespace {
 
 namespace fs = std::filesystem;
+using posix::Descriptor;
 
 constexpr mode_t kOwnerOnlyFile = 0600;
 constexpr mode_t kOwnerOnlyFolder = 0700;
 constexpr std::uint32_t kErrorSharingViolation = 32;
 constexpr int kRenameTries = 5;
 
-/// A descriptor that is closed at the end of its scope.
-class Descriptor {
-public:
-    explicit Descriptor(int descriptor) : m_descriptor(descriptor) {}
-    ~Descriptor() {
-        if (m_descriptor >= 0) close(m_descriptor);
-    }
-    Descriptor(Descriptor&& other) noexcept : m_descriptor(std::exchange(other.m_descriptor, -1)) {}
-    Descriptor& operator=(Descriptor&& other) noexcept {
-        std::swap(m_descriptor, other.m_descriptor);
-        return *this;
-    }
-
-    bool isOpen() const { return m_descriptor >= 0; }
-    int get() const { return m_descriptor; }
-
-private:
-    int m_descriptor;
-};
-
 Descriptor openFile(const fs::path& path, int flags) {
-    if (fileFault("open", path)) return Descriptor(-1);
+    if (fileFault("open", path)) return Descriptor();
     return Descriptor(::open(path.c_str(), flags | O_CLOEXEC, kOwnerOnlyFile));
 }
 
@@ -66,25 +48,15 @@ bool isRenameRefused(const fs::path& target) {
     return true;
 }
 
-bool writeAll(const Descriptor& file, std::string_view content) {
-    while (!content.empty()) {
-        const ssize_t written = ::write(file.get(), content.data(), content.size());
-        if (written < 0 && errno == EINTR) continue;
-        if (written <= 0) return false;
-        content.remove_prefix(static_cast<std::size_t>(written));
-    }
-    return true;
-}
-
 }  // namespace
 
 bool canOpenFile(const std::wstring& path) {
-    return openFile(hostPath(path), O_RDONLY).isOpen();
+    return static_cast<bool>(openFile(hostPath(path), O_RDONLY));
 }
 
 std::optional<std::string> readFile(const std::wstring& path) {
     const Descriptor file = openFile(hostPath(path), O_RDONLY);
-    if (!file.isOpen()) return std::nullopt;
+    if (!file) return std::nullopt;
     std::string content;
     std::array<char, 65536> buffer{};
     for (;;) {
@@ -99,7 +71,7 @@ std::optional<std::string> readFile(const std::wstring& path) {
 bool createFolder(const std::wstring& path) {
     const fs::path folder = hostPath(path);
     if (fileFault("CreateDirectory", folder)) return false;
-    if (!simulation::createOwnerFolder(folder.parent_path())) return false;
+    if (!posix::createOwnerFolder(folder.parent_path())) return false;
     return ::mkdir(folder.c_str(), kOwnerOnlyFolder) == 0 || errno == EEXIST;
 }
 
@@ -121,7 +93,7 @@ struct NewFile::State {
 std::optional<NewFile> NewFile::create(const std::wstring& path) {
     fs::path host = hostPath(path);
     Descriptor file = openFile(host, O_WRONLY | O_CREAT | O_EXCL);
-    if (!file.isOpen() || ::flock(file.get(), LOCK_EX) != 0 || isRemoved(file)) return std::nullopt;
+    if (!file || ::flock(file.get(), LOCK_EX) != 0 || isRemoved(file)) return std::nullopt;
     return NewFile(std::make_unique<State>(State{std::move(host), std::move(file)}));
 }
 
@@ -131,7 +103,7 @@ NewFile::NewFile(NewFile&&) noexcept = default;
 NewFile& NewFile::operator=(NewFile&&) noexcept = default;
 
 bool NewFile::write(std::string_view content) {
-    return !fileFault("write", m_state->path) && writeAll(m_state->file, content);
+    return !fileFault("write", m_state->path) && posix::writeAll(m_state->file, content);
 }
 
 bool NewFile::flush() {
@@ -156,14 +128,14 @@ void NewFile::remove() {
 void NewFile::removeIfAbandoned(const std::wstring& path) {
     const fs::path host = hostPath(path);
     const Descriptor file(::open(host.c_str(), O_RDONLY | O_CLOEXEC));
-    if (file.isOpen() && ::flock(file.get(), LOCK_EX | LOCK_NB) == 0) ::unlink(host.c_str());
+    if (file && ::flock(file.get(), LOCK_EX | LOCK_NB) == 0) ::unlink(host.c_str());
 }
 
 bool appendToFile(const std::string& narrowPath, std::string_view text) {
     const fs::path path = hostPath(narrowPath);
     const Descriptor file = openFile(path, O_WRONLY | O_CREAT | O_APPEND);
-    if (!file.isOpen()) return false;
-    if (!fileFault("write", path)) writeAll(file, text);
+    if (!file) return false;
+    if (!fileFault("write", path)) posix::writeAll(file, text);
     return true;
 }
 

@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <string_view>
 
-#include "platform/simulated/MachineFolder.h"
+#include "platform/posix/MachineFolder.h"
 #include "text/TextConversion.h"
 
 namespace vexa::platform {
@@ -14,7 +14,7 @@ std::filesystem::path hostPath(const std::wstring& path) {
     std::wstring below = path.substr(publicFolder.size());
     std::replace(below.begin(), below.end(), L'\\', L'/');
     const simulation::Machine* const machine = simulation::Machine::current();
-    const std::filesystem::path folder = machine != nullptr ? machine->folder() : machineFolder();
+    const std::filesystem::path folder = machine != nullptr ? machine->folder() : posix::machineFolder();
     return (folder / "Public").concat(utf8FromWide(below));
 }
 

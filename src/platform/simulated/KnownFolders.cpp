@@ -2,9 +2,10 @@
 
 #include <atomic>
 
+#include "contract/Store.h"
+#include "platform/posix/OwnerFiles.h"
 #include "platform/simulated/HostPath.h"
 #include "simulation/Machine.h"
-#include "simulation/parts/OwnerFiles.h"
 
 namespace vexa::platform {
 
@@ -16,8 +17,8 @@ namespace {
 void provideConfiguration(const simulation::Machine& machine) {
     static std::atomic<bool> isProvided{false};
     if (!machine.scenario().config || isProvided.exchange(true)) return;
-    simulation::replaceFile(machine.folder() / "Public" / "Roaming" / "Korvane" / "config.xml",
-                            *machine.scenario().config);
+    posix::replaceFile(contract::storeFolder(machine.folder() / "Public") / contract::kConfigFile,
+                       *machine.scenario().config);
 }
 
 }  // namespace

@@ -2,7 +2,6 @@
 
 #include <fcntl.h>
 #include <sys/file.h>
-#include <unistd.h>
 
 #include <algorithm>
 #include <cerrno>
@@ -10,8 +9,9 @@
 #include <utility>
 
 #include "platform/Thread.h"
-#include "platform/simulated/MachineFolder.h"
-#include "simulation/parts/OwnerFiles.h"
+#include "platform/posix/Descriptor.h"
+#include "platform/posix/MachineFolder.h"
+#include "platform/posix/OwnerFiles.h"
 
 namespace vexa::platform {
 
@@ -21,31 +21,26 @@ namespace {
 class LockFile {
 public:
     explicit LockFile(const std::filesystem::path& path)
-        : m_descriptor(::open(path.c_str(), O_RDWR | O_CREAT | O_CLOEXEC, 0600)) {}
-    ~LockFile() {
-        if (m_descriptor >= 0) ::close(m_descriptor);
-    }
-    LockFile(const LockFile&) = delete;
-    LockFile& operator=(const LockFile&) = delete;
+        : m_file(::open(path.c_str(), O_RDWR | O_CREAT | O_CLOEXEC, 0600)) {}
 
-    bool isOpen() const { return m_descriptor >= 0; }
+    bool isOpen() const { return static_cast<bool>(m_file); }
 
     /// One of the operations of flock.
     bool lock(int operation) {
         int result = 0;
         do {
-            result = ::flock(m_descriptor, operation);
+            result = ::flock(m_file.get(), operation);
         } while (result != 0 && errno == EINTR);
         return result == 0;
     }
 
 private:
-    const int m_descriptor;
+    const posix::Descriptor m_file;
 };
 
 std::filesystem::path fileOf(std::string name, const char* suffix) {
     std::replace(name.begin(), name.end(), '/', '_');
-    return machineFolder() / "mutexes" / (name + suffix);
+    return posix::machineFolder() / "mutexes" / (name + suffix);
 }
 
 }  // namespace
@@ -62,7 +57,7 @@ struct NamedMutex::State {
 };
 
 NamedMutex::NamedMutex(const std::string& name, Owner initialOwner) {
-    simulation::createOwnerFolder(machineFolder() / "mutexes");
+    posix::createOwnerFolder(posix::machineFolder() / "mutexes");
     m_state = std::make_unique<State>(name);
     State& state = *m_state;
 

@@ -4,7 +4,7 @@
 
 #include <algorithm>
 
-#include "platform/simulated/ProcNetTcp.h"
+#include "platform/posix/ProcNetTcp.h"
 
 namespace vexa::platform {
 
@@ -26,9 +26,9 @@ constexpr Table kTables[] = {
 bool isPeerOfSameAccount(std::uint16_t peerPort, std::uint16_t serverPort) {
     const uid_t own = geteuid();
     for (const Table& table : kTables) {
-        std::vector<ProcNetTcpRow> rows;
-        if (!readProcNetTcp(table.path, rows)) continue;
-        const auto peer = std::find_if(rows.begin(), rows.end(), [&](const ProcNetTcpRow& row) {
+        std::vector<posix::TcpSocket> rows;
+        if (!posix::readProcNetTcp(table.path, rows)) continue;
+        const auto peer = std::find_if(rows.begin(), rows.end(), [&](const posix::TcpSocket& row) {
             return row.localPort == peerPort && row.remotePort == serverPort &&
                    row.localAddress == table.loopback && row.remoteAddress == table.loopback;
         });

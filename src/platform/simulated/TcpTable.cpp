@@ -10,7 +10,7 @@
 #include <tuple>
 #include <vector>
 
-#include "platform/simulated/ProcNetTcp.h"
+#include "platform/posix/ProcNetTcp.h"
 #include "simulation/Machine.h"
 
 namespace vexa::platform {
@@ -45,7 +45,7 @@ std::uint32_t addressFromHex(const std::string& digits) {
     return address;
 }
 
-TcpRow tcpRow(const ProcNetTcpRow& row) {
+TcpRow tcpRow(const posix::TcpSocket& row) {
     return {kStates[row.state < kStates.size() ? row.state : 0], addressFromHex(row.localAddress),
             htons(row.localPort), addressFromHex(row.remoteAddress), htons(row.remotePort)};
 }
@@ -67,15 +67,15 @@ std::size_t bytesFor(std::size_t rows) {
 std::uint32_t getTcpTable(TcpTable* table, std::uint32_t& size, bool ordered) {
     simulation::Machine* const machine = simulation::Machine::current();
     if (const auto error = machine ? machine->faults().nextError("GetTcpTable") : std::nullopt) return *error;
-    std::vector<ProcNetTcpRow> sockets;
-    if (!readProcNetTcp("/proc/net/tcp", sockets)) return kErrorGeneralFailure;
+    std::vector<posix::TcpSocket> sockets;
+    if (!posix::readProcNetTcp("/proc/net/tcp", sockets)) return kErrorGeneralFailure;
     if (!table || size < bytesFor(sockets.size())) {
         size = static_cast<std::uint32_t>(bytesFor(sockets.size() + kSpareRows));
         return kErrorInsufficientBuffer;
     }
     std::vector<TcpRow> rows;
     rows.reserve(sockets.size());
-    for (const ProcNetTcpRow& socket : sockets)
+    for (const posix::TcpSocket& socket : sockets)
         rows.push_back(tcpRow(socket));
     if (ordered) std::sort(rows.begin(), rows.end(), comesBefore);
     table->rowCount = static_cast<std::uint32_t>(rows.size());

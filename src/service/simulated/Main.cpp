@@ -10,12 +10,12 @@
 #include <string>
 
 #include "platform/ClockControl.h"
-#include "platform/simulated/MachineFolder.h"
+#include "platform/posix/MachineFolder.h"
+#include "platform/posix/OwnerFiles.h"
 #include "service/Service.h"
 #include "simulation/Machine.h"
 #include "simulation/control/ControlServer.h"
 #include "simulation/control/Timeline.h"
-#include "simulation/parts/OwnerFiles.h"
 #include "simulation/scenario/DemoScenario.h"
 #include "simulation/text/Text.h"
 
@@ -53,7 +53,7 @@ std::string scenarioText(const std::filesystem::path& folder) {
     const std::filesystem::path path = named ? std::filesystem::path(named) : folder / "scenario.json";
     std::error_code error;
     if (!named && !std::filesystem::exists(path, error)) return std::string(vexa::simulation::demoScenario());
-    auto text = vexa::simulation::readFile(path);
+    auto text = vexa::posix::readFile(path);
     if (!text) throw vexa::simulation::JsonFault(path.string() + ": can't be read");
     return *std::move(text);
 }
@@ -100,8 +100,10 @@ std::wstring commandLine(int count, char** arguments) {
 
 int main(int argc, char** argv) {
     ignoreSignals();
+    const std::filesystem::path folder = vexa::posix::machineFolder();
+    if (folder.empty()) return complain("no machine folder: set VEXA_MACHINE or HOME");
     try {
-        buildMachine(vexa::platform::machineFolder());
+        buildMachine(folder);
     } catch (const vexa::simulation::JsonFault& fault) {
         return complain(fault.what());
     }

@@ -9,8 +9,8 @@
 #include "client/machine/MachineFolder.h"
 #include "client/machine/TcpEndpoints.h"
 #include "client/machine/TcpPorts.h"
-#include "client/posix/Descriptor.h"
 #include "client/terminal/ClientError.h"
+#include "platform/posix/Descriptor.h"
 
 namespace vexa::client {
 namespace {

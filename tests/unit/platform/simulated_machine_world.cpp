@@ -4,7 +4,7 @@
 
 #include "platform/Files.h"
 #include "platform/KnownFolders.h"
-#include "simulation/parts/OwnerFiles.h"
+#include "platform/posix/OwnerFiles.h"
 #include "text/TextConversion.h"
 #include "unit/platform/MachineWorld.h"
 #include "unit/simulation/TestMachine.h"

@@ -4,9 +4,9 @@
 #include "TestMachine.h"
 #include "platform/DebugOutput.h"
 #include "platform/Session.h"
-#include "platform/simulated/MachineFolder.h"
-#include "platform/simulated/ProcNetTcp.h"
-#include "simulation/parts/OwnerFiles.h"
+#include "platform/posix/MachineFolder.h"
+#include "platform/posix/OwnerFiles.h"
+#include "platform/posix/ProcNetTcp.h"
 
 namespace vexa::simulation {
 namespace {

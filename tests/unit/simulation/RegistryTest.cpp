@@ -3,7 +3,7 @@
 #include <gtest/gtest.h>
 
 #include "TestMachine.h"
-#include "simulation/parts/OwnerFiles.h"
+#include "platform/posix/OwnerFiles.h"
 #include "simulation/scenario/JsonText.h"
 
 namespace vexa::simulation {

@@ -5,11 +5,11 @@
 #include <string>
 #include <string_view>
 
-namespace vexa::simulation {
+namespace vexa::posix {
 
-// Files of the machine's folder: only their owner may read them.
+// Files that only their owner may read, as all in the folder of a machine.
 
-/// Creates the folder and those above it that are missing. False if that can't be done.
+/// Creates the folder and those above it that are missing. False if that can't be done; errno says why.
 bool createOwnerFolder(const std::filesystem::path& folder);
 
 /// Nothing if it can't be read.
@@ -22,4 +22,4 @@ bool replaceFile(const std::filesystem::path& path, std::string_view content);
 /// folder at need.
 bool appendToFile(const std::filesystem::path& path, std::string_view text);
 
-}  // namespace vexa::simulation
+}  // namespace vexa::posix

@@ -1,8 +1,8 @@
-#include "platform/simulated/MachineFolder.h"
+#include "platform/posix/MachineFolder.h"
 
 #include <cstdlib>
 
-namespace vexa::platform {
+namespace vexa::posix {
 
 namespace {
 
@@ -18,8 +18,9 @@ std::filesystem::path machineFolder() {
     if (const char* const state = environment("XDG_STATE_HOME")) {
         return std::filesystem::path(state) / "vexa" / "machine";
     }
-    const char* const home = environment("HOME");
-    return std::filesystem::path(home ? home : "/") / ".local" / "state" / "vexa" / "machine";
+    if (const char* const home = environment("HOME"))
+        return std::filesystem::path(home) / ".local" / "state" / "vexa" / "machine";
+    return {};
 }
 
-}  // namespace vexa::platform
+}  // namespace vexa::posix

@@ -2,9 +2,11 @@
 
 #include <unistd.h>
 
+#include <cerrno>
+#include <string_view>
 #include <utility>
 
-namespace vexa::client {
+namespace vexa::posix {
 
 /// Owns a file descriptor; -1 is none.
 class Descriptor {
@@ -31,4 +33,15 @@ private:
     int m_value;
 };
 
-}  // namespace vexa::client
+/// Goes on after an interruption and a part. False if an error stops it.
+inline bool writeAll(const Descriptor& file, std::string_view content) {
+    while (!content.empty()) {
+        const ssize_t written = ::write(file.get(), content.data(), content.size());
+        if (written < 0 && errno == EINTR) continue;
+        if (written <= 0) return false;
+        content.remove_prefix(static_cast<std::size_t>(written));
+    }
+    return true;
+}
+
+}  // namespace vexa::posix
