@@ -1,10 +1,12 @@
 #include <CLI/CLI.hpp>
 #include <array>
 #include <iostream>
+#include <string>
 
 #include "client/command/Commands.h"
 #include "client/command/Program.h"
 #include "client/terminal/ClientError.h"
+#include "contract/Version.h"
 
 namespace {
 
@@ -30,6 +32,7 @@ int reportWrongUse(const CLI::ParseError& error) {
 
 int run(int argc, char** argv) {
     CLI::App app("The Vexa wireless service: start it, look at the air, keep its credentials.", "vexa");
+    app.set_version_flag("--version", std::string("vexa ") + vexa::contract::version());
     app.require_subcommand(1);
     int exitCode = kExitOk;
     for (const auto add : kCommands)

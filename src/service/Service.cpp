@@ -4,9 +4,11 @@
 
 #include "base/AdapterIdentity.h"
 #include "base/DiagnosticLog.h"
+#include "base/StandardOutput.h"
 #include "connection/Supplicant.h"
 #include "connection/SupplicantMgr.h"
 #include "contract/Process.h"
+#include "contract/Version.h"
 #include "platform/NamedMutex.h"
 #include "service/CommandLine.h"
 #include "service/IpcServers.h"
@@ -70,6 +72,12 @@ int runService(const std::wstring* commandLine) {
     removePresentSupplicant(manager);
     manager.deinit();
     return kExitNormal;
+}
+
+bool tellVersion(const std::wstring& commandLine) {
+    if (commandLine != L"--version") return false;
+    printToStandardOutput("vexa-service %s\n", contract::version());
+    return true;
 }
 
 }  // namespace vexa

@@ -10,4 +10,8 @@ namespace vexa {
 /// after it, at the end of the process. Called once, on the main thread.
 int runService(const std::wstring* commandLine);
 
+/// Whether the command line asks for the version, which is told on standard output then: nothing else is to
+/// be done.
+bool tellVersion(const std::wstring& commandLine);
+
 }  // namespace vexa

@@ -99,6 +99,8 @@ std::wstring commandLine(int count, char** arguments) {
 }  // namespace
 
 int main(int argc, char** argv) {
+    const std::wstring line = commandLine(argc, argv);
+    if (vexa::tellVersion(line)) return 0;
     ignoreSignals();
     const std::filesystem::path folder = vexa::posix::machineFolder();
     if (folder.empty()) return complain("no machine folder: set VEXA_MACHINE or HOME");
@@ -113,6 +115,5 @@ int main(int argc, char** argv) {
     if (controlPort && !startControl(controlPort)) {
         return complain(std::string("control channel: can't be opened on port ") + controlPort);
     }
-    const std::wstring line = commandLine(argc, argv);
     return vexa::runService(argc > 1 ? &line : nullptr);
 }

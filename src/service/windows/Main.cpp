@@ -7,5 +7,6 @@
 
 int WINAPI wWinMain(HINSTANCE /*instance*/, HINSTANCE /*previous*/, PWSTR arguments, int /*show*/) {
     const std::wstring line = arguments != nullptr ? arguments : L"";
+    if (vexa::tellVersion(line)) return 0;
     return vexa::runService(&line);
 }

@@ -1,0 +1,9 @@
+#include "contract/Version.h"
+
+namespace vexa::contract {
+
+const char* version() {
+    return VEXA_VERSION;
+}
+
+}  // namespace vexa::contract
