@@ -26,6 +26,7 @@ constexpr std::size_t kBufferSize = 20480;
 constexpr std::size_t kMaxText = kBufferSize - 1;
 constexpr std::size_t kInlineFlushLimit = 1000;
 constexpr std::size_t kMaxQueuedLines = 100000;
+constexpr std::size_t kMaxBytesKept = std::size_t{1} << 20;  // of what a full disk didn't take
 constexpr std::int32_t kLastSequence = 1000000;
 constexpr int kLowestWrittenLevel = 2;
 constexpr auto kFlushPeriod = 10s;
@@ -154,11 +155,32 @@ std::string DiagnosticLog::nextNumber() {
 
 void DiagnosticLog::addLine(std::string_view text, bool numbered) {
     if (!m_bEnabled || text.empty()) return;
-    if (m_lineCount > kInlineFlushLimit) flushToFile();
+    if (m_lineCount > kInlineFlushLimit && !m_bDiskFull) flushToFile();
     const LockGuard lock(g_hs20Lock);
     m_lines.push_back((numbered ? nextNumber() : std::string()) + std::string(text));
-    if (m_lines.size() > kMaxQueuedLines) m_lines.pop_front();
+    m_bytes += m_lines.back().size();
+    dropOldest();
     m_lineCount = m_lines.size();
+}
+
+void DiagnosticLog::dropOldest() {
+    while (m_lines.size() > kMaxQueuedLines || (m_bDiskFull && m_bytes > kMaxBytesKept)) {
+        m_bytes -= m_lines.front().size();
+        m_lines.pop_front();
+        ++m_lost;
+    }
+}
+
+// A line that was written in part goes on where it broke off.
+void DiagnosticLog::removeWritten(std::size_t bytes) {
+    m_bytes -= bytes;
+    while (bytes > 0) {
+        std::string& line = m_lines.front();
+        const std::size_t part = std::min(bytes, line.size());
+        bytes -= part;
+        line.erase(0, part);
+        if (line.empty()) m_lines.pop_front();
+    }
 }
 
 // A file that could not be opened is tried empty first: each line of a long queue comes here, and to join
@@ -168,12 +190,20 @@ void DiagnosticLog::flushToFile() {
     const LockGuard lock(g_hs20Lock);
     if (m_bFileFailed && !platform::appendToFile(m_filePath, {})) return;
     std::string text;
+    if (m_lost > 0) text = timePrefix() + std::to_string(m_lost) + " lines of the log were lost.\n";
+    const std::size_t introduction = text.size();
     for (const std::string& line : m_lines)
         text += line;
-    m_bFileFailed = !platform::appendToFile(m_filePath, text);
+    const auto taken = platform::appendToFile(m_filePath, text);
+    m_bFileFailed = !taken;
     if (m_bFileFailed) return;
-    m_lines.clear();
-    m_lineCount = 0;
+    if (*taken >= introduction) {
+        m_lost = 0;
+        removeWritten(*taken - introduction);
+    }
+    m_bDiskFull = *taken < text.size();
+    dropOldest();
+    m_lineCount = m_lines.size();
 }
 
 }  // namespace vexa

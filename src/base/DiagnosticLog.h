@@ -50,12 +50,15 @@ public:
     /// Appends to the queue, with the next number or as it is; writes the queue out first if it is long.
     void addLine(std::string_view text, bool numbered);
 
-    /// Writes out and empties the queue; leaves it alone if the file can't be opened.
+    /// Writes out and empties the queue; leaves it alone if the file can't be opened. What a full disk
+    /// doesn't take is kept for later, the last of it.
     void flushToFile();
 
 private:
     void runThread();
     std::string nextNumber() REQUIRES(g_hs20Lock);
+    void removeWritten(std::size_t bytes) REQUIRES(g_hs20Lock);
+    void dropOldest() REQUIRES(g_hs20Lock);
 
     static inline std::atomic<bool> m_bEnableDump{false};
     std::atomic<bool> m_bEnabled{false};
@@ -64,6 +67,9 @@ private:
     std::deque<std::string> m_lines GUARDED_BY(g_hs20Lock);
     std::string m_filePath GUARDED_BY(g_hs20Lock);
     bool m_bFileFailed GUARDED_BY(g_hs20Lock) = false;
+    std::atomic<bool> m_bDiskFull{false};            // the last write didn't take all
+    std::size_t m_bytes GUARDED_BY(g_hs20Lock) = 0;  // in the lines
+    std::size_t m_lost GUARDED_BY(g_hs20Lock) = 0;   // lines dropped since the last that was written
     std::int32_t m_sequence GUARDED_BY(g_hs20Lock) = 0;
     platform::Event m_hStopEvent{platform::Reset::Auto, "the log's stop event"};
     platform::Thread m_thread;

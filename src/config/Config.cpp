@@ -20,11 +20,18 @@ namespace {
 
 constexpr std::size_t kMaxPath = 259;
 constexpr std::size_t kMaxDumpPath = 254;
-constexpr std::size_t kMaxDumpName = 255;
+constexpr std::size_t kLongestEnd = std::string_view("__99.txt").size();
 constexpr int kDumpNumbers = 100;
 constexpr std::size_t kMaxRegistryBytes = 260;
 
 constexpr const wchar_t* kDefaultDumpName = L"hs20log.txt";
+
+// A name by itself: no way to another folder or stream, and so short that the path keeps its end.
+bool isFitDumpName(std::wstring_view name, std::size_t room) {
+    return name.find(L"..") == std::wstring_view::npos &&
+           name.find_first_of(L"\\/:*?\"<>|") == std::wstring_view::npos &&
+           cutToUtf16Units(name, room) == name;
+}
 
 std::wstring path(const std::wstring& folder, const char* name) {
     return cutToUtf16Units(folder + L"\\" + wideFromNarrow(name), kMaxPath);
@@ -98,14 +105,17 @@ int Config::readGlobalSettings() {
     return kSuccess;
 }
 
+// Whoever may edit the file must not choose which file this process appends to.
 void Config::deriveDumpFilePath() {
     const std::wstring user = m_userName.empty() ? L"all" : m_userName.substr(m_userName.rfind(L'\\') + 1);
     const std::wstring folder = m_baseDir + L"\\Dump\\";
+    const std::size_t room = kMaxDumpPath - std::min(kMaxDumpPath, folder.size() + user.size() + kLongestEnd);
+    if (!isFitDumpName(m_dumpFilePath, room)) m_dumpFilePath = kDefaultDumpName;
     if (!m_bCreateNewDumpFile) {
         m_dumpFilePath = cutToUtf16Units(folder + m_dumpFilePath + L"_" + user + L".txt", kMaxDumpPath);
         return;
     }
-    std::wstring name = cutToUtf16Units(m_dumpFilePath, kMaxDumpName);
+    std::wstring name = m_dumpFilePath;
     name.resize(std::min(name.find(L".txt"), name.size()));
     const std::wstring beginning = folder + name + L"_" + user + L"_";
     for (int number = 0; number < kDumpNumbers; ++number) {

@@ -23,18 +23,23 @@ SplitPath split(const std::wstring& path) {
     return {path.substr(0, backslash), path.substr(backslash + 1)};
 }
 
+// A temporary is called as the file, then a dot, this many of these digits, and the ending.
+constexpr std::size_t kDigitCount = 16;
+constexpr std::wstring_view kDigits = L"0123456789abcdef";
+
 std::wstring randomName(const std::wstring& path) {
-    static constexpr std::wstring_view kDigits = L"0123456789abcdef";
     std::random_device random;
     std::wstring name = path + L".";
-    for (int i = 0; i < 16; ++i)
+    for (std::size_t i = 0; i < kDigitCount; ++i)
         name += kDigits[random() % kDigits.size()];
     return name.append(kTemporaryEnding);
 }
 
-bool isTemporaryOf(const std::wstring& name, const std::wstring& candidate) {
-    return candidate.size() > name.size() + kTemporaryEnding.size() && candidate.starts_with(name + L".") &&
-           candidate.ends_with(kTemporaryEnding);
+bool isTemporaryOf(const std::wstring& name, std::wstring_view candidate) {
+    if (candidate.size() != name.size() + 1 + kDigitCount + kTemporaryEnding.size()) return false;
+    const std::wstring_view digits = candidate.substr(name.size() + 1, kDigitCount);
+    return candidate.starts_with(name + L".") && candidate.ends_with(kTemporaryEnding) &&
+           digits.find_first_not_of(kDigits) == std::wstring_view::npos;
 }
 
 void removeLeftovers(const std::wstring& path) {

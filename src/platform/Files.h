@@ -57,8 +57,8 @@ private:
     std::unique_ptr<State> m_state;
 };
 
-/// Appends to a text file, opened and closed by each call. The path is in the narrow code page. False: it
-/// can't be opened, and nothing was written.
-bool appendToFile(const std::string& narrowPath, std::string_view text);
+/// Appends to a text file, opened and closed by each call. The path is in the narrow code page. How many
+/// bytes of the text it took, fewer than all on a full disk; nothing: it can't be opened.
+std::optional<std::size_t> appendToFile(const std::string& narrowPath, std::string_view text);
 
 }  // namespace vexa::platform

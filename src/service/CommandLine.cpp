@@ -20,6 +20,8 @@ using platform::TcpRow;
 using platform::TcpTable;
 
 constexpr std::size_t kMaxToken = 31;
+// On a busy host the table grows between the question for its size and the one for its rows.
+constexpr int kMaxTries = 10;
 
 /// Storage for a table whose size only the operating system knows.
 class TcpTableBuffer {
@@ -48,10 +50,14 @@ std::uint16_t hostOrder(std::uint32_t networkPort) {
 bool readTcpTable(TcpTableBuffer& buffer) {
     std::uint32_t size = sizeof(TcpTable);
     if (!buffer.allocate(size)) return false;
-    if (platform::getTcpTable(buffer.table(), size, true) == platform::kErrorInsufficientBuffer &&
-        !buffer.allocate(size))
-        return false;
-    const std::uint32_t result = platform::getTcpTable(buffer.table(), size, true);
+    const bool isTooSmall =
+        platform::getTcpTable(buffer.table(), size, true) == platform::kErrorInsufficientBuffer;
+    if (isTooSmall && !buffer.allocate(size)) return false;
+    std::uint32_t result = platform::getTcpTable(buffer.table(), size, true);
+    for (int i = 1; isTooSmall && i < kMaxTries && result == platform::kErrorInsufficientBuffer; ++i) {
+        if (!buffer.allocate(size)) return false;
+        result = platform::getTcpTable(buffer.table(), size, true);
+    }
     if (result == platform::kNoError) return true;
     printToStandardOutput("\tGetTcpTable failed with %d\n", static_cast<int>(result));
     return false;

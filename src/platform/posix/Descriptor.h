@@ -33,15 +33,22 @@ private:
     int m_value;
 };
 
-/// Goes on after an interruption and a part. False if an error stops it.
-inline bool writeAll(const Descriptor& file, std::string_view content) {
-    while (!content.empty()) {
-        const ssize_t written = ::write(file.get(), content.data(), content.size());
+/// Goes on after an interruption and a part, until all is written or an error stops it. How many bytes were
+/// written.
+inline std::size_t writeSome(const Descriptor& file, std::string_view content) {
+    std::size_t done = 0;
+    while (done < content.size()) {
+        const ssize_t written = ::write(file.get(), content.data() + done, content.size() - done);
         if (written < 0 && errno == EINTR) continue;
-        if (written <= 0) return false;
-        content.remove_prefix(static_cast<std::size_t>(written));
+        if (written <= 0) break;
+        done += static_cast<std::size_t>(written);
     }
-    return true;
+    return done;
+}
+
+/// False if an error stops it.
+inline bool writeAll(const Descriptor& file, std::string_view content) {
+    return writeSome(file, content) == content.size();
 }
 
 }  // namespace vexa::posix

@@ -1,6 +1,7 @@
 #include "platform/Clock.h"
 
 #include <atomic>
+#include <limits>
 
 #include "platform/ClockControl.h"
 #include "platform/running/Scheduler.h"
@@ -11,6 +12,15 @@ namespace {
 
 std::atomic<Duration::rep> g_shift{0};
 
+// The calendar at the machine's start, once a simulated machine owns the clock: from then on one clock tells
+// both. Until then the calendar is the system's own, which may be corrected.
+constexpr Duration::rep kNoMachine = std::numeric_limits<Duration::rep>::min();
+std::atomic<Duration::rep> g_calendarAtStart{kNoMachine};
+
+Duration systemCalendar() {
+    return std::chrono::duration_cast<Duration>(std::chrono::system_clock::now().time_since_epoch());
+}
+
 }  // namespace
 
 Duration now() {
@@ -18,9 +28,8 @@ Duration now() {
 }
 
 Duration wallTime() {
-    const auto real = std::chrono::system_clock::now().time_since_epoch();
-    return std::chrono::duration_cast<Duration>(real) + Scheduler::get().leadOverWallClock() +
-           Duration(g_shift.load());
+    const Duration::rep start = g_calendarAtStart;
+    return Duration(g_shift.load()) + (start == kNoMachine ? systemCalendar() : Duration(start) + now());
 }
 
 std::tm localTime() {
@@ -41,6 +50,7 @@ void sleepFor(Duration duration) {
 
 void setClockSpeed(double speed) {
     Scheduler::get().setSpeed(speed);
+    if (g_calendarAtStart == kNoMachine) g_calendarAtStart = (systemCalendar() - now()).count();
 }
 
 bool advance(Duration span) {

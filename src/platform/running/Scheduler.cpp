@@ -169,11 +169,6 @@ Duration Scheduler::nowLocked() const {
     return m_reference + Duration(static_cast<Duration::rep>(real.count() * m_speed));
 }
 
-Duration Scheduler::leadOverWallClock() {
-    const Lock lock(m_mutex);
-    return nowLocked() - std::chrono::duration_cast<Duration>(std::chrono::steady_clock::now() - m_realStart);
-}
-
 // Rounded up, so that a wait that ends by the wall clock has reached its deadline.
 Scheduler::RealTime Scheduler::realTimeOf(Duration instant) const {
     const std::chrono::duration<double, std::micro> real(

@@ -45,7 +45,6 @@ public:
     void endWork();
 
     Duration now();
-    Duration leadOverWallClock();
     void setSpeed(double speed);
     bool advance(Duration span);
     void requestAdvance(Duration span);
@@ -86,7 +85,6 @@ private:
     double m_speed = 1.0;
     RealTime m_realReference = std::chrono::steady_clock::now();
     Duration m_reference{0};
-    const RealTime m_realStart = m_realReference;
 };
 
 }  // namespace vexa::platform

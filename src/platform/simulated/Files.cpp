@@ -131,12 +131,11 @@ void NewFile::removeIfAbandoned(const std::wstring& path) {
     if (file && ::flock(file.get(), LOCK_EX | LOCK_NB) == 0) ::unlink(host.c_str());
 }
 
-bool appendToFile(const std::string& narrowPath, std::string_view text) {
+std::optional<std::size_t> appendToFile(const std::string& narrowPath, std::string_view text) {
     const fs::path path = hostPath(narrowPath);
     const Descriptor file = openFile(path, O_WRONLY | O_CREAT | O_APPEND);
-    if (!file) return false;
-    if (!fileFault("write", path)) posix::writeAll(file, text);
-    return true;
+    if (!file) return std::nullopt;
+    return fileFault("write", path) ? 0 : posix::writeSome(file, text);
 }
 
 }  // namespace vexa::platform

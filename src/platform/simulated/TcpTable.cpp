@@ -7,11 +7,15 @@
 #include <charconv>
 #include <cstddef>
 #include <cstring>
+#include <optional>
 #include <tuple>
+#include <utility>
 #include <vector>
 
-#include "platform/posix/ProcNetTcp.h"
+#include "platform/Mutex.h"
+#include "platform/simulated/TcpSockets.h"
 #include "simulation/Machine.h"
+#include "text/NeverDestroyed.h"
 
 namespace vexa::platform {
 
@@ -62,20 +66,66 @@ std::size_t bytesFor(std::size_t rows) {
     return offsetof(TcpTable, rows) + rows * sizeof(TcpRow);
 }
 
+/// Where the rows come from: the host, or the machine's own list. A caller who comes back with the room that
+/// he was told is answered from what he was told of, however the host's table has grown meanwhile.
+class TcpSockets {
+public:
+    void replace(std::vector<posix::TcpSocket> sockets) {
+        const LockGuard lock(m_mutex);
+        m_own = std::move(sockets);
+    }
+
+    std::optional<std::vector<posix::TcpSocket>> read(std::uint32_t room) {
+        const LockGuard lock(m_mutex);
+        if (room != 0 && room == m_roomTold) return takeSnapshot();
+        if (m_own) return m_own;
+        std::vector<posix::TcpSocket> sockets;
+        return posix::readProcNetTcp("/proc/net/tcp", sockets) ? std::optional(std::move(sockets))
+                                                               : std::nullopt;
+    }
+
+    std::uint32_t tellRoom(std::vector<posix::TcpSocket> sockets) {
+        const LockGuard lock(m_mutex);
+        m_roomTold = static_cast<std::uint32_t>(bytesFor(sockets.size() + kSpareRows));
+        m_snapshot = std::move(sockets);
+        return m_roomTold;
+    }
+
+private:
+    std::vector<posix::TcpSocket> takeSnapshot() REQUIRES(m_mutex) {
+        m_roomTold = 0;
+        return std::exchange(m_snapshot, {});
+    }
+
+    Mutex m_mutex{"TCP sockets"};
+    std::optional<std::vector<posix::TcpSocket>> m_own GUARDED_BY(m_mutex);
+    std::vector<posix::TcpSocket> m_snapshot GUARDED_BY(m_mutex);
+    std::uint32_t m_roomTold GUARDED_BY(m_mutex) = 0;
+};
+
+TcpSockets& tcpSockets() {
+    static NeverDestroyed<TcpSockets> sockets;
+    return sockets.get();
+}
+
 }  // namespace
+
+void setTcpSockets(std::vector<posix::TcpSocket> sockets) {
+    tcpSockets().replace(std::move(sockets));
+}
 
 std::uint32_t getTcpTable(TcpTable* table, std::uint32_t& size, bool ordered) {
     simulation::Machine* const machine = simulation::Machine::current();
     if (const auto error = machine ? machine->faults().nextError("GetTcpTable") : std::nullopt) return *error;
-    std::vector<posix::TcpSocket> sockets;
-    if (!posix::readProcNetTcp("/proc/net/tcp", sockets)) return kErrorGeneralFailure;
-    if (!table || size < bytesFor(sockets.size())) {
-        size = static_cast<std::uint32_t>(bytesFor(sockets.size() + kSpareRows));
+    auto sockets = tcpSockets().read(size);
+    if (!sockets) return kErrorGeneralFailure;
+    if (!table || size < bytesFor(sockets->size())) {
+        size = tcpSockets().tellRoom(*std::move(sockets));
         return kErrorInsufficientBuffer;
     }
     std::vector<TcpRow> rows;
-    rows.reserve(sockets.size());
-    for (const posix::TcpSocket& socket : sockets)
+    rows.reserve(sockets->size());
+    for (const posix::TcpSocket& socket : *sockets)
         rows.push_back(tcpRow(socket));
     if (ordered) std::sort(rows.begin(), rows.end(), comesBefore);
     table->rowCount = static_cast<std::uint32_t>(rows.size());

@@ -137,11 +137,11 @@ void NewFile::removeIfAbandoned(const std::wstring& path) {
 }
 
 // By the C runtime, which ends the lines of a text file as this system's editors want it.
-bool appendToFile(const std::string& narrowPath, std::string_view text) {
+std::optional<std::size_t> appendToFile(const std::string& narrowPath, std::string_view text) {
     const std::unique_ptr<std::FILE, CloseFile> file(std::fopen(narrowPath.c_str(), "a+"));
-    if (!file) return false;
-    std::fwrite(text.data(), 1, text.size(), file.get());
-    return true;
+    if (!file) return std::nullopt;
+    const std::size_t taken = std::fwrite(text.data(), 1, text.size(), file.get());
+    return std::fflush(file.get()) == 0 ? taken : 0;
 }
 
 }  // namespace vexa::platform
