@@ -3,7 +3,6 @@
 
 #include "TestMachine.h"
 #include "platform/DebugOutput.h"
-#include "platform/Session.h"
 #include "platform/simulated/MachineFolder.h"
 #include "platform/simulated/ProcNetTcp.h"
 #include "simulation/OwnerFiles.h"
@@ -11,20 +10,11 @@
 namespace vexa::simulation {
 namespace {
 
-TEST(Session, IsActiveWhenTheMachinesIs) {
-    TestMachine machine("{'session': 'disconnected'}");
-    EXPECT_FALSE(platform::isSessionActive());
-    machine.ask("{'do': 'setSession', 'session': 'active'}");
-    EXPECT_TRUE(platform::isSessionActive());
-}
-
-TEST(DebugOutput, IsOneLineForEachCall) {
+TEST(DebugOutput, DropsOneLineEndAndIsUtf8) {
     TestMachine machine;
-    platform::outputDebugString(std::string_view("one"));
-    platform::outputDebugString(std::string_view("two\n"));
     platform::outputDebugString(std::string_view("three\n\n"));
     platform::outputDebugString(std::wstring_view(L"caf\u00E9"));
-    EXPECT_EQ(readFile(machine->folder() / "debug.log"), "one\ntwo\nthree\n\ncaf\xC3\xA9\n");
+    EXPECT_EQ(readFile(machine->folder() / "debug.log"), "three\n\ncaf\xC3\xA9\n");
 }
 
 TEST(OwnerFiles, ReplacingLeavesNothingElseBehind) {

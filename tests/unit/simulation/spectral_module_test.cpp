@@ -1,79 +1,41 @@
 #include <gtest/gtest.h>
 
-#include "TestMachine.h"
+#include "Station.h"
 
 namespace vexa::simulation {
 namespace {
 
-constexpr DWORD kIhv = WLAN_NOTIFICATION_SOURCE_IHV;
+const std::string kCompleted = hex("005ec406 00000000 02000000 325c0000");
+const std::string kSamples = hex("005ec406 00000000 01000000 325c0000");
+constexpr std::size_t kHeaderSize = 18;
+constexpr std::size_t kRecordSize = 236;
 
 /// The client's side of the module.
-class Module {
+class Module : public Station {
 public:
-    explicit Module(const std::string& scenario) : machine(scenario) {}
+    using Station::Station;
 
-    DWORD send(Bytes request) {
-        const GUID guid = machine.guid();
-        DWORD returned = 0;
-        return WlanIhvControl(listener.handle(), &guid, wlan_ihv_control_type_driver,
-                              static_cast<DWORD>(request.size()), request.data(), 0, nullptr, &returned);
+    DWORD send(const Bytes& request, DWORD capacity = 0) {
+        return control(wlan_ihv_control_type_driver, request, capacity);
     }
 
-    DWORD control(int enable) {
-        const std::string flag = enable == 1 ? "01000000" : enable == 0 ? "00000000" : "02000000";
-        return send(
-            *bytesFromHex("01000000"
-                          "0b00a3ff"
-                          "00000000"
-                          "08000000"
-                          "0000000000000000" +
-                          flag + "00000000"));
+    DWORD scan(const std::string& flag) {
+        return send(*bytesFromHex(hex("01000000 0b00a3ff 00000000 08000000") + zeros(8) + flag + "00000000"));
     }
 
-    DWORD start() { return control(1); }
-    DWORD stop() { return control(0); }
+    DWORD start() { return scan("01000000"); }
+    DWORD stop() { return scan("00000000"); }
 
-    /// All data blocks, as hex.
-    std::vector<std::string> blocks() {
-        std::vector<std::string> out;
-        for (const Heard& heard : listener.heard()) {
-            if (heard.source == kIhv) out.push_back(hexText(heard.data));
-        }
-        return out;
+    Texts blocksOfScan() {
+        EXPECT_EQ(start(), ERROR_SUCCESS);
+        machine.advance(400);
+        return blocks();
     }
-
-    TestMachine machine;
-    Listener listener;
 };
-
-const std::string kCompleted =
-    "005ec406"
-    "00000000"
-    "02000000"
-    "325c0000";
-
-std::string zeros(std::size_t bytes) {
-    return std::string(bytes * 2, '0');
-}
-
-std::string repeated(const std::string& text, int times) {
-    std::string out;
-    for (int i = 0; i < times; ++i)
-        out += text;
-    return out;
-}
 
 Bytes channelListRequest() {
     Bytes request = *bytesFromHex(
-        "00000000"
-        "040050ff"
-        "00000000"
-        "14080000"
-        "0000000000000000"
-        "80011000"
-        "08080000"
-        "08080000"
-        "00000000");
+        hex("00000000 040050ff 00000000 14080000 0000000000000000 80011000 08080000 08080000 00000000"));
     request.resize(2092);
     return request;
 }
@@ -84,144 +46,108 @@ TEST(SpectralModule, SamplesComeJustBeforeTheCompletion) {
         "'bins': 9}]]}}");
     EXPECT_EQ(module.start(), ERROR_SUCCESS);
     module.machine.advance(399);
-    EXPECT_TRUE(module.blocks().empty());
+    EXPECT_EQ(module.blocks(), Texts{});
     module.machine.advance(1);
-    const std::string record =
-        "3c14"
-        "4600" +
-        zeros(3) + "feff" + zeros(47) + repeated("09", 56) + zeros(124);
-    const auto blocks = module.blocks();
-    ASSERT_EQ(blocks.size(), 2U);
-    EXPECT_EQ(blocks[0],
-              "005ec406"
-              "00000000"
-              "01000000"
-              "325c0000"
-              "0100" +
-                  record);
-    EXPECT_EQ(blocks[1], kCompleted);
+    std::string bins;
+    for (int i = 0; i < 56; ++i)
+        bins += "09";
+    EXPECT_EQ(
+        module.blocks(),
+        (Texts{kSamples + hex("0100 3c14 4600 000000 feff") + zeros(47) + bins + zeros(124), kCompleted}));
 }
 
-TEST(SpectralModule, TravelsInPartsOfSixteenRecords) {
+TEST(SpectralModule, TravelsInPartsOfSixteenRecordsInTheOrderOfTheChannels) {
     Module module(
-        "{'spectrum': {'channels': [36, 1], 'recordsPerScan': 9,"
+        "{'spectrum': {'channels': [36, 1, 36, 6], 'recordsPerScan': 9,"
         "'levels': {'1': {'congestion': 30, 'power': 60}, '36': {'congestion': 70, 'power': 96}}}}");
-    module.start();
-    module.machine.advance(400);
-    const auto blocks = module.blocks();
+    const Texts blocks = module.blocksOfScan();
     ASSERT_EQ(blocks.size(), 3U);
-    EXPECT_EQ(blocks[0].size(), 2 * (18U + 16 * 236));
-    EXPECT_EQ(blocks[1].size(), 2 * (18U + 2 * 236));
-    EXPECT_EQ(blocks[0].substr(32, 4), "1000");
-    EXPECT_EQ(blocks[1].substr(32, 4), "0200");
-    EXPECT_EQ(blocks[0].substr(36, 8), "3c144600");
-    EXPECT_EQ(blocks[1].substr(36, 8), "6c091e00");
-    EXPECT_EQ(blocks[1].substr(36 + 2 * 56, 112), repeated("64", 56));
+    EXPECT_EQ(blocks[0].size(), 2 * (kHeaderSize + 16 * kRecordSize));
+    EXPECT_EQ(blocks[1].size(), 2 * (kHeaderSize + 2 * kRecordSize));
+    EXPECT_EQ(blocks[0].substr(32, 12), hex("1000 3c14 4600"));
+    EXPECT_EQ(blocks[1].substr(32, 12), hex("0200 6c09 1e00"));
+    EXPECT_EQ(blocks[1].substr(36 + 2 * 56, 6), "646464");
 }
 
 TEST(SpectralModule, KnowsTheFrequenciesOfItsChannels) {
-    struct Case {
-        int channel;
-        const char* frequency;
-    };
-    const Case cases[] = {{1, "6c09"}, {13, "a809"}, {14, "b409"}, {36, "3c14"}, {165, "c116"}};
-    for (const Case& c : cases) {
-        const std::string number = std::to_string(c.channel);
-        Module module("{'spectrum': {'channels': [" + number + "], 'levels': {'" + number + "': {}}}}");
-        module.start();
-        module.machine.advance(400);
-        ASSERT_EQ(module.blocks().size(), 2U) << c.channel;
-        EXPECT_EQ(module.blocks()[0].substr(36, 4), c.frequency) << c.channel;
-    }
+    Module module(
+        "{'spectrum': {'channels': [1, 13, 14, 36, 165], 'recordsPerScan': 1, 'levels': "
+        "{'1': {}, '13': {}, '14': {}, '36': {}, '165': {}}}}");
+    const std::string block = module.blocksOfScan().front();
+    std::string frequencies;
+    for (std::size_t record = 0; record < 5; ++record)
+        frequencies += block.substr(2 * (kHeaderSize + record * kRecordSize), 4) + " ";
+    EXPECT_EQ(frequencies, "6c09 a809 b409 3c14 c116 ");
 }
 
-TEST(SpectralModule, AStartDuringAScanChangesNothing) {
+TEST(SpectralModule, AScanRunsOnceUntilItIsStoppedOrTheAdapterGoes) {
     Module module("{'spectrum': {}}");
     module.start();
     module.machine.advance(300);
-    EXPECT_EQ(module.start(), ERROR_SUCCESS);
+    EXPECT_EQ(module.start(), ERROR_SUCCESS) << "while it runs, a start changes nothing";
     module.machine.advance(100);
-    EXPECT_EQ(module.blocks(), (std::vector<std::string>{kCompleted}));
+    EXPECT_EQ(module.blocks(), Texts{kCompleted});
     module.machine.advance(1000);
-    EXPECT_EQ(module.blocks().size(), 1U);
-}
+    EXPECT_EQ(module.blocks(), Texts{});
 
-TEST(SpectralModule, AStopEndsTheScanWithoutAWord) {
-    Module module("{'spectrum': {}}");
     module.start();
     module.machine.advance(300);
     EXPECT_EQ(module.stop(), ERROR_SUCCESS);
     EXPECT_EQ(module.start(), ERROR_SUCCESS);
     module.machine.advance(399);
-    EXPECT_TRUE(module.blocks().empty());
+    EXPECT_EQ(module.blocks(), Texts{});
     module.machine.advance(1);
-    EXPECT_EQ(module.blocks().size(), 1U);
-}
+    EXPECT_EQ(module.blocks(), Texts{kCompleted});
 
-TEST(SpectralModule, EndsItsScanWithTheAdapter) {
-    Module module("{'spectrum': {}}");
     module.start();
-    module.machine.ask("{'do': 'pullAdapter'}");
+    module.act("{'do': 'pullAdapter'}");
     EXPECT_EQ(module.start(), ERROR_NOT_FOUND);
-    module.machine.ask("{'do': 'insertAdapter'}");
+    module.act("{'do': 'insertAdapter'}");
     module.machine.advance(1000);
-    EXPECT_TRUE(module.blocks().empty());
-    EXPECT_EQ(module.start(), ERROR_SUCCESS);
+    EXPECT_EQ(module.blocks(), Texts{});
+    EXPECT_EQ(module.blocksOfScan(), Texts{kCompleted});
 }
 
-TEST(SpectralModule, MayNeverComplete) {
-    Module module("{'spectrum': {'completes': false, 'scans': [[{}], [{}]]}}");
-    for (std::size_t scan = 1; scan <= 2; ++scan) {
-        module.start();
-        module.machine.advance(400);
-        ASSERT_EQ(module.blocks().size(), scan);
-        EXPECT_EQ(module.blocks().back().substr(16, 8), "01000000");
-    }
-}
-
-TEST(SpectralModule, ScansPastTheLastGiveNothingButTheirCompletion) {
-    Module module("{'spectrum': {'scans': [[], [{'frequency': 1}]]}}");
-    std::string sizes;
-    for (int scan = 0; scan < 3; ++scan) {
-        module.start();
-        module.machine.advance(400);
-    }
-    for (const auto& block : module.blocks())
-        sizes += std::to_string(block.size() / 2) + " ";
-    EXPECT_EQ(sizes, "16 254 16 16 ");
-}
-
-TEST(SpectralModule, OneSeedGivesOneStory) {
-    const auto story = [](const std::string& seed) {
-        Module module(
-            "{'seed': " + seed +
-            ", 'spectrum': {'channels': [1, 6], 'levels': {"
-            "'1': {'congestion': 50, 'power': -20, 'spread': 5}, '6': {'congestion': 2, 'spread': 4}}}}");
+TEST(SpectralModule, SendsScansAsTheyAreGivenAndMayNeverComplete) {
+    const struct {
+        const char* spectrum;
+        std::string sizes;
+    } cases[] = {{"'scans': [[], [{'frequency': 1}]]", "16 254 16 16 "},
+                 {"'scans': [[{}], [{}, {}]], 'completes': false", "254 490 "}};
+    for (const auto& [spectrum, sizes] : cases) {
+        Module module(std::string("{'spectrum': {") + spectrum + "}}");
+        std::string seen;
         for (int scan = 0; scan < 3; ++scan) {
-            module.start();
-            module.machine.advance(400);
+            for (const std::string& block : module.blocksOfScan())
+                seen += std::to_string(block.size() / 2) + " ";
         }
-        return module.blocks();
-    };
-    EXPECT_EQ(story("3"), story("3"));
-    EXPECT_NE(story("3"), story("4"));
+        EXPECT_EQ(seen, sizes);
+    }
 }
 
-TEST(SpectralModule, ValuesStayWithinTheirSpread) {
-    Module module(
-        "{'spectrum': {'channels': [1], 'recordsPerScan': 400, 'levels': {"
-        "'1': {'congestion': 3, 'power': -20, 'spread': 5}}}}");
-    module.start();
-    module.machine.advance(400);
+TEST(SpectralModule, OneSeedGivesOneStoryWithinTheSpread) {
+    const auto story = [](const std::string& seed) {
+        Module module("{'seed': " + seed +
+                      ", 'spectrum': {'channels': [1], 'recordsPerScan': 400, 'levels': {"
+                      "'1': {'congestion': 3, 'power': -20, 'spread': 5}}}}");
+        module.blocksOfScan();
+        Bytes records;
+        for (const Heard& heard : module.listener.heard()) {
+            if (heard.data.size() > kHeaderSize)
+                records.insert(records.end(), heard.data.begin() + kHeaderSize, heard.data.end());
+        }
+        return records;
+    };
+    const Bytes records = story("3");
+    EXPECT_EQ(story("3"), records);
+    EXPECT_NE(story("4"), records);
     int lowest = 99;
     int highest = -99;
-    for (const Heard& heard : module.listener.heard()) {
-        for (std::size_t at = 18; at < heard.data.size(); at += 236) {
-            EXPECT_LE(heard.data[at + 2], 8);
-            const auto power = static_cast<std::int16_t>(heard.data[at + 7] | heard.data[at + 8] << 8);
-            lowest = std::min<int>(lowest, power);
-            highest = std::max<int>(highest, power);
-        }
+    for (std::size_t at = 0; at < records.size(); at += kRecordSize) {
+        EXPECT_LE(records[at + 2], 8);
+        const auto power = static_cast<std::int16_t>(records[at + 7] | records[at + 8] << 8);
+        lowest = std::min<int>(lowest, power);
+        highest = std::max<int>(highest, power);
     }
     EXPECT_EQ(lowest, -25);
     EXPECT_EQ(highest, -15);
@@ -229,57 +155,39 @@ TEST(SpectralModule, ValuesStayWithinTheirSpread) {
 
 TEST(SpectralModule, LevelsChangeFromNowOnAndKeepWhatIsNotNamed) {
     Module module(
-        "{'spectrum': {'channels': [1], 'recordsPerScan': 1, 'levels': {'1': {'congestion': 3, 'power': "
-        "7}}}}");
-    EXPECT_EQ(module.machine.ask("{'do': 'levels', 'levels': {'1': {'congestion': 9}}}"), R"({"ok":true})");
-    EXPECT_EQ(module.machine.ask("{'do': 'set', 'scanMs': 50}"), R"({"ok":true})");
-    module.start();
-    module.machine.advance(50);
-    ASSERT_EQ(module.blocks().size(), 2U);
-    EXPECT_EQ(module.blocks()[0].substr(36, 18),
-              "6c09"
-              "0900"
-              "000000"
-              "0700");
+        "{'spectrum': {'channels': [1], 'recordsPerScan': 1, 'scanMs': 9000, 'levels': {'1': {'congestion': "
+        "3, 'power': 7}}}}");
+    module.act("{'do': 'levels', 'levels': {'1': {'congestion': 9}}}");
+    module.act("{'do': 'set', 'scanMs': 50}");
+    EXPECT_EQ(module.blocksOfScan().front().substr(36, 18), hex("6c09 0900 000000 0700"));
 }
 
-TEST(SpectralModule, GivesItsChannelsInPlaceOfTheRequest) {
-    Module module("{'spectrum': {'channels': [36, 1, 36]}}");
-    Bytes buffer = channelListRequest();
-    const GUID guid = module.machine.guid();
-    DWORD returned = 0;
-    ASSERT_EQ(WlanIhvControl(module.listener.handle(), &guid, wlan_ihv_control_type_driver, 2092,
-                             buffer.data(), 2092, buffer.data(), &returned),
-              ERROR_SUCCESS);
-    EXPECT_EQ(returned, 2092U);
+TEST(SpectralModule, GivesItsChannelsInTheRequestAndCountsMoreThanItCanGive) {
+    const auto listOf = [](const std::string& channels) {
+        Module module("{'spectrum': {'channels': [" + channels + "]}}");
+        EXPECT_EQ(module.send(channelListRequest(), 2092), ERROR_SUCCESS);
+        const Bytes list = module.output;
+        EXPECT_EQ(module.send(channelListRequest(), 2091), ERROR_INSUFFICIENT_BUFFER);
+        return list;
+    };
     Bytes expected = channelListRequest();
     expected[40] = 3;
     expected[46] = 36;
     expected[54] = 1;
     expected[62] = 36;
-    EXPECT_EQ(buffer, expected);
-    EXPECT_EQ(WlanIhvControl(module.listener.handle(), &guid, wlan_ihv_control_type_driver, 2092,
-                             channelListRequest().data(), 2091, buffer.data(), &returned),
-              ERROR_INSUFFICIENT_BUFFER);
-}
-
-TEST(SpectralModule, CountsMoreChannelsThanItCanGive) {
+    EXPECT_EQ(listOf("36, 1, 36"), expected);
     std::string channels = "1";
     for (int i = 1; i < 300; ++i)
         channels += ", 1";
-    Module module("{'spectrum': {'channels': [" + channels + "]}}");
-    Bytes buffer = channelListRequest();
-    const GUID guid = module.machine.guid();
-    DWORD returned = 0;
-    WlanIhvControl(module.listener.handle(), &guid, wlan_ihv_control_type_driver, 2092, buffer.data(), 2092,
-                   buffer.data(), &returned);
-    EXPECT_EQ(buffer[40] | buffer[41] << 8, 300);
-    EXPECT_EQ(buffer[46 + 8 * 255], 1);
+    const Bytes list = listOf(channels);
+    ASSERT_EQ(list.size(), 2092U);
+    EXPECT_EQ(at(list, 40, 2), "2c01");
+    EXPECT_EQ(list[46 + 8 * 255], 1);
 }
 
 TEST(SpectralModule, RefusesWhatIsNotWellFormed) {
     Module module("{'spectrum': {}}");
-    EXPECT_EQ(module.control(2), ERROR_INVALID_PARAMETER);
+    EXPECT_EQ(module.scan("02000000"), ERROR_INVALID_PARAMETER);
     EXPECT_EQ(module.send({}), ERROR_INVALID_PARAMETER);
     EXPECT_EQ(module.send(Bytes(32)), ERROR_INVALID_PARAMETER);
     for (const std::size_t wrong : {0U, 4U, 12U, 32U, 28U, 24U}) {
@@ -293,7 +201,6 @@ TEST(SpectralModule, IsMissingWithoutASpectrum) {
     Module module("{}");
     EXPECT_EQ(module.start(), ERROR_NOT_SUPPORTED);
     EXPECT_EQ(module.send(channelListRequest()), ERROR_NOT_SUPPORTED);
-    EXPECT_EQ(module.send(Bytes(32)), ERROR_INVALID_PARAMETER);
 }
 
 }  // namespace

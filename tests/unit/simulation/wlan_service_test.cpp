@@ -1,6 +1,6 @@
 #include <gtest/gtest.h>
 
-#include "TestMachine.h"
+#include "Station.h"
 #include "simulation/JsonText.h"
 
 namespace vexa::simulation {
@@ -8,51 +8,45 @@ namespace {
 
 class WlanService : public ::testing::Test {
 protected:
-    WlanService() {
-        DWORD version = 0;
-        EXPECT_EQ(WlanOpenHandle(2, nullptr, &version, &handle), ERROR_SUCCESS);
-        EXPECT_EQ(version, 2U);
-    }
+    DWORD query(int opcode) { return station.query(static_cast<WLAN_INTF_OPCODE>(opcode), answer); }
 
-    DWORD query(HANDLE client, const GUID& guid, WLAN_INTF_OPCODE opcode, Bytes* answer = nullptr) {
-        DWORD size = 0;
-        PVOID data = nullptr;
-        const DWORD result = WlanQueryInterface(client, &guid, opcode, nullptr, &size, &data, nullptr);
-        const auto* bytes = static_cast<const std::uint8_t*>(data);
-        if (answer && bytes) *answer = Bytes(bytes, bytes + size);
-        if (data) WlanFreeMemory(data);
-        return result;
-    }
-
-    TestMachine machine{"{'adapters': [{}, {'inserted': false}, {'hardwareId': null}]}"};
-    HANDLE handle = nullptr;
+    Station station{"{'adapters': [{}, {'inserted': false}, {'hardwareId': null}]}"};
+    Bytes answer;
 };
 
 TEST_F(WlanService, AHandleIsGoodUntilItIsClosed) {
+    const auto handles = [&] { return station.machine.query("{'query': 'handles'}").asUInt(); };
     HANDLE other = nullptr;
-    DWORD version = 0;
-    ASSERT_EQ(WlanOpenHandle(2, nullptr, &version, &other), ERROR_SUCCESS);
-    EXPECT_NE(other, handle);
-    EXPECT_EQ(machine.query("{'query': 'handles'}").asUInt(), 2U);
-    EXPECT_EQ(WlanCloseHandle(other, nullptr), ERROR_SUCCESS);
-    EXPECT_EQ(WlanCloseHandle(other, nullptr), ERROR_INVALID_HANDLE);
-    EXPECT_EQ(machine.query("{'query': 'handles'}").asUInt(), 1U);
-    for (HANDLE bad : {HANDLE{nullptr}, other, INVALID_HANDLE_VALUE}) {
-        PWLAN_INTERFACE_INFO_LIST list = nullptr;
-        DWORD size = 0;
-        EXPECT_EQ(WlanEnumInterfaces(bad, nullptr, &list), ERROR_INVALID_HANDLE);
-        EXPECT_EQ(query(bad, machine.guid(), wlan_intf_opcode_radio_state), ERROR_INVALID_HANDLE);
-        EXPECT_EQ(WlanRegisterNotification(bad, 0, FALSE, nullptr, nullptr, nullptr, nullptr),
-                  ERROR_INVALID_HANDLE);
-        const GUID guid = machine.guid();
-        EXPECT_EQ(WlanIhvControl(bad, &guid, wlan_ihv_control_type_driver, 0, nullptr, 0, nullptr, &size),
-                  ERROR_INVALID_HANDLE);
+    {
+        const Listener another;
+        other = another.handle();
+        EXPECT_NE(other, station.listener.handle());
+        EXPECT_EQ(handles(), 2U);
+    }
+    EXPECT_EQ(handles(), 1U);
+    const GUID guid = station.guid;
+    WLAN_CONNECTION_PARAMETERS parameters{};
+    PWLAN_INTERFACE_INFO_LIST list = nullptr;
+    PVOID data = nullptr;
+    DWORD size = 0;
+    for (const HANDLE bad : {HANDLE{nullptr}, other, INVALID_HANDLE_VALUE}) {
+        const DWORD results[] = {
+            WlanCloseHandle(bad, nullptr),
+            WlanEnumInterfaces(bad, nullptr, &list),
+            WlanQueryInterface(bad, &guid, wlan_intf_opcode_radio_state, nullptr, &size, &data, nullptr),
+            WlanRegisterNotification(bad, 0, FALSE, nullptr, nullptr, nullptr, nullptr),
+            WlanIhvControl(bad, &guid, wlan_ihv_control_type_driver, 0, nullptr, 0, nullptr, &size),
+            WlanConnect(bad, &guid, &parameters, nullptr),
+            WlanDisconnect(bad, &guid, nullptr),
+        };
+        for (const DWORD result : results)
+            EXPECT_EQ(result, ERROR_INVALID_HANDLE);
     }
 }
 
 TEST_F(WlanService, TheListHoldsTheInsertedAdaptersInOrder) {
     PWLAN_INTERFACE_INFO_LIST list = nullptr;
-    ASSERT_EQ(WlanEnumInterfaces(handle, nullptr, &list), ERROR_SUCCESS);
+    ASSERT_EQ(WlanEnumInterfaces(station.listener.handle(), nullptr, &list), ERROR_SUCCESS);
     ASSERT_EQ(list->dwNumberOfItems, 2U);
     const auto* interfaces = static_cast<const WLAN_INTERFACE_INFO*>(list->InterfaceInfo);
     EXPECT_EQ(interfaces[0].InterfaceGuid.Data4[7], 1);
@@ -62,32 +56,30 @@ TEST_F(WlanService, TheListHoldsTheInsertedAdaptersInOrder) {
 }
 
 TEST_F(WlanService, QueriesAnswerAboutInsertedAdaptersOnly) {
-    Bytes answer;
-    EXPECT_EQ(query(handle, machine.guid(), wlan_intf_opcode_interface_state, &answer), ERROR_SUCCESS);
+    EXPECT_EQ(query(wlan_intf_opcode_interface_state), ERROR_SUCCESS);
     EXPECT_EQ(hexText(answer), "04000000");
-    EXPECT_EQ(query(handle, machine.guid(), wlan_intf_opcode_channel_number, &answer), ERROR_SUCCESS);
+    EXPECT_EQ(query(wlan_intf_opcode_channel_number), ERROR_SUCCESS);
     EXPECT_EQ(hexText(answer), "00000000");
-    EXPECT_EQ(query(handle, machine.guid(), wlan_intf_opcode_current_connection), ERROR_INVALID_STATE);
-    EXPECT_EQ(query(handle, machine.guid(), static_cast<WLAN_INTF_OPCODE>(5)), ERROR_INVALID_PARAMETER);
-    EXPECT_EQ(query(handle, machine->adapters().guid(1), wlan_intf_opcode_radio_state), ERROR_NOT_FOUND);
+    EXPECT_EQ(query(5), ERROR_INVALID_PARAMETER);
+    station.guid = station.machine->adapters().guid(1);
+    EXPECT_EQ(query(wlan_intf_opcode_radio_state), ERROR_NOT_FOUND);
 }
 
 TEST_F(WlanService, CallsAreKept) {
-    const GUID guid = machine.guid();
-    const GUID pulled = machine->adapters().guid(1);
-    std::uint8_t request[] = {0xAB, 0xCD};
-    std::uint8_t output[3];
-    DWORD returned = 0;
-    machine.advance(5);
-    WlanIhvControl(handle, &pulled, wlan_ihv_control_type_driver, 2, request, 3, output, &returned);
-    query(handle, guid, wlan_intf_opcode_radio_state);
-    EXPECT_EQ(compactJson(machine.query("{'query': 'calls'}")),
-              R"([{"atMs":5,"call":"WlanIhvControl","inHex":"abcd","outSize":3,"result":1168,"type":1}])");
-    const Json::Value all = machine.query("{'query': 'calls', 'all': true}");
-    ASSERT_EQ(all.size(), 2U);
-    EXPECT_EQ(compactJson(all[1]), R"({"atMs":5,"call":"WlanQueryInterface","opcode":4,"result":0})");
-    machine.ask("{'do': 'clearCalls'}");
-    EXPECT_EQ(machine.query("{'query': 'calls', 'all': true}").size(), 0U);
+    station.machine.advance(5);
+    query(wlan_intf_opcode_radio_state);
+    station.guid = station.machine->adapters().guid(1);
+    station.control(wlan_ihv_control_type_driver, {0xAB, 0xCD}, 3);
+    const std::string control =
+        R"({"atMs":5,"call":"WlanIhvControl","inHex":"abcd","outSize":3,"result":1168,"type":1})";
+    const auto calls = [&](const std::string& members) {
+        return compactJson(station.machine.query("{'query': 'calls'" + members + "}"));
+    };
+    EXPECT_EQ(calls(""), "[" + control + "]");
+    EXPECT_EQ(calls(", 'all': true"),
+              R"([{"atMs":5,"call":"WlanQueryInterface","opcode":4,"result":0},)" + control + "]");
+    station.act("{'do': 'clearCalls'}");
+    EXPECT_EQ(calls(", 'all': true"), "[]");
 }
 
 }  // namespace
