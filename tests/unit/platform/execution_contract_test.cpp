@@ -2,7 +2,6 @@
 
 #include <array>
 #include <atomic>
-#include <functional>
 #include <memory>
 #include <vector>
 
@@ -40,51 +39,43 @@ TEST(Event, AnAutoResetEventEndsOneWaitAndAManualOneAll) {
     });
 }
 
-TEST(Event, ASetEventStaysSetUntilItIsWaitedForOrReset) {
-    inWorld([] {
-        Event event(Reset::Auto);
-        event.set();
-        event.set();
-        EXPECT_TRUE(event.wait(0ms));
-        EXPECT_FALSE(event.wait(0ms));
-        event.set();
-        event.reset();
-        EXPECT_FALSE(event.wait(0ms));
-    });
-}
-
-TEST(Event, OfSeveralSetEventsTheLowestIndexIsTakenAndTheOthersStay) {
+TEST(Event, StaysSetUntilItIsWaitedForOrResetAndTheLowestIndexIsTaken) {
     inWorld([] {
         Event first(Reset::Auto);
         Event second(Reset::Auto);
         Event third(Reset::Auto);
         const std::array<Event*, 3> events{&first, &second, &third};
-        third.set();
-        second.set();
+        for (Event* const event : {&first, &third, &second, &second})
+            event->set();
+        first.reset();
         EXPECT_EQ(waitForAny(events, 0ms), 1);
         EXPECT_EQ(waitForAny(events, 0ms), 2);
         EXPECT_EQ(waitForAny(events, 0ms), kTimedOut);
     });
 }
 
-TEST(Clock, AWaitEndsAtItsDeadlineAndNotBefore) {
+TEST(Clock, AWaitEndsAtItsDeadlineAndNotBeforeWhateverTheCalendarSays) {
     inWorld([] {
         Event never(Reset::Auto);
         std::atomic<bool> isOver{false};
-        const Duration start = now();
         std::atomic<Duration> end{};
+        const Duration start = now();
+        const Duration lead = wallTime() - start;
         Thread waiter;
         waiter.start("waiter", [&] {
-            never.wait(250ms);
+            isOver = !never.wait(250ms);
             end = now();
-            isOver = true;
         });
+        shiftWallTime(-1h);
+        EXPECT_LT(wallTime() - now(), lead - 30min);
+        shiftWallTime(3h);
         ASSERT_TRUE(advance(249ms));
         EXPECT_FALSE(isOver);
         ASSERT_TRUE(advance(2ms));
         EXPECT_TRUE(isOver);
         EXPECT_EQ(end.load() - start, 250ms);
         waiter.join();
+        shiftWallTime(-2h);
     });
 }
 
@@ -92,18 +83,18 @@ TEST(Clock, AdvancingRunsWhatFallsDueOnTheWayInItsOrder) {
     inWorld([] {
         Mutex mutex;
         std::vector<int> order;
+        const auto note = [&](int delay) {
+            const LockGuard lock(mutex);
+            order.push_back(delay);
+        };
         std::array<Thread, 3> sleepers;
         const std::array<int, 3> delays{30, 10, 20};
         for (std::size_t i = 0; i < sleepers.size(); ++i)
             sleepers[i].start("sleeper", [&, delay = delays[i]] {
                 sleepFor(std::chrono::milliseconds(delay));
-                {
-                    const LockGuard lock(mutex);
-                    order.push_back(delay);
-                }
+                note(delay);
                 sleepFor(100ms);
-                const LockGuard lock(mutex);
-                order.push_back(delay + 100);
+                note(delay + 100);
             });
         ASSERT_TRUE(advance(500ms));
         for (Thread& sleeper : sleepers)
@@ -112,79 +103,43 @@ TEST(Clock, AdvancingRunsWhatFallsDueOnTheWayInItsOrder) {
     });
 }
 
-TEST(Clock, ShiftingTheCalendarChangesNoWait) {
-    inWorld([] {
-        const Duration before = wallTime() - now();
-        shiftWallTime(-1h);
-        EXPECT_LT(wallTime() - now(), before - 30min);
-        shiftWallTime(1h);
-        Event never(Reset::Auto);
-        Thread waiter;
-        std::atomic<bool> isOver{false};
-        waiter.start("waiter", [&] { isOver = !never.wait(1s); });
-        shiftWallTime(2h);
-        ASSERT_TRUE(advance(500ms));
-        EXPECT_FALSE(isOver);
-        ASSERT_TRUE(advance(500ms));
-        waiter.join();
-        shiftWallTime(-2h);
-    });
-}
-
-// The compiler's check knows no recursion.
-void addUnderTwoLocks(RecursiveMutex& mutex, int& counter) NO_THREAD_SAFETY_ANALYSIS {
+// The compiler's check knows no recursion. True if the lock was held after one of two unlocks.
+bool addUnderTwoLocks(RecursiveMutex& mutex, int& counter) NO_THREAD_SAFETY_ANALYSIS {
     const LockGuard outer(mutex);
-    const LockGuard inner(mutex);
-    counter = counter + 1;
+    {
+        const LockGuard inner(mutex);
+        counter = counter + 1;
+    }
+    return mutex.isHeldByThisThread();
 }
 
-bool isHeldAfterOneOfTwoUnlocks(RecursiveMutex& mutex,
-                                const std::function<void()>& meanwhile) NO_THREAD_SAFETY_ANALYSIS {
-    mutex.lock();
-    mutex.lock();
-    mutex.unlock();
-    const bool isHeld = mutex.isHeldByThisThread();
-    meanwhile();
-    mutex.unlock();
-    return isHeld;
-}
-
-TEST(Mutex, ProtectsWhatItGuards) {
+TEST(Mutex, ProtectsWhatItGuardsAndARecursiveOneKnowsItsHolder) {
     inWorld([] {
         Mutex mutex;
         RecursiveMutex recursive;
         int plain = 0;
         int nested = 0;
+        int held = 0;
         std::array<Thread, 4> threads;
         for (Thread& thread : threads)
             thread.start("counter", [&] {
                 for (int i = 0; i < 100; ++i) {
-                    {
-                        const LockGuard lock(mutex);
-                        plain = plain + 1;
-                    }
-                    addUnderTwoLocks(recursive, nested);
+                    const bool isHeld = addUnderTwoLocks(recursive, nested);
+                    const LockGuard lock(mutex);
+                    plain = plain + 1;
+                    held = held + (isHeld ? 1 : 0);
                 }
             });
         for (Thread& thread : threads)
             thread.join();
         EXPECT_EQ(plain, 400);
         EXPECT_EQ(nested, 400);
-    });
-}
-
-TEST(Mutex, ARecursiveMutexKnowsItsHolder) {
-    inWorld([] {
-        RecursiveMutex mutex;
-        EXPECT_FALSE(mutex.isHeldByThisThread());
-        std::atomic<bool> isHeldByOther{true};
-        EXPECT_TRUE(isHeldAfterOneOfTwoUnlocks(mutex, [&] {
-            Thread other;
-            other.start("other", [&] { isHeldByOther = mutex.isHeldByThisThread(); });
-            other.join();
-        }));
-        EXPECT_FALSE(isHeldByOther);
-        EXPECT_FALSE(mutex.isHeldByThisThread());
+        EXPECT_EQ(held, 400);
+        EXPECT_FALSE(recursive.isHeldByThisThread());
+        const LockGuard lock(recursive);
+        Thread other;
+        other.start("other", [&] { EXPECT_FALSE(recursive.isHeldByThisThread()); });
+        other.join();
     });
 }
 
@@ -208,11 +163,15 @@ TEST(Thread, AJoinWithALimitGivesUpAndCanBeRepeated) {
     });
 }
 
-TEST(PeriodicTimer, CallsOncePerPeriodUntilItIsDestroyed) {
+TEST(PeriodicTimer, CallsOncePerPeriodWhichARestartBeginsAnewUntilItIsDestroyed) {
     inWorld([] {
         std::atomic<int> calls{0};
         {
-            const PeriodicTimer timer("timer", 10s, [&] { ++calls; });
+            PeriodicTimer timer("timer", 10s, [&] { ++calls; });
+            for (int i = 0; i < 5; ++i) {
+                ASSERT_TRUE(advance(9s));
+                timer.restart();
+            }
             ASSERT_TRUE(advance(9999ms));
             EXPECT_EQ(calls, 0);
             ASSERT_TRUE(advance(1ms));
@@ -225,46 +184,30 @@ TEST(PeriodicTimer, CallsOncePerPeriodUntilItIsDestroyed) {
     });
 }
 
-TEST(PeriodicTimer, ARestartBeginsANewPeriod) {
-    inWorld([] {
-        std::atomic<int> calls{0};
-        PeriodicTimer timer("timer", 10s, [&] { ++calls; });
-        for (int i = 0; i < 5; ++i) {
-            ASSERT_TRUE(advance(9s));
-            timer.restart();
-        }
-        EXPECT_EQ(calls, 0);
-        ASSERT_TRUE(advance(10s));
-        EXPECT_EQ(calls, 1);
-    });
-}
-
 TEST(PeriodicTimer, ARestartNeverWaitsAndTheDestructorDoes) {
     inWorld([] {
         Event entered(Reset::Auto);
         Event mayLeave(Reset::Auto);
         std::atomic<bool> hasLeft{false};
+        auto timer = std::make_unique<PeriodicTimer>("timer", 1s, [&] {
+            entered.set();
+            mayLeave.wait();
+            hasLeft = true;
+        });
+        ASSERT_TRUE(advance(1s));
+        ASSERT_TRUE(entered.wait(0ms));
+        timer->restart();
+        std::atomic<bool> sawItLeave{false};
         Thread owner;
-        {
-            auto timer = std::make_unique<PeriodicTimer>("timer", 1s, [&] {
-                entered.set();
-                mayLeave.wait();
-                hasLeft = true;
-            });
-            ASSERT_TRUE(advance(1s));
-            ASSERT_TRUE(entered.wait(0ms));
-            timer->restart();
-            std::atomic<bool> sawItLeave{false};
-            owner.start("owner", [&] {
-                timer.reset();
-                sawItLeave = hasLeft.load();
-            });
-            ASSERT_TRUE(advance(10ms));
-            EXPECT_FALSE(hasLeft);
-            mayLeave.set();
-            owner.join();
-            EXPECT_TRUE(sawItLeave);
-        }
+        owner.start("owner", [&] {
+            timer.reset();
+            sawItLeave = hasLeft.load();
+        });
+        ASSERT_TRUE(advance(10ms));
+        EXPECT_FALSE(hasLeft);
+        mayLeave.set();
+        owner.join();
+        EXPECT_TRUE(sawItLeave);
     });
 }
 

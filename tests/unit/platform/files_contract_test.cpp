@@ -19,12 +19,6 @@ protected:
         ASSERT_TRUE(file->write(content));
     }
 
-    std::vector<std::wstring> names() const {
-        auto found = filesIn(world.folder());
-        std::sort(found.begin(), found.end());
-        return found;
-    }
-
     test::MachineWorld world;
 };
 
@@ -45,19 +39,14 @@ TEST_F(Files, ANewFileHoldsTheBytesThatWereWritten) {
     EXPECT_EQ(readFile(path(L"new")), content + "!");
 }
 
-TEST_F(Files, ANewFileIsNoneThatExists) {
-    put(L"there", "old");
-    EXPECT_FALSE(NewFile::create(path(L"there")));
+TEST_F(Files, OnlyWhatIsThereCanBeOpenedAndOnlyWhatIsNotBeMade) {
+    EXPECT_FALSE(canOpenFile(path(L"file")));
+    EXPECT_FALSE(readFile(path(L"file")));
+    put(L"file", "");
+    EXPECT_TRUE(canOpenFile(path(L"file")));
+    EXPECT_EQ(readFile(path(L"file")), "");
+    EXPECT_FALSE(NewFile::create(path(L"file")));
     EXPECT_FALSE(NewFile::create(path(L"no folder\\new")));
-    EXPECT_EQ(readFile(path(L"there")), "old");
-}
-
-TEST_F(Files, OnlyWhatIsThereCanBeOpened) {
-    EXPECT_FALSE(canOpenFile(path(L"nothing")));
-    EXPECT_FALSE(readFile(path(L"nothing")));
-    put(L"empty", "");
-    EXPECT_TRUE(canOpenFile(path(L"empty")));
-    EXPECT_EQ(readFile(path(L"empty")), "");
 }
 
 TEST_F(Files, ARenamedFileReplacesTheOldOneOrLeavesIt) {
@@ -68,6 +57,7 @@ TEST_F(Files, ARenamedFileReplacesTheOldOneOrLeavesIt) {
             if (hasOld) put(target, "old");
             auto file = NewFile::create(path(L"draft"));
             ASSERT_TRUE(file && file->write("new"));
+            EXPECT_FALSE(file->rename(path(L"no folder\\target"), existing));
             const bool takesPlace = !hasOld || existing == Existing::Replace;
             EXPECT_EQ(file->rename(path(target), existing), takesPlace);
             EXPECT_EQ(canOpenFile(path(L"draft")), !takesPlace);
@@ -77,12 +67,6 @@ TEST_F(Files, ARenamedFileReplacesTheOldOneOrLeavesIt) {
             EXPECT_FALSE(canOpenFile(path(L"draft")));
         }
     }
-}
-
-TEST_F(Files, ARenameToAFolderThatIsNotThereFails) {
-    auto file = NewFile::create(path(L"draft"));
-    ASSERT_TRUE(file);
-    EXPECT_FALSE(file->rename(path(L"no folder\\target"), Existing::Replace));
 }
 
 TEST_F(Files, AFileIsAbandonedWhenNobodyHoldsIt) {
@@ -100,20 +84,18 @@ TEST_F(Files, AFileIsAbandonedWhenNobodyHoldsIt) {
     EXPECT_FALSE(canOpenFile(path(L"held")));
 }
 
-TEST_F(Files, AFolderListsItsFiles) {
-    EXPECT_TRUE(names().empty());
-    put(L"one", "");
-    put(L"two \u00E4", "");
-    EXPECT_EQ(names(), (std::vector<std::wstring>{L"one", L"two \u00E4"}));
-    EXPECT_TRUE(filesIn(path(L"nothing")).empty());
-}
-
-TEST_F(Files, AFolderThatExistsIsAsGoodAsANewOne) {
+TEST_F(Files, AFolderListsItsFilesAndOneThatExistsIsAsGoodAsANewOne) {
+    EXPECT_TRUE(filesIn(path(L"folder")).empty());
     EXPECT_TRUE(createFolder(path(L"folder")));
     EXPECT_TRUE(createFolder(path(L"folder")));
-    put(L"folder\\file", "in it");
-    EXPECT_EQ(readFile(path(L"folder\\file")), "in it");
-    EXPECT_FALSE(createFolder(path(L"folder\\file\\below")));
+    EXPECT_TRUE(filesIn(path(L"folder")).empty());
+    put(L"folder\\one", "");
+    put(L"folder\\two \u00E4", "in it");
+    EXPECT_EQ(readFile(path(L"folder\\two \u00E4")), "in it");
+    auto found = filesIn(path(L"folder"));
+    std::sort(found.begin(), found.end());
+    EXPECT_EQ(found, (std::vector<std::wstring>{L"one", L"two \u00E4"}));
+    EXPECT_FALSE(createFolder(path(L"folder\\one\\below")));
 }
 
 TEST_F(Files, TextIsAppendedToAFileThatIsMadeAtNeed) {

@@ -37,12 +37,16 @@ TEST(NamedMutex, ExistsWhileSomebodyHasItOpen) {
     });
 }
 
-TEST(NamedMutex, OwnershipIsTakenOnlyIfNobodyHasIt) {
+TEST(NamedMutex, OwnershipIsTakenOnlyByWhoWantsItAndIfNobodyHasIt) {
     inWorld([] {
-        NamedMutex first("{ownership}", Owner::Yes);
-        EXPECT_TRUE(first.isOwned());
+        NamedMutex mutex("{ownership}", Owner::No);
+        EXPECT_FALSE(mutex.isOwned());
+        mutex.wait();
+        EXPECT_TRUE(mutex.isOwned());
+        NamedMutex second("{ownership}", Owner::No);
+        second.release();  // not its to release
         EXPECT_FALSE(canBeTaken("{ownership}"));
-        first.release();
+        mutex.release();
         EXPECT_TRUE(canBeTaken("{ownership}"));
     });
 }
@@ -68,14 +72,6 @@ TEST(NamedMutex, AWaitEndsWhenTheOwnerReleasesOrCloses) {
             waiter.join();
             EXPECT_TRUE(isOver);
         }
-    });
-}
-
-TEST(NamedMutex, AWaitForAMutexThatNobodyHasEndsAtOnce) {
-    inWorld([] {
-        NamedMutex mutex("{free}", Owner::No);
-        mutex.wait();
-        EXPECT_TRUE(mutex.isOwned());
     });
 }
 

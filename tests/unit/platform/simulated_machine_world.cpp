@@ -28,7 +28,7 @@ std::wstring MachineWorld::folder() const {
 }
 
 std::vector<std::string> MachineWorld::debugLines() {
-    std::istringstream log(simulation::readFile(m_state->machine->folder() / "debug.log").value_or(""));
+    std::istringstream log(posix::readFile(m_state->machine->folder() / "debug.log").value_or(""));
     std::vector<std::string> lines;
     for (std::string line; std::getline(log, line);)
         lines.push_back(line);

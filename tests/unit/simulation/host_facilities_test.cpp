@@ -3,7 +3,6 @@
 
 #include "TestMachine.h"
 #include "platform/DebugOutput.h"
-#include "platform/Session.h"
 #include "platform/posix/MachineFolder.h"
 #include "platform/posix/OwnerFiles.h"
 #include "platform/posix/ProcNetTcp.h"
@@ -11,20 +10,14 @@
 namespace vexa::simulation {
 namespace {
 
-TEST(Session, IsActiveWhenTheMachinesIs) {
-    TestMachine machine("{'session': 'disconnected'}");
-    EXPECT_FALSE(platform::isSessionActive());
-    machine.ask("{'do': 'setSession', 'session': 'active'}");
-    EXPECT_TRUE(platform::isSessionActive());
-}
+using posix::readFile;
+using posix::replaceFile;
 
-TEST(DebugOutput, IsOneLineForEachCall) {
+TEST(DebugOutput, DropsOneLineEndAndIsUtf8) {
     TestMachine machine;
-    platform::outputDebugString(std::string_view("one"));
-    platform::outputDebugString(std::string_view("two\n"));
     platform::outputDebugString(std::string_view("three\n\n"));
     platform::outputDebugString(std::wstring_view(L"caf\u00E9"));
-    EXPECT_EQ(readFile(machine->folder() / "debug.log"), "one\ntwo\nthree\n\ncaf\xC3\xA9\n");
+    EXPECT_EQ(readFile(machine->folder() / "debug.log"), "three\n\ncaf\xC3\xA9\n");
 }
 
 TEST(OwnerFiles, ReplacingLeavesNothingElseBehind) {
@@ -46,23 +39,26 @@ TEST(ProcNetTcp, HoldsEachConnectionOnceAndEveryoneWhoListens) {
     const std::string connection = "  1: 0100007F:1F90 0100007F:D431 01" + rest;
     const std::string listener = "  0: 0100007F:1F90 00000000:0000 0A" + rest;
     ASSERT_TRUE(replaceFile(path, "  sl  local_address\n" + listener + listener + connection + connection));
-    std::vector<platform::ProcNetTcpRow> rows;
-    ASSERT_TRUE(platform::readProcNetTcp(path.c_str(), rows));
+    std::vector<posix::TcpSocket> rows;
+    ASSERT_TRUE(posix::readProcNetTcp(path.string(), rows));
     ASSERT_EQ(rows.size(), 3U);
     EXPECT_EQ(rows[2].localPort, 8080);
     EXPECT_EQ(rows[2].remotePort, 54321);
     EXPECT_EQ(rows[2].uid, 1000U);
+    EXPECT_EQ(rows[2].inode, 4711U);
 }
 
 TEST(MachineFolder, IsWhatTheEnvironmentSays) {
-    ::setenv("HOME", "/home/u", 1);
+    ::unsetenv("HOME");
     ::unsetenv("XDG_STATE_HOME");
     ::unsetenv("VEXA_MACHINE");
-    EXPECT_EQ(platform::machineFolder(), "/home/u/.local/state/vexa/machine");
+    EXPECT_EQ(posix::machineFolder(), "");
+    ::setenv("HOME", "/home/u", 1);
+    EXPECT_EQ(posix::machineFolder(), "/home/u/.local/state/vexa/machine");
     ::setenv("XDG_STATE_HOME", "/state", 1);
-    EXPECT_EQ(platform::machineFolder(), "/state/vexa/machine");
+    EXPECT_EQ(posix::machineFolder(), "/state/vexa/machine");
     ::setenv("VEXA_MACHINE", "/m", 1);
-    EXPECT_EQ(platform::machineFolder(), "/m");
+    EXPECT_EQ(posix::machineFolder(), "/m");
     ::unsetenv("VEXA_MACHINE");
 }
 
