@@ -21,7 +21,8 @@ constexpr int kFirstPort = 10000;
 constexpr int kLastPort = 32000;
 constexpr int kAttempts = 2000;
 
-// A server can have this port of the loopback address. Leaves no trace behind.
+}  // namespace
+
 bool canBind(std::uint16_t port) {
     asio::io_context context;
     tcp::socket socket(context, tcp::v4());
@@ -29,8 +30,6 @@ bool canBind(std::uint16_t port) {
     socket.bind({asio::ip::address_v4::loopback(), port}, error);
     return !error;
 }
-
-}  // namespace
 
 bool TcpPorts::isBusy(std::uint16_t port) const {
     return std::any_of(m_endpoints.begin(), m_endpoints.end(),

@@ -17,6 +17,9 @@ struct ReservedPort {
     NameHolder holder;
 };
 
+/// A server can have this port of the loopback address. Leaves no trace behind.
+bool canBind(std::uint16_t port);
+
 /// The IPv4 TCP endpoints of this host at one moment. Nothing is connected to find out about a port: a trial
 /// connection would stay behind in the table and make the port busy for the service.
 class TcpPorts {

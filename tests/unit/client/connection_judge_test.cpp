@@ -2,131 +2,105 @@
 
 #include <gtest/gtest.h>
 
-#include <memory>
+#include <map>
+#include <sstream>
 
 namespace vexa::client {
 namespace {
 
-using std::chrono::milliseconds;
-
 constexpr const char* kService = "HotSpot20";
 
-Event card(const char* source = kService, const char* id = "CARD_PLUG_IN") {
-    return {id, "", source};
-}
-Event result(int value) {
-    return {"CONNECT_DISCONNECT", std::to_string(value), kService};
-}
-Event internet() {
-    return {"GET_IS_INTERNET_ACCESS", "true", kService};
-}
-Event list(const std::string& connected, const std::string& other = "") {
-    std::string text;
-    for (const std::string& name : {connected, other}) {
-        if (name.empty()) continue;
-        text += text.empty() ? "" : ",";
-        text +=
-            R"({"NetWorkName":")" + name + R"(","IsConnected":)" + (name == connected ? "true}" : "false}");
-    }
-    return {"GET_ALL_NETWORK_LIST", "[" + text + "]", kService};
-}
-Event cafeNotConnected() {
-    return list("", "Cafe");
+Event networks(const std::string& json) {
+    return {"GET_ALL_NETWORK_LIST", "[" + json + "]", kService};
 }
 
-struct Told {
-    Event event;
-    int atMs = 0;
+// The words of a story. A network with a star is the connected one.
+const std::map<std::string, Event> kEvents{
+    {"succeeded", {"CONNECT_DISCONNECT", "1", kService}},
+    {"failed", {"CONNECT_DISCONNECT", "0", kService}},
+    {"internet", {"GET_IS_INTERNET_ACCESS", "true", kService}},
+    {"checked", {"CARD_PLUG_IN", "", kService}},
+    {"arrival", {"CARD_PLUG_IN", "", "SpectralAnalyser"}},
+    {"removal", {"CARD_PLUG_OUT", "", "SpectralAnalyser"}},
+    {"radio-off", {"GET_RADIO", "false\n", kService}},
+    {"radio-on", {"GET_RADIO", "true\n", kService}},
+    {"nonsense", {"CONNECT_DISCONNECT", "{", kService}},
+    {"anything", {"X", "", ""}},
+    {"nobody", networks("")},
+    {"Cafe", networks(R"({"NetWorkName":"Cafe","IsConnected":false})")},
+    {"Cafe*", networks(R"({"NetWorkName":"Cafe","IsConnected":true})")},
+    {"Hall", networks(R"({"NetWorkName":"Hall","IsConnected":false})")},
+    {"Hall*+Cafe",
+     networks(R"({"NetWorkName":"Hall","IsConnected":true},{"NetWorkName":"Cafe","IsConnected":false})")},
 };
 
-/// The outcome after these events, or Open.
-Outcome judged(ConnectionJudge& judge, const std::vector<Told>& events) {
-    for (const Told& told : events) {
-        const auto outcome = judge.apply(
-            told.event, ConnectionJudge::Time() + std::chrono::hours(1) + milliseconds(told.atMs));
-        if (outcome != Outcome::Open) return outcome;
+/// The outcome after these words, or Open. A number is the time in ms at which the next ones come.
+Outcome judged(ConnectionJudge& judge, const std::string& story) {
+    ConnectionJudge::Time now = ConnectionJudge::Time() + std::chrono::hours(1);
+    const ConnectionJudge::Time start = now;
+    std::istringstream words(story);
+    for (std::string word; words >> word;) {
+        if (std::isdigit(static_cast<unsigned char>(word[0])) != 0) {
+            now = start + std::chrono::milliseconds(std::stoi(word));
+            continue;
+        }
+        if (const Outcome outcome = judge.apply(kEvents.at(word), now); outcome != Outcome::Open)
+            return outcome;
     }
     return Outcome::Open;
 }
 
 struct Case {
     const char* what;
-    std::vector<Told> events;
+    const char* story;
     Outcome outcome;
 };
 
 TEST(JoinJudge, BelievesTheListAndWhatComesBehindTheRequest) {
-    const std::vector<Case> cases{
-        {"told and listed", {{result(1)}, {internet()}, {list("Cafe")}}, Outcome::Joined},
-        {"told, but another is listed", {{result(1)}, {internet()}, {list("Hall", "Cafe")}}, Outcome::Open},
-        {"listed for a moment",
-         {{list("Cafe")}, {cafeNotConnected(), 950}, {list("Cafe"), 1000}},
-         Outcome::Open},
-        {"listed for long", {{list("Cafe")}, {list("Cafe"), 950}}, Outcome::Joined},
-        {"failed before", {{result(0)}, {internet()}, {cafeNotConnected()}}, Outcome::Open},
-        {"failed before, joined then",
-         {{result(0)},
-          {internet()},
-          {cafeNotConnected()},
-          {card()},
-          {card()},
-          {result(1)},
-          {internet()},
-          {list("Cafe")}},
+    const Case cases[] = {
+        {"told and listed", "succeeded internet Cafe*", Outcome::Joined},
+        {"told, but another is listed", "succeeded internet Hall*+Cafe", Outcome::Open},
+        {"listed for a moment", "Cafe* 950 Cafe 1000 Cafe*", Outcome::Open},
+        {"listed for long", "Cafe* 950 Cafe*", Outcome::Joined},
+        {"failed before", "failed internet Cafe", Outcome::Open},
+        {"failed before, joined then", "failed internet Cafe checked checked succeeded internet Cafe*",
          Outcome::Joined},
-        {"failed behind",
-         {{card()}, {card()}, {result(0)}, {internet()}, {cafeNotConnected()}},
+        {"failed behind", "checked checked failed internet Cafe", Outcome::Refused},
+        {"one check is not enough", "checked failed internet Cafe", Outcome::Open},
+        {"an adapter's coming is no check", "arrival arrival failed internet Cafe", Outcome::Open},
+        {"failed, then another's success", "checked checked failed internet succeeded internet Hall*+Cafe",
          Outcome::Refused},
-        {"one check is not enough",
-         {{card()}, {result(0)}, {internet()}, {cafeNotConnected()}},
-         Outcome::Open},
-        {"an adapter's coming is no check",
-         {{card("SpectralAnalyser")},
-          {card("SpectralAnalyser")},
-          {result(0)},
-          {internet()},
-          {cafeNotConnected()}},
-         Outcome::Open},
-        {"failed, then another's success",
-         {{card()}, {card()}, {result(0)}, {internet()}, {result(1)}, {internet()}, {list("Hall", "Cafe")}},
-         Outcome::Refused},
-        {"answered without a report", {{result(0)}, {cafeNotConnected()}}, Outcome::NotStarted},
-        {"another's request", {{card()}, {card()}, {result(0)}, {cafeNotConnected()}}, Outcome::Open},
-        {"gone while it waited", {{card()}, {card()}, {result(0)}, {list("", "Hall")}}, Outcome::OutOfRange},
-        {"missing for a moment", {{list("")}, {cafeNotConnected(), 500}, {list(""), 950}}, Outcome::Open},
-        {"missing for long", {{list("")}, {list(""), 950}}, Outcome::OutOfRange},
-        {"radio off", {{{"GET_RADIO", "false\n", kService}}}, Outcome::RadioOff},
-        {"radio on", {{{"GET_RADIO", "true\n", kService}}}, Outcome::Open},
-        {"adapter out", {{card("SpectralAnalyser", "CARD_PLUG_OUT")}}, Outcome::AdapterOut},
-        {"nonsense",
-         {{{"CONNECT_DISCONNECT", "{", kService}}, {{"X", "", ""}}, {list("Hall", "Cafe")}},
-         Outcome::NotStarted}};
-    for (const Case& example : cases) {
+        {"answered without a report", "failed Cafe", Outcome::NotStarted},
+        {"another's request", "checked checked failed Cafe", Outcome::Open},
+        {"gone while it waited", "checked checked failed Hall", Outcome::OutOfRange},
+        {"missing for a moment", "nobody 500 Cafe 950 nobody", Outcome::Open},
+        {"missing for long", "nobody 950 nobody", Outcome::OutOfRange},
+        {"radio off", "radio-off", Outcome::RadioOff},
+        {"radio on", "radio-on", Outcome::Open},
+        {"adapter out", "removal", Outcome::AdapterOut},
+        {"nonsense", "nonsense anything Hall*+Cafe", Outcome::NotStarted},
+    };
+    for (const Case& c : cases) {
         JoinJudge judge("Cafe");
-        EXPECT_EQ(judged(judge, example.events), example.outcome) << example.what;
+        EXPECT_EQ(judged(judge, c.story), c.outcome) << c.what;
     }
 }
 
 TEST(LeaveJudge, NeedsAListWithoutTheConnection) {
-    const std::vector<Case> connected{{"still there", {{list("Cafe")}, {list("Cafe"), 5000}}, Outcome::Open},
-                                      {"left", {{list("Cafe")}, {cafeNotConnected()}}, Outcome::Left},
-                                      {"gone over to another", {{list("Hall", "Cafe")}}, Outcome::Left},
-                                      {"not in the list", {{list("")}}, Outcome::Left},
-                                      {"a result says nothing", {{result(0)}, {internet()}}, Outcome::Open}};
-    for (const Case& example : connected) {
-        LeaveJudge judge("Cafe", true);
-        EXPECT_EQ(judged(judge, example.events), example.outcome) << example.what;
-    }
-    const std::vector<Case> trying{
-        {"a list alone", {{cafeNotConnected()}}, Outcome::Open},
-        {"the attempt has ended", {{result(0)}, {internet()}, {cafeNotConnected()}}, Outcome::Ended},
-        {"another's request", {{result(0)}, {cafeNotConnected()}}, Outcome::Open},
-        {"joined and left",
-         {{result(1)}, {internet()}, {list("Cafe")}, {cafeNotConnected()}},
-         Outcome::Left}};
-    for (const Case& example : trying) {
-        LeaveJudge judge("Cafe", false);
-        EXPECT_EQ(judged(judge, example.events), example.outcome) << example.what;
+    const std::pair<bool, Case> cases[] = {
+        {true, {"still there", "Cafe* 5000 Cafe*", Outcome::Open}},
+        {true, {"left", "Cafe* Cafe", Outcome::Left}},
+        {true, {"gone over to another", "Hall*+Cafe", Outcome::Left}},
+        {true, {"not in the list", "nobody", Outcome::Left}},
+        {true, {"a result says nothing", "failed internet", Outcome::Open}},
+        {false, {"a list alone", "Cafe", Outcome::Open}},
+        {false, {"the attempt has ended", "failed internet Cafe", Outcome::Ended}},
+        {false, {"another's request", "failed Cafe", Outcome::Open}},
+        {false, {"joined and left", "succeeded internet Cafe* Cafe", Outcome::Left}},
+    };
+    for (const auto& [isConnected, c] : cases) {
+        LeaveJudge judge("Cafe", isConnected);
+        EXPECT_EQ(judged(judge, c.story), c.outcome) << c.what;
     }
 }
 
@@ -134,12 +108,12 @@ TEST(ConnectionJudges, AskWhatTheyNeed) {
     JoinJudge join("Cafe");
     EXPECT_EQ(join.takeQuestions(), std::vector<const char*>{"GET_IS_CARD_IN"}) << "at once";
     EXPECT_TRUE(join.takeQuestions().empty());
-    judged(join, {{card()}, {result(1)}});
+    judged(join, "checked succeeded");
     const auto questions = join.takeQuestions();
     ASSERT_EQ(questions.size(), 2U);
     EXPECT_STREQ(questions[0], "GET_IS_CARD_IN");
     EXPECT_STREQ(questions[1], "GET_ALL_NETWORK_LIST");
-    judged(join, {{card()}, {card()}});
+    judged(join, "checked checked");
     EXPECT_TRUE(join.takeQuestions().empty());
     EXPECT_FALSE(LeaveJudge("Cafe", false).wantsLists())
         << "a list that was asked for would look like an end";

@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include "client/hotspot/CredentialText.h"
+#include "client/hotspot/Fitting.h"
 #include "client/port/JsonLine.h"
 #include "client/terminal/ClientError.h"
 
@@ -58,46 +59,75 @@ TEST(Credential, TextThatTheServiceCannotStoreIsKnown) {
         std::string text;
         bool isStored;
     };
-    const std::string smile = "😀";
-    std::string sixtyThree;
+    std::string sixtyTwo;  // UTF-16 units
     for (int i = 0; i < 31; ++i)
-        sixtyThree += smile;
-    for (const Case& example :
-         {Case{&Credential::name, std::string(127, 'x'), true},
-          Case{&Credential::name, std::string(128, 'x'), false},
-          Case{&Credential::realm, std::string(128, 'x'), false},
-          Case{&Credential::clientCert, std::string(128, 'x'), false},
-          Case{&Credential::caCert, std::string(127, 'x'), true},
-          Case{&Credential::username, std::string(63, 'x'), true},
-          Case{&Credential::username, std::string(64, 'x'), false},
-          Case{&Credential::creator, std::string(64, 'x'), false},
-          Case{&Credential::password, sixtyThree + "x", true},
-          Case{&Credential::password, sixtyThree + smile, false}, Case{&Credential::password, "a\tb", false},
-          Case{&Credential::password, "a\x7F", false}, Case{&Credential::realm, "caf\xE9", false},
-          Case{&Credential::realm, " <&>\"' ", true}}) {
+        sixtyTwo += "😀";
+    for (const auto& [field, text, isStored] : {Case{&Credential::name, std::string(127, 'x'), true},
+                                                {&Credential::name, std::string(128, 'x'), false},
+                                                {&Credential::realm, std::string(128, 'x'), false},
+                                                {&Credential::clientCert, std::string(128, 'x'), false},
+                                                {&Credential::caCert, std::string(127, 'x'), true},
+                                                {&Credential::username, std::string(63, 'x'), true},
+                                                {&Credential::username, std::string(64, 'x'), false},
+                                                {&Credential::creator, std::string(64, 'x'), false},
+                                                {&Credential::password, sixtyTwo + "x", true},
+                                                {&Credential::password, sixtyTwo + "😀", false},
+                                                {&Credential::password, "a\tb", false},
+                                                {&Credential::password, "a\x7F", false},
+                                                {&Credential::realm, "caf\xE9", false},
+                                                {&Credential::realm, " <&>\"' ", true}}) {
         Credential credential = userCredential(1, "n");
-        credential.*example.field = example.text;
-        EXPECT_EQ(!objectionTo(credential), example.isStored) << example.text;
+        credential.*field = text;
+        EXPECT_EQ(!objectionTo(credential), isStored) << text;
     }
 }
 
-TEST(CredentialText, HidesPasswordsUnlessAsked) {
-    const CredentialList list{userCredential(1, "n")};
-    const auto contains = [](const std::string& text) { return text.find("pässword") != std::string::npos; };
-    EXPECT_FALSE(contains(credentialTable(list, Passwords::Hidden)[1]));
-    EXPECT_TRUE(contains(credentialTable(list, Passwords::Shown)[1]));
-    EXPECT_FALSE(contains(jsonLine(credentialsJson(list, Passwords::Hidden))));
-    EXPECT_TRUE(contains(jsonLine(credentialsJson(list, Passwords::Shown))));
-}
-
-TEST(CredentialText, KindsThatAreNotKnownHaveANumber) {
+TEST(CredentialText, HidesPasswordsUnlessAskedAndNumbersKindsThatAreNotKnown) {
     Credential credential = userCredential(1, "n");
+    for (const auto passwords : {Passwords::Hidden, Passwords::Shown}) {
+        const std::string table = credentialTable({credential}, passwords)[1];
+        const std::string json = jsonLine(credentialsJson({credential}, passwords));
+        for (const std::string& text : {table, json})
+            EXPECT_EQ(text.find("pässword") != std::string::npos, passwords == Passwords::Shown) << text;
+    }
     credential.type = 2;
     credential.access = 9;
     const Json::Value object = credentialJson(credential, 4, Passwords::Hidden);
     EXPECT_EQ(object["method"].asString(), "type 2");
     EXPECT_EQ(object["access"].asString(), "9");
     EXPECT_EQ(object["position"].asInt(), 4);
+}
+
+TEST(Fitting, RealmAndMethodStandBesideEachOther) {
+    const auto stored = [](const char* name, int method, const char* realm, const char* password = "p") {
+        Credential result = userCredential(1, name);
+        result.method = method;
+        result.realm = realm;
+        result.password = password;
+        return result;
+    };
+    const CredentialList all{stored("card", kMethodTls, "a"),  stored("phone", kMethodTtls, "a"),
+                             stored("case", kMethodTtls, "A"), stored("half", kMethodTtls, "a", ""),
+                             stored("late", kMethodTtls, "b"), stored("bare", kMethodTls, "b", "")};
+    struct Case {
+        std::vector<Network::Realm> realms;
+        std::optional<int> method;
+        const char* names;
+    };
+    const Case cases[] = {
+        {{}, {}, ""},
+        {{{kMethodTls, "a"}}, {}, "card"},
+        {{{kMethodTtls, "a"}}, {}, "phone"},
+        {{{kMethodTtls, "a"}, {kMethodTls, "a"}}, {}, "card or phone"},
+        {{{kMethodTtls, "a"}, {kMethodTls, "a"}}, kMethodTtls, "phone"},
+        {{{kMethodTtls, "b"}, {kMethodTls, "b"}, {kMethodTtls, "a"}}, {}, "phone, late or bare"},
+        {{{kMethodTls, "a"}}, 0, ""},
+    };
+    for (const Case& c : cases) {
+        Network network;
+        network.realms = c.realms;
+        EXPECT_EQ(alternatives(credentialsBehind(all, network, c.method)), c.names);
+    }
 }
 
 }  // namespace

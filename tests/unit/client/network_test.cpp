@@ -2,10 +2,10 @@
 
 #include <gtest/gtest.h>
 
+#include <fstream>
+
 #include "client/machine/MachineRegistry.h"
 #include "client/port/JsonLine.h"
-
-#include <fstream>
 
 namespace vexa::client {
 namespace {
@@ -15,28 +15,25 @@ NetworkList parsed(const std::string& text) {
 }
 
 TEST(NetworkList, InternetDependsOnTheConnection) {
-    struct Case {
-        const char* isConnected;
-        const char* code;
-        Network::Internet meaning;
-    };
     using Internet = Network::Internet;
-    for (const Case& example :
-         {Case{"true", "0", Internet::Reached}, Case{"true", "1", Internet::Missing},
-          Case{"true", "2", Internet::None}, Case{"false", "0", Internet::None},
-          Case{"false", "2", Internet::Offered}, Case{"false", "1", Internet::None},
-          Case{"null", "2", Internet::Offered}, Case{"true", "\"0\"", Internet::None}}) {
-        const auto list = parsed(std::string(R"([{"NetWorkName":"n","IsConnected":)") + example.isConnected +
-                                 R"(,"IsInternetAccess":)" + example.code + "}]");
-        ASSERT_EQ(list.size(), 1U);
-        EXPECT_EQ(list[0].internet, example.meaning) << example.isConnected << ' ' << example.code;
-    }
+    const std::pair<std::string, Internet> cases[] = {
+        {R"("IsConnected":true,"IsInternetAccess":0)", Internet::Reached},
+        {R"("IsConnected":true,"IsInternetAccess":1)", Internet::Missing},
+        {R"("IsConnected":true,"IsInternetAccess":2)", Internet::None},
+        {R"("IsConnected":false,"IsInternetAccess":0)", Internet::None},
+        {R"("IsConnected":false,"IsInternetAccess":2)", Internet::Offered},
+        {R"("IsConnected":null,"IsInternetAccess":2)", Internet::Offered},
+        {R"("IsConnected":true,"IsInternetAccess":"0")", Internet::None},
+    };
+    for (const auto& [members, meaning] : cases)
+        EXPECT_EQ(parsed(R"([{"NetWorkName":"n",)" + members + "}]").at(0).internet, meaning) << members;
 }
 
-TEST(NetworkList, RealmsKeepTheirOrderAndMethod) {
+TEST(NetworkList, RealmsKeepTheirOrderAndMethodAndNonsenseIsLeftOut) {
     const auto list = parsed(R"([{"NetWorkName":"n","RealmFetched":true,"SupportRealmList":[
         {"CredentialEapMethod":2,"RealmName":"b"},{"CredentialEapMethod":1,"RealmName":"a"},{"RealmName":7}]},
-        {"NetWorkName":"m","RealmFetched":true},{"NetWorkName":"l","RealmFetched":false}])");
+        {"NetWorkName":"m","RealmFetched":true},{"NetWorkName":"l","RealmFetched":false},
+        7, null, {}, {"NetWorkName":3}])");
     const auto lines = networkTable(list);
     ASSERT_EQ(lines.size(), 4U);
     EXPECT_TRUE(lines[1].ends_with("b (TTLS), a (TLS)")) << lines[1];
@@ -46,10 +43,7 @@ TEST(NetworkList, RealmsKeepTheirOrderAndMethod) {
     EXPECT_EQ(json[0]["realms"].size(), 2U);
     EXPECT_TRUE(json[1]["realms"].isArray());
     EXPECT_TRUE(json[2]["realms"].isNull());
-}
-
-TEST(NetworkList, NonsenseIsLeftOut) {
-    for (const char* text : {"null", "7", "{}", "[]", "[7, null, {}, {\"NetWorkName\": 3}]"})
+    for (const char* text : {"null", "7", "{}", "[]"})
         EXPECT_TRUE(parsed(text).empty()) << text;
 }
 
@@ -58,17 +52,16 @@ TEST(HotspotSwitch, IsOnUnlessTheRegistrySaysFalse) {
     const MachineFolder machine(temporary.path().string());
     EXPECT_TRUE(readHotspotSwitch(machine));
     const std::string key = R"({"HKEY_CURRENT_USER\\Software\\Korvane\\Vexa":)";
-    struct Case {
-        std::string text;
-        bool isOn;
+    const std::pair<std::string, bool> cases[] = {
+        {"nonsense", true},
+        {key + "7}", true},
+        {key + R"({"IsHotSpotAutoConnect":7}})", true},
+        {key + R"({"IsHotSpotAutoConnect":"False"}})", false},
+        {key + R"({"IsHotSpotAutoConnect":"false "}})", true},
     };
-    for (const Case& example :
-         {Case{"nonsense", true}, Case{"[]", true}, Case{key + "7}", true}, Case{key + "{}}", true},
-          Case{key + R"({"IsHotSpotAutoConnect":"true"}})", true},
-          Case{key + R"({"IsHotSpotAutoConnect":"False"}})", false},
-          Case{key + R"({"IsHotSpotAutoConnect":"false "}})", true}}) {
-        std::ofstream(machine.registryFile()) << example.text;
-        EXPECT_EQ(readHotspotSwitch(machine), example.isOn) << example.text;
+    for (const auto& [text, isOn] : cases) {
+        std::ofstream(machine.registryFile()) << text;
+        EXPECT_EQ(readHotspotSwitch(machine), isOn) << text;
     }
 }
 
@@ -79,11 +72,11 @@ TEST(HotspotSwitch, WritingLeavesOtherValuesAlone) {
         << R"({"HKEY_CURRENT_USER\\Other":{"a":1},"HKEY_CURRENT_USER\\Software\\Korvane\\Vexa":{"b":"c"}})";
     ASSERT_TRUE(writeHotspotSwitch(machine, false));
     EXPECT_FALSE(readHotspotSwitch(machine));
-    std::ifstream file(machine.registryFile());
-    const std::string text{std::istreambuf_iterator<char>(file), std::istreambuf_iterator<char>()};
-    const Json::Value registry = parseJson(text).value();
-    EXPECT_EQ(registry["HKEY_CURRENT_USER\\Other"]["a"].asInt(), 1);
-    EXPECT_EQ(registry["HKEY_CURRENT_USER\\Software\\Korvane\\Vexa"]["b"].asString(), "c");
+    std::string text;
+    std::getline(std::ifstream(machine.registryFile()), text);
+    EXPECT_EQ(text,
+              R"({"HKEY_CURRENT_USER\\Other":{"a":1},)"
+              R"("HKEY_CURRENT_USER\\Software\\Korvane\\Vexa":{"IsHotSpotAutoConnect":"false","b":"c"}})");
     ASSERT_TRUE(writeHotspotSwitch(machine, true));
     EXPECT_TRUE(readHotspotSwitch(machine));
     EXPECT_FALSE(writeHotspotSwitch(MachineFolder("/nonexistent"), false));

@@ -1,9 +1,10 @@
 #include "unit/config/StoreMachine.h"
 
-#include <algorithm>
+#include <gtest/gtest.h>
+
 #include <fstream>
+#include <set>
 #include <sstream>
-#include <vector>
 
 namespace vexa::test {
 
@@ -29,14 +30,33 @@ std::string StoreMachine::read(const std::string& name) {
 }
 
 std::string StoreMachine::listing() {
-    std::vector<std::string> names;
+    std::set<std::string> names;
     for (const auto& entry : fs::directory_iterator(folder()))
-        names.push_back(entry.path().filename().string());
-    std::sort(names.begin(), names.end());
+        names.insert(entry.path().filename().string());
     std::string text;
     for (const std::string& name : names)
         text += (text.empty() ? "" : " ") + name;
     return text;
+}
+
+int StoreMachine::openWith(std::string_view content, bool* isChanged) {
+    write("config.xml", content);
+    return open(m_config, isChanged);
+}
+
+void StoreMachine::fail(const std::string& call, int skip, int times, int error) {
+    m_machine.ask("{'do':'fail','call':'" + call + "','error':" + std::to_string(error) +
+                  ",'skip':" + std::to_string(skip) + ",'times':" + std::to_string(times) + "}");
+}
+
+void StoreMachine::add(const std::wstring& realm) {
+    CredentialInput input;
+    input.type = CRED_TYPE_EAP_TTLS;
+    input.realm = realm;
+    std::int32_t id = 0;
+    EXPECT_EQ(m_config.credentials().addCredential(input, m_config.nextCredId(), m_config.userName(), id),
+              kSuccess);
+    m_config.advanceNextCredId();
 }
 
 int open(Config& config, bool* isChanged) {
@@ -44,9 +64,9 @@ int open(Config& config, bool* isChanged) {
     return result != kSuccess ? result : config.readConfig(isChanged);
 }
 
-std::string places(Config& config) {
+std::string places(const CredentialTable& table) {
     std::string text;
-    for (const Credential* credential : config.credentials().copyCredentialPointers())
+    for (const Credential* credential : table.copyCredentialPointers())
         text += (text.empty() ? "" : " ") + std::to_string(credential->m_id) + ":" +
                 std::to_string(credential->m_priority);
     return text;
@@ -56,6 +76,10 @@ std::string document(const std::string& credentials, const std::string& users, c
     return "<?xml version=\"1.0\" encoding=\"UTF-8\"?><configurations><global>" + global +
            "</global><credentials>" + credentials + "</credentials><users>" + users +
            "</users></configurations>";
+}
+
+std::string saved(const std::string& credentials, const std::string& users, const std::string& global) {
+    return "\xEF\xBB\xBF" + document(credentials, users, global);
 }
 
 std::string ttls(int id, const std::string& realm, const std::string& creator, const std::string& access) {

@@ -30,8 +30,7 @@ TEST(SpectralMessages, RequestsByByte) {
     EXPECT_EQ(
         std::vector(start.begin(), start.end()),
         bytes({1, 0, 0, 0, 0x0B, 0, 0xA3, 0xFF, 0, 0, 0, 0, 8, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 0, 1}, 32));
-    const auto stop = scanControlRequest(false);
-    EXPECT_EQ(stop[24], std::byte{0});
+    EXPECT_EQ(scanControlRequest(false)[24], std::byte{0});
     EXPECT_EQ(channelListRequest(),
               bytes({0, 0, 0, 0, 0x04, 0, 0x50, 0xFF, 0,    0,    0,    0,    0x14, 0x08, 0,    0,    0, 0,
                      0, 0, 0, 0, 0,    0, 0x80, 0x01, 0x10, 0x00, 0x08, 0x08, 0,    0,    0x08, 0x08, 0, 0},
@@ -77,8 +76,7 @@ TEST(SpectralMessages, RecordsThatDoNotFitAreDropped) {
         EXPECT_EQ(parseSamples(samples(c.announced, c.held)).size(), c.records)
             << c.announced << " in " << c.held;
     EXPECT_TRUE(parseSamples(samples(1, 236, 0x33)).empty());
-    for (const std::size_t size : {std::size_t{16}, std::size_t{17}})
-        EXPECT_TRUE(parseSamples(Bytes(samples(1, 236)).first(size)).empty());
+    EXPECT_TRUE(parseSamples(Bytes(samples(1, 236)).first(17)).empty());
 }
 
 TEST(SpectralMessages, FieldsOfARecordStandAtTheirOffsetsAlignedOrNot) {
