@@ -116,10 +116,10 @@ def open_connection(port, timeout=PATIENCE, receive_buffer=None):
     return connection
 
 
-def handshake(host, key="dGhlIHNhbXBsZSBub25jZQ==", start="GET / HTTP/1.1\r\n"):
+def handshake(host, key="dGhlIHNhbXBsZSBub25jZQ=="):
     """A request that the ports let in, if nothing else is wrong with it."""
     upgrade = f"Upgrade: websocket\r\nConnection: Upgrade\r\nSec-WebSocket-Version: 13\r\nSec-WebSocket-Key: {key}"
-    return f"{start}Host: {host}\r\n{upgrade}\r\n\r\n".encode()
+    return f"GET / HTTP/1.1\r\nHost: {host}\r\n{upgrade}\r\n\r\n".encode()
 
 
 def accepted(key):
@@ -292,8 +292,12 @@ class PortClient(WebSocket):
         return self.wait_event(answer or command)
 
     def credentials(self, command="GET_ALL_CREDENTIAL_LIST", data=None):
-        """The list that a command about credentials brings."""
-        return json.loads(self.ask(command, data, "GET_ALL_CREDENTIAL_LIST")["Data"]) or []
+        """The list that answers a command about credentials."""
+        self.send(command, data)
+        return self.credential_list()
+
+    def credential_list(self):
+        return json.loads(self.wait_event("GET_ALL_CREDENTIAL_LIST")["Data"]) or []
 
 
 class ControlClient(WebSocket):

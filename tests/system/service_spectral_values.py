@@ -3,10 +3,8 @@
 import json
 import math
 import random
-import unittest
 
-from harness import Machine, wait_until
-
+from harness import Machine, Story, wait_until
 
 
 def channel_of(frequency):
@@ -99,38 +97,33 @@ def frequency_of(channel):
 
 
 CHANNELS = [36, 1, 6, 36, 11, 14, 165, 1, 149, 100, 13, 200, 255, 12, 40]
-
-
-def random_bins(chance):
-    kind = chance.randrange(6)
-    if kind == 0:
-        return chance.randrange(256)
-    if kind == 1:
-        return [0] * 56
-    if kind == 2:
-        return [chance.choice((0, 0, 0, 1, 255)) for _ in range(56)]
-    return [chance.randrange(256) for _ in range(56)]
+EDGES = [0, 1, 2401, 2402, 2403, 2406, 2407, 2411, 2483, 2485, 2511, 2512, 4899, 4900, 4920, 5000, 5001, 5004, 65535]
 
 
 def random_record(chance):
-    frequencies = [frequency_of(channel) for channel in CHANNELS] * 3
-    frequencies += [0, 1, 2401, 2402, 2403, 2406, 2407, 2411, 2483, 2485, 2511, 2512, 4899, 4900, 5000, 5001, 5004]
-    frequencies += [4920, 65535, chance.randrange(65536)]
+    frequencies = [frequency_of(channel) for channel in CHANNELS] * 3 + EDGES + [chance.randrange(65536)]
     usual = (chance.randrange(-20, 120),) * 20
     unusual = (chance.randrange(-(2**15), 2**15), -(2**15), 2**15 - 1, -2980, -3140, 3100, 3200, 96, 95)
+    any_bins = [chance.randrange(256) for _ in range(56)]
+    few_bins = [chance.choice((0, 0, 0, 1, 255)) for _ in range(56)]
     return {
         "frequency": chance.choice(frequencies),
         "congestion": chance.choice((chance.randrange(101),) * 20 + (0, 65535)),
         "power": chance.choice(usual + unusual),
-        "bins": random_bins(chance),
+        "bins": chance.choice((chance.randrange(256), [0] * 56, few_bins, any_bins, any_bins, any_bins)),
     }
 
 
-def quiet_record(chance):
-    return {**random_record(chance), "power": chance.randrange(-60, 97), "bins": chance.randrange(1, 256)}
+def quiet_record(chance, **members):
+    return {**random_record(chance), "power": chance.randrange(-60, 97), "bins": chance.randrange(1, 256), **members}
 
 
-class Values(unittest.TestCase):
+def of_channel_1(name, values, **members):
+    """A scan for each value of one member."""
+    return [[{"frequency": 2412, "congestion": 0, "power": 0, "bins": 100, **members, name: value}] for value in values]
+
+
+class Values(Story):
     def assert_published(self, channels, scans):
         spectrum = {"channels": channels, "scans": scans, "scanMs": 50}
         model = Model(channels)
@@ -160,47 +153,27 @@ class Values(unittest.TestCase):
             with self.subTest(seed):
                 self.assert_published(CHANNELS, [[random_record(chance) for _ in range(100)] for _ in range(20)])
 
-    def test_one_record_for_each_value(self):
+    def test_one_record_for_each_value_and_many_of_one_channel(self):
         chance = random.Random(10)
         self.assert_published(CHANNELS, [[quiet_record(chance) for _ in range(25)] for _ in range(60)])
-
-    def test_many_records_of_one_channel(self):
-        chance = random.Random(20)
-        scans = [[{**quiet_record(chance), "frequency": 2412} for _ in range(400)] for _ in range(5)]
-        self.assert_published([1], scans)
+        self.assert_published([1], [[quiet_record(chance, frequency=2412) for _ in range(400)] for _ in range(5)])
 
     def test_every_frequency_has_its_channel(self):
         edges = (2407, 2412, 2477, 2482, 2483, 2484, 2485, 2531, 2532, 2552, 4899, 4900, 4920, 5000, 5001, 5005, 5180)
         scans = [
-            [{"frequency": frequency, "congestion": 7 + i % 90, "power": 30, "bins": 1 + i % 250}]
+            [{"frequency": frequency, "congestion": 7 + i, "power": 30, "bins": 1 + i}]
             for i, frequency in enumerate(edges)
         ]
         self.assert_published(list(range(256)), scans)
 
-    def test_the_smoothing_of_congestion(self):
-        values = [50, 20, 20, 20, 0, 0, 0, 0, 0, 0, 0, 7, 100, 65535, 1, 2, 1]
-        scans = [[{"frequency": 2412, "congestion": value, "power": 0, "bins": 100}] for value in values]
-        self.assert_published([1], scans)
+    def test_the_smoothing_of_congestion_and_interference_that_falls_to_nothing(self):
+        congestion = [50, 20, 20, 20, 0, 0, 0, 0, 0, 0, 0, 7, 100, 65535, 1, 2, 1]
+        power = [60, -200, 60, -200, 61, 60, -200, -200, 96, 200]
+        self.assert_published([1], of_channel_1("congestion", congestion) + of_channel_1("power", power))
 
-    def test_interference_that_falls_to_nothing_is_not_told(self):
-        powers = [60, -200, 60, -200, 61, 60, -200, -200, 96, 200]
-        scans = [[{"frequency": 2412, "congestion": 0, "power": power, "bins": 100}] for power in powers]
-        self.assert_published([1], scans)
-
-
-class KnownValues(unittest.TestCase):
-    """Worked out by hand, so that the computation above is itself held to something."""
-
-    def test_the_model(self):
-        cases = (
-            ({"congestion": 0, "power": 60}, {"order": 1, "noise_value": 67}),
-            ({"congestion": 0, "power": 96}, {"order": 1, "noise_value": 100}),
-        )
-        for record, told in cases:
-            self.assertEqual(Model([1]).scan([{"frequency": 2412, "bins": 100, **record}]), [told])
-        two = [{"frequency": 2412, "bins": 0, "power": 0, "congestion": value} for value in (30, 41)]
-        self.assertEqual(Model([1]).scan(two), [{"order": 1, "congestion_value": 35}])
-
-
-if __name__ == "__main__":
-    unittest.main()
+    def test_the_model_by_values_that_were_worked_out_by_hand(self):
+        for power, value in ((60, 67), (96, 100)):
+            (scan,) = of_channel_1("power", [power])
+            self.assertEqual(Model([1]).scan(scan), [{"order": 1, "noise_value": value}])
+        scan = [record for (record,) in of_channel_1("congestion", (30, 41), bins=0)]
+        self.assertEqual(Model([1]).scan(scan), [{"order": 1, "congestion_value": 35}])

@@ -1,15 +1,10 @@
 """Two users of one machine share one file, one after the other; and what the first start and the log leave on disk."""
 
-import json
-import pathlib
 import re
-import shutil
 import stat
-import tempfile
-import unittest
 import xml.etree.ElementTree
 
-from harness import Machine, wait_until
+from harness import STORE, Machine, Story, wait_until
 
 DEFAULT = (
     b'\xef\xbb\xbf<?xml version="1.0" encoding="UTF-8"?><configurations>\t<global>\t\t<dump_file_path>hs20log.txt'
@@ -21,21 +16,19 @@ ALICE, BOB = "PC\\alice", "PC\\bob"
 PRIVATE, PUBLIC = 2, 1
 
 
-class Store(unittest.TestCase):
+class Store(Story):
     def setUp(self):
-        self.folder = pathlib.Path(tempfile.mkdtemp(prefix="vexa-store-"))
-        self.addCleanup(shutil.rmtree, self.folder, ignore_errors=True)
-        self.store = self.folder / "Public" / "Roaming" / "Korvane"
+        self.folder = self.new_folder()
+        self.store = self.folder / STORE
         self.file = self.store / "config.xml"
 
     def session(self, user, **scenario):
         return Machine({"user": user, "speed": 20, **scenario}, folder=self.folder)
 
     @staticmethod
-    def ask(client, command, data=None):
+    def ask(client, *command):
         """The realms of the list that answers, in order."""
-        client.send(command, data)
-        return [entry["RealName"] for entry in json.loads(client.wait_event("GET_ALL_CREDENTIAL_LIST")["Data"]) or []]
+        return [entry["RealName"] for entry in client.credentials(*command)]
 
     def add(self, client, realm, access=PUBLIC):
         data = {"CredentialEapMethod": 2, "Type": 1, "RealName": realm, "AccessType": access}
@@ -61,17 +54,15 @@ class Store(unittest.TestCase):
             self.assertEqual(self.add(client, "short-lived"), ["short-lived", "shared", "alices-private"])
         with self.session(BOB) as machine:
             client = machine.hs20()
-            self.assertEqual(self.ask(client, "GET_ALL_CREDENTIAL_LIST"), ["short-lived", "shared"])
+            self.assertEqual(self.ask(client), ["short-lived", "shared"])
             self.assertIsNone(self.references(BOB), "a first read saves nothing")
             self.add(client, "bobs-private", PRIVATE)
             self.assertEqual(self.ask(client, "DELETE_CREDENTIAL", {"Id": 3}), ["bobs-private", "shared"])
             self.assertEqual(self.references(ALICE), [("3", "1"), ("2", "2"), ("1", "3")])
-            self.assertEqual(
-                self.owners(), {"alices-private": ALICE, "bobs-private": BOB, "shared": BOB}, "each save signs what all see"
-            )
+            owners = {"alices-private": ALICE, "bobs-private": BOB, "shared": BOB}
+            self.assertEqual(self.owners(), owners, "each save signs what all see")
         with self.session(ALICE) as machine:
-            client = machine.hs20()
-            self.assertEqual(self.ask(client, "GET_ALL_CREDENTIAL_LIST"), ["shared", "alices-private"])
+            self.assertEqual(self.ask(machine.hs20()), ["shared", "alices-private"])
             self.assertEqual([number for number, _ in self.references(ALICE)], ["2", "1"])
             self.assertEqual(self.references(BOB), [("4", "1"), ("2", "2")])
             self.assertEqual(self.owners(), {"bobs-private": BOB, "alices-private": ALICE, "shared": ALICE})
@@ -104,17 +95,12 @@ class Store(unittest.TestCase):
 
     def test_each_run_with_the_log_on_has_its_own_file(self):
         text = DEFAULT.replace(b"<enabledump>false", b"<enabledump>true").decode("utf-8-sig")
+        first, second = (self.store / "Dump" / f"hs20log_alice_{number}.txt" for number in (0, 1))
         with self.session(ALICE, config=text):
-            first = self.store / "Dump" / "hs20log_alice_0.txt"
             content = wait_until(lambda: first.exists() and first.read_text(), "the log is written")
         self.assertRegex(content, r"\A\[1\] \d\d/\d\d \d\d:\d\d:\d\d  ")
         numbers = [int(number) for number in re.findall(r"^\[(\d+)\]", content, re.MULTILINE)]
         self.assertEqual(numbers, list(range(1, len(numbers) + 1)))
         self.assertEqual(stat.S_IMODE(first.stat().st_mode), 0o600)
         with self.session(ALICE):
-            second = self.store / "Dump" / "hs20log_alice_1.txt"
             wait_until(second.exists, "the second log is written")
-
-
-if __name__ == "__main__":
-    unittest.main()
