@@ -22,17 +22,20 @@ CAFE = {"bssid": "02:aa:00:00:00:02", "ssid": "Cafe",
         "accepts": [{"eapMethod": 21, "username": "me", "password": "secret"}]}  # fmt: skip
 
 
-class Life(Story):
+class ConnectionStory(Story):
     def begin(self, *networks, **scenario):
         self.start(config=CONFIG, networks=networks, **scenario)
         self.hs20 = self.machine.hs20()
 
+    def method(self):
+        """The number that stands in the registry."""
+        return self.control.query("registry").get("HKEY_CURRENT_USER\\Software\\Korvane\\Vexa", {}).get("EapMethod")
+
     def wait_method(self, number):
-        def method():
-            return self.control.query("registry").get("HKEY_CURRENT_USER\\Software\\Korvane\\Vexa", {}).get("EapMethod")
+        wait_until(lambda: self.method() == number, f"the method {number} in the registry")
 
-        wait_until(lambda: method() == number, f"the method {number} in the registry")
 
+class Life(ConnectionStory):
     def test_joins_the_better_network_and_falls_back_to_the_machine(self):
         self.begin(CAFE, OFFICE)
         self.control.wait_connected("Office")
