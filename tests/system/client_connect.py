@@ -3,8 +3,7 @@
 import signal
 
 from client_networks import REPORT, NetworkStory
-from harness import Story, run_client, wait_until
-from peer import Peer
+from harness import wait_until
 
 CAFE = {
     "bssid": "02:00:00:00:00:01",
@@ -187,55 +186,3 @@ class Leaving(ConnectStory):
         self.assertEqual(self.refused(1, "disconnect", "--timeout", "1"), 'vexa: "Café" was not left within 1 s')
         self.assertEqual(self.done("disconnect", "--no-wait"), 'The service was asked to leave "Café".\n')
         wait_until(lambda: self.control.connected() is None, "the end")
-
-
-def listed(connected, name="Café"):
-    realms = [{"CredentialEapMethod": 2, "RealmName": "r"}]
-    entry = {"NetWorkName": name, "IsConnected": connected, "RealmFetched": True, "SupportRealmList": realms}
-    return ("GET_ALL_NETWORK_LIST", [entry])
-
-
-CREDENTIAL = {
-    "Id": 1, "Type": 1, "AccessType": 1, "CredentialEapMethod": 2, "AutoConnect": True, "CredentialName": "Pocket",
-    "RealName": "r", "Creator": "", "CaCert": "", "ClientCert": "", "Username": "u", "Password": "p",
-}  # fmt: skip
-KNOWN = {"GET_RADIO": True, "GET_IS_INTERNET_ACCESS": True, "GET_ALL_CREDENTIAL_LIST": [CREDENTIAL]}
-FAILED = [("CONNECT_DISCONNECT", 0), ("GET_IS_INTERNET_ACCESS", False)]
-DONE = [("CONNECT_DISCONNECT", 1), ("GET_IS_INTERNET_ACCESS", True)]
-JOINED = 'Connected to "Café" with the credential "Pocket".'
-
-
-class ForeignEvents(Story):
-    """A peer whose answers are chosen: what comes of a request when others' events are between."""
-
-    def joining(self, after_connect, lists, checks, *options):
-        lists, checks = iter(lists), iter(checks)
-
-        def answer(command):
-            name = command["CommandId"]
-            if name == "GET_ALL_NETWORK_LIST":
-                return [next(lists)]
-            if name == "CONNECT_NETWORK":
-                return after_connect
-            if name in KNOWN:
-                return [(name, KNOWN[name])]
-            in_use = "CONNECT_NETWORK" in peer.commands
-            return [*(next(checks, []) if in_use else []), ("CARD_PLUG_IN", "")]
-
-        peer = self.enterContext(Peer(answer))
-        result = run_client("connect", "Café", "--hs20-port", peer.port, *options, VEXA_MACHINE="/nonexistent")
-        return result.returncode, (result.stdout + result.stderr).strip()
-
-    def test_what_counts(self):
-        no, yes, gone = listed(False), listed(True), listed(False, "Hall")
-        for what, after_connect, lists, checks, told in (
-            ("a success that the list shows", DONE, [no, yes], [], JOINED),
-            ("a success of another", DONE, [no] * 9, [], 'vexa: "Café" was not joined within 1 s'),
-            ("a failure that was told before ours", FAILED, [no, no, yes], [[], DONE], JOINED),
-            ("an answer without a report", FAILED[:1], [no] * 9, [], 'vexa: the service could not begin to join "Café"'),
-            ("a list without it that lasts", [], [no] + [gone] * 9, [], 'vexa: "Café" is out of range'),
-            ("a connection that nothing tells of and that lasts", [], [no] + [yes] * 9, [], JOINED),
-        ):
-            with self.subTest(what):
-                options = ["--timeout", "1"] if "within 1 s" in told else []
-                self.assertEqual(self.joining(after_connect, lists, checks, *options), (told != JOINED, told))

@@ -1,15 +1,12 @@
 """Several at once: clients of one service that change its credentials, and a service that goes meanwhile."""
 
 import collections
-import os
-import random
+import json
 import signal
+import socket
 import threading
-import time
-import xml.etree.ElementTree
 
-from harness import Story, run_client, wait_until
-from peer import Peer
+from harness import TEXT, Story, accepted, frame, read_frame, read_head, run_client, wait_until
 
 ADD = ["credential", "add", "--method", "tls", "--client-cert", "c", "--realm"]
 UNKNOWN = "whether the change was made is not known"
@@ -47,44 +44,53 @@ class WithService(Story):
         (entry,) = self.told("credentials")
         self.assertEqual([entry[k] for k in ("name", "caCert", "clientCert", "autoConnect")], ["new"] * 3 + [False])
 
-    def test_a_noisy_client_confuses_nobody(self):
-        noise = self.machine.hs20()
-        quiet = threading.Event()
 
-        def make_noise():
-            number = 0
-            while not quiet.wait(0.001):
-                number += 1
-                noise.send("GET_ALL_CREDENTIAL_LIST")
-                noise.send("ADD_CREDENTIAL", {"Type": 3, "CredentialEapMethod": 1, "RealName": f"noise{number % 7}"})
-                noise.send("DELETE_CREDENTIAL", {"Id": random.randint(1, 40)})
+class Peer:
+    """Listens like a service and lets the test say what each command is answered with, in which order; None closes the
+    connection."""
 
-        thread = threading.Thread(target=make_noise)
-        thread.start()
-        self.addCleanup(thread.join)
-        self.addCleanup(quiet.set)
-        for n in range(10):
-            with self.subTest(n):
-                self.done(*ADD, f"mine{n}")
-                again = self.vexa(*ADD, f"mine{n}", "--name", "x")
-                # The noise may have deleted it in between.
-                self.assertEqual("Added" in again.stdout, again.returncode == 0, again.stderr)
+    def __init__(self, answer):
+        self._answer = answer
+        self._listener = socket.create_server(("127.0.0.1", 0))
+        self.port = self._listener.getsockname()[1]
+        self.commands = []
+        threading.Thread(target=self._listen, daemon=True).start()
 
-    def test_a_killed_service_is_told_and_what_was_told_is_kept(self):
-        told = set()
-        for n in range(12):
-            adding = self.running(*ADD, f"r{n}", "--machine", self.machine.folder)
-            time.sleep(random.uniform(0, 0.03))  # any moment will do
-            os.kill(self.machine.service_pid(), signal.SIGKILL)
-            if adding.wait() == 0:
-                told.add(f"r{n}")
-            else:
-                self.assertEqual((adding.process.returncode, len(adding.errors)), (1, 1), adding.errors)
-            self.machine.parent.wait()
-            self.start(folder=self.machine.folder)
-            self.assertLessEqual(told, set(self.realms()))
-        tree = xml.etree.ElementTree.parse(self.machine.config())
-        self.assertLessEqual(told, {entry.text for entry in tree.iter("realm")})
+    def __enter__(self):
+        return self
+
+    def __exit__(self, *_):
+        self._listener.close()
+
+    def _listen(self):
+        try:
+            while True:
+                connection, _ = self._listener.accept()
+                threading.Thread(target=self._serve, args=(connection,), daemon=True).start()
+        except OSError:
+            pass  # closed
+
+    def _serve(self, connection):
+        with connection, connection.makefile("rb") as stream:
+            _, headers = read_head(stream)
+            head = b"HTTP/1.1 101 x\r\nUpgrade: websocket\r\nConnection: Upgrade\r\nSec-WebSocket-Accept: "
+            connection.sendall(head + accepted(headers[b"sec-websocket-key"]) + b"\r\n\r\n")
+            while (command := self._read(stream)) is not None:
+                self.commands.append(command["CommandId"])
+                events = self._answer(command)
+                if events is None:
+                    return
+                for event, data, *source in events:
+                    envelope = {"EventId": event, "Source": (source or ["HotSpot20"])[0], "Data": json.dumps(data)}
+                    connection.sendall(frame(TEXT, json.dumps(envelope).encode()))
+
+    @staticmethod
+    def _read(stream):
+        try:
+            _, opcode, payload = read_frame(stream)
+        except OSError:
+            return None
+        return json.loads(payload) if opcode == TEXT else None
 
 
 LIST, IN = "GET_ALL_CREDENTIAL_LIST", "CARD_PLUG_IN"

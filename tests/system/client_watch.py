@@ -78,18 +78,6 @@ class Telling(WatchStory):
         wait_until(lambda: self.sentences(watch).count("the adapter is in") == 2, "its return")
         self.assert_quiet_end(watch, signal.SIGTERM)
 
-    def test_credentials_that_change(self):
-        watch = self.started()
-        self.add_user("A")
-        self.add_user("B")
-        self.done("credential", "move", "B", "2")
-        self.wait_told(watch, "the credentials have another order of priority")
-        self.done("credential", "edit", "A", "--name", "C")
-        self.wait_told(watch, 'credential 1 "C" was changed')
-        self.done("credential", "delete", "C")
-        self.wait_told(watch, 'credential 1 "C" was deleted')
-        self.assert_quiet_end(watch)
-
     def test_json_is_each_event_of_both_ports(self):
         watch = self.watch("--json")
 

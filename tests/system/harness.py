@@ -26,6 +26,7 @@ import time
 import unittest
 
 PATIENCE = 30.0
+KEY = base64.b64encode(bytes(16))
 TEXT, BINARY, CLOSE, PING, PONG = 1, 2, 8, 9, 10
 STORE = pathlib.PurePath("Public", "Roaming", "Korvane")
 
@@ -116,10 +117,10 @@ def open_connection(port, timeout=PATIENCE, receive_buffer=None):
     return connection
 
 
-def handshake(host, key="dGhlIHNhbXBsZSBub25jZQ=="):
+def handshake(host):
     """A request that the ports let in, if nothing else is wrong with it."""
-    upgrade = f"Upgrade: websocket\r\nConnection: Upgrade\r\nSec-WebSocket-Version: 13\r\nSec-WebSocket-Key: {key}"
-    return f"GET / HTTP/1.1\r\nHost: {host}\r\n{upgrade}\r\n\r\n".encode()
+    upgrade = "Upgrade: websocket\r\nConnection: Upgrade\r\nSec-WebSocket-Version: 13\r\n"
+    return f"GET / HTTP/1.1\r\nHost: {host}\r\n{upgrade}Sec-WebSocket-Key: {KEY.decode()}\r\n\r\n".encode()
 
 
 def accepted(key):
@@ -183,7 +184,11 @@ class WebSocket:
         self._sending = threading.Lock()
         self.socket = open_connection(port, receive_buffer=receive_buffer)
         self.input = self.socket.makefile("rb")
-        self._shake_hands(host or f"127.0.0.1:{port}")
+        self.socket.sendall(handshake(host or f"127.0.0.1:{port}"))
+        status, headers = read_head(self.input)
+        if headers.get(b"sec-websocket-accept") != accepted(KEY):
+            self.socket.close()
+            raise ConnectionError(f"not let in: {status!r}")
         self.socket.settimeout(None)
         self._reader = None
         if reads:
@@ -193,14 +198,6 @@ class WebSocket:
         """For a client that was made with reads=False, and until now left all in its socket."""
         self._reader = threading.Thread(target=self._read_all, daemon=True)
         self._reader.start()
-
-    def _shake_hands(self, host):
-        key = base64.b64encode(os.urandom(16))
-        self.socket.sendall(handshake(host, key.decode()))
-        status, headers = read_head(self.input)
-        if headers.get(b"sec-websocket-accept") != accepted(key):
-            self.socket.close()
-            raise ConnectionError(f"not let in: {status!r} {headers}")
 
     def _read_all(self):
         message, code = b"", 1006
