@@ -2,16 +2,9 @@
 
 import json
 
-from harness import Story
+from harness import Story, network
 
 LIST = "GET_ALL_NETWORK_LIST"
-
-
-def network(number, name, realms=None, **members):
-    entry = {"bssid": f"02:aa:00:00:00:{number:02x}", "ssid": name, **members}
-    if realms is not None:
-        entry["realms"] = [{"names": [realm], "eapMethods": methods} for realm, methods in realms.items()]
-    return entry
 
 
 def shown(event):

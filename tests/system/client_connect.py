@@ -3,20 +3,11 @@
 import signal
 
 from client_networks import REPORT, NetworkStory
-from harness import wait_until
+from harness import network, wait_until
 
-CAFE = {
-    "bssid": "02:00:00:00:00:01",
-    "ssid": "Café",
-    "realms": [{"names": ["cafe.example"], "eapMethods": [21, 13]}],
-    "accepts": [{"eapMethod": 21, "username": "anna", "password": "secret"}, {"eapMethod": 13, "authMode": "machine"}],
-}
-HALL = {
-    "bssid": "02:00:00:00:00:02",
-    "ssid": "Hall",
-    "realms": [{"names": ["hall.example"], "eapMethods": [21]}],
-    "accepts": [{"eapMethod": 21, "username": "anna"}],
-}
+PASSWORD, CERTIFICATE = {"eapMethod": 21, "username": "anna"}, {"eapMethod": 13, "authMode": "machine"}
+CAFE = network(1, "Café", {"cafe.example": [21, 13]}, accepts=[{**PASSWORD, "password": "secret"}, CERTIFICATE])
+HALL = network(2, "Hall", {"hall.example": [21]}, accepts=[PASSWORD])
 MANUAL = "--no-auto-connect"
 # Of the machine: long enough to act in the meantime, short enough to wait for.
 SLOW_MS = 20000
@@ -116,7 +107,7 @@ class NotJoining(ConnectStory):
         self.assertEqual(self.refused(1, "connect", "Hall"), 'vexa: could not join "Hall" with "Pocket"')
 
     def test_realms_that_are_not_known(self):
-        self.control.do("addNetwork", network={**HALL, "bssid": "02:00:00:00:00:03", "ssid": "Later", "anqp": "never"})
+        self.control.do("addNetwork", network=network(3, "Later", {}, anqp="never"))
         self.control.do("reportNetworks")
         self.assertIn('realms of "Later" are not known yet', self.refused(1, "connect", "Later", "--timeout", "1"))
 

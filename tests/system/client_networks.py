@@ -4,18 +4,12 @@ import json
 import signal
 
 from client_credentials import CredentialStory
-from harness import wait_until
+from harness import network, wait_until
 
-ROAM = [{"names": ["roam.example"], "eapMethods": [21]}, {"names": ["corp.example"], "eapMethods": [13]}]
 NETWORKS = [
-    {
-        "bssid": "02:00:00:00:00:01",
-        "ssid": "Airport Free",
-        "realms": ROAM,
-        "accepts": [{"eapMethod": 21, "username": "anna"}],
-    },
-    {"bssid": "02:00:00:00:00:02", "ssid": "Café", "realms": [], "internetAccess": 0},
-    {"bssid": "02:00:00:00:00:03", "ssid": "Later", "anqp": "never", "realms": []},
+    network(1, "Airport Free", {"roam.example": [21], "corp.example": [13]}, accepts=[{"eapMethod": 21, "username": "anna"}]),
+    network(2, "Café", {}, internetAccess=0),
+    network(3, "Later", {}, anqp="never"),
 ]
 REPORT = [{"atMs": 1, "do": "reportNetworks"}]
 
@@ -30,12 +24,12 @@ class NetworkStory(CredentialStory):
         return self.told("status")
 
     def all_reported(self):
-        def look():
+        def are_listed():
             self.control.do("reportNetworks")
             listed = self.networks()
-            return listed if len(listed) == len(self.scenario["networks"]) and listed[0]["realms"] else None
+            return len(listed) == len(self.scenario["networks"]) and listed[0]["realms"]
 
-        return wait_until(look, "all networks")
+        wait_until(are_listed, "all networks")
 
     def hide(self, bssid):
         self.control.do("hide", bssid=bssid)

@@ -165,3 +165,19 @@ class InAnyOrder(Story):
         wait_until(lambda: "ADD_CREDENTIAL" in peer.commands, "the command")
         self.assertEqual(adding.stop(signal.SIGINT), 1)
         self.assertEqual(adding.errors, [f"vexa: stopped before the service had answered; {UNKNOWN}"])
+
+    def test_a_connection_that_nothing_tells_of_is_believed_when_it_lasts(self):
+        looks = iter([False] + [True] * 9)
+        known = {"GET_IS_CARD_IN": (IN, ""), LIST: (LIST, stored("r")), "CONNECT_NETWORK": ("X", 0)}
+
+        def answer(command):
+            name = command["CommandId"]
+            if name == "GET_ALL_NETWORK_LIST":
+                realms = [{"CredentialEapMethod": 1, "RealmName": "r"}]
+                entry = {"NetWorkName": "Café", "RealmFetched": True, "SupportRealmList": realms}
+                return [(name, [{**entry, "IsConnected": next(looks)}])]
+            return [known.get(name, (name, True))]
+
+        peer = self.enterContext(Peer(answer))
+        told = self.done("connect", "Café", "--hs20-port", peer.port, VEXA_MACHINE="/nonexistent")
+        self.assertEqual(told, 'Connected to "Café" with the credential "r".\n')

@@ -5,7 +5,7 @@ import re
 import signal
 
 from client_networks import NETWORKS, REPORT, NetworkStory
-from harness import wait_until
+from harness import network, wait_until
 
 LINE = re.compile(r"\d\d:\d\d:\d\d  (hotspot |spectrum)  (\S.*)")
 CHANNELS = {"channels": [1, 6], "levels": {"1": {"congestion": 30, "power": 30}, "6": {"congestion": 60, "power": 60}}}
@@ -57,7 +57,7 @@ class Telling(WatchStory):
 
     def test_the_air_the_radio_and_the_adapter(self):
         watch = self.started()
-        gate = {"bssid": "02:00:00:00:00:09", "ssid": "Gate", "realms": []}
+        gate = network(9, "Gate", {})
         self.control.do("addNetwork", network=gate)
         self.control.do("reportNetworks")
         self.wait_told(watch, '"Gate" is in range; realms: none')

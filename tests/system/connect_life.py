@@ -1,6 +1,6 @@
 """The life of a connection on the real programs: joined by itself, left by the user, asked for again."""
 
-from harness import Story, wait_until
+from harness import Story, network, wait_until
 
 CREATOR = "<accesstype>alluser</accesstype><creator>KORVANE-PC\\user</creator>"
 CONFIG = f"""<?xml version="1.0" encoding="UTF-8"?><configurations><global>
@@ -14,12 +14,9 @@ CONFIG = f"""<?xml version="1.0" encoding="UTF-8"?><configurations><global>
 <users><user><username>KORVANE-PC\\user</username><credentials><credential><id>1</id><priority>1</priority></credential>
 <credential><id>2</id><priority>2</priority></credential></credentials></user></users></configurations>"""
 
-OFFICE = {"bssid": "02:aa:00:00:00:01", "ssid": "Office",
-          "realms": [{"names": ["work.example"], "eapMethods": [13]}],
-          "accepts": [{"eapMethod": 13, "authMode": "machine"}]}  # fmt: skip
-CAFE = {"bssid": "02:aa:00:00:00:02", "ssid": "Cafe",
-        "realms": [{"names": ["cafe.example"], "eapMethods": [21]}],
-        "accepts": [{"eapMethod": 21, "username": "me", "password": "secret"}]}  # fmt: skip
+USER = {"eapMethod": 21, "username": "me", "password": "secret"}
+OFFICE = network(1, "Office", {"work.example": [13]}, accepts=[{"eapMethod": 13, "authMode": "machine"}])
+CAFE = network(2, "Cafe", {"cafe.example": [21]}, accepts=[USER])
 
 
 class ConnectionStory(Story):

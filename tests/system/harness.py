@@ -107,6 +107,13 @@ def run_client(*arguments, stdin=None, **variables):
     )
 
 
+def network(number, name, realms=None, **members):
+    """Of a scenario: with realms by their names, each with its EAP methods."""
+    if realms is not None:
+        members["realms"] = [{"names": [realm], "eapMethods": methods} for realm, methods in realms.items()]
+    return {"bssid": f"02:aa:00:00:00:{number:02x}", "ssid": name, **members}
+
+
 def open_connection(port, timeout=PATIENCE, receive_buffer=None):
     """A socket that is connected to a port of the machine under test."""
     connection = socket.socket()
