@@ -6,9 +6,9 @@ import socket
 import stat
 import subprocess
 
-from harness import Story, busy_ports, clean_environment, free_ports, is_running, run_client, wait_until
+from harness import Story, clean_environment, free_ports, is_running, run_client, tcp_rows, wait_until
 
-LISTEN = "0A"
+LISTENING = [("0100007F", "0A")]  # on the loopback address alone
 
 
 class RunningService(Story):
@@ -17,8 +17,7 @@ class RunningService(Story):
         machine.control.close()
         sa, hs20, control = machine.sa_port, machine.hs20_port, machine.control_port
         self.assertEqual(len({sa, hs20, control, 0}), 4)
-        table = busy_ports()
-        self.assertEqual([table[sa], table[hs20]], [{LISTEN}, {LISTEN}], "nothing has touched them")
+        self.assertEqual([tcp_rows(sa), tcp_rows(hs20)], [LISTENING, LISTENING], "nothing has touched them")
         path = machine.folder / "ports.json"
         self.assertEqual(json.loads(path.read_text()), {"sa": sa, "hs20": hs20, "control": control})
         for file in (path, machine.folder / "stdout.log"):
@@ -40,7 +39,7 @@ class RunningService(Story):
         parent = self.running(*command, environment=clean_environment(VEXA_CONTROL_PORT="1"), stdin=subprocess.PIPE)
         ports = json.loads(parent.wait_line("{"))
         self.assertEqual((set(ports), ports["control"]), ({"sa", "hs20", "control"}, 0))
-        self.assertEqual(busy_ports()[ports["sa"]], {LISTEN})
+        self.assertEqual(tcp_rows(ports["sa"]), LISTENING)
         parent.process.stdin.write("what comes before the end means nothing\n")
         parent.process.stdin.close()
         self.assertEqual(parent.wait(), 0)

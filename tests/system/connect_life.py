@@ -2,15 +2,13 @@
 
 from harness import Story, network, wait_until
 
-CREATOR = "<accesstype>alluser</accesstype><creator>KORVANE-PC\\user</creator>"
-CONFIG = f"""<?xml version="1.0" encoding="UTF-8"?><configurations><global>
-<dump_file_path>hs20log.txt</dump_file_path><create_new_dump_file>false</create_new_dump_file>
-<autoconnect>true</autoconnect><enabledump>true</enabledump><dumplevel>0</dumplevel><homerealm></homerealm>
-<nextcredid>3</nextcredid></global><credentials>
-<credential><id>1</id><type>eaptls</type>{CREATOR}<eap>1</eap><autoconnect>true</autoconnect><credname>Work</credname>
-<realm>work.example</realm><cacert>ab</cacert><clientcert></clientcert></credential>
-<credential><id>2</id><type>eapttls</type>{CREATOR}<eap>2</eap><autoconnect>true</autoconnect><credname>Cafe</credname>
-<realm>cafe.example</realm><username>me</username><password>secret</password></credential></credentials>
+COMMON = "<accesstype>alluser</accesstype><creator>KORVANE-PC\\user</creator><autoconnect>true</autoconnect>"
+CONFIG = f"""<?xml version="1.0" encoding="UTF-8"?><configurations><global><dump_file_path>hs20log.txt</dump_file_path>
+<create_new_dump_file>false</create_new_dump_file><enabledump>true</enabledump><nextcredid>3</nextcredid></global>
+<credentials><credential><id>1</id><type>eaptls</type>{COMMON}<eap>1</eap><credname>Work</credname>
+<realm>work.example</realm><cacert>ab</cacert></credential>
+<credential><id>2</id><type>eapttls</type>{COMMON}<eap>2</eap><credname>Cafe</credname><realm>cafe.example</realm>
+<username>me</username><password>secret</password></credential></credentials>
 <users><user><username>KORVANE-PC\\user</username><credentials><credential><id>1</id><priority>1</priority></credential>
 <credential><id>2</id><priority>2</priority></credential></credentials></user></users></configurations>"""
 

@@ -49,13 +49,11 @@ def wait_until(condition, what, timeout=PATIENCE):
     return value
 
 
-def busy_ports():
-    """The local ports with a row in the TCP table, each with the states of its rows."""
-    ports = collections.defaultdict(set)
-    for line in pathlib.Path("/proc/net/tcp").read_text().splitlines()[1:]:
-        fields = line.split()
-        ports[int(fields[1].split(":")[1], 16)].add(fields[3])
-    return ports
+def tcp_rows(port):
+    """The rows of the TCP table with this local port, each with its address, backwards, and its state."""
+    lines = pathlib.Path("/proc/net/tcp").read_text().splitlines()[1:]
+    rows = [(*line.split()[1].split(":"), line.split()[3]) for line in lines]
+    return [(address, state) for address, local, state in rows if int(local, 16) == port]
 
 
 def free_ports(count):
@@ -238,11 +236,11 @@ class WebSocket:
         with self._sending:
             self.socket.sendall(frame(opcode, payload, final, os.urandom(4)))
 
-    def take(self, timeout=PATIENCE):
+    def take(self):
         """The oldest message not taken yet, as bytes."""
         with self._arrival:
-            if not self._arrival.wait_for(lambda: self.received or self.close_code is not None, timeout):
-                raise AssertionError(f"no message within {timeout} s")
+            if not self._arrival.wait_for(lambda: self.received or self.close_code is not None, PATIENCE):
+                raise AssertionError(f"no message within {PATIENCE} s")
             if not self.received:
                 raise ConnectionError(f"closed with code {self.close_code}")
             return self.received.popleft()
@@ -274,21 +272,14 @@ class PortClient(WebSocket):
             message["Data"] = data if isinstance(data, (str, bool)) else json.dumps(data)
         self.send_frame(TEXT, json.dumps(message).encode())
 
-    def next_event(self, timeout=PATIENCE):
-        return json.loads(self.take(timeout))
+    def next_event(self):
+        return json.loads(self.take())
 
-    def wait_event(self, event_id, where=lambda event: True, timeout=PATIENCE):
+    def wait_event(self, event_id, where=lambda event: True):
         """The next event of this name; those before it are passed over."""
-        end = time.monotonic() + timeout
-        passed = []
-        while True:
-            try:
-                event = self.next_event(max(0.0, end - time.monotonic()))
-            except AssertionError:
-                raise AssertionError(f"no {event_id} within {timeout} s, but {passed}") from None
-            if event["EventId"] == event_id and where(event):
-                return event
-            passed.append(event["EventId"])
+        while (event := self.next_event())["EventId"] != event_id or not where(event):
+            pass
+        return event
 
     def ask(self, command, data=None, answer=None):
         """The next event of the command's name, or of another one that answers it."""

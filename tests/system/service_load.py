@@ -131,6 +131,19 @@ class Rush(Story):
         self.assertLess(len(got), len(expected))
         self.assertEqual(got, expected[: len(got)])
 
+    def test_the_dropped_client_is_told_why(self):
+        self.start(spectrum={"channels": list(range(256))})
+        stuck, busy = self.machine.sa(reads=False, receive_buffer=4096), self.machine.sa()
+        # More than the sockets and the queue hold together.
+        sent = lists = 0
+        while sent < 16 * MEBIBYTE:
+            busy.send("GET_CHANNEL_LIST")
+            sent += len(busy.take()) + len(busy.take())
+            lists += 1
+        stuck.start_reading()
+        self.assertEqual(stuck.wait_closed(), 1008)
+        self.assertLess(len(stuck.received), 2 * lists)
+
     def test_a_client_that_floods_but_never_reads_holds_up_nobody(self):
         self.start()
         flood, other = self.machine.hs20(reads=False, receive_buffer=4096), self.machine.hs20()

@@ -14,6 +14,7 @@ from harness import Story, clean_environment, free_ports, is_running, program, w
 STOP_LIMIT = 11.5
 PR_SET_CHILD_SUBREAPER = 36
 CHANNEL = "SPECTRAL_ANALYSER_CURRENT_CHANNEL_DATA"
+HOTSPOT, SPECTRAL = "create ipc successfully,port={}\n", "Create IPC server successfully, port={}\n"
 NO_HOTSPOT, NO_SPECTRAL = "create ipc server fail\n", "Create IPC server failed.\n"
 
 
@@ -30,16 +31,8 @@ def run_service(*arguments, **variables):
     return done.returncode, done.stdout, done.stderr
 
 
-def hotspot_created(port):
-    return f"create ipc successfully,port={port}\n"
-
-
-def spectral_created(port):
-    return f"Create IPC server successfully, port={port}\n"
-
-
 def created(sa, hs20):
-    return hotspot_created(hs20) + spectral_created(sa)
+    return HOTSPOT.format(hs20) + SPECTRAL.format(sa)
 
 
 class Alone(Story):
@@ -78,9 +71,9 @@ class Alone(Story):
     def test_no_server_on_what_is_no_port(self):
         for offset in (-65536, 65536):
             sa, hs20 = free_ports(2)
-            self.assert_runs(f"{sa + offset} {hs20}", prints=hotspot_created(hs20) + NO_SPECTRAL)
+            self.assert_runs(f"{sa + offset} {hs20}", prints=HOTSPOT.format(hs20) + NO_SPECTRAL)
             sa, hs20 = free_ports(2)
-            self.assert_runs(f"{sa} {hs20 + offset}", prints=NO_HOTSPOT + spectral_created(sa))
+            self.assert_runs(f"{sa} {hs20 + offset}", prints=NO_HOTSPOT + SPECTRAL.format(sa))
 
     def test_a_port_in_any_row_of_the_table_is_busy(self):
         (other,) = free_ports(1)
@@ -157,7 +150,7 @@ class WithParent(Story):
     def test_equal_ports_leave_one_channel(self):
         (port,) = free_ports(1)
         machine = self.start(arguments=["--sa-port", f"{port}", "--hs20-port", f"{port}"])
-        self.assertEqual(machine.output(), hotspot_created(port) + NO_SPECTRAL)
+        self.assertEqual(machine.output(), HOTSPOT.format(port) + NO_SPECTRAL)
         client = machine.hs20()
         self.control.do("pullAdapter")
         self.control.do("insertAdapter")

@@ -28,6 +28,7 @@ SCANS = [
     ),
     ("interference that falls to nothing is not told", [record(2412, 100, QUIET), record(5180, 8)], "2:c89"),
     ("nor one that comes back as it was", [record(2412, 100), record(5180, 8)], "2:c95"),
+    ("a bin without a magnitude counts as 1", [record(5180, 8, 60, [0] * 20 + [200] * 36)], "1:i53"),
     (
         "records without a magnitude spoil their channel",
         [record(2412, 100, 96, bins=0), record(2412, 100, 96), record(2437, 1, QUIET, bins=0)],
@@ -41,7 +42,7 @@ SCANS = [
     (
         "frequencies at the end of a channel",
         [record(2416, 90), record(2485, 70), record(5184, 60), record(6275, 40)],
-        "1:c39 2:c93 4:c44 4:i67 5:c40 5:i67",
+        "1:c39 1:i67 2:c93 4:c44 4:i67 5:c40 5:i67",
     ),
     ("a fall", [record(2437, 0)], "3:c8 3:i67"),
     ("goes on", [record(2437, 0)], "3:c3"),

@@ -3,12 +3,20 @@ everything that a client was told is there, and a file that anybody can read."""
 
 import os
 import random
+import re
 import signal
+import stat
 import time
 import xml.etree.ElementTree
 
-from harness import STORE, Machine, Story
+from harness import STORE, Machine, Story, wait_until
 
+DEFAULT = (
+    b'\xef\xbb\xbf<?xml version="1.0" encoding="UTF-8"?><configurations>\t<global>\t\t<dump_file_path>hs20log.txt'
+    b"</dump_file_path>\t\t<create_new_dump_file>true</create_new_dump_file>\t\t<autoconnect>true</autoconnect>\t\t"
+    b"<enabledump>false</enabledump>\t\t<dumplevel>0</dumplevel>\t\t<homerealm></homerealm>\t\t<nextcredid>1"
+    b"</nextcredid>\t</global>\t<credentials>\t</credentials>\t<users>\t</users></configurations>"
+)
 ALICE, BOB = "PC\\alice", "PC\\bob"
 PRIVATE, PUBLIC = 2, 1
 SEED = 20
@@ -42,9 +50,9 @@ class StoreStory(Story):
         return [path.name for path in self.store.iterdir() if path.name not in ("config.xml", "Dump")]
 
 
-class TwoUsers(StoreStory):
-    def session(self, user):
-        return Machine({"user": user, "speed": 20}, folder=self.folder)
+class Users(StoreStory):
+    def session(self, user, **scenario):
+        return Machine({"user": user, "speed": 20, **scenario}, folder=self.folder)
 
     def owners(self):
         """Each stored realm with its creator."""
@@ -79,6 +87,23 @@ class TwoUsers(StoreStory):
             self.assertEqual(self.references(BOB), [("4", "1"), ("2", "2")])
             self.assertEqual(self.owners(), {"bobs-private": BOB, "alices-private": ALICE, "shared": ALICE})
         self.assertEqual(self.strays(), [])
+
+    def test_what_is_made_is_for_its_owner_alone(self):
+        with self.session(ALICE) as machine:
+            self.assertEqual((self.store / "config.xml").read_bytes(), DEFAULT)
+            add(machine.hs20(), "a")
+        self.assertEqual(list((self.store / "Dump").iterdir()), [], "the log is off")
+        text = DEFAULT.replace(b"<enabledump>false", b"<enabledump>true").decode("utf-8-sig")
+        first, second = (self.store / "Dump" / f"hs20log_alice_{number}.txt" for number in (0, 1))
+        with self.session(ALICE, config=text):
+            content = wait_until(lambda: first.exists() and first.read_text(), "the log is written")
+        numbers = [int(number) for number in re.findall(r"^\[(\d+)\] ", content, re.MULTILINE)]
+        self.assertEqual(numbers, list(range(1, len(numbers) + 1)))
+        with self.session(ALICE):
+            wait_until(second.exists, "the second log is written")
+        for path in (self.store, *self.store.rglob("*")):
+            mode = stat.S_IMODE(path.stat().st_mode)
+            self.assertEqual(mode, 0o700 if path.is_dir() else 0o600, path)
 
 
 class Crash(StoreStory):
