@@ -161,6 +161,8 @@ class Changing(CredentialStory):
                 with self.subTest(arguments):
                     self.assertIn(which, self.refused(1, "credential", *arguments))
         self.assertEqual(self.names(), ["A", "B", "C"])
+        self.done("credential", "edit", "A", "--name", "B")
+        self.assertIn("several", self.refused(1, "credential", "delete", "B"))
 
     def test_reload_takes_what_was_edited_by_hand(self):
         path = self.machine.config()

@@ -28,16 +28,11 @@ class Alone(Story):
     def run_service(self, *arguments, **scenario):
         return run_service(*arguments, VEXA_SCENARIO=wine.scenario_file(scenario, self.new_folder()))
 
-    def test_what_is_no_command_line(self):
-        (free,) = free_ports(1)
-        for arguments in ((), (free,), ("0", free), (free, "0"), ("abc", free), (free, "x"), ("", free), (free, "")):
-            with self.subTest(arguments):
-                self.assertEqual(self.run_service(*arguments), (1, "", ""))
-
-    def test_a_port_in_use(self):
+    def test_what_is_no_command_line_or_names_a_port_in_use(self):
         with socket.create_server(("127.0.0.1", 0)) as server:
             busy, (free,) = server.getsockname()[1], free_ports(1)
-            for arguments in ((busy, free), (free, busy)):
+            for arguments in ((), (free,), (0, free), (free, 0), ("abc", free), (free, "x"), ("", free), (free, ""),
+                              (busy, free), (free, busy)):  # fmt: skip
                 with self.subTest(arguments):
                     self.assertEqual(self.run_service(*arguments), (1, "", ""))
 

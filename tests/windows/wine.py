@@ -86,14 +86,12 @@ def stage():
     """A folder with the programs by themselves in `plain`, and the service among the stand-ins in `simulated`."""
     folder = pathlib.Path(tempfile.mkdtemp(prefix="vexa-wine-"))
     atexit.register(shutil.rmtree, folder, ignore_errors=True)
-    plain, simulated = folder / "plain", folder / "simulated"
-    plain.mkdir()
-    simulated.mkdir()
-    for name in ("vexa.exe", "vexa-service.exe"):
-        shutil.copy(build() / "bin" / name, plain)
-    shutil.copy(build() / "bin" / "vexa-service.exe", simulated)
-    for name in STAND_INS:
-        shutil.copy(build() / "stand-ins" / f"{name}.dll", simulated)
+    stand_ins = [f"stand-ins/{name}.dll" for name in STAND_INS]
+    parts = {"plain": ["bin/vexa.exe", "bin/vexa-service.exe"], "simulated": ["bin/vexa-service.exe", *stand_ins]}
+    for name, files in parts.items():
+        (folder / name).mkdir()
+        for file in files:
+            shutil.copy(build() / file, folder / name)
     return folder
 
 
