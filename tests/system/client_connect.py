@@ -2,12 +2,12 @@
 
 import signal
 
-from client_networks import REPORT, NetworkStory
+from client_networks import ANNA, REPORT, NetworkStory
 from harness import network, wait_until
 
-PASSWORD, CERTIFICATE = {"eapMethod": 21, "username": "anna"}, {"eapMethod": 13, "authMode": "machine"}
-CAFE = network(1, "Café", {"cafe.example": [21, 13]}, accepts=[{**PASSWORD, "password": "secret"}, CERTIFICATE])
-HALL = network(2, "Hall", {"hall.example": [21]}, accepts=[PASSWORD])
+ACCEPTS = [{**ANNA, "password": "secret"}, {"eapMethod": 13, "authMode": "machine"}]
+CAFE = network(1, "Café", {"cafe.example": [21, 13]}, accepts=ACCEPTS)
+HALL = network(2, "Hall", {"hall.example": [21]}, accepts=[ANNA])
 MANUAL = "--no-auto-connect"
 # Of the machine: long enough to act in the meantime, short enough to wait for.
 SLOW_MS = 20000
@@ -61,7 +61,7 @@ class Joining(ConnectStory):
     def test_the_next_credential_is_tried(self):
         self.pocket(MANUAL)
         self.card()
-        self.control.do("setNetwork", bssid=CAFE["bssid"], accepts=CAFE["accepts"][:1])
+        self.control.do("setNetwork", bssid=CAFE["bssid"], accepts=ACCEPTS[:1])
         before = self.requests()
         self.assertIn('with the credential "Pocket"', self.done("connect", "Café"))
         self.assertEqual(self.requests() - before, 3, "the user's certificate, the machine's, the password")

@@ -107,6 +107,7 @@ class Adding(CredentialStory):
                 stored = self.list("--show-passwords")[0]
                 self.assertEqual([stored[k] for k in ("name", "username", "password")], [text] * 3)
 
+
 class Changing(CredentialStory):
     def setUp(self):
         super().setUp()
@@ -142,8 +143,8 @@ class Changing(CredentialStory):
                 self.assertEqual(told, f'Changed credential {entries[which]["id"]} "{which}": {words}.\n')
                 entries[which].update(changes)
                 self.assertEqual(self.list("--show-passwords"), list(entries.values()))
-        for edit in (["A", "--client-cert", "x"], ["A", "--username", ""], ["T", "--username", "x"], ["T", "--password-stdin"]):
-            self.refused(2, "credential", "edit", *edit, stdin="p")
+        for edit in ("A --client-cert x", "A --username=", "T --username x", "T --password-stdin"):
+            self.refused(2, "credential", "edit", *edit.split(), stdin="p")
         self.done("credential", "edit", "T", "--name", "")
         self.assertEqual(self.names(), ["", "A", "B", "C"])
         words = self.done("credential", "edit", "B", "--name", "B")

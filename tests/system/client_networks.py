@@ -6,8 +6,9 @@ import signal
 from client_credentials import CredentialStory
 from harness import network, wait_until
 
+ANNA = {"eapMethod": 21, "username": "anna"}
 NETWORKS = [
-    network(1, "Airport Free", {"roam.example": [21], "corp.example": [13]}, accepts=[{"eapMethod": 21, "username": "anna"}]),
+    network(1, "Airport Free", {"roam.example": [21], "corp.example": [13]}, accepts=[ANNA]),
     network(2, "Café", {}, internetAccess=0),
     network(3, "Later", {}, anqp="never"),
 ]

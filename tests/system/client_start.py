@@ -55,7 +55,7 @@ class RunningService(Story):
         machine = self.start()
         second = self.running("start", "--machine", machine.folder)
         self.assertEqual((second.wait(), second.lines, len(second.errors)), (3, [], 1), second.errors)
-        machine.sa().ask("GET_CURRENT_CHANNEL", answer="SPECTRAL_ANALYSER_CURRENT_CHANNEL_DATA")
+        machine.sa().ask("GET_CURRENT_CHANNEL")
         self.assertTrue((machine.folder / "ports.json").exists())
         self.assertEqual(machine.stop(), 0)
 
@@ -63,7 +63,7 @@ class RunningService(Story):
         one, other = self.start(), self.start()
         self.assertNotEqual(one.sa_port, other.sa_port)
         self.assertEqual(one.stop(), 0)
-        other.sa().ask("GET_CURRENT_CHANNEL", answer="SPECTRAL_ANALYSER_CURRENT_CHANNEL_DATA")
+        other.sa().ask("GET_CURRENT_CHANNEL")
         self.assertEqual(other.stop(), 0)
 
 

@@ -41,18 +41,6 @@ class Life(ConnectionStory):
         for call in (first, second):
             self.assertEqual((call["mode"], call["ssid"], call["flags"], call["result"]), (1, None, 1, 0))
 
-    def test_stays_away_from_what_the_user_left_until_he_asks(self):
-        self.begin(CAFE)
-        self.control.wait_connected("Cafe")
-        self.wait_method(2)
-        self.hs20.send("DISCONNECT_NETWORK", {"NetWorkName": "Cafe"})
-        self.wait_method(0)
-        self.control.do("clearCalls")
-        self.control.wait_passed(30000)
-        self.assertEqual(self.control.calls("WlanConnect"), [])
-        self.hs20.send("CONNECT_NETWORK", {"NetWorkName": "Cafe"})
-        self.control.wait_connected("Cafe")
-
     def test_a_name_in_no_list_is_told_as_a_failure(self):
         self.begin(CAFE)
         self.control.wait_connected("Cafe")

@@ -28,6 +28,9 @@ import unittest
 PATIENCE = 30.0
 KEY = base64.b64encode(bytes(16))
 TEXT, BINARY, CLOSE, PING, PONG = 1, 2, 8, 9, 10
+CHANNEL, CHANNEL_LIST = "SPECTRAL_ANALYSER_CURRENT_CHANNEL_DATA", "SPECTRAL_ANALYSER_CHANNEL_LIST_DATA_2G5G"
+# Commands whose answer has another name.
+ANSWERS = {"GET_CURRENT_CHANNEL": CHANNEL, "GET_CHANNEL_LIST": CHANNEL_LIST, "GET_IS_CARD_IN": "CARD_PLUG_IN"}
 STORE = pathlib.PurePath("Public", "Roaming", "Korvane")
 
 
@@ -282,9 +285,9 @@ class PortClient(WebSocket):
         return event
 
     def ask(self, command, data=None, answer=None):
-        """The next event of the command's name, or of another one that answers it."""
+        """The next event that answers the command."""
         self.send(command, data)
-        return self.wait_event(answer or command)
+        return self.wait_event(answer or ANSWERS.get(command, command))
 
     def credentials(self, command="GET_ALL_CREDENTIAL_LIST", data=None):
         """The list that answers a command about credentials."""

@@ -56,7 +56,7 @@ class Idle(Story):
             self.assert_rests(machine)
             for _ in range(10):
                 machine.sa(), machine.hs20()
-            machine.sa().ask("GET_CURRENT_CHANNEL", answer="SPECTRAL_ANALYSER_CURRENT_CHANNEL_DATA")
+            machine.sa().ask("GET_CURRENT_CHANNEL")
             self.assert_rests(machine)
             self.assert_small(machine)
 

@@ -4,10 +4,9 @@ import json
 import re
 import unittest
 
-from harness import BINARY, Machine, Story, wait_until
+from harness import BINARY, CHANNEL, CHANNEL_LIST, Machine, Story, wait_until
 
 TIMESTAMP = r"\d{4}-\d\d-\d\dT\d\d:\d\d:\d\d "
-CHANNEL, CHANNELS = "SPECTRAL_ANALYSER_CURRENT_CHANNEL_DATA", "SPECTRAL_ANALYSER_CHANNEL_LIST_DATA_2G5G"
 
 
 def spectral(event_id, data=None, source="SpectralAnalyser"):
@@ -42,7 +41,7 @@ class Texts(Story):
         self.assert_answers(
             client,
             ("GET_CURRENT_CHANNEL", spectral(CHANNEL, "0")),
-            ("GET_CHANNEL_LIST", spectral("RADIO_ON"), spectral(CHANNELS, "[\n" + ",\n".join(entries) + "\n]\n")),
+            ("GET_CHANNEL_LIST", spectral("RADIO_ON"), spectral(CHANNEL_LIST, "[\n" + ",\n".join(entries) + "\n]\n")),
             ("FULL_SCAN", spectral("SPECTRAL_ANALYSER_SAMPLE_DATA_CONGESTION", congestion)),
             (None, spectral("SPECTRAL_ANALYSER_SAMPLE_DATA_INTERFERENCE", noise)),
         )
@@ -54,7 +53,7 @@ class Texts(Story):
             ("RADIO_ON", {"spectrum": {"channels": []}}),
         ):
             with self.subTest(scenario), Machine({"speed": 20, **scenario}) as machine:
-                answers = spectral(radio), spectral(CHANNELS, "null\n")
+                answers = spectral(radio), spectral(CHANNEL_LIST, "null\n")
                 self.assert_answers(machine.sa(), ("GET_CHANNEL_LIST", *answers))
 
     def test_events_of_the_adapter(self):
@@ -82,8 +81,9 @@ NOTHING = [
     b'{"CommandId":"%d%s%n%x"}', b'{"CommandId":"' + b"A" * 100000 + b'"}', b'{"CommandId":""}',
     b'{"CommandId":"@\\u0000"}', b'{"CommandId":1}', b'{"CommandId":1.5}', b'{"CommandId":true}',
     b'{"CommandId":null}', b'{"CommandId":["@"]}', b'{"CommandId":{"CommandId":"@"}}', b"/* @ */", b"/* @",
-    b"\xff\xfe\x80", b'{"CommandId":"\\ud800"}', b'{"CommandId":"\\q"}', '{"CommandId":"GET_RADIO"}'.encode("utf-16-le"),
-    b"[" * 200000, b'{"a":' * 50000, b"[" * 2000 + b"]" * 2000, b'{"A":' + b"[" * 5000 + b"]" * 5000 + b',"CommandId":"@"}',
+    b"\xff\xfe\x80", b'{"CommandId":"\\ud800"}', b'{"CommandId":"\\q"}', b"[" * 200000, b'{"a":' * 50000,
+    '{"CommandId":"GET_RADIO"}'.encode("utf-16-le"), b"[" * 2000 + b"]" * 2000,
+    b'{"A":' + b"[" * 5000 + b"]" * 5000 + b',"CommandId":"@"}',
 ]  # fmt: skip
 
 # Messages that are the command nevertheless.
@@ -115,7 +115,7 @@ class Reading(unittest.TestCase):
     def assert_answers(self, texts, on_sa, on_hs20):
         """How often each is answered on each port."""
         for client, command, answer, marker, end, count in (
-            (self.sa, b"GET_CURRENT_CHANNEL", CHANNEL, "GET_CHANNEL_LIST", CHANNELS, on_sa),
+            (self.sa, b"GET_CURRENT_CHANNEL", CHANNEL, "GET_CHANNEL_LIST", CHANNEL_LIST, on_sa),
             (self.hs20, b"GET_RADIO", "GET_RADIO", "GET_IS_CARD_IN", "CARD_PLUG_IN", on_hs20),
         ):
             for text in texts:

@@ -8,12 +8,11 @@ import socket
 import subprocess
 import time
 
-from harness import Story, clean_environment, free_ports, is_running, program, wait_until
+from harness import CHANNEL, CHANNEL_LIST, Story, clean_environment, free_ports, is_running, program, wait_until
 
 # The thread that connects may be in a sleep of ten seconds, which nothing ends early; the rest takes a moment.
 STOP_LIMIT = 11.5
 PR_SET_CHILD_SUBREAPER = 36
-CHANNEL = "SPECTRAL_ANALYSER_CURRENT_CHANNEL_DATA"
 HOTSPOT, SPECTRAL = "create ipc successfully,port={}\n", "Create IPC server successfully, port={}\n"
 NO_HOTSPOT, NO_SPECTRAL = "create ipc server fail\n", "Create IPC server failed.\n"
 
@@ -64,7 +63,8 @@ class Alone(Story):
             self.assert_refused(*arguments)
 
     def test_command_lines_that_are_taken(self):
-        for form in ("{0} {1}", "{0} {1} rest", "{0}  {1}", "+{0} +{1}", "\t{0} \t{1}", "{0}x {1}.5", "{0:x<31} {1:x<31}"):
+        forms = "{0} {1}", "{0} {1} rest", "{0}  {1}", "+{0} +{1}", "\t{0} \t{1}", "{0}x {1}.5", "{0:x<31} {1:x<31}"
+        for form in forms:
             sa, hs20 = free_ports(2)
             self.assert_runs(form.format(str(sa), str(hs20)), prints=created(sa, hs20))
 
@@ -117,7 +117,7 @@ class WithParent(Story):
         for arguments in ([], ["nonsense"], free_ports(2)):
             self.assertEqual(run_service(*arguments, VEXA_MACHINE=str(machine.folder)), (0, "", ""))
         self.assertEqual(machine.output(), before)
-        machine.sa().ask("GET_CURRENT_CHANNEL", answer=CHANNEL)
+        machine.sa().ask("GET_CURRENT_CHANNEL")
         self.assertEqual(machine.stop(), 0)
 
     def test_a_killed_parent_is_a_normal_stop(self):
@@ -157,7 +157,7 @@ class WithParent(Story):
         self.control.do("notify", source=16, code=4)
         self.control.do("radio", hardware="on", software="off")
         self.assertEqual(client.next_event()["EventId"], "GET_RADIO")
-        client.ask("GET_IS_CARD_IN", answer="CARD_PLUG_IN")
+        client.ask("GET_IS_CARD_IN")
         self.assertEqual(machine.stop(), 0)
 
 
@@ -192,7 +192,7 @@ class Stop(Story):
         for _ in range(100):
             busy.send("GET_CHANNEL_LIST")
         for _ in range(100):
-            busy.wait_event("SPECTRAL_ANALYSER_CHANNEL_LIST_DATA_2G5G")
+            busy.wait_event(CHANNEL_LIST)
         self.assert_stops()
 
     def test_while_commands_pour_in_and_scans_complete_all_the_time(self):
@@ -212,5 +212,5 @@ class Stop(Story):
         service = self.start().service_pid()
         for number in (signal.SIGINT, signal.SIGHUP, signal.SIGPIPE):
             os.kill(service, number)
-        self.machine.sa().ask("GET_CURRENT_CHANNEL", answer=CHANNEL)
+        self.machine.sa().ask("GET_CURRENT_CHANNEL")
         self.assert_stops()

@@ -2,7 +2,7 @@
 
 import json
 
-from harness import Story, wait_until
+from harness import CHANNEL, CHANNEL_LIST, Story, wait_until
 
 CHANNELS = [36, 1, 6, 36, 14, 255]
 LOUD, QUIET, EVEN, MIXED = 32767, -32768, 100, list(range(200, 256))
@@ -65,11 +65,11 @@ class Values(Story):
         client.send("FULL_SCAN")
         wait_until(lambda: len(self.control.query("calls")) > len(scans) + 2, "the last scan")
         client.send("GET_CURRENT_CHANNEL")
-        client.wait_event("SPECTRAL_ANALYSER_CHANNEL_LIST_DATA_2G5G")
+        client.wait_event(CHANNEL_LIST)
         for name, _, expected in SCANS:
             for value in expected.split():
                 event = client.next_event()
                 event_id, member = self.NAMES[value[2]]
                 told = {"order": int(value[0]), member: int(value[3:])}
                 self.assertEqual((event["EventId"], json.loads(event["Data"])), (event_id, told), name)
-        self.assertEqual(client.next_event()["EventId"], "SPECTRAL_ANALYSER_CURRENT_CHANNEL_DATA")
+        self.assertEqual(client.next_event()["EventId"], CHANNEL)

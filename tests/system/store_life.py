@@ -1,5 +1,5 @@
-"""The file of the credentials: two users of one machine share it, one after the other; and what a killed service leaves:
-everything that a client was told is there, and a file that anybody can read."""
+"""The file of the credentials: two users of one machine share it, one after the other; and what a killed service
+leaves: everything that a client was told is there, and a file that anybody can read."""
 
 import os
 import random

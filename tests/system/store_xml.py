@@ -23,9 +23,9 @@ BASE = (
     "<?p i?><users></users></configurations>\n"
 ).encode()
 PIECES = [
-    b"<", b">", b"&", b";", b"/", b'"', b"'", b"=", b" ", b"-", b"!", b"?", b"]]>", b"<![CDATA[", b"<!--", b"-->", b"&amp;",
-    b"&#0;", b"&#x41;", b"&x;", b"<a>", b"</a>", b"<a/>", b"<?p?>", b"<?xml?>", b"\x00", b"\x01", b"\x7f", b"\x80", b"\xc3\xa9",
-    b"\xed\xa0\x80", b"\xef\xbf\xbf", b"\xf0\x9f\x98\x80", b"\r", b"\n", b"x", b":", b"1",
+    *(bytes([byte]) for byte in b"<>&;/\"'= -!?x:1\r\n\x00\x01\x7f\x80"), b"]]>", b"<![CDATA[", b"<!--", b"-->", b"&amp;",
+    b"&#0;", b"&#x41;", b"&x;", b"<a>", b"</a>", b"<a/>", b"<?p?>", b"<?xml?>", b"\xc3\xa9", b"\xed\xa0\x80",
+    b"\xef\xbf\xbf", b"\xf0\x9f\x98\x80",
 ]  # fmt: skip
 
 
