@@ -33,7 +33,6 @@ class ConnectStory(NetworkStory):
         self.control.do("set", connectMs=SLOW_MS)
 
     def attempt(self):
-        """`vexa connect` in the middle of a slow attempt."""
         self.slowly()
         before = self.requests()
         joining = self.running("connect", "Café", "--machine", self.machine.folder)

@@ -128,7 +128,6 @@ class InPipe(DemoStory):
 
 class InTerminal(DemoStory):
     def demo(self, pattern=BAR, command=FOR_LONG, **options):
-        """A demo that has shown the pattern."""
         terminal = self.terminal(*command, **{"TMPDIR": str(self.temporary), **options})
         terminal.read_until(pattern)
         return terminal

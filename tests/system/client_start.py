@@ -22,8 +22,9 @@ class RunningService(Story):
         self.assertEqual(json.loads(path.read_text()), {"sa": sa, "hs20": hs20, "control": control})
         for file in (path, machine.folder / "stdout.log"):
             self.assertEqual(stat.S_IMODE(file.stat().st_mode), 0o600)
-        self.assertEqual(machine.stop(), 0)
-        self.assertFalse(path.exists())
+        service = machine.service_pid()
+        self.assertEqual(machine.stop(signal.SIGINT), 0)
+        self.assertFalse(is_running(service) or path.exists())
         told = [f"ready sa={sa} hs20={hs20} control={control}"]
         self.assertEqual((machine.parent.lines, machine.parent.errors), (told, []))
 
@@ -44,27 +45,14 @@ class RunningService(Story):
         parent.process.stdin.close()
         self.assertEqual(parent.wait(), 0)
 
-    def test_either_signal_stops_it(self):
-        for number in (signal.SIGINT, signal.SIGTERM):
-            with self.subTest(number.name):
-                service = self.start().service_pid()
-                self.assertEqual(self.machine.stop(number), 0)
-                self.assertFalse(is_running(service))
-
     def test_a_second_parent_is_turned_away(self):
         machine = self.start()
         second = self.running("start", "--machine", machine.folder)
         self.assertEqual((second.wait(), second.lines, len(second.errors)), (3, [], 1), second.errors)
+        self.assertEqual(self.start().stop(), 0, "one in another folder is not")
         machine.sa().ask("GET_CURRENT_CHANNEL")
         self.assertTrue((machine.folder / "ports.json").exists())
         self.assertEqual(machine.stop(), 0)
-
-    def test_machines_in_different_folders_run_side_by_side(self):
-        one, other = self.start(), self.start()
-        self.assertNotEqual(one.sa_port, other.sa_port)
-        self.assertEqual(one.stop(), 0)
-        other.sa().ask("GET_CURRENT_CHANNEL")
-        self.assertEqual(other.stop(), 0)
 
 
 class ServiceThatDoesNotCome(Story):

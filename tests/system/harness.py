@@ -35,7 +35,6 @@ STORE = pathlib.PurePath("Public", "Roaming", "Korvane")
 
 
 def program(name):
-    """The path of a built program."""
     path = pathlib.Path(os.environ.get("VEXA_BUILD", "build/debug")) / "bin" / name
     if not path.exists():
         raise FileNotFoundError(f"{path}: build it, and set VEXA_BUILD to the build folder")
@@ -97,7 +96,6 @@ def clean_environment(**variables):
 
 
 def run_client(*arguments, stdin=None, **variables):
-    """Runs a command of `vexa` to its end."""
     return subprocess.run(
         [program("vexa"), *map(str, arguments)],
         env=clean_environment(**variables),
@@ -116,7 +114,6 @@ def network(number, name, realms=None, **members):
 
 
 def open_connection(port, timeout=PATIENCE, receive_buffer=None):
-    """A socket that is connected to a port of the machine under test."""
     connection = socket.socket()
     if receive_buffer:
         connection.setsockopt(socket.SOL_SOCKET, socket.SO_RCVBUF, receive_buffer)
@@ -137,7 +134,6 @@ def accepted(key):
 
 
 def read_head(stream):
-    """The first line of a request or an answer, and its headers."""
     first, headers = stream.readline(), {}
     for line in iter(stream.readline, b"\r\n"):
         if not line:
@@ -267,8 +263,6 @@ class WebSocket:
 
 
 class PortClient(WebSocket):
-    """A client of the spectral or the hotspot port."""
-
     def send(self, command, data=None):
         message = {"CommandId": command}
         if data is not None:
@@ -285,12 +279,10 @@ class PortClient(WebSocket):
         return event
 
     def ask(self, command, data=None, answer=None):
-        """The next event that answers the command."""
         self.send(command, data)
         return self.wait_event(answer or ANSWERS.get(command, command))
 
     def credentials(self, command="GET_ALL_CREDENTIAL_LIST", data=None):
-        """The list that answers a command about credentials."""
         self.send(command, data)
         return self.credential_list()
 
@@ -299,8 +291,6 @@ class PortClient(WebSocket):
 
 
 class ControlClient(WebSocket):
-    """A client of the machine's control channel."""
-
     def ask(self, **message):
         self.send_frame(TEXT, json.dumps(message).encode())
         return json.loads(self.take())
@@ -320,11 +310,9 @@ class ControlClient(WebSocket):
         wait_until(lambda: self.connected() == ssid, f"a connection to {ssid}")
 
     def calls(self, name):
-        """The calls of this name that the service has made."""
         return [call for call in self.query("calls") if call["call"] == name]
 
     def wait_passed(self, milliseconds):
-        """Waits for so much time of the machine."""
         end = self.query("time")["ms"] + milliseconds
         wait_until(lambda: self.query("time")["ms"] > end, f"{milliseconds} ms of the machine")
 
@@ -401,8 +389,6 @@ class Program:
 
 
 class Terminal:
-    """A pseudo terminal with a program in it."""
-
     def __init__(self, arguments, environment, columns=100, rows=40):
         self.screen = b""
         self.ours, self._theirs = pty.openpty()
@@ -422,7 +408,6 @@ class Terminal:
         self._read(lambda: re.search(pattern, self.screen))
 
     def finish(self):
-        """Gives the exit code."""
         self._read(lambda: self.process.poll() is not None)
         self._drain(0)
         return self.process.returncode
@@ -506,11 +491,9 @@ class Machine:
         return client
 
     def sa(self, **options):
-        """A new client of the spectral port."""
         return self._kept(PortClient(self.sa_port, **options))
 
     def hs20(self, **options):
-        """A new client of the hotspot port."""
         return self._kept(PortClient(self.hs20_port, **options))
 
     def stop(self, number=signal.SIGTERM):
@@ -518,7 +501,6 @@ class Machine:
         return self.parent.stop(number)
 
     def config(self):
-        """The path of its config.xml."""
         return self.folder / STORE / "config.xml"
 
     def output(self):
@@ -557,13 +539,11 @@ class Story(unittest.TestCase):
         return pathlib.Path(self.enterContext(folder))
 
     def running(self, *arguments, environment=None, stdin=subprocess.DEVNULL):
-        """A command of `vexa` that runs on."""
         running = Program([program("vexa"), *map(str, arguments)], environment, stdin)
         self.addCleanup(running.end)
         return running
 
     def terminal(self, *arguments, columns=100, rows=40, **variables):
-        """A command of `vexa` in a terminal."""
         environment = clean_environment(**{"TERM": "xterm-256color", "LC_ALL": "C.UTF-8", **variables})
         terminal = Terminal([program("vexa"), *map(str, arguments)], environment, columns, rows)
         self.addCleanup(terminal.close)
@@ -588,5 +568,4 @@ class Story(unittest.TestCase):
         return run_client(*arguments, stdin=stdin, **variables)
 
     def told(self, *arguments):
-        """What it prints as JSON."""
         return json.loads(self.done(*arguments, "--json"))

@@ -18,7 +18,6 @@ CONTINUATION = 0
 
 
 def padded(command, size):
-    """A command of so many bytes."""
     text = json.dumps({"CommandId": command, "Padding": ""}).encode()
     return text[:-2] + b"x" * (size - len(text)) + text[-2:]
 

@@ -18,7 +18,6 @@ NO_HOTSPOT, NO_SPECTRAL = "create ipc server fail\n", "Create IPC server failed.
 
 
 def run_service(*arguments, **variables):
-    """Gives its exit code, what it prints, and its errors."""
     done = subprocess.run(
         [program("vexa-service"), *map(str, arguments)],
         env=clean_environment(**variables),

@@ -24,7 +24,6 @@ ROUNDS = 12
 
 
 def realms(credentials):
-    """In their order."""
     return [entry["RealName"] for entry in credentials]
 
 
@@ -55,7 +54,6 @@ class Users(StoreStory):
         return Machine({"user": user, "speed": 20, **scenario}, folder=self.folder)
 
     def owners(self):
-        """Each stored realm with its creator."""
         return {node.findtext("realm"): node.findtext("creator") for node in self.stored()}
 
     def references(self, user):

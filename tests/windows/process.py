@@ -13,7 +13,6 @@ STOP_LIMIT = 25
 
 
 def run_service(*arguments, **variables):
-    """Gives its exit code, what it prints, and its errors."""
     done = wine.run(wine.service(), *arguments, timeout=STOP_LIMIT, **variables)
     return done.returncode, done.stdout, done.stderr
 

@@ -1,8 +1,8 @@
 """The programs for Windows in Wine: what the stories on the native programs find in harness.py, for a prefix.
 
 VEXA_WINDOWS_BUILD names the folder with the programs and what stands in for the system's libraries, WINEPREFIX a
-prefix that prefix.py has made. One machine lives in it at a time. Its clock is that of the host: a scenario's
-`speed` is left out.
+prefix, which `wine.py make` makes anew and `wine.py remove` ends and removes. One machine lives in it at a time. Its
+clock is that of the host: a scenario's `speed` is left out.
 """
 
 import atexit
@@ -67,7 +67,6 @@ def users():
 
 
 def store():
-    """The folder of config.xml."""
     return users() / STORE
 
 
@@ -111,7 +110,6 @@ def scenario_file(scenario, folder):
 
 
 def run(program, *arguments, stdin=None, timeout=PATIENCE, **variables):
-    """Runs a program to its end."""
     relay()
     return subprocess.run(
         ["wine", str(program), *map(str, arguments)],
@@ -132,6 +130,20 @@ def run_client(*arguments, stdin=None, **_):
 def end_all():
     """Ends whatever runs in the prefix, also what a story left that was killed."""
     subprocess.run(["wineserver", "-k", "-w"], env=environment(), stderr=subprocess.DEVNULL, check=False)
+
+
+def remove_prefix():
+    if prefix().exists():
+        end_all()
+        shutil.rmtree(prefix())
+
+
+def make_prefix():
+    remove_prefix()
+    prefix().parent.mkdir(parents=True, exist_ok=True)
+    quiet = {"stdin": subprocess.DEVNULL, "stdout": subprocess.DEVNULL, "stderr": subprocess.DEVNULL}
+    subprocess.run(["wineboot", "--init"], env=environment(), check=True, **quiet)
+    end_all()
 
 
 def forget_machine():
@@ -253,3 +265,6 @@ class Machine(NativeMachine):
 
 harness.open_connection, harness.run_client, harness.Machine = open_connection, run_client, Machine
 enter_own_network()
+
+if __name__ == "__main__":
+    {"make": make_prefix, "remove": remove_prefix}[sys.argv[1]]()
