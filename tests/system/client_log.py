@@ -4,14 +4,9 @@ import json
 import os
 import re
 import signal
-import subprocess
-import tempfile
-import unittest
-from pathlib import Path
 
-from harness import Machine, Program, clean_environment, program, wait_until
+from harness import STORE, Story, run_client, wait_until
 
-STORE = Path("Public/Roaming/Korvane")
 LINE = re.compile(r"\[\d+\] \d\d/\d\d \d\d:\d\d:\d\d  ")
 
 
@@ -23,50 +18,26 @@ def config(enabled):
     )
 
 
-class LogTest(unittest.TestCase):
-    def run_log(self, folder, *arguments):
-        return subprocess.run(
-            [program("vexa"), "log", "--machine", str(folder), *arguments],
-            env=clean_environment(),
-            stdin=subprocess.DEVNULL,
-            capture_output=True,
-            encoding="utf-8",
-            timeout=60,
-        )
-
-    def follower(self, folder, *arguments):
-        follower = Program([program("vexa"), "log", "--machine", str(folder), "--follow", *arguments])
-        self.addCleanup(follower.end)
-        return follower
-
-
-class OfService(LogTest):
+class OfService(Story):
     def test_what_the_service_did_can_be_followed(self):
-        with Machine({"speed": 20, "config": config("true")}) as machine:
-            follower = self.follower(machine.folder)
-            machine.hs20().send("NO_SUCH_COMMAND")
-            wait_until(lambda: any("NO_SUCH_COMMAND" in line for line in list(follower.lines)), "the line")
-            self.assertTrue(any(LINE.match(line) for line in follower.lines))
-            machine.hs20().send("ANOTHER_COMMAND")
-            wait_until(lambda: any("ANOTHER_COMMAND" in line for line in list(follower.lines)), "the next")
-            shown = self.run_log(machine.folder)
-            self.assertEqual(shown.returncode, 0, shown.stderr)
-            self.assertIn("ANOTHER_COMMAND", shown.stdout)
-            self.assertEqual(follower.stop(signal.SIGINT), 0)
+        machine = self.start(config=config("true"))
+        follower = self.running("log", "--follow", "--machine", machine.folder)
+        machine.hs20().send("NO_SUCH_COMMAND")
+        self.assertRegex(follower.wait_line("NO_SUCH_COMMAND"), LINE)
+        machine.hs20().send("ANOTHER_COMMAND")
+        follower.wait_line("ANOTHER_COMMAND")
+        self.assertIn("ANOTHER_COMMAND", self.done("log"))
+        self.assertEqual(follower.stop(signal.SIGINT), 0)
 
     def test_a_log_that_is_off_is_told(self):
-        with Machine({"speed": 20, "config": config("false")}) as machine:
-            shown = self.run_log(machine.folder)
-            self.assertEqual((shown.returncode, shown.stdout), (1, ""))
-            self.assertRegex(shown.stderr, r"^vexa: the log is off: set enabledump to true in .*config\.xml")
-            self.assertEqual(len(shown.stderr.splitlines()), 1)
+        self.start(config=config("false"))
+        expected = r"^vexa: the log is off: set enabledump to true in .*config\.xml"
+        self.assertRegex(self.refused(1, "log"), expected)
 
 
-class OfFiles(LogTest):
+class OfFiles(Story):
     def setUp(self):
-        folder = tempfile.TemporaryDirectory()
-        self.addCleanup(folder.cleanup)
-        self.folder = Path(folder.name)
+        self.folder = self.new_folder()
 
     def write(self, name, text, age=0):
         path = self.folder / STORE / "Dump" / name
@@ -76,28 +47,23 @@ class OfFiles(LogTest):
         now = 1_700_000_000
         os.utime(path, (now - age, now - age))
 
-    def set_config(self, text):
+    def set_config(self, enabled):
         (self.folder / STORE).mkdir(parents=True, exist_ok=True)
-        (self.folder / STORE / "config.xml").write_text(text, encoding="utf-8-sig")
+        (self.folder / STORE / "config.xml").write_text(config(enabled), encoding="utf-8-sig")
+
+    def vexa(self, *arguments, **_):
+        return run_client(*arguments, "--machine", self.folder)
 
     def lines(self, *arguments):
-        shown = self.run_log(self.folder, *arguments)
-        self.assertEqual((shown.returncode, shown.stderr), (0, ""))
-        return shown.stdout.splitlines()
+        return self.done("log", *arguments).splitlines()
 
-    def test_a_machine_that_never_ran_has_none(self):
-        shown = self.run_log(self.folder)
-        self.assertEqual((shown.returncode, shown.stdout), (1, ""))
-        self.assertIn("no service has run", shown.stderr)
-
-    def test_a_log_without_a_line_is_told(self):
-        self.set_config(config("true"))
-        shown = self.run_log(self.folder)
-        self.assertEqual((shown.returncode, shown.stdout), (1, ""))
-        self.assertIn("nothing is in it yet", shown.stderr)
+    def test_why_there_is_none(self):
+        self.assertIn("no service has run", self.refused(1, "log"))
+        self.set_config("true")
+        self.assertIn("nothing is in it yet", self.refused(1, "log"))
 
     def test_the_file_that_was_written_last_comes_last(self):
-        self.set_config(config("true"))
+        self.set_config("true")
         self.write("hs20log_user_10.txt", "third\n", age=5)
         self.write("hs20log_user_9.txt", "second\n", age=5)
         self.write("hs20log_user_0.txt", "fourth\nlast, without an end", age=1)
@@ -111,44 +77,35 @@ class OfFiles(LogTest):
         self.assertEqual(entries[0], {"file": "hs20log_user_10.txt", "line": "third"})
 
     def test_bytes_of_any_kind_become_text(self):
-        self.set_config(config("true"))
+        self.set_config("true")
         self.write("a.txt", b"caf\xe9\nsnow \xe2\x98\x83\nred \x1b[31m\ttab\n")
         self.assertEqual(self.lines(), ["café", "snow ☃", "red \\x1b[31m\ttab"])
         self.assertEqual(json.loads(self.lines("--json")[2])["line"], "red \x1b[31m\ttab")
 
     def test_files_of_a_log_that_is_off_now_are_shown_with_a_word(self):
-        self.set_config(config("false"))
+        self.set_config("false")
         self.write("a.txt", "from before\n")
-        shown = self.run_log(self.folder)
+        shown = self.vexa("log")
         self.assertEqual((shown.returncode, shown.stdout), (0, "from before\n"))
         self.assertIn("the log is off", shown.stderr)
 
     def test_following_waits_for_files_and_takes_whole_lines(self):
-        follower = self.follower(self.folder, "--json")
+        follower = self.running("log", "--follow", "--json", "--machine", self.folder)
         wait_until(lambda: follower.errors, "a word about the silence")
         self.write("a.txt", "one\ntw")
-        wait_until(lambda: len(follower.lines) == 1, "the first line")
+        follower.wait_line("one")
         self.write("a.txt", "o\n")
         self.write("b.txt", "three\n")
-        wait_until(lambda: len(follower.lines) == 3, "the others")
+        follower.wait_line("", count=3)
         told = [json.loads(line)["line"] for line in follower.lines]
-        self.assertEqual(told[0], "one")
-        self.assertEqual(sorted(told[1:]), ["three", "two"])
+        self.assertEqual((told[0], sorted(told[1:])), ("one", ["three", "two"]))
         self.assertEqual(follower.stop(signal.SIGTERM), 0)
 
     def test_following_begins_with_the_last_lines(self):
-        self.set_config(config("true"))
+        self.set_config("true")
         self.write("a.txt", "one\ntwo\nthree\n")
-        follower = self.follower(self.folder, "-n", "1")
-        wait_until(lambda: follower.lines, "a line")
+        follower = self.running("log", "--follow", "-n", "1", "--machine", self.folder)
+        follower.wait_line("three")
         (self.folder / STORE / "Dump" / "a.txt").write_text("anew\n")
-        wait_until(lambda: len(follower.lines) == 2, "the file that was emptied")
+        follower.wait_line("anew")
         self.assertEqual(follower.lines, ["three", "anew"])
-
-    def test_wrong_use(self):
-        for arguments in (["-n"], ["-n", "x"], ["-n", "-1"], ["--nonsense"], ["more"]):
-            self.assertEqual(self.run_log(self.folder, *arguments).returncode, 2, arguments)
-
-
-if __name__ == "__main__":
-    unittest.main()

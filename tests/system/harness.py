@@ -5,10 +5,14 @@ A test gets the folder with the programs from VEXA_BUILD.
 
 import base64
 import collections
+import fcntl
 import hashlib
 import json
 import os
 import pathlib
+import pty
+import re
+import select
 import shutil
 import signal
 import socket
@@ -16,16 +20,21 @@ import struct
 import subprocess
 import sys
 import tempfile
+import termios
 import threading
 import time
+import unittest
 
 PATIENCE = 30.0
-ACCEPT_SUFFIX = b"258EAFA5-E914-47DA-95CA-C5AB0DC85B11"
+KEY = base64.b64encode(bytes(16))
 TEXT, BINARY, CLOSE, PING, PONG = 1, 2, 8, 9, 10
+CHANNEL, CHANNEL_LIST = "SPECTRAL_ANALYSER_CURRENT_CHANNEL_DATA", "SPECTRAL_ANALYSER_CHANNEL_LIST_DATA_2G5G"
+# Commands whose answer has another name.
+ANSWERS = {"GET_CURRENT_CHANNEL": CHANNEL, "GET_CHANNEL_LIST": CHANNEL_LIST, "GET_IS_CARD_IN": "CARD_PLUG_IN"}
+STORE = pathlib.PurePath("Public", "Roaming", "Korvane")
 
 
 def program(name):
-    """The path of a built program."""
     path = pathlib.Path(os.environ.get("VEXA_BUILD", "build/debug")) / "bin" / name
     if not path.exists():
         raise FileNotFoundError(f"{path}: build it, and set VEXA_BUILD to the build folder")
@@ -35,43 +44,48 @@ def program(name):
 def wait_until(condition, what, timeout=PATIENCE):
     """Gives the first true value of the condition; an AssertionError names `what` never came."""
     end = time.monotonic() + timeout
-    while True:
-        value = condition()
-        if value:
-            return value
+    while not (value := condition()):
         if time.monotonic() > end:
             raise AssertionError(f"not within {timeout} s: {what}")
         time.sleep(0.01)
+    return value
 
 
-def busy_ports():
-    """The local ports with a row in the TCP table, each with the states of its rows."""
-    ports = collections.defaultdict(set)
-    for line in pathlib.Path("/proc/net/tcp").read_text().splitlines()[1:]:
-        fields = line.split()
-        ports[int(fields[1].split(":")[1], 16)].add(fields[3])
+def tcp_rows(port):
+    """The rows of the TCP table with this local port, each with its address, backwards, and its state."""
+    lines = pathlib.Path("/proc/net/tcp").read_text().splitlines()[1:]
+    rows = [(*line.split()[1].split(":"), line.split()[3]) for line in lines]
+    return [(address, state) for address, local, state in rows if int(local, 16) == port]
+
+
+def free_ports(count):
+    """Ports without a row in the TCP table. Bound all at once, so that none comes twice."""
+    sockets = [socket.create_server(("127.0.0.1", 0)) for _ in range(count)]
+    ports = [bound.getsockname()[1] for bound in sockets]
+    for bound in sockets:
+        bound.close()
     return ports
 
 
-def children_of(pid):
-    """The processes that this one has started, without those that have ended."""
-    children = []
-    for path in pathlib.Path("/proc").glob("[0-9]*/stat"):
-        try:
-            fields = path.read_text().rpartition(")")[2].split()
-        except OSError:
-            continue
-        if int(fields[1]) == pid and fields[0] != "Z":
-            children.append(int(path.parent.name))
-    return children
+def process_state(pid):
+    """The letter of its state and its parent; Z as well once nobody knows it any more."""
+    try:
+        fields = pathlib.Path(f"/proc/{pid}/stat").read_text(errors="replace").rpartition(")")[2].split()
+    except OSError:
+        return "Z", 0
+    return fields[0], int(fields[1])
 
 
 def is_running(pid):
     """False once the process has ended, even if nobody has asked for its exit code."""
-    try:
-        return pathlib.Path(f"/proc/{pid}/stat").read_text().rpartition(")")[2].split()[0] != "Z"
-    except OSError:
-        return False
+    return process_state(pid)[0] != "Z"
+
+
+def child_of(pid):
+    """The only process that this one has started and that has not ended."""
+    states = {path.name: process_state(path.name) for path in pathlib.Path("/proc").glob("[0-9]*")}
+    (child,) = [int(name) for name, (state, parent) in states.items() if parent == pid and state != "Z"]
+    return child
 
 
 def clean_environment(**variables):
@@ -81,8 +95,25 @@ def clean_environment(**variables):
     return environment
 
 
+def run_client(*arguments, stdin=None, **variables):
+    return subprocess.run(
+        [program("vexa"), *map(str, arguments)],
+        env=clean_environment(**variables),
+        input=stdin or "",
+        capture_output=True,
+        timeout=60,
+        encoding="utf-8",
+    )
+
+
+def network(number, name, realms=None, **members):
+    """Of a scenario: with realms by their names, each with its EAP methods."""
+    if realms is not None:
+        members["realms"] = [{"names": [realm], "eapMethods": methods} for realm, methods in realms.items()]
+    return {"bssid": f"02:aa:00:00:00:{number:02x}", "ssid": name, **members}
+
+
 def open_connection(port, timeout=PATIENCE, receive_buffer=None):
-    """A socket that is connected to a port of the machine under test."""
     connection = socket.socket()
     if receive_buffer:
         connection.setsockopt(socket.SOL_SOCKET, socket.SO_RCVBUF, receive_buffer)
@@ -91,26 +122,78 @@ def open_connection(port, timeout=PATIENCE, receive_buffer=None):
     return connection
 
 
-class Refused(Exception):
-    """The server did not take the client in; `status` is its HTTP status."""
+def handshake(host):
+    """A request that the ports let in, if nothing else is wrong with it."""
+    upgrade = "Upgrade: websocket\r\nConnection: Upgrade\r\nSec-WebSocket-Version: 13\r\n"
+    return f"GET / HTTP/1.1\r\nHost: {host}\r\n{upgrade}Sec-WebSocket-Key: {KEY.decode()}\r\n\r\n".encode()
 
-    def __init__(self, status):
-        super().__init__(f"HTTP status {status}")
-        self.status = status
+
+def accepted(key):
+    """What a server answers to the key of a handshake."""
+    return base64.b64encode(hashlib.sha1(key + b"258EAFA5-E914-47DA-95CA-C5AB0DC85B11").digest())
+
+
+def read_head(stream):
+    first, headers = stream.readline(), {}
+    for line in iter(stream.readline, b"\r\n"):
+        if not line:
+            raise ConnectionError("closed during the handshake")
+        name, _, value = line.partition(b":")
+        headers[name.strip().lower()] = value.strip()
+    return first, headers
+
+
+def read_exactly(stream, count):
+    data = stream.read(count)
+    if len(data) < count:
+        raise ConnectionError("closed")
+    return data
+
+
+def masked(payload, mask):
+    repeated = (mask * (len(payload) // 4 + 1))[: len(payload)]
+    return (int.from_bytes(payload, "big") ^ int.from_bytes(repeated, "big")).to_bytes(len(payload), "big")
+
+
+def read_frame(stream):
+    """Whether it is the last of its message, the opcode and the payload."""
+    first, second = read_exactly(stream, 2)
+    length, form = second & 0x7F, {126: ">H", 127: ">Q"}.get(second & 0x7F)
+    if form:
+        (length,) = struct.unpack(form, read_exactly(stream, struct.calcsize(form)))
+    mask = read_exactly(stream, 4) if second & 0x80 else None
+    payload = read_exactly(stream, length)
+    return bool(first & 0x80), first & 0x0F, masked(payload, mask) if mask else payload
+
+
+def frame(opcode, payload, final=True, mask=None):
+    length, head = len(payload), (0x80 if final else 0) | opcode
+    bit = 0x80 if mask else 0
+    if length < 126:
+        text = bytes([head, bit | length])
+    elif length < 0x10000:
+        text = struct.pack(">BBH", head, bit | 126, length)
+    else:
+        text = struct.pack(">BBQ", head, bit | 127, length)
+    return text + mask + masked(payload, mask) if mask else text + payload
 
 
 class WebSocket:
     """One client of one port. A thread collects what comes in, so that a test that does not look holds up nobody."""
 
-    def __init__(self, port, host=None, headers=(), timeout=PATIENCE, reads=True, receive_buffer=None):
+    def __init__(self, port, host=None, reads=True, receive_buffer=None):
         self.received = collections.deque()
         self.close_code = None
         self._arrival = threading.Condition()
         self._sending = threading.Lock()
-        self._socket = open_connection(port, timeout, receive_buffer)
-        self._input = self._socket.makefile("rb")
-        self._handshake(host or f"127.0.0.1:{port}", headers)
-        self._socket.settimeout(None)
+        self.socket = open_connection(port, receive_buffer=receive_buffer)
+        self.input = self.socket.makefile("rb")
+        self.socket.sendall(handshake(host or f"127.0.0.1:{port}"))
+        status, headers = read_head(self.input)
+        if headers.get(b"sec-websocket-accept") != accepted(KEY):
+            self.socket.close()
+            raise ConnectionError(f"not let in: {status!r}")
+        self.socket.settimeout(None)
         self._reader = None
         if reads:
             self.start_reading()
@@ -120,58 +203,17 @@ class WebSocket:
         self._reader = threading.Thread(target=self._read_all, daemon=True)
         self._reader.start()
 
-    def _handshake(self, host, headers):
-        key = base64.b64encode(os.urandom(16))
-        request = [
-            b"GET / HTTP/1.1",
-            b"Host: " + host.encode(),
-            b"Upgrade: websocket",
-            b"Connection: Upgrade",
-            b"Sec-WebSocket-Version: 13",
-            b"Sec-WebSocket-Key: " + key,
-        ]
-        request += [f"{name}: {value}".encode() for name, value in headers]
-        self._socket.sendall(b"\r\n".join(request) + b"\r\n\r\n")
-        status = self._input.readline().split()
-        answer = {}
-        for line in iter(self._input.readline, b"\r\n"):
-            if not line:
-                raise ConnectionError("closed during the handshake")
-            name, _, value = line.partition(b":")
-            answer[name.strip().lower()] = value.strip()
-        if len(status) < 2 or status[1] != b"101":
-            self._socket.close()
-            raise Refused(int(status[1]) if len(status) > 1 else 0)
-        accepted = base64.b64encode(hashlib.sha1(key + ACCEPT_SUFFIX).digest())
-        if answer.get(b"sec-websocket-accept") != accepted:
-            raise ConnectionError("a wrong Sec-WebSocket-Accept")
-
-    def _exactly(self, count):
-        data = self._input.read(count)
-        if len(data) < count:
-            raise ConnectionError("closed")
-        return data
-
-    def _read_frame(self):
-        first, second = self._exactly(2)
-        length = second & 0x7F
-        if length == 126:
-            (length,) = struct.unpack(">H", self._exactly(2))
-        elif length == 127:
-            (length,) = struct.unpack(">Q", self._exactly(8))
-        return bool(first & 0x80), first & 0x0F, self._exactly(length)
-
     def _read_all(self):
         message, code = b"", 1006
         try:
             while True:
-                final, opcode, payload = self._read_frame()
+                final, opcode, payload = read_frame(self.input)
                 if opcode == PING:
                     self.send_frame(PONG, payload)
                 elif opcode == CLOSE:
                     code = struct.unpack(">H", payload[:2])[0] if len(payload) >= 2 else 1005
                     self.send_frame(CLOSE, payload[:2])
-                    self._socket.shutdown(socket.SHUT_WR)
+                    self.socket.shutdown(socket.SHUT_WR)
                     break
                 elif opcode != PONG:
                     message += payload
@@ -190,81 +232,67 @@ class WebSocket:
             self._arrival.notify_all()
 
     def send_frame(self, opcode, payload, final=True):
-        mask = os.urandom(4)
-        length = len(payload)
-        head = bytes([(0x80 if final else 0) | opcode])
-        if length < 126:
-            head += bytes([0x80 | length])
-        elif length < 0x10000:
-            head += bytes([0x80 | 126]) + struct.pack(">H", length)
-        else:
-            head += bytes([0x80 | 127]) + struct.pack(">Q", length)
-        repeated = (mask * (length // 4 + 1))[:length]
-        masked = (int.from_bytes(payload, "big") ^ int.from_bytes(repeated, "big")).to_bytes(length, "big")
         with self._sending:
-            self._socket.sendall(head + mask + masked)
+            self.socket.sendall(frame(opcode, payload, final, os.urandom(4)))
 
-    def send_text(self, text):
-        self.send_frame(TEXT, text.encode() if isinstance(text, str) else text)
-
-    def take(self, timeout=PATIENCE):
+    def take(self):
         """The oldest message not taken yet, as bytes."""
         with self._arrival:
-            if not self._arrival.wait_for(lambda: self.received or self.close_code is not None, timeout):
-                raise AssertionError(f"no message within {timeout} s")
+            if not self._arrival.wait_for(lambda: self.received or self.close_code is not None, PATIENCE):
+                raise AssertionError(f"no message within {PATIENCE} s")
             if not self.received:
                 raise ConnectionError(f"closed with code {self.close_code}")
             return self.received.popleft()
 
-    def wait_closed(self, timeout=PATIENCE):
+    def wait_closed(self):
         """Gives the close code; 1006 if the connection ended without one."""
         with self._arrival:
-            if not self._arrival.wait_for(lambda: self.close_code is not None, timeout):
-                raise AssertionError(f"still open after {timeout} s")
+            if not self._arrival.wait_for(lambda: self.close_code is not None, PATIENCE):
+                raise AssertionError(f"still open after {PATIENCE} s")
             return self.close_code
 
     def close(self):
         try:
-            self._socket.shutdown(socket.SHUT_RDWR)
+            self.socket.shutdown(socket.SHUT_RDWR)
         except OSError:
             pass
         if self._reader:
             self._reader.join()
-        self._input.close()
-        self._socket.close()
+        self.input.close()
+        self.socket.close()
 
 
 class PortClient(WebSocket):
-    """A client of the spectral or the hotspot port."""
-
     def send(self, command, data=None):
         message = {"CommandId": command}
         if data is not None:
             message["Data"] = data if isinstance(data, (str, bool)) else json.dumps(data)
-        self.send_text(json.dumps(message))
+        self.send_frame(TEXT, json.dumps(message).encode())
 
-    def next_event(self, timeout=PATIENCE):
-        return json.loads(self.take(timeout))
+    def next_event(self):
+        return json.loads(self.take())
 
-    def wait_event(self, event_id, where=lambda event: True, timeout=PATIENCE):
+    def wait_event(self, event_id, where=lambda event: True):
         """The next event of this name; those before it are passed over."""
-        end = time.monotonic() + timeout
-        passed = []
-        while True:
-            try:
-                event = self.next_event(max(0.0, end - time.monotonic()))
-            except AssertionError:
-                raise AssertionError(f"no {event_id} within {timeout} s, but {passed}") from None
-            if event["EventId"] == event_id and where(event):
-                return event
-            passed.append(event["EventId"])
+        while (event := self.next_event())["EventId"] != event_id or not where(event):
+            pass
+        return event
+
+    def ask(self, command, data=None, answer=None):
+        self.send(command, data)
+        return self.wait_event(answer or ANSWERS.get(command, command))
+
+    def credentials(self, command="GET_ALL_CREDENTIAL_LIST", data=None):
+        self.send(command, data)
+        return self.credential_list()
+
+    def credential_list(self):
+        return json.loads(self.wait_event("GET_ALL_CREDENTIAL_LIST")["Data"]) or []
 
 
 class ControlClient(WebSocket):
-    """A client of the machine's control channel."""
-
     def ask(self, **message):
-        self.send_text(json.dumps(message))
+        self.send_frame(TEXT, json.dumps(message).encode())
         return json.loads(self.take())
 
     def do(self, action, **members):
@@ -272,6 +300,21 @@ class ControlClient(WebSocket):
 
     def query(self, name, **members):
         return self._result(self.ask(query=name, **members)).get("result")
+
+    def connected(self):
+        """The name of the network that the machine is connected to, or None."""
+        interface = self.query("interface")
+        return interface["ssid"] if interface["state"] == "connected" else None
+
+    def wait_connected(self, ssid):
+        wait_until(lambda: self.connected() == ssid, f"a connection to {ssid}")
+
+    def calls(self, name):
+        return [call for call in self.query("calls") if call["call"] == name]
+
+    def wait_passed(self, milliseconds):
+        end = self.query("time")["ms"] + milliseconds
+        wait_until(lambda: self.query("time")["ms"] > end, f"{milliseconds} ms of the machine")
 
     @staticmethod
     def _result(answer):
@@ -295,10 +338,8 @@ class Program:
             text=True,
             errors="replace",
         )
-        self._readers = [
-            threading.Thread(target=self._collect, args=(self.process.stdout, self.lines), daemon=True),
-            threading.Thread(target=self._collect, args=(self.process.stderr, self.errors), daemon=True),
-        ]
+        streams = (self.process.stdout, self.lines), (self.process.stderr, self.errors)
+        self._readers = [threading.Thread(target=self._collect, args=pair, daemon=True) for pair in streams]
         for reader in self._readers:
             reader.start()
 
@@ -307,19 +348,19 @@ class Program:
         for line in stream:
             lines.append(line.rstrip("\n"))
 
-    def wait_line(self, start, timeout=PATIENCE):
-        """The first line that begins so."""
+    def wait_line(self, text, count=1):
+        """The first line that holds this text, once so many do."""
 
         def found():
-            match = next((line for line in list(self.lines) if line.startswith(start)), None)
-            if match is None and self.process.poll() is not None:
+            is_over = self.process.poll() is not None
+            if is_over:
                 self.wait()
-                match = next((line for line in self.lines if line.startswith(start)), None)
-                if match is None:
-                    raise AssertionError(f"ended with {self.process.returncode}, no line {start!r}: {self.errors}")
-            return match
+            matches = [line for line in list(self.lines) if text in line]
+            if is_over and len(matches) < count:
+                raise AssertionError(f"ended with {self.process.returncode}, no line {text!r}: {self.errors}")
+            return matches if len(matches) >= count else None
 
-        return wait_until(found, f"a line {start!r}; there is {self.lines}, {self.errors}", timeout)
+        return wait_until(found, f"a line {text!r}; there is {self.lines}, {self.errors}")[0]
 
     def wait(self, timeout=PATIENCE):
         """Gives the exit code, with all lines collected."""
@@ -347,11 +388,72 @@ class Program:
                 stream.close()
 
 
+class Terminal:
+    def __init__(self, arguments, environment, columns=100, rows=40):
+        self.screen = b""
+        self.ours, self._theirs = pty.openpty()
+        fcntl.ioctl(self.ours, termios.TIOCSWINSZ, struct.pack("HHHH", rows, columns, 0, 0))
+        self.before = self.settings()
+        self.process = subprocess.Popen(
+            arguments,
+            env=environment,
+            stdin=self._theirs,
+            stdout=self._theirs,
+            stderr=self._theirs,
+            start_new_session=True,
+            preexec_fn=lambda: fcntl.ioctl(0, termios.TIOCSCTTY, 0),
+        )
+
+    def read_until(self, pattern):
+        self._read(lambda: re.search(pattern, self.screen))
+
+    def finish(self):
+        self._read(lambda: self.process.poll() is not None)
+        self._drain(0)
+        return self.process.returncode
+
+    def suspend_and_resume(self):
+        self.press(b"\x1a")
+        wait_until(lambda: process_state(self.process.pid)[0] == "T", "the stop")
+        wait_until(lambda: self.settings() == self.before, "the terminal as before")
+        self.process.send_signal(signal.SIGCONT)
+        wait_until(lambda: self.settings() != self.before, "the terminal being taken again")
+
+    def _read(self, done):
+        end = time.monotonic() + PATIENCE
+        while not done():
+            if time.monotonic() > end:
+                raise AssertionError(f"not in {PATIENCE} s; the terminal got {self.screen[-2000:]!r}")
+            self._drain(0.05)
+
+    def _drain(self, wait):
+        while select.select([self.ours], [], [], wait)[0]:
+            self.screen += os.read(self.ours, 65536)
+            wait = 0
+
+    def press(self, keys):
+        os.write(self.ours, keys)
+
+    def settings(self):
+        return termios.tcgetattr(self._theirs)
+
+    def last_line(self):
+        # A terminal that echoes shows the pressed Ctrl-C.
+        return self.screen.decode().rstrip().splitlines()[-1].removeprefix("^C")
+
+    def close(self):
+        if self.process.poll() is None:
+            self.process.kill()
+            self.process.wait()
+        os.close(self.ours)
+        os.close(self._theirs)
+
+
 class Machine:
     """A simulated machine with its service, started by `vexa start`. Use it with `with`: it stops at the end, and
     after a failure shows what the machine has written."""
 
-    def __init__(self, scenario=None, folder=None, service=None, control=True, arguments=()):
+    def __init__(self, scenario=None, folder=None, control=True, arguments=()):
         self._own_folder = folder is None
         self.folder = pathlib.Path(folder or tempfile.mkdtemp(prefix="vexa-test-"))
         self._clients = []
@@ -362,16 +464,13 @@ class Machine:
             command += ["--scenario", str(path)]
         if control:
             command += ["--control-port", "0"]
-        if service:
-            command += ["--service", str(service)]
         self.parent = Program(command)
         self.sa_port = self.hs20_port = self.control_port = 0
 
     def __enter__(self):
         try:
             ports = dict(part.split("=") for part in self.parent.wait_line("ready ").split()[1:])
-            self.sa_port, self.hs20_port = int(ports["sa"]), int(ports["hs20"])
-            self.control_port = int(ports["control"])
+            self.sa_port, self.hs20_port, self.control_port = (int(ports[name]) for name in ("sa", "hs20", "control"))
             self.control = self._kept(ControlClient(self.control_port)) if self.control_port else None
         except BaseException:
             self.__exit__(*sys.exc_info())
@@ -392,16 +491,17 @@ class Machine:
         return client
 
     def sa(self, **options):
-        """A new client of the spectral port."""
         return self._kept(PortClient(self.sa_port, **options))
 
     def hs20(self, **options):
-        """A new client of the hotspot port."""
         return self._kept(PortClient(self.hs20_port, **options))
 
     def stop(self, number=signal.SIGTERM):
         """Stops it and gives the parent's exit code."""
         return self.parent.stop(number)
+
+    def config(self):
+        return self.folder / STORE / "config.xml"
 
     def output(self):
         """What the service has printed."""
@@ -412,18 +512,60 @@ class Machine:
         return self._content("debug.log")
 
     def service_pid(self):
-        """The process of the service: the only child of its parent."""
-        (pid,) = children_of(self.parent.process.pid)
-        return pid
+        return child_of(self.parent.process.pid)
 
     def _content(self, name):
         path = self.folder / name
         return path.read_text(encoding="latin-1") if path.exists() else ""
 
     def _show_logs(self):
-        for name, text in (
-            ("debug.log", self.debug_log()),
-            ("stdout.log", self.output()),
-            ("standard error", "\n".join(self.parent.errors)),
-        ):
+        told = {"debug.log": self.debug_log(), "stdout.log": self.output(), "errors": "\n".join(self.parent.errors)}
+        for name, text in told.items():
             print(f"--- {name}\n{text[-4000:]}", file=sys.stderr)
+
+
+class Story(unittest.TestCase):
+    """A test with machines, programs and folders that go when it ends."""
+
+    def start(self, folder=None, arguments=(), **scenario):
+        """Gives a machine, whose time is twenty times as fast if the scenario does not say otherwise."""
+        scenario = {"speed": 20, **scenario}
+        self.machine = self.enterContext(Machine(scenario, folder=folder, arguments=arguments))
+        self.control = self.machine.control
+        return self.machine
+
+    def new_folder(self):
+        folder = tempfile.TemporaryDirectory(prefix="vexa-test-", ignore_cleanup_errors=True)
+        return pathlib.Path(self.enterContext(folder))
+
+    def running(self, *arguments, environment=None, stdin=subprocess.DEVNULL):
+        running = Program([program("vexa"), *map(str, arguments)], environment, stdin)
+        self.addCleanup(running.end)
+        return running
+
+    def terminal(self, *arguments, columns=100, rows=40, **variables):
+        environment = clean_environment(**{"TERM": "xterm-256color", "LC_ALL": "C.UTF-8", **variables})
+        terminal = Terminal([program("vexa"), *map(str, arguments)], environment, columns, rows)
+        self.addCleanup(terminal.close)
+        return terminal
+
+    def done(self, *arguments, stdin=None, **variables):
+        """What a command of `vexa` prints that does what it is asked for, on this machine if no other is named."""
+        result = self.vexa(*arguments, stdin=stdin, **variables)
+        self.assertEqual((result.returncode, result.stderr), (0, ""), arguments)
+        return result.stdout
+
+    def refused(self, exit_code, *arguments, stdin=None, **variables):
+        """The line that says why it doesn't; behind wrong use, 2, may come a hint."""
+        result = self.vexa(*arguments, stdin=stdin, **variables)
+        self.assertEqual((result.returncode, result.stdout), (exit_code, ""), (arguments, result.stderr))
+        self.assertRegex(result.stderr, r"\Avexa: .*\n" + (r"\Z" if exit_code == 1 else ""))
+        return result.stderr.splitlines()[0]
+
+    def vexa(self, *arguments, stdin=None, **variables):
+        if "VEXA_MACHINE" not in variables:
+            variables["VEXA_MACHINE"] = str(self.machine.folder)
+        return run_client(*arguments, stdin=stdin, **variables)
+
+    def told(self, *arguments):
+        return json.loads(self.done(*arguments, "--json"))

@@ -5,14 +5,13 @@ import socket
 import unittest
 
 import harness
-from harness import PATIENCE, Machine, WebSocket
+from harness import PATIENCE, Machine, WebSocket, handshake, tcp_rows
 
 NOBODY = 65534
 ANSWER_LIMIT = 5.0
-UPGRADE = (
-    "Upgrade: websocket\r\nConnection: Upgrade\r\nSec-WebSocket-Version: 13\r\n"
-    "Sec-WebSocket-Key: dGhlIHNhbXBsZSBub25jZQ==\r\n"
-)
+GET = "GET / HTTP/1.1\r\n"
+ORIGINS = ["Origin: http://example.com", "Origin: http://localhost", "Origin: null", "Origin:", "origin: x"]
+
 
 def exchange(port, request):
     """All that the server answers until it closes the connection."""
@@ -49,124 +48,79 @@ def exchange_as(account, port, request):
 class Entry(unittest.TestCase):
     @classmethod
     def setUpClass(cls):
-        cls.machine = Machine({"speed": 20})
-        cls.addClassCleanup(cls.machine.__exit__, None, None, None)
-        cls.machine.__enter__()
-        cls.witness = {cls.machine.sa_port: cls.machine.sa(), cls.machine.hs20_port: cls.machine.hs20()}
+        machine = cls.machine = cls.enterClassContext(Machine({"speed": 20}))
+        cls.ports = {"sa": machine.sa_port, "hs20": machine.hs20_port, "control": machine.control_port}
+        cls.witnesses = (machine.sa(), "GET_CURRENT_CHANNEL"), (machine.hs20(), "GET_RADIO")
 
-    def ports(self):
-        return {"sa": self.machine.sa_port, "hs20": self.machine.hs20_port, "control": self.machine.control_port}
+    def tearDown(self):
+        self.assert_undisturbed()
 
     def assert_undisturbed(self):
-        for port, command in ((self.machine.sa_port, "GET_CURRENT_CHANNEL"), (self.machine.hs20_port, "GET_RADIO")):
-            client = self.witness[port]
+        for client, command in self.witnesses:
             client.send(command)
             client.next_event()
         self.assertGreaterEqual(self.machine.control.query("time")["ms"], 0)
 
-    def test_hosts_that_are_this_machine(self):
-        for port in self.ports().values():
-            for host in (
-                f"localhost:{port}",
-                "localhost",
-                "LocalHost",
-                f"127.0.0.1:{port}",
-                "127.0.0.1",
-                f"[::1]:{port}",
-                "[::1]",
-            ):
-                with self.subTest(port=port, host=host):
-                    WebSocket(port, host=host).close()
-        self.assert_undisturbed()
-
-    def test_hosts_that_are_not(self):
-        for name, port in self.ports().items():
-            for host in (
-                "example.com",
-                f"example.com:{port}",
-                f"localhost.example.com:{port}",
-                f"127.0.0.1.example.com:{port}",
-                "192.0.2.1",
-                f"0.0.0.0:{port}",
-                "[2001:db8::1]",
-                "[::1",
-                "[::1].example.com",
-                "::1",
-                "localhost@example.com",
-                "127.0.0.1x",
-                "localhost:80:80",
-                "localhost:evil",
-                "[::1]:evil",
-            ):
-                with self.subTest(port=name, host=host):
-                    self.assert_refused(port, f"GET / HTTP/1.1\r\nHost: {host}\r\n{UPGRADE}\r\n")
-        self.assert_undisturbed()
-
-    def assert_refused(self, port, request):
-        answer = exchange(port, request.encode("latin-1"))
+    def assert_refused(self, answer):
         self.assertEqual(answer.split(b"\r\n")[0], b"HTTP/1.1 403 Forbidden")
 
+    def test_hosts_that_are_this_machine(self):
+        for port in self.ports.values():
+            for host in ("localhost", "LocalHost", "127.0.0.1", "[::1]"):
+                for end in ("", f":{port}"):
+                    with self.subTest(port=port, host=host + end):
+                        WebSocket(port, host=host + end).close()
+
+    def test_hosts_that_are_not(self):
+        for name, port in self.ports.items():
+            for host in (
+                "example.com", f"example.com:{port}", f"localhost.example.com:{port}",
+                f"127.0.0.1.example.com:{port}", "192.0.2.1", f"0.0.0.0:{port}", "[2001:db8::1]", "[::1",
+                "[::1].example.com", "::1", "localhost@example.com", "127.0.0.1x", "localhost:80:80",
+                "localhost:evil", "[::1]:evil",
+            ):  # fmt: skip
+                with self.subTest(port=name, host=host):
+                    self.assert_refused(exchange(port, handshake(host)))
+
     def test_requests_that_do_not_get_in(self):
-        for name, port in self.ports().items():
-            host = f"Host: 127.0.0.1:{port}\r\n"
-            get = "GET / HTTP/1.1\r\n"
-            cases = {
-                "an origin": f"{get}{host}Origin: http://example.com\r\n{UPGRADE}\r\n",
-                "an origin on this machine": f"{get}{host}Origin: http://localhost\r\n{UPGRADE}\r\n",
-                "the origin of a file": f"{get}{host}Origin: null\r\n{UPGRADE}\r\n",
-                "an empty origin": f"{get}{host}Origin:\r\n{UPGRADE}\r\n",
-                "an origin in small letters": f"{get}{host}origin: x\r\n{UPGRADE}\r\n",
-                "no host": f"{get}{UPGRADE}\r\n",
-                "an empty host": f"{get}Host:\r\n{UPGRADE}\r\n",
-                "two hosts": f"{get}{host}Host: example.com\r\n{UPGRADE}\r\n",
-                "a plain request": f"{get}{host}\r\n",
-                "a plain post": f"POST / HTTP/1.1\r\n{host}Content-Length: 21\r\n\r\n" + '{"CommandId":"GET_RA"}',
-                "another method": f"POST / HTTP/1.1\r\n{host}{UPGRADE}\r\n",
-                "an old protocol": f"GET / HTTP/1.0\r\n{host}{UPGRADE}\r\n",
-                "garbage": "\x16\x03\x01\x02\x00\x01\x00\r\n\r\n",
-                "a command without a handshake": '{"CommandId":"FULL_SCAN"}\r\n\r\n',
-                "a header that has no end": f"{get}{host}X: " + "x" * 100000,
-            }
-            for case, request in cases.items():
-                with self.subTest(port=name, case=case):
-                    self.assert_refused(port, request)
-        self.assert_undisturbed()
+        for name, port in self.ports.items():
+            host = f"127.0.0.1:{port}"
+            good = handshake(host).decode()
+            self.assertTrue(good.startswith(f"{GET}Host: {host}\r\n"))
+            for request in (
+                *(good.replace(GET, f"{GET}{header}\r\n") for header in ORIGINS),
+                good.replace(f"Host: {host}\r\n", ""),
+                good.replace(f"Host: {host}\r\n", "Host:\r\n"),
+                good.replace(GET, f"{GET}Host: example.com\r\n"),
+                good.replace("GET", "POST", 1),
+                good.replace("HTTP/1.1", "HTTP/1.0"),
+                f"{GET}Host: {host}\r\n\r\n",
+                f"POST / HTTP/1.1\r\nHost: {host}\r\nContent-Length: 21\r\n\r\n" + '{"CommandId":"GET_RA"}',
+                '{"CommandId":"FULL_SCAN"}\r\n\r\n',
+                "\x16\x03\x01\x02\x00\x01\x00\r\n\r\n",
+                f"{GET}Host: {host}\r\nX: " + "x" * 100000,
+            ):
+                with self.subTest(port=name, request=request[:200]):
+                    self.assert_refused(exchange(port, request.encode("latin-1")))
 
     def test_another_account(self):
         if os.geteuid() != 0:
             self.skipTest("only root can become somebody else")
-        for name, port in self.ports().items():
-            good = f"GET / HTTP/1.1\r\nHost: 127.0.0.1:{port}\r\n{UPGRADE}\r\n"
+        for name, port in self.ports.items():
             # Nothing of what a stranger sends is waited for.
-            for request in (good, "", "garbage"):
+            for request in (handshake(f"127.0.0.1:{port}"), b"", b"garbage"):
                 with self.subTest(port=name, request=request):
-                    answer = exchange_as(NOBODY, port, request.encode())
-                    self.assertEqual(answer.split(b"\r\n")[0], b"HTTP/1.1 403 Forbidden")
-        self.assert_undisturbed()
+                    self.assert_refused(exchange_as(NOBODY, port, request))
 
     def test_silent_and_half_requests_hold_up_nobody(self):
-        held = []
-        try:
-            for port in self.ports().values():
-                for beginning in (b"", b"G", b"GET / HTTP/1.1\r\nHost: loc"):
-                    for _ in range(20):
-                        held.append(socket.create_connection(("127.0.0.1", port), timeout=PATIENCE))
-                        held[-1].sendall(beginning)
-            self.assert_undisturbed()
-        finally:
-            for connection in held:
-                connection.close()
+        for port in self.ports.values():
+            for beginning in (b"", b"G", b"GET / HTTP/1.1\r\nHost: loc") * 20:
+                held = socket.create_connection(("127.0.0.1", port), timeout=PATIENCE)
+                self.enterContext(held).sendall(beginning)
         self.assert_undisturbed()
 
     def test_only_the_loopback_address_listens(self):
-        with open("/proc/net/tcp", encoding="ascii") as table:
-            rows = [line.split() for line in table.readlines()[1:]]
-        listening = {row[1] for row in rows if row[3] == "0A"}
-        for name, port in self.ports().items():
+        for name, port in self.ports.items():
             with self.subTest(name):
-                self.assertIn(f"0100007F:{port:04X}", listening)
-                self.assertNotIn(f"00000000:{port:04X}", listening)
-
-
-if __name__ == "__main__":
-    unittest.main()
+                listening = [address for address, state in tcp_rows(port) if state == "0A"]
+                self.assertEqual(listening, ["0100007F"])

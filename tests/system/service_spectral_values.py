@@ -1,206 +1,75 @@
-"""The values that are published, against a computation of its own over thousands of records."""
+"""The values that are published of records of every kind, from scan to scan."""
 
 import json
-import math
-import random
-import unittest
 
-from harness import Machine, wait_until
+from harness import CHANNEL, CHANNEL_LIST, Story, wait_until
 
-
-
-def channel_of(frequency):
-    """0 for none."""
-    if frequency == 0:
-        return 0
-    if frequency == 2484:
-        return 14
-    if frequency < 2484:
-        return int((frequency - 2407) / 5)
-    if frequency < 4900:
-        return 15 + int((frequency - 2512) / 20)
-    return (frequency - (4000 if frequency <= 5000 else 5000)) // 5
+CHANNELS = [36, 1, 6, 36, 14, 255]
+LOUD, QUIET, EVEN, MIXED = 32767, -32768, 100, list(range(200, 256))
 
 
-def power_of_ten(exponent):
-    try:
-        return 10.0**exponent if exponent >= 0 else 1.0 / 10.0 ** abs(exponent)
-    except OverflowError:
-        return math.inf if exponent >= 0 else 0.0
+def record(frequency, congestion, power=60, bins=EVEN):
+    return {"frequency": frequency, "congestion": congestion, "power": power, "bins": bins}
 
 
-def decibels(ratio):
-    if math.isnan(ratio):
-        return math.nan
-    if ratio == 0.0:
-        return -120.0
-    return max(-120.0, 10.0 * math.log10(ratio))
+# Scans, each with the values by their orders that it brings: a congestion c or an interference i.
+SCANS = [
+    ("a mean is truncated", [record(2412, 30), record(2412, 41)], "2:c35 2:i67"),
+    ("what does not change is not told", [record(2412, 35)], ""),
+    (
+        "several channels in their order",
+        [record(2437, 50, 96), record(5180, 20, -20), record(2484, 7, 40, MIXED)],
+        "1:c20 3:c50 3:i100 4:c7 4:i47",
+    ),
+    (
+        "congestion is smoothed and limited, interference limited",
+        [record(2412, 65535, LOUD, MIXED), record(5180, 0)],
+        "1:c8 1:i67 2:c74",
+    ),
+    ("interference that falls to nothing is not told", [record(2412, 100, QUIET), record(5180, 8)], "2:c89"),
+    ("nor one that comes back as it was", [record(2412, 100), record(5180, 8)], "2:c95"),
+    ("a bin without a magnitude counts as 1", [record(5180, 8, 60, [0] * 20 + [200] * 36)], "1:i53"),
+    (
+        "records without a magnitude spoil their channel",
+        [record(2412, 100, 96, bins=0), record(2412, 100, 96), record(2437, 1, QUIET, bins=0)],
+        "2:c98 3:c20",
+    ),
+    (
+        "frequencies of no channel, and channels that are not listed",
+        [record(frequency, 99) for frequency in (0, 2402, 2407, 2417, 2483, 2512, 4899, 5000, 5200, 65535)],
+        "",
+    ),
+    (
+        "frequencies at the end of a channel",
+        [record(2416, 90), record(2485, 70), record(5184, 60), record(6275, 40)],
+        "1:c39 1:i67 2:c93 4:c44 4:i67 5:c40 5:i67",
+    ),
+    ("a fall", [record(2437, 0)], "3:c8 3:i67"),
+    ("goes on", [record(2437, 0)], "3:c3"),
+    ("and on", [record(2437, 0)], "3:c1"),
+    ("to its end", [record(2437, 0)], "3:c0"),
+    ("from where a value counts as it is", [record(2437, 60, 61)], "3:c60 3:i68"),
+]
 
 
-def level_of(power, bins):
-    total = float(sum(value * value for value in bins))
-    factor = power_of_ten((power - 96) / 10.0)
-    level = 0.0
-    for value in bins:
-        magnitude = float(value or 1)
-        share = magnitude * magnitude / total if total else math.inf
-        level += decibels(math.nan if share == math.inf and factor == 0.0 else share * factor)
-    return level / 56.0
-
-
-def percent(mean, base=0):
-    if math.isnan(mean) or not -(2.0**31) - 1 < mean < 2.0**31:
-        return 0
-    return min(100, max(0, int(mean) + base))
-
-
-class Model:
-    """What a client of the spectral port has to hear."""
-
-    def __init__(self, channels):
-        self.order = {channel: i + 1 for i, channel in enumerate(dict.fromkeys(channels))}
-        self.tables = {order: [0, 0, 0, 0] for order in self.order.values()}
-
-    def scan(self, records):
-        by_channel = {}
-        for record in records:
-            by_channel.setdefault(channel_of(record["frequency"]), []).append(record)
-        for channel, group in by_channel.items():
-            if channel in self.order:
-                levels = congestion = 0.0
-                for record in group:
-                    levels += level_of(record["power"], bins_of(record))
-                    congestion += record["congestion"]
-                levels = 1.7976931348623157e308 if math.isinf(levels) else levels
-                table = self.tables[self.order[channel]]
-                table[0:2] = percent(congestion / len(group)), percent(levels / len(group), 120)
-        return [event for order in sorted(self.tables) for event in self.publish(order, self.tables[order])]
-
-    @staticmethod
-    def publish(order, table):
-        congestion, noise, last_congestion, last_noise = table
-        if last_congestion:
-            congestion = int(0.4 * last_congestion + 0.6 * congestion)
-        if congestion != last_congestion:
-            yield {"order": order, "congestion_value": congestion}
-        table[0] = table[2] = congestion
-        if noise not in (last_noise, 0):
-            yield {"order": order, "noise_value": noise}
-            table[3] = noise
-
-
-def bins_of(record):
-    bins = record["bins"]
-    return [bins] * 56 if isinstance(bins, int) else bins
-
-
-def frequency_of(channel):
-    return 2484 if channel == 14 else 2407 + 5 * channel if channel < 14 else 5000 + 5 * channel
-
-
-CHANNELS = [36, 1, 6, 36, 11, 14, 165, 1, 149, 100, 13, 200, 255, 12, 40]
-
-
-def random_bins(chance):
-    kind = chance.randrange(6)
-    if kind == 0:
-        return chance.randrange(256)
-    if kind == 1:
-        return [0] * 56
-    if kind == 2:
-        return [chance.choice((0, 0, 0, 1, 255)) for _ in range(56)]
-    return [chance.randrange(256) for _ in range(56)]
-
-
-def random_record(chance):
-    frequencies = [frequency_of(channel) for channel in CHANNELS] * 3
-    frequencies += [0, 1, 2401, 2402, 2403, 2406, 2407, 2411, 2483, 2485, 2511, 2512, 4899, 4900, 5000, 5001, 5004]
-    frequencies += [4920, 65535, chance.randrange(65536)]
-    usual = (chance.randrange(-20, 120),) * 20
-    unusual = (chance.randrange(-(2**15), 2**15), -(2**15), 2**15 - 1, -2980, -3140, 3100, 3200, 96, 95)
-    return {
-        "frequency": chance.choice(frequencies),
-        "congestion": chance.choice((chance.randrange(101),) * 20 + (0, 65535)),
-        "power": chance.choice(usual + unusual),
-        "bins": random_bins(chance),
+class Values(Story):
+    NAMES = {
+        "c": ("SPECTRAL_ANALYSER_SAMPLE_DATA_CONGESTION", "congestion_value"),
+        "i": ("SPECTRAL_ANALYSER_SAMPLE_DATA_INTERFERENCE", "noise_value"),
     }
 
-
-def quiet_record(chance):
-    return {**random_record(chance), "power": chance.randrange(-60, 97), "bins": chance.randrange(1, 256)}
-
-
-class Values(unittest.TestCase):
-    def assert_published(self, channels, scans):
-        spectrum = {"channels": channels, "scans": scans, "scanMs": 50}
-        model = Model(channels)
-        expected = [event for scan in scans for event in model.scan(scan)]
-        self.assertGreater(len(expected), 3)
-        with Machine({"speed": 20, "spectrum": spectrum}) as machine:
-            client = machine.sa()
-            client.send("GET_CHANNEL_LIST")
-            client.send("FULL_SCAN")
-            starts = len(scans) + 2
-            wait_until(lambda: len(machine.control.query("calls")) > starts, "the last scan")
-            client.send("GET_CURRENT_CHANNEL")
-            client.wait_event("SPECTRAL_ANALYSER_CHANNEL_LIST_DATA_2G5G")
-            published = []
-            while (event := client.next_event())["EventId"] != "SPECTRAL_ANALYSER_CURRENT_CHANNEL_DATA":
-                sample = json.loads(event["Data"])
-                name = "CONGESTION" if "congestion_value" in sample else "INTERFERENCE"
-                self.assertEqual(event["EventId"], f"SPECTRAL_ANALYSER_SAMPLE_DATA_{name}")
-                published.append(sample)
-        for i, (got, wanted) in enumerate(zip(published, expected)):
-            self.assertEqual(got, wanted, f"event {i} of {len(expected)}")
-        self.assertEqual(len(published), len(expected))
-
-    def test_thousands_of_records_of_every_kind(self):
-        for seed in range(2):
-            chance = random.Random(seed)
-            with self.subTest(seed):
-                self.assert_published(CHANNELS, [[random_record(chance) for _ in range(100)] for _ in range(20)])
-
-    def test_one_record_for_each_value(self):
-        chance = random.Random(10)
-        self.assert_published(CHANNELS, [[quiet_record(chance) for _ in range(25)] for _ in range(60)])
-
-    def test_many_records_of_one_channel(self):
-        chance = random.Random(20)
-        scans = [[{**quiet_record(chance), "frequency": 2412} for _ in range(400)] for _ in range(5)]
-        self.assert_published([1], scans)
-
-    def test_every_frequency_has_its_channel(self):
-        edges = (2407, 2412, 2477, 2482, 2483, 2484, 2485, 2531, 2532, 2552, 4899, 4900, 4920, 5000, 5001, 5005, 5180)
-        scans = [
-            [{"frequency": frequency, "congestion": 7 + i % 90, "power": 30, "bins": 1 + i % 250}]
-            for i, frequency in enumerate(edges)
-        ]
-        self.assert_published(list(range(256)), scans)
-
-    def test_the_smoothing_of_congestion(self):
-        values = [50, 20, 20, 20, 0, 0, 0, 0, 0, 0, 0, 7, 100, 65535, 1, 2, 1]
-        scans = [[{"frequency": 2412, "congestion": value, "power": 0, "bins": 100}] for value in values]
-        self.assert_published([1], scans)
-
-    def test_interference_that_falls_to_nothing_is_not_told(self):
-        powers = [60, -200, 60, -200, 61, 60, -200, -200, 96, 200]
-        scans = [[{"frequency": 2412, "congestion": 0, "power": power, "bins": 100}] for power in powers]
-        self.assert_published([1], scans)
-
-
-class KnownValues(unittest.TestCase):
-    """Worked out by hand, so that the computation above is itself held to something."""
-
-    def test_the_model(self):
-        cases = (
-            ({"congestion": 0, "power": 60}, {"order": 1, "noise_value": 67}),
-            ({"congestion": 0, "power": 96}, {"order": 1, "noise_value": 100}),
-        )
-        for record, told in cases:
-            self.assertEqual(Model([1]).scan([{"frequency": 2412, "bins": 100, **record}]), [told])
-        two = [{"frequency": 2412, "bins": 0, "power": 0, "congestion": value} for value in (30, 41)]
-        self.assertEqual(Model([1]).scan(two), [{"order": 1, "congestion_value": 35}])
-
-
-if __name__ == "__main__":
-    unittest.main()
+    def test_what_each_scan_brings(self):
+        scans = [records for _, records, _ in SCANS]
+        client = self.start(spectrum={"channels": CHANNELS, "scans": scans, "scanMs": 50}).sa()
+        client.send("GET_CHANNEL_LIST")
+        client.send("FULL_SCAN")
+        wait_until(lambda: len(self.control.query("calls")) > len(scans) + 2, "the last scan")
+        client.send("GET_CURRENT_CHANNEL")
+        client.wait_event(CHANNEL_LIST)
+        for name, _, expected in SCANS:
+            for value in expected.split():
+                event = client.next_event()
+                event_id, member = self.NAMES[value[2]]
+                told = {"order": int(value[0]), member: int(value[3:])}
+                self.assertEqual((event["EventId"], json.loads(event["Data"])), (event_id, told), name)
+        self.assertEqual(client.next_event()["EventId"], CHANNEL)

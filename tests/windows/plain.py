@@ -4,25 +4,19 @@ import json
 import unittest
 
 import wine
-from wine import Machine, client, run
 
 
 class WithoutAnAdapter(unittest.TestCase):
     def test_it_serves_both_ports_says_so_and_stops(self):
-        with Machine(simulated=False) as machine:
+        with wine.Machine(simulated=False) as machine:
             sa, hs20 = machine.sa(), machine.hs20()
             hs20.send("GET_IS_CARD_IN")
             self.assertEqual(hs20.next_event()["EventId"], "CARD_PLUG_OUT")
-            hs20.send("GET_RADIO")
-            self.assertEqual(hs20.next_event()["Data"], "false\n")
+            self.assertEqual(hs20.ask("GET_RADIO")["Data"], "false\n")
             sa.send("GET_CHANNEL_LIST")
             self.assertEqual(sa.next_event()["EventId"], "RADIO_OFF")
             self.assertEqual(sa.next_event()["Data"], "null\n")
-            status = run(client(), "status", "--json")
+            status = wine.run_client("status", "--json")
             self.assertEqual((status.returncode, json.loads(status.stdout)["adapter"]), (0, False), status)
             self.assertTrue((wine.store() / "config.xml").is_file())
             self.assertEqual(machine.stop(), 0)
-
-
-if __name__ == "__main__":
-    unittest.main()

@@ -18,22 +18,6 @@ namespace {
 
 constexpr std::size_t kLongestLine = 8;
 
-class Socket {
-public:
-    explicit Socket(SOCKET socket) : m_socket(socket) {}
-    ~Socket() {
-        if (m_socket != INVALID_SOCKET) closesocket(m_socket);
-    }
-    Socket(const Socket&) = delete;
-    Socket& operator=(const Socket&) = delete;
-
-    explicit operator bool() const { return m_socket != INVALID_SOCKET; }
-    SOCKET get() const { return m_socket; }
-
-private:
-    const SOCKET m_socket;
-};
-
 SOCKET newSocket() {
     return socket(AF_INET, SOCK_STREAM, IPPROTO_TCP);
 }
@@ -47,16 +31,16 @@ sockaddr_in loopback(unsigned short port) {
 }
 
 /// Byte by byte, so that nothing behind the line is taken.
-std::optional<unsigned short> readPort(const Socket& client) {
+std::optional<unsigned short> readPort(SOCKET client) {
     std::string line;
-    for (char c = 0; line.size() < kLongestLine && recv(client.get(), &c, 1, 0) == 1; line += c)
+    for (char c = 0; line.size() < kLongestLine && recv(client, &c, 1, 0) == 1; line += c)
         if (c == '\n') return static_cast<unsigned short>(std::atoi(line.c_str()));
     return std::nullopt;
 }
 
-bool sendAll(const Socket& to, const char* data, int size) {
+bool sendAll(SOCKET to, const char* data, int size) {
     while (size > 0) {
-        const int sent = send(to.get(), data, size, 0);
+        const int sent = send(to, data, size, 0);
         if (sent <= 0) return false;
         data += sent;
         size -= sent;
@@ -65,31 +49,33 @@ bool sendAll(const Socket& to, const char* data, int size) {
 }
 
 /// Until one side ends, which the other one is told.
-void pump(const Socket& from, const Socket& to) {
+void pump(SOCKET from, SOCKET to) {
     std::array<char, 65536> buffer{};
     int count = 0;
     do
-        count = recv(from.get(), buffer.data(), static_cast<int>(buffer.size()), 0);
+        count = recv(from, buffer.data(), static_cast<int>(buffer.size()), 0);
     while (count > 0 && sendAll(to, buffer.data(), count));
-    shutdown(to.get(), SD_SEND);
-    shutdown(from.get(), SD_RECEIVE);
+    shutdown(to, SD_SEND);
+    shutdown(from, SD_RECEIVE);
 }
 
-void serve(SOCKET accepted) {
-    const Socket client(accepted);
-    const auto port = readPort(client);
-    if (!port) return;
-    const Socket server(newSocket());
-    const sockaddr_in address = loopback(*port);
-    if (connect(server.get(), reinterpret_cast<const sockaddr*>(&address), sizeof address) != 0) return;
-    std::thread back([&] { pump(server, client); });
-    pump(client, server);
-    back.join();
+void serve(SOCKET client) {
+    if (const auto port = readPort(client)) {
+        const SOCKET server = newSocket();
+        const sockaddr_in address = loopback(*port);
+        if (connect(server, reinterpret_cast<const sockaddr*>(&address), sizeof address) == 0) {
+            std::thread back([&] { pump(server, client); });
+            pump(client, server);
+            back.join();
+        }
+        closesocket(server);
+    }
+    closesocket(client);
 }
 
-void acceptAll(const Socket& listener) {
+void acceptAll(SOCKET listener) {
     for (;;) {
-        const SOCKET accepted = accept(listener.get(), nullptr, nullptr);
+        const SOCKET accepted = accept(listener, nullptr, nullptr);
         if (accepted == INVALID_SOCKET) return;
         std::thread(serve, accepted).detach();
     }
@@ -100,16 +86,16 @@ void acceptAll(const Socket& listener) {
 int main() {
     WSADATA data{};
     if (WSAStartup(MAKEWORD(2, 2), &data) != 0) return 1;
-    const Socket listener(newSocket());
+    const SOCKET listener = newSocket();
     sockaddr_in address = loopback(0);
     int size = sizeof address;
     auto* const name = reinterpret_cast<sockaddr*>(&address);
-    if (bind(listener.get(), name, size) != 0 || listen(listener.get(), SOMAXCONN) != 0 ||
-        getsockname(listener.get(), name, &size) != 0)
+    if (bind(listener, name, size) != 0 || listen(listener, SOMAXCONN) != 0 ||
+        getsockname(listener, name, &size) != 0)
         return 1;
     std::printf("port %u\n", static_cast<unsigned>(ntohs(address.sin_port)));
     std::fflush(stdout);
-    std::thread([&] { acceptAll(listener); }).detach();
+    std::thread(acceptAll, listener).detach();
     while (std::getchar() != EOF) {
     }
     std::fflush(stdout);

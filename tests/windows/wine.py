@@ -1,8 +1,8 @@
 """The programs for Windows in Wine: what the stories on the native programs find in harness.py, for a prefix.
 
 VEXA_WINDOWS_BUILD names the folder with the programs and what stands in for the system's libraries, WINEPREFIX a
-prefix that prefix.py has made. One machine lives in it at a time. Its clock is that of the host: a scenario's
-`speed` is left out.
+prefix, which `wine.py make` makes anew and `wine.py remove` ends and removes. One machine lives in it at a time. Its
+clock is that of the host: a scenario's `speed` is left out.
 """
 
 import atexit
@@ -24,15 +24,15 @@ import tempfile
 sys.path.insert(0, str(pathlib.Path(__file__).resolve().parent.parent / "system"))
 
 import harness
-from harness import PATIENCE, ControlClient, Program, clean_environment, is_running, wait_until
+from harness import PATIENCE, STORE, ControlClient, Program, clean_environment, free_ports, is_running, wait_until
 
 STAND_INS = ("wlanapi", "iphlpapi", "wtsapi32", "secur32")
-STORE = pathlib.PurePath("Public", "Roaming", "Korvane")
 
 CLONE_NEWUSER, CLONE_NEWNET = 0x10000000, 0x40000000
 SIOCGIFFLAGS, SIOCSIFFLAGS, IFF_UP = 0x8913, 0x8914, 1
 
-_direct_connection = harness.open_connection
+open_direct = harness.open_connection  # as a process that is not Wine's
+NativeMachine = harness.Machine
 
 
 def enter_own_network():
@@ -67,7 +67,6 @@ def users():
 
 
 def store():
-    """The folder of config.xml."""
     return users() / STORE
 
 
@@ -86,14 +85,12 @@ def stage():
     """A folder with the programs by themselves in `plain`, and the service among the stand-ins in `simulated`."""
     folder = pathlib.Path(tempfile.mkdtemp(prefix="vexa-wine-"))
     atexit.register(shutil.rmtree, folder, ignore_errors=True)
-    plain, simulated = folder / "plain", folder / "simulated"
-    plain.mkdir()
-    simulated.mkdir()
-    for name in ("vexa.exe", "vexa-service.exe"):
-        shutil.copy(build() / "bin" / name, plain)
-    shutil.copy(build() / "bin" / "vexa-service.exe", simulated)
-    for name in STAND_INS:
-        shutil.copy(build() / "stand-ins" / f"{name}.dll", simulated)
+    stand_ins = [f"stand-ins/{name}.dll" for name in STAND_INS]
+    parts = {"plain": ["bin/vexa.exe", "bin/vexa-service.exe"], "simulated": ["bin/vexa-service.exe", *stand_ins]}
+    for name, files in parts.items():
+        (folder / name).mkdir()
+        for file in files:
+            shutil.copy(build() / file, folder / name)
     return folder
 
 
@@ -112,38 +109,41 @@ def scenario_file(scenario, folder):
     return windows_path(path)
 
 
-def run(program, *arguments, timeout=PATIENCE, **variables):
-    """Runs a program to its end."""
+def run(program, *arguments, stdin=None, timeout=PATIENCE, **variables):
     relay()
     return subprocess.run(
-        ["wine", str(program), *arguments],
+        ["wine", str(program), *map(str, arguments)],
         env=environment(**variables),
-        stdin=subprocess.DEVNULL,
+        input=stdin or "",
         capture_output=True,
-        text=True,
+        encoding="utf-8",
         errors="replace",
         timeout=timeout,
-        check=False,
     )
 
 
 def run_client(*arguments, stdin=None, **_):
     """Runs a command of the client on the service that runs here."""
-    relay()
-    return subprocess.run(
-        ["wine", str(client()), *map(str, arguments)],
-        env=environment(),
-        input=stdin or "",
-        capture_output=True,
-        timeout=60,
-        encoding="utf-8",
-        check=False,
-    )
+    return run(client(), *arguments, stdin=stdin, timeout=60)
 
 
 def end_all():
     """Ends whatever runs in the prefix, also what a story left that was killed."""
     subprocess.run(["wineserver", "-k", "-w"], env=environment(), stderr=subprocess.DEVNULL, check=False)
+
+
+def remove_prefix():
+    if prefix().exists():
+        end_all()
+        shutil.rmtree(prefix())
+
+
+def make_prefix():
+    remove_prefix()
+    prefix().parent.mkdir(parents=True, exist_ok=True)
+    quiet = {"stdin": subprocess.DEVNULL, "stdout": subprocess.DEVNULL, "stderr": subprocess.DEVNULL}
+    subprocess.run(["wineboot", "--init"], env=environment(), check=True, **quiet)
+    end_all()
 
 
 def forget_machine():
@@ -174,34 +174,19 @@ def relay():
 
 
 def open_connection(port, timeout=PATIENCE, receive_buffer=None):
-    connection = _direct_connection(relay(), timeout, receive_buffer)
+    connection = open_direct(relay(), timeout, receive_buffer)
     connection.sendall(f"{port}\n".encode())
     return connection
 
 
-harness.open_connection = open_connection
-enter_own_network()
-
-
 @contextlib.contextmanager
-def native_machine(**options):
-    """A machine of the native programs, of VEXA_BUILD, for comparison."""
-    harness.open_connection = _direct_connection
+def native_connections():
+    """For a machine of the native programs, of VEXA_BUILD, beside this one."""
+    harness.open_connection = open_direct
     try:
-        with harness.Machine(**options) as machine:
-            yield machine
+        yield
     finally:
         harness.open_connection = open_connection
-
-
-def open_direct(port, timeout=PATIENCE):
-    """A connection of a process that is not Wine's."""
-    return _direct_connection(port, timeout)
-
-
-def free_port():
-    with socket.create_server(("127.0.0.1", 0)) as server:
-        return server.getsockname()[1]
 
 
 def service_pid(port):
@@ -236,14 +221,14 @@ class Parent(Program):
         super().end()
 
 
-class Machine(harness.Machine):
+class Machine(NativeMachine):
     """A prefix with its service. At the end of the block what still runs is killed: only stop() waits for the
     service's own end."""
 
     def __init__(self, scenario=None, folder=None, control=True, arguments=(), simulated=True):
         self._own_folder = folder is None
         self._clients = []
-        self._port_for_control = free_port() if control and simulated else 0
+        self._port_for_control = free_ports(1)[0] if control and simulated else 0
         self.folder = pathlib.Path(folder or tempfile.mkdtemp(prefix="vexa-test-"))
         if self._own_folder:
             forget_machine()
@@ -273,9 +258,13 @@ class Machine(harness.Machine):
     def service_pid(self):
         return service_pid(self.sa_port) if self.sa_port else None
 
-    def store(self):
-        return self.folder / STORE
-
     def _content(self, name):
         (path,) = list(users().glob(f"*/AppData/Local/Korvane/Vexa/{name}")) or (self.folder / name,)
         return path.read_text(encoding="latin-1") if path.exists() else ""
+
+
+harness.open_connection, harness.run_client, harness.Machine = open_connection, run_client, Machine
+enter_own_network()
+
+if __name__ == "__main__":
+    {"make": make_prefix, "remove": remove_prefix}[sys.argv[1]]()

@@ -1,0 +1,153 @@
+"""The file of the credentials: two users of one machine share it, one after the other; and what a killed service
+leaves: everything that a client was told is there, and a file that anybody can read."""
+
+import os
+import random
+import re
+import signal
+import stat
+import time
+import xml.etree.ElementTree
+
+from harness import STORE, Machine, Story, wait_until
+
+DEFAULT = (
+    b'\xef\xbb\xbf<?xml version="1.0" encoding="UTF-8"?><configurations>\t<global>\t\t<dump_file_path>hs20log.txt'
+    b"</dump_file_path>\t\t<create_new_dump_file>true</create_new_dump_file>\t\t<autoconnect>true</autoconnect>\t\t"
+    b"<enabledump>false</enabledump>\t\t<dumplevel>0</dumplevel>\t\t<homerealm></homerealm>\t\t<nextcredid>1"
+    b"</nextcredid>\t</global>\t<credentials>\t</credentials>\t<users>\t</users></configurations>"
+)
+ALICE, BOB = "PC\\alice", "PC\\bob"
+PRIVATE, PUBLIC = 2, 1
+SEED = 20
+ROUNDS = 12
+
+
+def realms(credentials):
+    return [entry["RealName"] for entry in credentials]
+
+
+def credential(realm, access=PUBLIC):
+    kind = {"CredentialEapMethod": 2, "Type": 1, "AccessType": access}
+    return {**kind, "RealName": realm, "Username": "user", "Password": "secret"}
+
+
+def add(client, *data):
+    """Gives the realms of the list that answers."""
+    return realms(client.credentials("ADD_CREDENTIAL", credential(*data)))
+
+
+class StoreStory(Story):
+    def setUp(self):
+        self.folder = self.new_folder()
+        self.store = self.folder / STORE
+
+    def stored(self, path="credentials/credential"):
+        return xml.etree.ElementTree.parse(self.store / "config.xml").findall(path)
+
+    def strays(self):
+        return [path.name for path in self.store.iterdir() if path.name not in ("config.xml", "Dump")]
+
+
+class Users(StoreStory):
+    def session(self, user, **scenario):
+        return Machine({"user": user, "speed": 20, **scenario}, folder=self.folder)
+
+    def owners(self):
+        return {node.findtext("realm"): node.findtext("creator") for node in self.stored()}
+
+    def references(self, user):
+        """The ids and priorities of his list."""
+        (node,) = [node for node in self.stored("users/user") if node.findtext("username") == user] or [None]
+        if node is None:
+            return None
+        return [(r.findtext("id"), r.findtext("priority")) for r in node.findall("credentials/credential")]
+
+    def test_they_take_turns(self):
+        with self.session(ALICE) as machine:
+            client = machine.hs20()
+            add(client, "alices-private", PRIVATE)
+            add(client, "shared")
+            self.assertEqual(add(client, "short-lived"), ["short-lived", "shared", "alices-private"])
+        with self.session(BOB) as machine:
+            client = machine.hs20()
+            self.assertEqual(realms(client.credentials()), ["short-lived", "shared"])
+            self.assertIsNone(self.references(BOB), "a first read saves nothing")
+            add(client, "bobs-private", PRIVATE)
+            left = client.credentials("DELETE_CREDENTIAL", {"Id": 3})
+            self.assertEqual(realms(left), ["bobs-private", "shared"])
+            self.assertEqual(self.references(ALICE), [("3", "1"), ("2", "2"), ("1", "3")])
+            owners = {"alices-private": ALICE, "bobs-private": BOB, "shared": BOB}
+            self.assertEqual(self.owners(), owners, "each save signs what all see")
+        with self.session(ALICE) as machine:
+            self.assertEqual(realms(machine.hs20().credentials()), ["shared", "alices-private"])
+            self.assertEqual([number for number, _ in self.references(ALICE)], ["2", "1"])
+            self.assertEqual(self.references(BOB), [("4", "1"), ("2", "2")])
+            self.assertEqual(self.owners(), {"bobs-private": BOB, "alices-private": ALICE, "shared": ALICE})
+        self.assertEqual(self.strays(), [])
+
+    def test_what_is_made_is_for_its_owner_alone(self):
+        with self.session(ALICE) as machine:
+            self.assertEqual((self.store / "config.xml").read_bytes(), DEFAULT)
+            add(machine.hs20(), "a")
+        self.assertEqual(list((self.store / "Dump").iterdir()), [], "the log is off")
+        text = DEFAULT.replace(b"<enabledump>false", b"<enabledump>true").decode("utf-8-sig")
+        first, second = (self.store / "Dump" / f"hs20log_alice_{number}.txt" for number in (0, 1))
+        with self.session(ALICE, config=text):
+            content = wait_until(lambda: first.exists() and first.read_text(), "the log is written")
+        numbers = [int(number) for number in re.findall(r"^\[(\d+)\] ", content, re.MULTILINE)]
+        self.assertEqual(numbers, list(range(1, len(numbers) + 1)))
+        with self.session(ALICE):
+            wait_until(second.exists, "the second log is written")
+        for path in (self.store, *self.store.rglob("*")):
+            mode = stat.S_IMODE(path.stat().st_mode)
+            self.assertEqual(mode, 0o700 if path.is_dir() else 0o600, path)
+
+
+class Crash(StoreStory):
+    def setUp(self):
+        super().setUp()
+        self.random = random.Random(SEED)
+        self.acknowledged = set()
+        self.sent = 0
+
+    def session(self):
+        return Machine({}, folder=self.folder, control=False)
+
+    def add(self, client):
+        self.sent += 1
+        self.acknowledged.update(add(client, f"realm{self.sent}"))
+
+    def add_until_killed(self, machine):
+        client, pid = machine.hs20(), machine.service_pid()
+        for _ in range(self.random.randrange(1, 8)):
+            self.add(client)
+        self.sent += 1
+        client.send("ADD_CREDENTIAL", credential(f"realm{self.sent}"))
+        time.sleep(self.random.uniform(0, 0.02))  # where in a save the kill falls is the point of the test
+        os.kill(pid, signal.SIGKILL)
+        try:
+            while True:
+                self.acknowledged.update(realms(client.credential_list()))
+        except ConnectionError:
+            pass
+        self.assertEqual(machine.parent.wait(), 128 + signal.SIGKILL)
+
+    def check_file(self):
+        stored, ids = ([node.findtext(name) for node in self.stored()] for name in ("realm", "id"))
+        self.assertEqual((len(set(stored)), len(set(ids))), (len(stored), len(ids)))
+        self.assertEqual(self.acknowledged - set(stored), set(), "told to the client and not in the file")
+
+    def test_nothing_that_a_client_was_told_is_lost(self):
+        for number in range(ROUNDS):
+            with self.subTest(seed=SEED, round=number):
+                with self.session() as machine:
+                    self.add_until_killed(machine)
+                self.check_file()
+                self.assertLessEqual(len(self.strays()), 1, self.strays())
+        with self.session() as machine:
+            client = machine.hs20()
+            self.assertEqual(self.acknowledged - set(realms(client.credentials())), set())
+            self.add(client)
+            self.assertEqual(self.strays(), [], "a save leaves no temporary of the dead")
+        self.check_file()
