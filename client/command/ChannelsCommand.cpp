@@ -16,8 +16,6 @@ namespace vexa::client {
 
 namespace {
 
-using std::chrono::steady_clock;
-
 constexpr std::chrono::seconds kAnswerLimit{10};
 
 struct ChannelsOptions {
@@ -26,10 +24,9 @@ struct ChannelsOptions {
 };
 
 bool waitForList(SpectralScan& scan, Signals& signals) {
-    const auto deadline = steady_clock::now() + kAnswerLimit;
+    const Deadline deadline = Deadline::in(kAnswerLimit);
     while (!scan.view().hasChannelList()) {
-        const auto left = std::chrono::ceil<std::chrono::milliseconds>(deadline - steady_clock::now());
-        switch (waitForActivity(scan.descriptor(), scan.events(), signals, left)) {
+        switch (waitForActivity(scan.descriptor(), scan.events(), signals, deadline)) {
             case Activity::StopAsked:
                 return false;
             case Activity::Timeout:

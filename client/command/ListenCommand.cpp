@@ -18,7 +18,8 @@ struct ListenOptions {
 int runListen(const ListenOptions& options) {
     Signals signals;
     WebSocketClient client(options.port);
-    while (waitForActivity(client.descriptor(), client.events(), signals, std::nullopt) == Activity::Ready) {
+    while (waitForActivity(client.descriptor(), client.events(), signals, Deadline::never()) ==
+           Activity::Ready) {
         client.process();
         if (!printEvents(client)) break;
         if (!client.isOpen()) throw ClientError("the service has closed the connection");

@@ -56,7 +56,7 @@ void print(const std::vector<LogFiles::Line>& lines, std::size_t from, bool json
 
 void follow(LogFiles& files, const LogOptions& options) {
     Signals signals;
-    while (std::cout && waitForActivity(-1, 0, signals, kBetweenLooks) != Activity::StopAsked)
+    while (std::cout && waitForActivity(-1, 0, signals, Deadline::in(kBetweenLooks)) != Activity::StopAsked)
         print(files.takeLines(), 0, options.json);
 }
 

@@ -42,7 +42,7 @@ void explain(HotspotPort& port, const HotspotOptions& options) {
 
 // An adapter that comes is asked for its list; all later lists come by themselves.
 void watch(HotspotPort& port, NetworkList shown, bool json) {
-    while (const auto event = port.next(std::nullopt)) {
+    while (const auto event = port.next(Deadline::never())) {
         if (event->id == kCardIn) port.tell(kNetworkList);
         if (event->id != kNetworkList) continue;
         NetworkList list = networkList(parseJson(event->data).value_or(Json::Value()));

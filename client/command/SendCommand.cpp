@@ -12,7 +12,6 @@ namespace vexa::client {
 namespace {
 
 using std::chrono::milliseconds;
-using std::chrono::steady_clock;
 
 constexpr int kDefaultWaitMs = 1000;
 constexpr milliseconds kGoodbyeLimit{2000};
@@ -26,11 +25,10 @@ struct SendOptions {
 };
 
 void printAnswers(WebSocketClient& client, Signals& signals, milliseconds wait) {
-    const auto deadline = steady_clock::now() + wait;
-    while (true) {
-        const auto left = std::chrono::ceil<milliseconds>(deadline - steady_clock::now());
-        if (left <= milliseconds(0)) return;
-        if (waitForActivity(client.descriptor(), client.events(), signals, left) != Activity::Ready) return;
+    const Deadline deadline = Deadline::in(wait);
+    while (!deadline.isOver()) {
+        if (waitForActivity(client.descriptor(), client.events(), signals, deadline) != Activity::Ready)
+            return;
         client.process();
         if (!printEvents(client)) return;
         if (!client.isOpen()) throw ClientError("the service has closed the connection");

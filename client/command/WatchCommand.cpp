@@ -19,9 +19,6 @@ namespace vexa::client {
 
 namespace {
 
-using std::chrono::milliseconds;
-using std::chrono::steady_clock;
-
 struct WatchOptions {
     PortOption spectral{Half::Spectral};
     PortOption hotspot{Half::Hotspot};
@@ -95,22 +92,15 @@ private:
     HotspotNarrator m_narrator;
 };
 
-std::optional<milliseconds> leftUntil(std::optional<steady_clock::time_point> end) {
-    if (!end) return std::nullopt;
-    return std::chrono::ceil<milliseconds>(*end - steady_clock::now());
-}
-
 int runWatch(const WatchOptions& options) {
     Signals signals;
     Watch watch(options);
-    std::optional<steady_clock::time_point> end;
-    if (options.seconds > 0) end = steady_clock::now() + std::chrono::seconds(options.seconds);
+    const Deadline end =
+        options.seconds > 0 ? Deadline::in(std::chrono::seconds(options.seconds)) : Deadline::never();
     std::optional<TerminalKeys> keys;
     if (TerminalKeys::isUsable()) keys.emplace();
-    while (watch.tell()) {
-        const auto left = leftUntil(end);
-        if (left && *left <= milliseconds(0)) break;
-        const Activity activity = waitForActivity(watch.awaited(), signals, keys ? &*keys : nullptr, left);
+    while (watch.tell() && !end.isOver()) {
+        const Activity activity = waitForActivity(watch.awaited(), signals, keys ? &*keys : nullptr, end);
         if (activity == Activity::StopAsked) break;
     }
     return kExitOk;

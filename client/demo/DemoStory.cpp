@@ -15,7 +15,6 @@
 namespace vexa::client {
 
 using std::chrono::milliseconds;
-using std::chrono::steady_clock;
 
 namespace {
 
@@ -79,14 +78,12 @@ DemoStory::DemoStory(std::uint16_t port, const MachineFolder& machine, Credentia
     : m_client(port),
       m_narrator([machine] { return readConnectionMethod(machine); }),
       m_stored(std::move(stored)),
-      m_log(machine.dumpFolder()),
-      m_start(steady_clock::now()),
-      m_nextLook(m_start) {
+      m_log(machine.dumpFolder()) {
     ask(HotspotNarrator::firstQuestions());
 }
 
-std::optional<DemoStory::Time> DemoStory::wake() const {
-    return std::min(m_nextLook, m_nextStep.value_or(m_nextLook));
+Deadline DemoStory::wake() const {
+    return std::min(m_nextLook, m_nextStep);
 }
 
 std::vector<SideShow::Item> DemoStory::process() {
@@ -114,7 +111,7 @@ void DemoStory::tell(std::vector<Item>& items, const Event& event) {
     const std::size_t joins = m_narrator.joined().size();
     const auto sentences = m_narrator.tell(event);
     const bool isJoined = m_narrator.joined().size() > joins;
-    if (isJoined) m_nextStep = steady_clock::now() + kStay;
+    if (isJoined) m_nextStep = Deadline::in(kStay);
     for (const std::string& sentence : sentences) {
         if (!isAside(event)) say(items, isJoined ? Speaker::Joining : Speaker::Service, "", sentence);
     }
@@ -122,8 +119,8 @@ void DemoStory::tell(std::vector<Item>& items, const Event& event) {
 }
 
 void DemoStory::act(std::vector<Item>& items) {
-    if (!m_nextStep || steady_clock::now() < *m_nextStep) return;
-    m_nextStep.reset();
+    if (!m_nextStep.isOver()) return;
+    m_nextStep = Deadline::never();
     if (m_stepsDone == kSteps.size() || m_narrator.joined().back() != kSteps[m_stepsDone].joined) return;
     const Step& step = kSteps[m_stepsDone++];
     const std::string command = commandText(step.command, commandData(step.network));
@@ -133,9 +130,8 @@ void DemoStory::act(std::vector<Item>& items) {
 
 // The same reason is found again in every round; it is told once.
 void DemoStory::takeReasons(std::vector<Item>& items) {
-    const auto now = steady_clock::now();
-    if (now < m_nextLook) return;
-    m_nextLook = now + kBetweenLooks;
+    if (!m_nextLook.isOver()) return;
+    m_nextLook = Deadline::in(kBetweenLooks);
     for (const LogFiles::Line& line : m_log.takeLines()) {
         if (!isReason(line.text)) continue;
         const std::string text = textOf(line.text);
@@ -151,7 +147,7 @@ void DemoStory::takeReasons(std::vector<Item>& items) {
 void DemoStory::say(std::vector<Item>& items, Speaker speaker, std::string json,
                     const std::string& sentence) {
     std::ostringstream line;
-    const double seconds = std::chrono::duration<double>(steady_clock::now() - m_start).count();
+    const double seconds = std::chrono::duration<double>(Deadline::Clock::now() - m_start).count();
     line << std::fixed << std::setprecision(1) << std::setw(5) << seconds << " s  " << sentence;
     m_lines.push_back({speaker, line.str()});
     items.push_back({std::move(json), sentence});

@@ -8,7 +8,6 @@
 namespace vexa::client {
 
 using std::chrono::milliseconds;
-using std::chrono::steady_clock;
 
 namespace {
 
@@ -22,11 +21,11 @@ std::string turnName(std::uint16_t port) {
 }  // namespace
 
 ChangeTurn::ChangeTurn(std::uint16_t port, Signals& signals, milliseconds limit) {
-    const auto deadline = steady_clock::now() + limit;
+    const Deadline deadline = Deadline::in(limit);
     while (!(m_holder = takeKernelName(turnName(port)))) {
-        if (steady_clock::now() >= deadline)
+        if (deadline.isOver())
             throw ClientError("another vexa is changing the credentials and does not come to an end");
-        if (waitForActivity(-1, 0, signals, kBetweenAttempts) == Activity::StopAsked)
+        if (waitForActivity(-1, 0, signals, Deadline::in(kBetweenAttempts)) == Activity::StopAsked)
             throw StoppedByUser("stopped before anything was changed");
     }
 }

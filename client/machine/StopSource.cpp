@@ -1,6 +1,5 @@
 #include "client/machine/StopSource.h"
 
-#include <algorithm>
 #include <array>
 
 #include "client/terminal/Poll.h"
@@ -8,24 +7,16 @@
 
 namespace vexa::client {
 
-using std::chrono::milliseconds;
-using std::chrono::steady_clock;
-
 StopSource::StopSource(Signals& signals, bool stopOnEndOfInput)
     : m_signals(signals), m_watchInput(stopOnEndOfInput) {}
 
-StopSource::Wake StopSource::wait(std::optional<milliseconds> limit) {
-    const auto deadline = steady_clock::now() + limit.value_or(milliseconds(0));
+StopSource::Wake StopSource::wait(Deadline deadline) {
     while (true) {
         if (const auto wake = takeSignals()) return *wake;
-        std::optional<milliseconds> left;
-        if (limit) {
-            left = std::chrono::ceil<milliseconds>(deadline - steady_clock::now());
-            if (*left <= milliseconds(0)) return Wake::Timeout;
-        }
+        if (deadline.isOver()) return Wake::Timeout;
         std::array<Polled, 2> watched{
             {{m_signals.descriptor(), kReadable}, {m_watchInput ? kStandardInput : -1, kReadable}}};
-        waitFor(watched, left);
+        waitFor(watched, deadline);
         if (watched[1].happened != 0 && inputEnded()) {
             m_watchInput = false;
             return Wake::Stop;

@@ -1,8 +1,8 @@
 #pragma once
 
-#include <chrono>
 #include <optional>
 
+#include "client/terminal/Deadline.h"
 #include "client/terminal/Signals.h"
 
 namespace vexa::client {
@@ -15,8 +15,8 @@ public:
     /// `stopOnEndOfInput`: the end of standard input is a request to stop as well.
     StopSource(Signals& signals, bool stopOnEndOfInput);
 
-    /// Without a limit it waits for ever. Every request is told once.
-    Wake wait(std::optional<std::chrono::milliseconds> limit);
+    /// Every request is told once.
+    Wake wait(Deadline deadline);
 
 private:
     std::optional<Wake> takeSignals();

@@ -7,9 +7,6 @@
 
 namespace vexa::client {
 
-using std::chrono::milliseconds;
-using std::chrono::steady_clock;
-
 namespace {
 
 void suspend(TerminalKeys* keys) {
@@ -32,27 +29,23 @@ bool anyReady(std::span<const Polled> watched) {
 
 }  // namespace
 
-Activity waitForActivity(int descriptor, short events, Signals& signals, std::optional<milliseconds> limit) {
+Activity waitForActivity(int descriptor, short events, Signals& signals, Deadline deadline) {
     const Awaited only{descriptor, events};
-    return waitForActivity(std::span(&only, 1), signals, nullptr, limit);
+    return waitForActivity(std::span(&only, 1), signals, nullptr, deadline);
 }
 
 Activity waitForActivity(std::span<const Awaited> awaited, Signals& signals, TerminalKeys* keys,
-                         std::optional<milliseconds> limit) {
-    const auto deadline = steady_clock::now() + limit.value_or(milliseconds(0));
+                         Deadline deadline) {
     while (true) {
-        std::optional<milliseconds> left;
-        if (limit)
-            left = std::max(std::chrono::ceil<milliseconds>(deadline - steady_clock::now()), milliseconds(0));
         std::vector<Polled> watched{{signals.descriptor(), kReadable},
                                     {keys == nullptr ? -1 : keys->descriptor(), kReadable}};
         for (const Awaited& one : awaited)
             watched.push_back({one.descriptor, one.events});
-        waitFor(watched, left);
+        waitFor(watched, deadline);
         if (stopAsked(signals, keys)) return Activity::StopAsked;
         if (watched[1].happened != 0 && keys->takeQuit()) return Activity::StopAsked;
         if (anyReady(std::span(watched).subspan(2))) return Activity::Ready;
-        if (limit && steady_clock::now() >= deadline) return Activity::Timeout;
+        if (deadline.isOver()) return Activity::Timeout;
     }
 }
 

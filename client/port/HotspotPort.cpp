@@ -8,7 +8,6 @@
 namespace vexa::client {
 
 using std::chrono::milliseconds;
-using std::chrono::steady_clock;
 
 namespace {
 
@@ -42,8 +41,8 @@ HotspotPort::HotspotPort(std::uint16_t port, Signals& signals, milliseconds limi
 HotspotPort::Answer HotspotPort::ask(const std::string& command, const std::optional<std::string>& data,
                                      const std::string& event, const Accepts& accepts) {
     tell(command, data);
-    const auto end = steady_clock::now() + m_limit;
-    auto wake = std::min(end, steady_clock::now() + kFirstCheck);
+    const Deadline end = Deadline::in(m_limit);
+    Deadline wake = std::min(end, Deadline::in(kFirstCheck));
     Answer answer;
     // What is still owed for an earlier question tells nothing about this one.
     int stale = m_checksOwed;
@@ -57,7 +56,7 @@ HotspotPort::Answer HotspotPort::ask(const std::string& command, const std::opti
     while (answered < kChecks) {
         const auto told = next(wake);
         if (!told) {
-            if (steady_clock::now() >= end) throw NoAnswer(silenceText(m_limit));
+            if (end.isOver()) throw NoAnswer(silenceText(m_limit));
             checkNow();
         } else if (told->id == event) {
             answer.payload = parseJson(told->data).value_or(Json::Value());
@@ -80,15 +79,15 @@ HotspotPort::Answer HotspotPort::ask(const std::string& command, const std::opti
 }
 
 HotspotPort::Answer HotspotPort::question(const std::string& command, const Accepts& accepts) {
-    const auto end = steady_clock::now() + std::min(m_limit, kStartLimit);
+    const Deadline end = Deadline::in(std::min(m_limit, kStartLimit));
     while (true) {
         Answer answer = ask(command, std::nullopt, command, accepts);
-        if (answer.payload || !answer.cardIn || steady_clock::now() >= end) return answer;
+        if (answer.payload || !answer.cardIn || end.isOver()) return answer;
     }
 }
 
 bool HotspotPort::hasAdapter() {
-    const auto end = steady_clock::now() + m_limit;
+    const Deadline end = Deadline::in(m_limit);
     check();
     while (const auto told = next(end)) {
         if (isCheckAnswer(*told) && --m_checksOwed == 0) return told->id == kCardIn;
@@ -105,19 +104,15 @@ void HotspotPort::tell(const std::string& command, const std::optional<std::stri
     m_client.send(commandText(command, data));
 }
 
-std::optional<Event> HotspotPort::next(std::optional<steady_clock::time_point> deadline) {
+std::optional<Event> HotspotPort::next(Deadline deadline) {
     while (true) {
         while (const auto text = m_client.take()) {
             if (auto event = parseEvent(*text)) return event;
         }
         if (!m_client.isOpen()) throw NoAnswer("the service has closed the connection");
-        std::optional<milliseconds> left;
-        if (deadline) {
-            left = std::chrono::ceil<milliseconds>(*deadline - steady_clock::now());
-            if (*left <= milliseconds(0)) return std::nullopt;
-        }
+        if (deadline.isOver()) return std::nullopt;
         const Awaited service{m_client.descriptor(), m_client.events()};
-        if (waitForActivity(std::span(&service, 1), m_signals, m_keys, left) == Activity::StopAsked)
+        if (waitForActivity(std::span(&service, 1), m_signals, m_keys, deadline) == Activity::StopAsked)
             throw StoppedByUser("stopped before the service had answered");
         m_client.process();
     }

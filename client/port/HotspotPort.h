@@ -11,6 +11,7 @@
 #include "client/port/Event.h"
 #include "client/port/WebSocketClient.h"
 #include "client/terminal/ClientError.h"
+#include "client/terminal/Deadline.h"
 #include "client/terminal/Signals.h"
 #include "client/terminal/TerminalKeys.h"
 
@@ -55,7 +56,7 @@ public:
     void tell(const std::string& command, const std::optional<std::string>& data = std::nullopt);
 
     /// The next event. Nothing if none comes before the deadline. Throws NoAnswer.
-    std::optional<Event> next(std::optional<std::chrono::steady_clock::time_point> deadline);
+    std::optional<Event> next(Deadline deadline);
 
     /// From now on `q` ends the waiting too.
     void endWith(TerminalKeys& keys) { m_keys = &keys; }

@@ -71,7 +71,7 @@ std::optional<std::string> readHiddenLine(Signals& signals, const std::string& p
     std::string line;
     while (true) {
         std::array<Polled, 2> watched{{{kStandardInput, kReadable}, {signals.descriptor(), kReadable}}};
-        waitFor(watched, std::nullopt);
+        waitFor(watched, Deadline::never());
         handleSignals(signals, terminal, prompt);
         if (watched[0].happened == 0) continue;
         char next = 0;

@@ -2,10 +2,10 @@
 
 #include <json/value.h>
 
-#include <chrono>
-#include <optional>
 #include <string>
 #include <vector>
+
+#include "client/terminal/Deadline.h"
 
 namespace vexa::client {
 
@@ -35,7 +35,7 @@ public:
     virtual short events() const = 0;
 
     /// When process() has something to do although nothing has arrived.
-    virtual std::optional<std::chrono::steady_clock::time_point> wake() const = 0;
+    virtual Deadline wake() const = 0;
 
     /// Takes in what has arrived, without waiting. Throws ClientError when the connection is lost.
     virtual std::vector<Item> process() = 0;

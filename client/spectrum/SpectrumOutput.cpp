@@ -34,7 +34,7 @@ void printLines(const std::vector<std::string>& lines) {
 }  // namespace
 
 SpectrumOutput::SpectrumOutput(Form form, const SideShow* side)
-    : m_form(form), m_side(side), m_start(steady_clock::now()), m_nextDrawing(m_start) {
+    : m_form(form), m_side(side), m_start(steady_clock::now()) {
     if (form == Form::Readable && TerminalScreen::isUsable()) {
         m_screen.emplace();
     } else if (m_side != nullptr) {
@@ -72,16 +72,15 @@ void SpectrumOutput::printLine(const SpectralScan::Told& told, const SpectralVie
     }
 }
 
-std::optional<milliseconds> SpectrumOutput::refresh(const SpectralView& view) {
-    if (!m_screen || !m_changed) return std::nullopt;
-    const auto now = steady_clock::now();
-    if (now < m_nextDrawing) return std::chrono::ceil<milliseconds>(m_nextDrawing - now);
+Deadline SpectrumOutput::refresh(const SpectralView& view) {
+    if (!m_screen || !m_changed) return Deadline::never();
+    if (!m_nextDrawing.isOver()) return m_nextDrawing;
     auto lines = picture(view);
     lines.front() += "   (q or Ctrl-C ends)";
     m_screen->draw(lines);
     m_changed = false;
-    m_nextDrawing = now + kBetweenDrawings;
-    return std::nullopt;
+    m_nextDrawing = Deadline::in(kBetweenDrawings);
+    return Deadline::never();
 }
 
 void SpectrumOutput::finish(const SpectralView& view) {

@@ -7,6 +7,7 @@
 
 #include "client/spectrum/SideShow.h"
 #include "client/spectrum/SpectralScan.h"
+#include "client/terminal/Deadline.h"
 #include "client/terminal/Signals.h"
 #include "client/terminal/TerminalScreen.h"
 
@@ -25,9 +26,9 @@ public:
     /// What is told beside the spectrum.
     void showSide(const std::vector<SideShow::Item>& items);
 
-    /// Draws what has changed, but not too often. Gives the time until it should be called again; nothing:
-    /// not before something has happened.
-    std::optional<std::chrono::milliseconds> refresh(const SpectralView& view);
+    /// Draws what has changed, but not too often. Gives when it should be called again although nothing has
+    /// happened.
+    Deadline refresh(const SpectralView& view);
 
     /// The last picture, and one line that says what was seen.
     void finish(const SpectralView& view);
@@ -52,7 +53,7 @@ private:
     const SideShow* m_side;
     std::optional<TerminalScreen> m_screen;
     std::chrono::steady_clock::time_point m_start;
-    std::chrono::steady_clock::time_point m_nextDrawing;
+    Deadline m_nextDrawing = Deadline::in({});
     bool m_changed = true;
 };
 

@@ -22,7 +22,7 @@ constexpr wchar_t kEnter = L'\r';
 void waitForInput(Signals& signals) {
     while (true) {
         std::array<Polled, 2> watched{{{kStandardInput, kReadable}, {signals.descriptor(), kReadable}}};
-        waitFor(watched, std::nullopt);
+        waitFor(watched, Deadline::never());
         while (const auto signal = signals.take())
             if (Signals::isStop(*signal)) throw StoppedByUser("stopped before anything was changed");
         if (watched[0].happened != 0) return;
