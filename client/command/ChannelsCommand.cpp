@@ -7,10 +7,10 @@
 
 #include "client/command/Commands.h"
 #include "client/command/PortOption.h"
-#include "client/port/Activity.h"
 #include "client/port/JsonLine.h"
 #include "client/spectrum/SpectralScan.h"
 #include "client/terminal/ClientError.h"
+#include "client/terminal/EventLoop.h"
 
 namespace vexa::client {
 
@@ -24,16 +24,12 @@ struct ChannelsOptions {
 };
 
 bool waitForList(SpectralScan& scan, Signals& signals) {
+    EventLoop loop(signals);
     const Deadline deadline = Deadline::in(kAnswerLimit);
     while (!scan.view().hasChannelList()) {
-        switch (waitForActivity(scan.descriptor(), scan.events(), signals, deadline)) {
-            case Activity::StopAsked:
-                return false;
-            case Activity::Timeout:
-                throw ClientError("the service did not answer");
-            case Activity::Ready:
-                scan.process();
-        }
+        if (deadline.isOver()) throw ClientError("the service did not answer");
+        if (!loop.wait(scan.polled(), deadline)) return false;
+        scan.process();
     }
     return true;
 }

@@ -2,9 +2,9 @@
 #include <memory>
 
 #include "client/command/Commands.h"
-#include "client/port/Activity.h"
 #include "client/port/EventLines.h"
 #include "client/terminal/ClientError.h"
+#include "client/terminal/EventLoop.h"
 
 namespace vexa::client {
 
@@ -18,8 +18,8 @@ struct ListenOptions {
 int runListen(const ListenOptions& options) {
     Signals signals;
     WebSocketClient client(options.port);
-    while (waitForActivity(client.descriptor(), client.events(), signals, Deadline::never()) ==
-           Activity::Ready) {
+    EventLoop loop(signals);
+    while (loop.wait(client.polled(), Deadline::never())) {
         client.process();
         if (!printEvents(client)) break;
         if (!client.isOpen()) throw ClientError("the service has closed the connection");

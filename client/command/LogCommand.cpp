@@ -9,9 +9,9 @@
 #include "client/machine/LogFiles.h"
 #include "client/machine/MachineFolder.h"
 #include "client/machine/ServiceHost.h"
-#include "client/port/Activity.h"
 #include "client/port/JsonLine.h"
 #include "client/terminal/ClientError.h"
+#include "client/terminal/EventLoop.h"
 #include "client/terminal/Text.h"
 
 namespace vexa::client {
@@ -56,7 +56,8 @@ void print(const std::vector<LogFiles::Line>& lines, std::size_t from, bool json
 
 void follow(LogFiles& files, const LogOptions& options) {
     Signals signals;
-    while (std::cout && waitForActivity(-1, 0, signals, Deadline::in(kBetweenLooks)) != Activity::StopAsked)
+    EventLoop loop(signals);
+    while (std::cout && loop.wait(Deadline::in(kBetweenLooks)))
         print(files.takeLines(), 0, options.json);
 }
 

@@ -8,6 +8,7 @@
 #include "client/hotspot/Network.h"
 #include "client/port/HotspotPort.h"
 #include "client/port/JsonLine.h"
+#include "client/terminal/TerminalKeys.h"
 
 namespace vexa::client {
 

@@ -5,10 +5,10 @@
 
 #include "client/command/Commands.h"
 #include "client/command/PortOption.h"
-#include "client/port/Activity.h"
 #include "client/spectrum/SpectralText.h"
 #include "client/spectrum/SpectrumWatch.h"
 #include "client/terminal/ClientError.h"
+#include "client/terminal/EventLoop.h"
 
 namespace vexa::client {
 
@@ -55,12 +55,11 @@ private:
 };
 
 void scanOnce(SpectralScan& scan, Signals& signals, seconds limit) {
+    EventLoop loop(signals);
     Completeness completeness(limit);
     scan.start();
     while (!completeness.end().isOver()) {
-        const Activity activity =
-            waitForActivity(scan.descriptor(), scan.events(), signals, completeness.end());
-        if (activity == Activity::StopAsked) break;
+        if (!loop.wait(scan.polled(), completeness.end())) break;
         if (!scan.process().empty()) completeness.update(scan.view());
     }
     scan.stop();

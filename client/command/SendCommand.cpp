@@ -2,10 +2,10 @@
 #include <memory>
 
 #include "client/command/Commands.h"
-#include "client/port/Activity.h"
 #include "client/port/Event.h"
 #include "client/port/EventLines.h"
 #include "client/terminal/ClientError.h"
+#include "client/terminal/EventLoop.h"
 
 namespace vexa::client {
 
@@ -25,10 +25,9 @@ struct SendOptions {
 };
 
 void printAnswers(WebSocketClient& client, Signals& signals, milliseconds wait) {
+    EventLoop loop(signals);
     const Deadline deadline = Deadline::in(wait);
-    while (!deadline.isOver()) {
-        if (waitForActivity(client.descriptor(), client.events(), signals, deadline) != Activity::Ready)
-            return;
+    while (!deadline.isOver() && loop.wait(client.polled(), deadline)) {
         client.process();
         if (!printEvents(client)) return;
         if (!client.isOpen()) throw ClientError("the service has closed the connection");

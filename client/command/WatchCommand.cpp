@@ -9,11 +9,12 @@
 #include "client/command/PortOption.h"
 #include "client/hotspot/HotspotNarrator.h"
 #include "client/machine/MachineRegistry.h"
-#include "client/port/Activity.h"
 #include "client/port/EventLines.h"
 #include "client/spectrum/SpectralScan.h"
 #include "client/spectrum/SpectralText.h"
 #include "client/terminal/ClientError.h"
+#include "client/terminal/EventLoop.h"
+#include "client/terminal/TerminalKeys.h"
 
 namespace vexa::client {
 
@@ -43,10 +44,7 @@ public:
         ask(HotspotNarrator::firstQuestions());
     }
 
-    std::array<Awaited, 2> awaited() const {
-        return {Awaited{m_hotspot.descriptor(), m_hotspot.events()},
-                Awaited{m_spectral.descriptor(), m_spectral.events()}};
-    }
+    std::array<Polled, 2> polled() const { return {m_hotspot.polled(), m_spectral.polled()}; }
 
     /// Tells what has come. False once nobody reads it.
     bool tell() {
@@ -99,9 +97,10 @@ int runWatch(const WatchOptions& options) {
         options.seconds > 0 ? Deadline::in(std::chrono::seconds(options.seconds)) : Deadline::never();
     std::optional<TerminalKeys> keys;
     if (TerminalKeys::isUsable()) keys.emplace();
+    EventLoop loop(signals, keys ? &*keys : nullptr);
     while (watch.tell() && !end.isOver()) {
-        const Activity activity = waitForActivity(watch.awaited(), signals, keys ? &*keys : nullptr, end);
-        if (activity == Activity::StopAsked) break;
+        auto polled = watch.polled();
+        if (!loop.wait(polled, end)) break;
     }
     return kExitOk;
 }

@@ -17,8 +17,7 @@ public:
     /// Connects. Throws ClientError.
     DemoStory(std::uint16_t port, const MachineFolder& machine, CredentialList stored);
 
-    int descriptor() const override { return m_client.descriptor(); }
-    short events() const override { return m_client.events(); }
+    Polled polled() const override { return m_client.polled(); }
     Deadline wake() const override;
     std::vector<Item> process() override;
     std::vector<std::string> opening(bool json) const override;

@@ -105,7 +105,7 @@ ServiceParent::State ServiceParent::waitUntilReady() {
         }
         if (portsListen()) break;
         if (deadline.isOver()) giveUp();
-        if (m_stop.wait(Deadline::in(pause)) == StopSource::Wake::Stop) return State::StopRequested;
+        if (!m_stop.wait(Deadline::in(pause))) return State::StopRequested;
     }
     m_reserved.clear();
     if (!writePortsFile(m_folder.portsFile(), m_ports)) {
@@ -116,7 +116,7 @@ ServiceParent::State ServiceParent::waitUntilReady() {
 
 ServiceParent::State ServiceParent::waitForEnd() {
     while (!m_process->exitCode()) {
-        if (m_stop.wait(Deadline::never()) == StopSource::Wake::Stop) return State::StopRequested;
+        if (!m_stop.wait(Deadline::never())) return State::StopRequested;
     }
     return State::Ended;
 }

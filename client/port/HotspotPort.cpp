@@ -2,7 +2,6 @@
 
 #include <algorithm>
 
-#include "client/port/Activity.h"
 #include "client/port/JsonLine.h"
 
 namespace vexa::client {
@@ -36,7 +35,7 @@ std::string silenceText(milliseconds limit) {
 }  // namespace
 
 HotspotPort::HotspotPort(std::uint16_t port, Signals& signals, milliseconds limit)
-    : m_client(port), m_signals(signals), m_limit(limit) {}
+    : m_client(port), m_loop(signals), m_limit(limit) {}
 
 HotspotPort::Answer HotspotPort::ask(const std::string& command, const std::optional<std::string>& data,
                                      const std::string& event, const Accepts& accepts) {
@@ -111,8 +110,7 @@ std::optional<Event> HotspotPort::next(Deadline deadline) {
         }
         if (!m_client.isOpen()) throw NoAnswer("the service has closed the connection");
         if (deadline.isOver()) return std::nullopt;
-        const Awaited service{m_client.descriptor(), m_client.events()};
-        if (waitForActivity(std::span(&service, 1), m_signals, m_keys, deadline) == Activity::StopAsked)
+        if (!m_loop.wait(m_client.polled(), deadline))
             throw StoppedByUser("stopped before the service had answered");
         m_client.process();
     }

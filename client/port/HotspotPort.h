@@ -12,8 +12,7 @@
 #include "client/port/WebSocketClient.h"
 #include "client/terminal/ClientError.h"
 #include "client/terminal/Deadline.h"
-#include "client/terminal/Signals.h"
-#include "client/terminal/TerminalKeys.h"
+#include "client/terminal/EventLoop.h"
 
 namespace vexa::client {
 
@@ -59,7 +58,7 @@ public:
     std::optional<Event> next(Deadline deadline);
 
     /// From now on `q` ends the waiting too.
-    void endWith(TerminalKeys& keys) { m_keys = &keys; }
+    void endWith(TerminalMode& keys) { m_loop.use(keys); }
 
     /// Sees to it that the service gets what was told.
     void close();
@@ -68,8 +67,7 @@ private:
     void check();
 
     WebSocketClient m_client;
-    Signals& m_signals;
-    TerminalKeys* m_keys = nullptr;
+    EventLoop m_loop;
     std::chrono::milliseconds m_limit;
     int m_checksOwed = 0;
 };

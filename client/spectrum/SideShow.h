@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "client/terminal/Deadline.h"
+#include "client/terminal/Poll.h"
 
 namespace vexa::client {
 
@@ -31,10 +32,10 @@ public:
     SideShow(const SideShow&) = delete;
     SideShow& operator=(const SideShow&) = delete;
 
-    virtual int descriptor() const = 0;
-    virtual short events() const = 0;
+    /// What has to be waited for until process() has something to do.
+    virtual Polled polled() const = 0;
 
-    /// When process() has something to do although nothing has arrived.
+    /// When it has something to do although nothing has arrived.
     virtual Deadline wake() const = 0;
 
     /// Takes in what has arrived, without waiting. Throws ClientError when the connection is lost.

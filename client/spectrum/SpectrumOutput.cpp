@@ -73,7 +73,7 @@ void SpectrumOutput::printLine(const SpectralScan::Told& told, const SpectralVie
 }
 
 Deadline SpectrumOutput::refresh(const SpectralView& view) {
-    if (!m_screen || !m_changed) return Deadline::never();
+    if (!m_screen || !(m_changed || m_screen->needsDrawing())) return Deadline::never();
     if (!m_nextDrawing.isOver()) return m_nextDrawing;
     auto lines = picture(view);
     lines.front() += "   (q or Ctrl-C ends)";
@@ -111,20 +111,6 @@ std::vector<std::string> SpectrumOutput::picture(const SpectralView& view) const
         m_side->lines({m_screen->columns(), left, m_screen->rows(), TerminalScreen::wantsColour()});
     lines.insert(lines.end(), below.begin(), below.end());
     return lines;
-}
-
-void SpectrumOutput::handleSignal(Signal signal) {
-    if (signal == Signal::Suspend) {
-        if (m_screen) m_screen->leave();
-        Signals::suspend();
-        if (m_screen) m_screen->enter();
-    }
-    if (signal == Signal::Resize && m_screen) m_screen->resized();
-    m_changed = true;
-}
-
-bool SpectrumOutput::isQuitKey() {
-    return m_screen->keys().takeQuit();
 }
 
 bool SpectrumOutput::isGone() const {

@@ -8,7 +8,6 @@
 #include "client/spectrum/SideShow.h"
 #include "client/spectrum/SpectralScan.h"
 #include "client/terminal/Deadline.h"
-#include "client/terminal/Signals.h"
 #include "client/terminal/TerminalScreen.h"
 
 namespace vexa::client {
@@ -33,13 +32,8 @@ public:
     /// The last picture, and one line that says what was seen.
     void finish(const SpectralView& view);
 
-    /// The terminal was resized, or this process is to be suspended.
-    void handleSignal(Signal signal);
-
-    int keyDescriptor() const { return m_screen ? m_screen->keys().descriptor() : -1; }
-
-    /// Reads a key; true if it asks for the end.
-    bool isQuitKey();
+    /// The mode that the terminal is in until finish(); null if it is in none.
+    TerminalMode* terminal() { return m_screen ? &*m_screen : nullptr; }
 
     /// Nobody reads the output any more.
     bool isGone() const;
