@@ -40,7 +40,7 @@ public:
         m_fitting = fittingCredentials(m_stored, m_network);
         if (m_network.isConnected) return sayConnected("Already connected to ");
         // What was told until now says nothing of what comes.
-        m_port.hasAdapter();
+        m_port.waitUntilHandled();
         tellOfNetwork(m_port, kCommand, m_options.network);
         if (m_options.noWait) return sayAsked();
         JoinJudge judge(m_options.network);
@@ -73,7 +73,7 @@ private:
     }
 
     int sayAsked() {
-        m_port.hasAdapter();  // the answer comes behind the command
+        m_port.waitUntilHandled();
         sayDone(m_options, "asked", "The service was asked to join " + m_name + ".");
         return kExitOk;
     }

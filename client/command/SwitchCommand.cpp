@@ -53,7 +53,7 @@ int runRefresh(const HotspotOptions& options) {
     HotspotPort port(options.port.find(), signals, options.limit());
     requireAdapter(port);
     port.tell("UPDATE_NETWORK_REALM");
-    port.hasAdapter();  // the answer comes behind the command
+    port.waitUntilHandled();
     say(options, "refreshing", true, "The realms of the networks are being asked for again.");
     return kExitOk;
 }

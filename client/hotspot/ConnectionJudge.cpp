@@ -9,9 +9,7 @@ namespace vexa::client {
 
 namespace {
 
-constexpr const char* kCheck = "GET_IS_CARD_IN";
 constexpr const char* kList = "GET_ALL_NETWORK_LIST";
-constexpr const char* kService = "HotSpot20";
 
 // A connection that nothing was told of counts once it was seen so long; so does a network that is missing.
 constexpr std::chrono::milliseconds kSettled{900};
@@ -22,6 +20,15 @@ bool hasLasted(std::optional<ConnectionJudge::Time>& since, ConnectionJudge::Tim
 }
 
 }  // namespace
+
+ConnectionJudge::ConnectionJudge(std::string network) : m_network(std::move(network)) {
+    check();
+}
+
+void ConnectionJudge::check() {
+    m_questions.push_back(Checkpoints::kQuestion);
+    m_checkpoints.ask();
+}
 
 const Network* ConnectionJudge::find(const NetworkList& list) const {
     const auto found =
@@ -37,24 +44,17 @@ std::vector<const char*> ConnectionJudge::takeQuestions() {
 // comes behind a result knows what kind of result it was.
 Outcome ConnectionJudge::apply(const Event& event, Time now) {
     const Json::Value payload = parseJson(event.data).value_or(Json::Value());
-    if (event.id == "CARD_PLUG_IN" || event.id == "CARD_PLUG_OUT") return applyCard(event);
+    if (event.id == kCardOut) return Outcome::AdapterOut;
+    if (m_checkpoints.take(event) && !m_checkpoints.isPassed()) check();
     if (event.id == "GET_RADIO" && payload == Json::Value(false)) return Outcome::RadioOff;
     if (event.id == "CONNECT_DISCONNECT") {
-        m_results.push_back({payload == Json::Value(1), m_answersOwed == 0, false});
+        m_results.push_back({payload == Json::Value(1), m_checkpoints.isPassed(), false});
         if (wantsLists()) m_questions.push_back(kList);
     } else if (event.id == "GET_IS_INTERNET_ACCESS" && !m_results.empty()) {
         m_results.back().isReport = true;
     } else if (event.id == kList) {
         return judge(networkList(payload), std::exchange(m_results, {}), now);
     }
-    return Outcome::Open;
-}
-
-// Another client's question has the same answer. He would have to ask twice at the very moment to mislead us.
-Outcome ConnectionJudge::applyCard(const Event& event) {
-    if (event.id == "CARD_PLUG_OUT") return Outcome::AdapterOut;
-    if (event.source != kService || m_answersOwed == 0) return Outcome::Open;
-    if (--m_answersOwed > 0) m_questions.push_back(kCheck);
     return Outcome::Open;
 }
 

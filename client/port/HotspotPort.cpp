@@ -10,22 +10,10 @@ using std::chrono::milliseconds;
 
 namespace {
 
-constexpr const char* kCheckCommand = "GET_IS_CARD_IN";
-constexpr const char* kCardOut = "CARD_PLUG_OUT";
-constexpr const char* kSource = "HotSpot20";
-
 // How long a command may stay without an event before we ask whether the service has gone past it.
 constexpr milliseconds kFirstCheck{200};
-// The answer to another client's question looks like the answer to ours. He would have to ask twice at the
-// very moment, ahead of our command, to mislead us.
-constexpr int kChecks = 2;
 constexpr milliseconds kStartLimit{5000};
 constexpr milliseconds kGoodbyeLimit{2000};
-
-/// An adapter that comes or goes makes the same event, from another source.
-bool isCheckAnswer(const Event& event) {
-    return event.source == kSource && (event.id == kCardIn || event.id == kCardOut);
-}
 
 std::string silenceText(milliseconds limit) {
     return "the service did not answer within " +
@@ -39,39 +27,28 @@ HotspotPort::HotspotPort(std::uint16_t port, Signals& signals, milliseconds limi
 
 HotspotPort::Answer HotspotPort::ask(const std::string& command, const std::optional<std::string>& data,
                                      const std::string& event, const Accepts& accepts) {
+    m_checkpoints.begin();
     tell(command, data);
     const Deadline end = Deadline::in(m_limit);
-    Deadline wake = std::min(end, Deadline::in(kFirstCheck));
+    Deadline firstCheck = Deadline::in(kFirstCheck);
     Answer answer;
-    // What is still owed for an earlier question tells nothing about this one.
-    int stale = m_checksOwed;
-    int asked = 0;
-    int answered = 0;
     const auto checkNow = [&] {
-        check();
-        ++asked;
-        wake = end;
+        sendCheck();
+        firstCheck = end;
     };
-    while (answered < kChecks) {
-        const auto told = next(wake);
+    while (!m_checkpoints.isPassed()) {
+        const auto told = next(std::min(end, firstCheck));
         if (!told) {
             if (end.isOver()) throw NoAnswer(silenceText(m_limit));
             checkNow();
         } else if (told->id == event) {
             answer.payload = parseJson(told->data).value_or(Json::Value());
-            if (accepts(*answer.payload)) {
-                answer.isAccepted = true;
-                return answer;
-            }
-            if (asked == 0) checkNow();
-        } else if (isCheckAnswer(*told) && m_checksOwed > 0) {
-            --m_checksOwed;
-            if (stale > 0) {
-                --stale;
-                continue;
-            }
+            answer.isAccepted = accepts(*answer.payload);
+            if (answer.isAccepted) break;
+            if (!m_checkpoints.isAsked()) checkNow();
+        } else if (m_checkpoints.take(*told)) {
             answer.cardIn = told->id == kCardIn;
-            if (++answered < kChecks) checkNow();
+            if (!m_checkpoints.isPassed()) checkNow();
         }
     }
     return answer;
@@ -86,17 +63,18 @@ HotspotPort::Answer HotspotPort::question(const std::string& command, const Acce
 }
 
 bool HotspotPort::hasAdapter() {
+    m_checkpoints.begin();
+    sendCheck();
     const Deadline end = Deadline::in(m_limit);
-    check();
     while (const auto told = next(end)) {
-        if (isCheckAnswer(*told) && --m_checksOwed == 0) return told->id == kCardIn;
+        if (m_checkpoints.take(*told)) return told->id == kCardIn;
     }
     throw NoAnswer(silenceText(m_limit));
 }
 
-void HotspotPort::check() {
-    tell(kCheckCommand);
-    ++m_checksOwed;
+void HotspotPort::sendCheck() {
+    tell(Checkpoints::kQuestion);
+    m_checkpoints.ask();
 }
 
 void HotspotPort::tell(const std::string& command, const std::optional<std::string>& data) {

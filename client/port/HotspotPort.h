@@ -8,6 +8,7 @@
 #include <optional>
 #include <string>
 
+#include "client/port/Checkpoints.h"
 #include "client/port/Event.h"
 #include "client/port/WebSocketClient.h"
 #include "client/terminal/ClientError.h"
@@ -16,11 +17,8 @@
 
 namespace vexa::client {
 
-inline constexpr const char* kCardIn = "CARD_PLUG_IN";
-
 /// A conversation with the hotspot port. Every client hears every event, and an event does not say whose
-/// command it answers: what has arrived is told apart by its content, and by a question of which the answer
-/// must come later.
+/// command it answers: what has arrived is told apart by its content, and by checkpoints behind the command.
 class HotspotPort {
 public:
     /// Connects. Throws ClientError. Each question waits for `limit` at most.
@@ -47,9 +45,12 @@ public:
     /// its adapter well enough to answer; it is asked again, for a while.
     Answer question(const std::string& command, const Accepts& accepts);
 
-    /// Whether the service has an adapter. Everything that was told before has been handled then. Throws
-    /// NoAnswer.
+    /// Whether the service has an adapter. Throws NoAnswer.
     bool hasAdapter();
+
+    /// Returns when the service has handled everything that was told before; what it tells until then is
+    /// passed over. Throws NoAnswer.
+    void waitUntilHandled() { hasAdapter(); }
 
     /// Sends a command that nothing answers.
     void tell(const std::string& command, const std::optional<std::string>& data = std::nullopt);
@@ -64,12 +65,12 @@ public:
     void close();
 
 private:
-    void check();
+    void sendCheck();
 
     WebSocketClient m_client;
     EventLoop m_loop;
     std::chrono::milliseconds m_limit;
-    int m_checksOwed = 0;
+    Checkpoints m_checkpoints;
 };
 
 /// For events of which the first will do.
