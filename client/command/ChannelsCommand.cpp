@@ -4,10 +4,11 @@
 #include <iomanip>
 #include <iostream>
 #include <memory>
+#include <sstream>
 
 #include "client/command/Commands.h"
+#include "client/command/Output.h"
 #include "client/command/PortOption.h"
-#include "client/port/JsonLine.h"
 #include "client/spectrum/SpectralScan.h"
 #include "client/terminal/ClientError.h"
 #include "client/terminal/EventLoop.h"
@@ -34,14 +35,17 @@ bool waitForList(SpectralScan& scan, Signals& signals) {
     return true;
 }
 
-void printTable(const SpectralView& view) {
-    std::cout << "Channel  Order\n";
+std::vector<std::string> channelTable(const SpectralView& view) {
+    std::vector<std::string> lines{"Channel  Order"};
     for (const auto& channel : view.channels()) {
-        std::cout << std::setw(7) << channel.number << std::setw(7) << channel.order << '\n';
+        std::ostringstream line;
+        line << std::setw(7) << channel.number << std::setw(7) << channel.order;
+        lines.push_back(line.str());
     }
+    return lines;
 }
 
-void printJson(const SpectralView& view) {
+Json::Value channelsJson(const SpectralView& view) {
     Json::Value list(Json::arrayValue);
     for (const auto& channel : view.channels()) {
         Json::Value entry(Json::objectValue);
@@ -49,14 +53,14 @@ void printJson(const SpectralView& view) {
         entry["order"] = channel.order;
         list.append(entry);
     }
-    std::cout << jsonLine(list) << '\n';
+    return list;
 }
 
 int runChannels(const ChannelsOptions& options) {
     Signals signals;
     SpectralScan scan(options.port.find());
     if (!waitForList(scan, signals)) return kExitOk;
-    options.json ? printJson(scan.view()) : printTable(scan.view());
+    print(options.json, channelsJson(scan.view()), channelTable(scan.view()));
     if (scan.view().channels().empty()) std::cerr << "vexa: the service knows no channels\n";
     return kExitOk;
 }

@@ -22,7 +22,7 @@ int runListen(const ListenOptions& options) {
     while (loop.wait(client.polled(), Deadline::never())) {
         client.process();
         if (!printEvents(client)) break;
-        if (!client.isOpen()) throw ClientError("the service has closed the connection");
+        client.requireOpen();
     }
     return kExitOk;
 }

@@ -30,7 +30,7 @@ void printAnswers(WebSocketClient& client, Signals& signals, milliseconds wait) 
     while (!deadline.isOver() && loop.wait(client.polled(), deadline)) {
         client.process();
         if (!printEvents(client)) return;
-        if (!client.isOpen()) throw ClientError("the service has closed the connection");
+        client.requireOpen();
     }
 }
 

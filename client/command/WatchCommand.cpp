@@ -59,20 +59,20 @@ private:
         m_hotspot.process();
         while (const auto text = m_hotspot.take()) {
             const auto event = parseEvent(*text);
-            if (m_options.json) printEvent(*text);
+            if (m_options.json) std::cout << eventLine(*text) << '\n';
             if (!event) continue;
             for (const std::string& sentence : m_narrator.tell(*event)) {
                 if (!m_options.json) say("hotspot ", sentence);
             }
             ask(m_narrator.takeQuestions());
         }
-        if (!m_hotspot.isOpen()) throw ClientError("the service has closed the connection");
+        m_hotspot.requireOpen();
     }
 
     void tellSpectral() {
         for (const auto& told : m_spectral.process()) {
             if (m_options.json)
-                printEvent(told.text);
+                std::cout << eventLine(told.text) << '\n';
             else
                 say("spectrum", describeEvent(told.event, told.update, m_spectral.view()));
         }

@@ -8,8 +8,8 @@
 
 #include "client/hotspot/CredentialText.h"
 #include "client/machine/MachineRegistry.h"
+#include "client/port/EventLines.h"
 #include "client/port/JsonLine.h"
-#include "client/terminal/ClientError.h"
 #include "client/terminal/Text.h"
 
 namespace vexa::client {
@@ -61,12 +61,6 @@ std::string textOf(const std::string& line) {
     return printable(std::regex_replace(std::regex_replace(line, kHead, ""), kAddress, " ..."));
 }
 
-std::string commandData(const char* network) {
-    Json::Value data(Json::objectValue);
-    data["NetWorkName"] = network;
-    return jsonLine(data);
-}
-
 void append(std::vector<std::string>& lines, const std::vector<std::string>& block) {
     lines.emplace_back();
     lines.insert(lines.end(), block.begin(), block.end());
@@ -101,10 +95,10 @@ void DemoStory::takeEvents(std::vector<Item>& items) {
         isAnything = true;
         const auto event = parseEvent(*text);
         if (!event) continue;
-        items.push_back({jsonLine(parseJson(*text).value_or(Json::Value())), ""});
+        items.push_back({eventLine(*text), ""});
         tell(items, *event);
     }
-    if (!isAnything && !m_client.isOpen()) throw ClientError("the service has closed the connection");
+    if (!isAnything) m_client.requireOpen();
 }
 
 void DemoStory::tell(std::vector<Item>& items, const Event& event) {
@@ -123,7 +117,7 @@ void DemoStory::act(std::vector<Item>& items) {
     m_nextStep = Deadline::never();
     if (m_stepsDone == kSteps.size() || m_narrator.joined().back() != kSteps[m_stepsDone].joined) return;
     const Step& step = kSteps[m_stepsDone++];
-    const std::string command = commandText(step.command, commandData(step.network));
+    const std::string command = commandText(step.command, networkData(step.network));
     m_client.send(command);
     say(items, Speaker::Traveller, command, step.sentence);
 }
@@ -137,10 +131,7 @@ void DemoStory::takeReasons(std::vector<Item>& items) {
         const std::string text = textOf(line.text);
         if (std::find(m_reasons.begin(), m_reasons.end(), text) != m_reasons.end()) continue;
         m_reasons.push_back(text);
-        Json::Value object(Json::objectValue);
-        object["file"] = line.file;
-        object["line"] = asUtf8(line.text);
-        say(items, Speaker::Log, jsonLine(object), "log: " + text);
+        say(items, Speaker::Log, jsonOf(line), "log: " + text);
     }
 }
 

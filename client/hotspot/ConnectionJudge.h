@@ -58,7 +58,6 @@ protected:
     virtual Outcome judge(const NetworkList& list, const std::vector<Result>& results, Time now) = 0;
 
     const std::string& network() const { return m_network; }
-    const Network* find(const NetworkList& list) const;
 
 private:
     void check();

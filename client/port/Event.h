@@ -1,5 +1,7 @@
 #pragma once
 
+#include <json/value.h>
+
 #include <optional>
 #include <string>
 #include <string_view>
@@ -18,6 +20,9 @@ struct Event {
 
 /// Nothing if the text is no event.
 std::optional<Event> parseEvent(std::string_view text);
+
+/// Its data as JSON; null if it is none.
+Json::Value payloadOf(const Event& event);
 
 /// The text of a command; `data` goes along as it is given.
 std::string commandText(const std::string& id, const std::optional<std::string>& data = std::nullopt);

@@ -2,8 +2,6 @@
 
 #include <algorithm>
 
-#include "client/port/JsonLine.h"
-
 namespace vexa::client {
 
 using std::chrono::milliseconds;
@@ -42,7 +40,7 @@ HotspotPort::Answer HotspotPort::ask(const std::string& command, const std::opti
             if (end.isOver()) throw NoAnswer(silenceText(m_limit));
             checkNow();
         } else if (told->id == event) {
-            answer.payload = parseJson(told->data).value_or(Json::Value());
+            answer.payload = payloadOf(*told);
             answer.isAccepted = accepts(*answer.payload);
             if (answer.isAccepted) break;
             if (!m_checkpoints.isAsked()) checkNow();
@@ -86,7 +84,7 @@ std::optional<Event> HotspotPort::next(Deadline deadline) {
         while (const auto text = m_client.take()) {
             if (auto event = parseEvent(*text)) return event;
         }
-        if (!m_client.isOpen()) throw NoAnswer("the service has closed the connection");
+        m_client.requireOpen();
         if (deadline.isOver()) return std::nullopt;
         if (!m_loop.wait(m_client.polled(), deadline))
             throw StoppedByUser("stopped before the service had answered");

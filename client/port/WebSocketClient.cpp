@@ -156,8 +156,8 @@ void WebSocketClient::send(std::string text) {
 std::optional<std::string> WebSocketClient::take() {
     return m_impl->take();
 }
-bool WebSocketClient::isOpen() const {
-    return m_impl->isOpen();
+void WebSocketClient::requireOpen() const {
+    if (!m_impl->isOpen()) throw NoAnswer("the service has closed the connection");
 }
 void WebSocketClient::close(std::chrono::milliseconds limit) {
     m_impl->close(limit);

@@ -34,8 +34,8 @@ public:
     /// The oldest message not yet taken.
     std::optional<std::string> take();
 
-    /// False once the connection is lost.
-    bool isOpen() const;
+    /// Throws NoAnswer once the connection is lost.
+    void requireOpen() const;
 
     /// Sends what is queued and says goodbye; waits for the answer up to `limit`.
     void close(std::chrono::milliseconds limit);

@@ -4,6 +4,7 @@
 #include <iostream>
 #include <sstream>
 
+#include "client/port/EventLines.h"
 #include "client/port/JsonLine.h"
 #include "client/spectrum/SpectralPicture.h"
 #include "client/spectrum/SpectralText.h"
@@ -66,7 +67,7 @@ void SpectrumOutput::showSide(const std::vector<SideShow::Item>& items) {
 
 void SpectrumOutput::printLine(const SpectralScan::Told& told, const SpectralView& view) const {
     if (m_form == Form::Json) {
-        std::cout << jsonLine(parseJson(told.text).value_or(Json::Value())) << '\n';
+        std::cout << eventLine(told.text) << '\n';
     } else {
         std::cout << secondsSince(m_start) << "  " << describeEvent(told.event, told.update, view) << '\n';
     }
