@@ -4,19 +4,18 @@
 #include <iomanip>
 #include <iostream>
 #include <memory>
+#include <sstream>
 
 #include "client/command/Commands.h"
+#include "client/command/Output.h"
 #include "client/command/PortOption.h"
-#include "client/port/Activity.h"
-#include "client/port/JsonLine.h"
 #include "client/spectrum/SpectralScan.h"
 #include "client/terminal/ClientError.h"
+#include "client/terminal/EventLoop.h"
 
 namespace vexa::client {
 
 namespace {
-
-using std::chrono::steady_clock;
 
 constexpr std::chrono::seconds kAnswerLimit{10};
 
@@ -26,29 +25,27 @@ struct ChannelsOptions {
 };
 
 bool waitForList(SpectralScan& scan, Signals& signals) {
-    const auto deadline = steady_clock::now() + kAnswerLimit;
+    EventLoop loop(signals);
+    const Deadline deadline = Deadline::in(kAnswerLimit);
     while (!scan.view().hasChannelList()) {
-        const auto left = std::chrono::ceil<std::chrono::milliseconds>(deadline - steady_clock::now());
-        switch (waitForActivity(scan.descriptor(), scan.events(), signals, left)) {
-            case Activity::StopAsked:
-                return false;
-            case Activity::Timeout:
-                throw ClientError("the service did not answer");
-            case Activity::Ready:
-                scan.process();
-        }
+        if (deadline.isOver()) throw ClientError("the service did not answer");
+        if (!loop.wait(scan.polled(), deadline)) return false;
+        scan.process();
     }
     return true;
 }
 
-void printTable(const SpectralView& view) {
-    std::cout << "Channel  Order\n";
+std::vector<std::string> channelTable(const SpectralView& view) {
+    std::vector<std::string> lines{"Channel  Order"};
     for (const auto& channel : view.channels()) {
-        std::cout << std::setw(7) << channel.number << std::setw(7) << channel.order << '\n';
+        std::ostringstream line;
+        line << std::setw(7) << channel.number << std::setw(7) << channel.order;
+        lines.push_back(line.str());
     }
+    return lines;
 }
 
-void printJson(const SpectralView& view) {
+Json::Value channelsJson(const SpectralView& view) {
     Json::Value list(Json::arrayValue);
     for (const auto& channel : view.channels()) {
         Json::Value entry(Json::objectValue);
@@ -56,14 +53,14 @@ void printJson(const SpectralView& view) {
         entry["order"] = channel.order;
         list.append(entry);
     }
-    std::cout << jsonLine(list) << '\n';
+    return list;
 }
 
 int runChannels(const ChannelsOptions& options) {
     Signals signals;
     SpectralScan scan(options.port.find());
     if (!waitForList(scan, signals)) return kExitOk;
-    options.json ? printJson(scan.view()) : printTable(scan.view());
+    print(options.json, channelsJson(scan.view()), channelTable(scan.view()));
     if (scan.view().channels().empty()) std::cerr << "vexa: the service knows no channels\n";
     return kExitOk;
 }

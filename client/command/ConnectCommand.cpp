@@ -35,12 +35,12 @@ public:
 
     int run() {
         requireRadio(m_port);
-        m_network = findNetwork();
+        m_network = wantedNetwork();
         m_stored = askCredentials(m_port);
         m_fitting = fittingCredentials(m_stored, m_network);
         if (m_network.isConnected) return sayConnected("Already connected to ");
         // What was told until now says nothing of what comes.
-        m_port.hasAdapter();
+        m_port.waitUntilHandled();
         tellOfNetwork(m_port, kCommand, m_options.network);
         if (m_options.noWait) return sayAsked();
         JoinJudge judge(m_options.network);
@@ -50,21 +50,16 @@ public:
     }
 
 private:
-    Network findNetwork() {
+    Network wantedNetwork() {
         const NetworkList list = askNetworks(m_port).value_or(NetworkList());
-        for (const Network& network : list) {
-            if (network.name == m_options.network) return network;
-        }
+        if (const Network* const network = findNetwork(list, m_options.network)) return *network;
         throw ClientError(whyNotFound(list));
     }
 
     std::string whyNotFound(const NetworkList& list) const {
         if (list.empty() && !hotspotSwitch(m_options.hotspot.port.machine()).value_or(true))
             return "hotspot networks are disabled: `vexa enable` enables them";
-        std::string names;
-        for (const Network& network : list)
-            names += (names.empty() ? "" : ", ") + inQuotes(network.name);
-        return "no network " + m_name + " is in range" + (names.empty() ? "" : "; there is " + names);
+        return "no network " + m_name + " is in range" + (list.empty() ? "" : "; there is " + namesOf(list));
     }
 
     std::chrono::seconds limit() const {
@@ -73,7 +68,7 @@ private:
     }
 
     int sayAsked() {
-        m_port.hasAdapter();  // the answer comes behind the command
+        m_port.waitUntilHandled();
         sayDone(m_options, "asked", "The service was asked to join " + m_name + ".");
         return kExitOk;
     }
@@ -81,20 +76,15 @@ private:
     int sayConnected(const char* beginning) {
         const auto names = credentialsOf(m_network, m_stored, m_options.hotspot.port.machine());
         const bool hasInternet = askInternet(m_port).value_or(false);
-        std::vector<std::string> quoted;
         Json::Value details(Json::objectValue);
         details["credentials"] = Json::Value(Json::arrayValue);
-        for (const std::string& name : names) {
-            quoted.push_back(inQuotes(name));
+        for (const std::string& name : names)
             details["credentials"].append(name);
-        }
         details["internet"] = hasInternet;
-        sayDone(m_options, "connected",
-                beginning + m_name +
-                    (names.empty() ? ", with no credential of ours"
-                                   : " with the credential " + alternatives(quoted)) +
-                    (hasInternet ? "." : "; it does not reach the internet."),
-                details);
+        sayDone(
+            m_options, "connected",
+            beginning + m_name + withOneOf(names) + (hasInternet ? "." : "; it does not reach the internet."),
+            details);
         return kExitOk;
     }
 

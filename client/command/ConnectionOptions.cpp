@@ -2,9 +2,9 @@
 
 #include <CLI/CLI.hpp>
 #include <algorithm>
-#include <iostream>
 
-#include "client/port/JsonLine.h"
+#include "client/command/Output.h"
+#include "client/hotspot/Network.h"
 
 namespace vexa::client {
 
@@ -26,19 +26,13 @@ std::chrono::seconds ConnectionOptions::answerLimit() const {
 
 void sayDone(const ConnectionOptions& options, const char* verb, const std::string& sentence,
              Json::Value details) {
-    if (!options.hotspot.json) {
-        std::cout << sentence << '\n';
-        return;
-    }
     details["done"] = verb;
     details["network"] = options.network;
-    std::cout << jsonLine(details) << '\n';
+    print(options.hotspot.json, details, sentence);
 }
 
 void tellOfNetwork(HotspotPort& port, const char* command, const std::string& network) {
-    Json::Value data(Json::objectValue);
-    data["NetWorkName"] = network;
-    port.tell(command, jsonLine(data));
+    port.tell(command, networkData(network));
 }
 
 }  // namespace vexa::client

@@ -41,7 +41,7 @@ CredentialList storedCredentials(const ServicePorts& ports, Signals& signals) {
 /// False if the user has ended it before there was anything to see.
 bool showAll(const DemoOptions& options, const ServicePorts& ports, const MachineFolder& machine,
              Signals& signals) try {
-    const auto end = std::chrono::steady_clock::now() + std::chrono::seconds(options.seconds);
+    const Deadline end = Deadline::in(std::chrono::seconds(options.seconds));
     DemoStory story(ports.hs20, machine, storedCredentials(ports, signals));
     SpectrumOutput output(formOf(options), &story);
     SpectralScan scan(ports.sa);

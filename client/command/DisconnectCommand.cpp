@@ -44,11 +44,11 @@ int runDisconnect(ConnectionOptions& options) {
     options.network = networkToLeave(options, connected);
     const bool isConnected = connected != nullptr && connected->name == options.network;
     // What was told until now says nothing of what comes.
-    port.hasAdapter();
+    port.waitUntilHandled();
     tellOfNetwork(port, kCommand, options.network);
     const std::string name = inQuotes(options.network);
     if (options.noWait) {
-        port.hasAdapter();  // the answer comes behind the command
+        port.waitUntilHandled();
         sayDone(options, "asked", "The service was asked to leave " + name + ".");
         return kExitOk;
     }

@@ -2,9 +2,9 @@
 #include <memory>
 
 #include "client/command/Commands.h"
-#include "client/port/Activity.h"
 #include "client/port/EventLines.h"
 #include "client/terminal/ClientError.h"
+#include "client/terminal/EventLoop.h"
 
 namespace vexa::client {
 
@@ -18,10 +18,11 @@ struct ListenOptions {
 int runListen(const ListenOptions& options) {
     Signals signals;
     WebSocketClient client(options.port);
-    while (waitForActivity(client.descriptor(), client.events(), signals, std::nullopt) == Activity::Ready) {
+    EventLoop loop(signals);
+    while (loop.wait(client.polled(), Deadline::never())) {
         client.process();
         if (!printEvents(client)) break;
-        if (!client.isOpen()) throw ClientError("the service has closed the connection");
+        client.requireOpen();
     }
     return kExitOk;
 }

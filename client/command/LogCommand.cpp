@@ -1,5 +1,3 @@
-#include <json/value.h>
-
 #include <CLI/CLI.hpp>
 #include <iostream>
 #include <memory>
@@ -9,9 +7,8 @@
 #include "client/machine/LogFiles.h"
 #include "client/machine/MachineFolder.h"
 #include "client/machine/ServiceHost.h"
-#include "client/port/Activity.h"
-#include "client/port/JsonLine.h"
 #include "client/terminal/ClientError.h"
+#include "client/terminal/EventLoop.h"
 #include "client/terminal/Text.h"
 
 namespace vexa::client {
@@ -42,21 +39,15 @@ std::string whyOff(const MachineFolder& machine) {
 
 void print(const std::vector<LogFiles::Line>& lines, std::size_t from, bool json) {
     for (std::size_t i = from; i < lines.size(); ++i) {
-        if (json) {
-            Json::Value object(Json::objectValue);
-            object["file"] = lines[i].file;
-            object["line"] = asUtf8(lines[i].text);
-            std::cout << jsonLine(object) << '\n';
-        } else {
-            std::cout << printable(lines[i].text, Tabs::Kept) << '\n';
-        }
+        std::cout << (json ? jsonOf(lines[i]) : printable(lines[i].text, Tabs::Kept)) << '\n';
     }
     std::cout << std::flush;
 }
 
 void follow(LogFiles& files, const LogOptions& options) {
     Signals signals;
-    while (std::cout && waitForActivity(-1, 0, signals, kBetweenLooks) != Activity::StopAsked)
+    EventLoop loop(signals);
+    while (std::cout && loop.wait(Deadline::in(kBetweenLooks)))
         print(files.takeLines(), 0, options.json);
 }
 

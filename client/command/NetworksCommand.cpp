@@ -4,10 +4,11 @@
 
 #include "client/command/Commands.h"
 #include "client/command/HotspotOptions.h"
+#include "client/command/Output.h"
 #include "client/hotspot/HotspotQuestions.h"
 #include "client/hotspot/Network.h"
 #include "client/port/HotspotPort.h"
-#include "client/port/JsonLine.h"
+#include "client/terminal/TerminalKeys.h"
 
 namespace vexa::client {
 
@@ -18,16 +19,9 @@ struct NetworksOptions {
     bool watch = false;
 };
 
-bool print(const NetworkList& list, bool json) {
-    if (json) {
-        std::cout << jsonLine(networksJson(list)) << '\n';
-    } else if (list.empty()) {
-        std::cout << "No hotspot networks.\n";
-    } else {
-        for (const auto& line : networkTable(list))
-            std::cout << line << '\n';
-    }
-    return static_cast<bool>(std::cout << std::flush);
+bool show(const NetworkList& list, bool json) {
+    return print(json, networksJson(list),
+                 list.empty() ? std::vector<std::string>{"No hotspot networks."} : networkTable(list));
 }
 
 /// An empty list has reasons that the list does not tell.
@@ -42,14 +36,14 @@ void explain(HotspotPort& port, const HotspotOptions& options) {
 
 // An adapter that comes is asked for its list; all later lists come by themselves.
 void watch(HotspotPort& port, NetworkList shown, bool json) {
-    while (const auto event = port.next(std::nullopt)) {
+    while (const auto event = port.next(Deadline::never())) {
         if (event->id == kCardIn) port.tell(kNetworkList);
         if (event->id != kNetworkList) continue;
-        NetworkList list = networkList(parseJson(event->data).value_or(Json::Value()));
+        NetworkList list = networkList(payloadOf(*event));
         if (list == shown) continue;
         shown = std::move(list);
         if (!json) std::cout << '\n';
-        if (!print(shown, json)) return;
+        if (!show(shown, json)) return;
     }
 }
 
@@ -60,7 +54,7 @@ int runNetworks(const NetworksOptions& options) {
     const auto list = askNetworks(port);
     if (!list && !options.watch) throw ClientError(kNoAdapter);
     if (!list) std::cerr << "vexa: " << kNoAdapter << '\n';
-    if (list) print(*list, json);
+    if (list) show(*list, json);
     if (list && list->empty() && !json) explain(port, options.hotspot);
     if (!options.watch) return kExitOk;
     std::optional<TerminalKeys> keys;

@@ -5,10 +5,10 @@
 
 #include "client/command/Commands.h"
 #include "client/command/PortOption.h"
-#include "client/port/Activity.h"
 #include "client/spectrum/SpectralText.h"
 #include "client/spectrum/SpectrumWatch.h"
 #include "client/terminal/ClientError.h"
+#include "client/terminal/EventLoop.h"
 
 namespace vexa::client {
 
@@ -16,7 +16,6 @@ namespace {
 
 using std::chrono::milliseconds;
 using std::chrono::seconds;
-using std::chrono::steady_clock;
 
 constexpr int kDefaultTimeout = 15;
 
@@ -35,7 +34,7 @@ struct ScanOptions {
 /// Decides when a scan has told enough.
 class Completeness {
 public:
-    explicit Completeness(seconds limit) : m_limit(steady_clock::now() + limit), m_end(m_limit) {}
+    explicit Completeness(seconds limit) : m_limit(Deadline::in(limit)), m_end(m_limit) {}
 
     /// To be called when the view has changed.
     void update(const SpectralView& view) {
@@ -43,27 +42,24 @@ public:
         if (known == m_known) return;
         m_known = known;
         const bool all = view.hasChannelList() && known == view.channels().size();
-        m_end = std::min(m_limit, steady_clock::now() + (all ? kRestOfBurst : kQuietLimit));
+        m_end = std::min(m_limit, Deadline::in(all ? kRestOfBurst : kQuietLimit));
     }
 
-    /// How long to wait for more; 0: it is enough.
-    milliseconds left() const {
-        return std::max(milliseconds(0), std::chrono::ceil<milliseconds>(m_end - steady_clock::now()));
-    }
+    /// How long to wait for more.
+    Deadline end() const { return m_end; }
 
 private:
-    steady_clock::time_point m_limit;
-    steady_clock::time_point m_end;
+    Deadline m_limit;
+    Deadline m_end;
     std::size_t m_known = 0;
 };
 
 void scanOnce(SpectralScan& scan, Signals& signals, seconds limit) {
+    EventLoop loop(signals);
     Completeness completeness(limit);
     scan.start();
-    while (completeness.left() > milliseconds(0)) {
-        const Activity activity =
-            waitForActivity(scan.descriptor(), scan.events(), signals, completeness.left());
-        if (activity == Activity::StopAsked) break;
+    while (!completeness.end().isOver()) {
+        if (!loop.wait(scan.polled(), completeness.end())) break;
         if (!scan.process().empty()) completeness.update(scan.view());
     }
     scan.stop();
@@ -74,7 +70,7 @@ int runScan(const ScanOptions& options) {
     SpectralScan scan(options.port.find());
     if (options.watch) {
         SpectrumOutput output(options.json ? SpectrumOutput::Form::Json : SpectrumOutput::Form::Readable);
-        watchSpectrum(scan, signals, output, std::nullopt);
+        watchSpectrum(scan, signals, output, Deadline::never());
         return kExitOk;
     }
     scanOnce(scan, signals, seconds(options.timeout));

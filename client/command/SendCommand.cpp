@@ -2,17 +2,16 @@
 #include <memory>
 
 #include "client/command/Commands.h"
-#include "client/port/Activity.h"
 #include "client/port/Event.h"
 #include "client/port/EventLines.h"
 #include "client/terminal/ClientError.h"
+#include "client/terminal/EventLoop.h"
 
 namespace vexa::client {
 
 namespace {
 
 using std::chrono::milliseconds;
-using std::chrono::steady_clock;
 
 constexpr int kDefaultWaitMs = 1000;
 constexpr milliseconds kGoodbyeLimit{2000};
@@ -26,14 +25,12 @@ struct SendOptions {
 };
 
 void printAnswers(WebSocketClient& client, Signals& signals, milliseconds wait) {
-    const auto deadline = steady_clock::now() + wait;
-    while (true) {
-        const auto left = std::chrono::ceil<milliseconds>(deadline - steady_clock::now());
-        if (left <= milliseconds(0)) return;
-        if (waitForActivity(client.descriptor(), client.events(), signals, left) != Activity::Ready) return;
+    EventLoop loop(signals);
+    const Deadline deadline = Deadline::in(wait);
+    while (!deadline.isOver() && loop.wait(client.polled(), deadline)) {
         client.process();
         if (!printEvents(client)) return;
-        if (!client.isOpen()) throw ClientError("the service has closed the connection");
+        client.requireOpen();
     }
 }
 

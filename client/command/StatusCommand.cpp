@@ -1,13 +1,12 @@
 #include <CLI/CLI.hpp>
-#include <iostream>
 #include <memory>
 
 #include "client/command/Commands.h"
 #include "client/command/HotspotOptions.h"
+#include "client/command/Output.h"
 #include "client/hotspot/Fitting.h"
 #include "client/hotspot/HotspotQuestions.h"
 #include "client/port/HotspotPort.h"
-#include "client/port/JsonLine.h"
 #include "client/terminal/Text.h"
 
 namespace vexa::client {
@@ -86,12 +85,7 @@ int runStatus(const HotspotOptions& options) {
     Signals signals;
     HotspotPort port(options.port.find(), signals, options.limit());
     const Status status = askStatus(port, options);
-    if (options.json) {
-        std::cout << jsonLine(statusJson(status)) << '\n';
-    } else {
-        for (const auto& line : statusLines(status))
-            std::cout << line << '\n';
-    }
+    print(options.json, statusJson(status), statusLines(status));
     return kExitOk;
 }
 

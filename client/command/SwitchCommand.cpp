@@ -1,13 +1,12 @@
 #include <CLI/CLI.hpp>
-#include <iostream>
 #include <memory>
 
 #include "client/command/Commands.h"
 #include "client/command/HotspotOptions.h"
+#include "client/command/Output.h"
 #include "client/hotspot/HotspotQuestions.h"
 #include "client/machine/MachineRegistry.h"
 #include "client/port/HotspotPort.h"
-#include "client/port/JsonLine.h"
 
 namespace vexa::client {
 
@@ -16,13 +15,9 @@ namespace {
 constexpr const char* kSwitch = "SET_HOTSPOT_AUTO_CONNECT";
 
 void say(const HotspotOptions& options, const char* member, const Json::Value& value, const char* sentence) {
-    if (!options.json) {
-        std::cout << sentence << '\n';
-        return;
-    }
     Json::Value object(Json::objectValue);
     object[member] = value;
-    std::cout << jsonLine(object) << '\n';
+    print(options.json, object, sentence);
 }
 
 // Without an adapter, or before it knows the adapter, the service answers all the same, and turns nothing. It
@@ -53,7 +48,7 @@ int runRefresh(const HotspotOptions& options) {
     HotspotPort port(options.port.find(), signals, options.limit());
     requireAdapter(port);
     port.tell("UPDATE_NETWORK_REALM");
-    port.hasAdapter();  // the answer comes behind the command
+    port.waitUntilHandled();
     say(options, "refreshing", true, "The realms of the networks are being asked for again.");
     return kExitOk;
 }

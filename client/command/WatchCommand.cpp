@@ -9,18 +9,16 @@
 #include "client/command/PortOption.h"
 #include "client/hotspot/HotspotNarrator.h"
 #include "client/machine/MachineRegistry.h"
-#include "client/port/Activity.h"
 #include "client/port/EventLines.h"
 #include "client/spectrum/SpectralScan.h"
 #include "client/spectrum/SpectralText.h"
 #include "client/terminal/ClientError.h"
+#include "client/terminal/EventLoop.h"
+#include "client/terminal/TerminalKeys.h"
 
 namespace vexa::client {
 
 namespace {
-
-using std::chrono::milliseconds;
-using std::chrono::steady_clock;
 
 struct WatchOptions {
     PortOption spectral{Half::Spectral};
@@ -46,10 +44,7 @@ public:
         ask(HotspotNarrator::firstQuestions());
     }
 
-    std::array<Awaited, 2> awaited() const {
-        return {Awaited{m_hotspot.descriptor(), m_hotspot.events()},
-                Awaited{m_spectral.descriptor(), m_spectral.events()}};
-    }
+    std::array<Polled, 2> polled() const { return {m_hotspot.polled(), m_spectral.polled()}; }
 
     /// Tells what has come. False once nobody reads it.
     bool tell() {
@@ -64,20 +59,20 @@ private:
         m_hotspot.process();
         while (const auto text = m_hotspot.take()) {
             const auto event = parseEvent(*text);
-            if (m_options.json) printEvent(*text);
+            if (m_options.json) std::cout << eventLine(*text) << '\n';
             if (!event) continue;
             for (const std::string& sentence : m_narrator.tell(*event)) {
                 if (!m_options.json) say("hotspot ", sentence);
             }
             ask(m_narrator.takeQuestions());
         }
-        if (!m_hotspot.isOpen()) throw ClientError("the service has closed the connection");
+        m_hotspot.requireOpen();
     }
 
     void tellSpectral() {
         for (const auto& told : m_spectral.process()) {
             if (m_options.json)
-                printEvent(told.text);
+                std::cout << eventLine(told.text) << '\n';
             else
                 say("spectrum", describeEvent(told.event, told.update, m_spectral.view()));
         }
@@ -95,23 +90,17 @@ private:
     HotspotNarrator m_narrator;
 };
 
-std::optional<milliseconds> leftUntil(std::optional<steady_clock::time_point> end) {
-    if (!end) return std::nullopt;
-    return std::chrono::ceil<milliseconds>(*end - steady_clock::now());
-}
-
 int runWatch(const WatchOptions& options) {
     Signals signals;
     Watch watch(options);
-    std::optional<steady_clock::time_point> end;
-    if (options.seconds > 0) end = steady_clock::now() + std::chrono::seconds(options.seconds);
+    const Deadline end =
+        options.seconds > 0 ? Deadline::in(std::chrono::seconds(options.seconds)) : Deadline::never();
     std::optional<TerminalKeys> keys;
     if (TerminalKeys::isUsable()) keys.emplace();
-    while (watch.tell()) {
-        const auto left = leftUntil(end);
-        if (left && *left <= milliseconds(0)) break;
-        const Activity activity = waitForActivity(watch.awaited(), signals, keys ? &*keys : nullptr, left);
-        if (activity == Activity::StopAsked) break;
+    EventLoop loop(signals, keys ? &*keys : nullptr);
+    while (watch.tell() && !end.isOver()) {
+        auto polled = watch.polled();
+        if (!loop.wait(polled, end)) break;
     }
     return kExitOk;
 }

@@ -8,14 +8,13 @@
 
 #include "client/hotspot/CredentialText.h"
 #include "client/machine/MachineRegistry.h"
+#include "client/port/EventLines.h"
 #include "client/port/JsonLine.h"
-#include "client/terminal/ClientError.h"
 #include "client/terminal/Text.h"
 
 namespace vexa::client {
 
 using std::chrono::milliseconds;
-using std::chrono::steady_clock;
 
 namespace {
 
@@ -62,12 +61,6 @@ std::string textOf(const std::string& line) {
     return printable(std::regex_replace(std::regex_replace(line, kHead, ""), kAddress, " ..."));
 }
 
-std::string commandData(const char* network) {
-    Json::Value data(Json::objectValue);
-    data["NetWorkName"] = network;
-    return jsonLine(data);
-}
-
 void append(std::vector<std::string>& lines, const std::vector<std::string>& block) {
     lines.emplace_back();
     lines.insert(lines.end(), block.begin(), block.end());
@@ -79,14 +72,12 @@ DemoStory::DemoStory(std::uint16_t port, const MachineFolder& machine, Credentia
     : m_client(port),
       m_narrator([machine] { return readConnectionMethod(machine); }),
       m_stored(std::move(stored)),
-      m_log(machine.dumpFolder()),
-      m_start(steady_clock::now()),
-      m_nextLook(m_start) {
+      m_log(machine.dumpFolder()) {
     ask(HotspotNarrator::firstQuestions());
 }
 
-std::optional<DemoStory::Time> DemoStory::wake() const {
-    return std::min(m_nextLook, m_nextStep.value_or(m_nextLook));
+Deadline DemoStory::wake() const {
+    return std::min(m_nextLook, m_nextStep);
 }
 
 std::vector<SideShow::Item> DemoStory::process() {
@@ -104,17 +95,17 @@ void DemoStory::takeEvents(std::vector<Item>& items) {
         isAnything = true;
         const auto event = parseEvent(*text);
         if (!event) continue;
-        items.push_back({jsonLine(parseJson(*text).value_or(Json::Value())), ""});
+        items.push_back({eventLine(*text), ""});
         tell(items, *event);
     }
-    if (!isAnything && !m_client.isOpen()) throw ClientError("the service has closed the connection");
+    if (!isAnything) m_client.requireOpen();
 }
 
 void DemoStory::tell(std::vector<Item>& items, const Event& event) {
     const std::size_t joins = m_narrator.joined().size();
     const auto sentences = m_narrator.tell(event);
     const bool isJoined = m_narrator.joined().size() > joins;
-    if (isJoined) m_nextStep = steady_clock::now() + kStay;
+    if (isJoined) m_nextStep = Deadline::in(kStay);
     for (const std::string& sentence : sentences) {
         if (!isAside(event)) say(items, isJoined ? Speaker::Joining : Speaker::Service, "", sentence);
     }
@@ -122,36 +113,32 @@ void DemoStory::tell(std::vector<Item>& items, const Event& event) {
 }
 
 void DemoStory::act(std::vector<Item>& items) {
-    if (!m_nextStep || steady_clock::now() < *m_nextStep) return;
-    m_nextStep.reset();
+    if (!m_nextStep.isOver()) return;
+    m_nextStep = Deadline::never();
     if (m_stepsDone == kSteps.size() || m_narrator.joined().back() != kSteps[m_stepsDone].joined) return;
     const Step& step = kSteps[m_stepsDone++];
-    const std::string command = commandText(step.command, commandData(step.network));
+    const std::string command = commandText(step.command, networkData(step.network));
     m_client.send(command);
     say(items, Speaker::Traveller, command, step.sentence);
 }
 
 // The same reason is found again in every round; it is told once.
 void DemoStory::takeReasons(std::vector<Item>& items) {
-    const auto now = steady_clock::now();
-    if (now < m_nextLook) return;
-    m_nextLook = now + kBetweenLooks;
+    if (!m_nextLook.isOver()) return;
+    m_nextLook = Deadline::in(kBetweenLooks);
     for (const LogFiles::Line& line : m_log.takeLines()) {
         if (!isReason(line.text)) continue;
         const std::string text = textOf(line.text);
         if (std::find(m_reasons.begin(), m_reasons.end(), text) != m_reasons.end()) continue;
         m_reasons.push_back(text);
-        Json::Value object(Json::objectValue);
-        object["file"] = line.file;
-        object["line"] = asUtf8(line.text);
-        say(items, Speaker::Log, jsonLine(object), "log: " + text);
+        say(items, Speaker::Log, jsonOf(line), "log: " + text);
     }
 }
 
 void DemoStory::say(std::vector<Item>& items, Speaker speaker, std::string json,
                     const std::string& sentence) {
     std::ostringstream line;
-    const double seconds = std::chrono::duration<double>(steady_clock::now() - m_start).count();
+    const double seconds = std::chrono::duration<double>(Deadline::Clock::now() - m_start).count();
     line << std::fixed << std::setprecision(1) << std::setw(5) << seconds << " s  " << sentence;
     m_lines.push_back({speaker, line.str()});
     items.push_back({std::move(json), sentence});

@@ -1,6 +1,5 @@
 #pragma once
 
-#include <chrono>
 #include <cstdint>
 
 #include "client/hotspot/HotspotNarrator.h"
@@ -18,9 +17,8 @@ public:
     /// Connects. Throws ClientError.
     DemoStory(std::uint16_t port, const MachineFolder& machine, CredentialList stored);
 
-    int descriptor() const override { return m_client.descriptor(); }
-    short events() const override { return m_client.events(); }
-    std::optional<std::chrono::steady_clock::time_point> wake() const override;
+    Polled polled() const override { return m_client.polled(); }
+    Deadline wake() const override;
     std::vector<Item> process() override;
     std::vector<std::string> opening(bool json) const override;
     std::vector<std::string> lines(const Room& room) const override;
@@ -28,8 +26,6 @@ public:
     void addSummary(Json::Value& object) const override;
 
 private:
-    using Time = std::chrono::steady_clock::time_point;
-
     enum class Speaker { Service, Joining, Traveller, Log };
     struct Line {
         Speaker speaker;
@@ -48,9 +44,9 @@ private:
     HotspotNarrator m_narrator;
     CredentialList m_stored;
     LogFiles m_log;
-    Time m_start;
-    Time m_nextLook;
-    std::optional<Time> m_nextStep;
+    Deadline::Clock::time_point m_start = Deadline::Clock::now();
+    Deadline m_nextLook = Deadline::in({});
+    Deadline m_nextStep = Deadline::never();
     std::size_t m_stepsDone = 0;
     std::vector<std::string> m_reasons;
     std::vector<Line> m_lines;

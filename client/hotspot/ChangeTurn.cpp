@@ -2,13 +2,12 @@
 
 #include <string>
 
-#include "client/port/Activity.h"
-#include "client/port/HotspotPort.h"
+#include "client/terminal/ClientError.h"
+#include "client/terminal/EventLoop.h"
 
 namespace vexa::client {
 
 using std::chrono::milliseconds;
-using std::chrono::steady_clock;
 
 namespace {
 
@@ -22,11 +21,12 @@ std::string turnName(std::uint16_t port) {
 }  // namespace
 
 ChangeTurn::ChangeTurn(std::uint16_t port, Signals& signals, milliseconds limit) {
-    const auto deadline = steady_clock::now() + limit;
+    EventLoop loop(signals);
+    const Deadline deadline = Deadline::in(limit);
     while (!(m_holder = takeKernelName(turnName(port)))) {
-        if (steady_clock::now() >= deadline)
+        if (deadline.isOver())
             throw ClientError("another vexa is changing the credentials and does not come to an end");
-        if (waitForActivity(-1, 0, signals, kBetweenAttempts) == Activity::StopAsked)
+        if (!loop.wait(Deadline::in(kBetweenAttempts)))
             throw StoppedByUser("stopped before anything was changed");
     }
 }

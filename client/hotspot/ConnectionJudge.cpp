@@ -3,15 +3,9 @@
 #include <algorithm>
 #include <utility>
 
-#include "client/port/JsonLine.h"
-
 namespace vexa::client {
 
 namespace {
-
-constexpr const char* kCheck = "GET_IS_CARD_IN";
-constexpr const char* kList = "GET_ALL_NETWORK_LIST";
-constexpr const char* kService = "HotSpot20";
 
 // A connection that nothing was told of counts once it was seen so long; so does a network that is missing.
 constexpr std::chrono::milliseconds kSettled{900};
@@ -23,10 +17,13 @@ bool hasLasted(std::optional<ConnectionJudge::Time>& since, ConnectionJudge::Tim
 
 }  // namespace
 
-const Network* ConnectionJudge::find(const NetworkList& list) const {
-    const auto found =
-        std::find_if(list.begin(), list.end(), [this](const Network& one) { return one.name == m_network; });
-    return found == list.end() ? nullptr : &*found;
+ConnectionJudge::ConnectionJudge(std::string network) : m_network(std::move(network)) {
+    check();
+}
+
+void ConnectionJudge::check() {
+    m_questions.push_back(Checkpoints::kQuestion);
+    m_checkpoints.ask();
 }
 
 std::vector<const char*> ConnectionJudge::takeQuestions() {
@@ -36,30 +33,23 @@ std::vector<const char*> ConnectionJudge::takeQuestions() {
 // The service tells of the end of an attempt, of the internet then, and sends no list in between: a list that
 // comes behind a result knows what kind of result it was.
 Outcome ConnectionJudge::apply(const Event& event, Time now) {
-    const Json::Value payload = parseJson(event.data).value_or(Json::Value());
-    if (event.id == "CARD_PLUG_IN" || event.id == "CARD_PLUG_OUT") return applyCard(event);
+    const Json::Value payload = payloadOf(event);
+    if (event.id == kCardOut) return Outcome::AdapterOut;
+    if (m_checkpoints.take(event) && !m_checkpoints.isPassed()) check();
     if (event.id == "GET_RADIO" && payload == Json::Value(false)) return Outcome::RadioOff;
     if (event.id == "CONNECT_DISCONNECT") {
-        m_results.push_back({payload == Json::Value(1), m_answersOwed == 0, false});
-        if (wantsLists()) m_questions.push_back(kList);
+        m_results.push_back({payload == Json::Value(1), m_checkpoints.isPassed(), false});
+        if (wantsLists()) m_questions.push_back(kNetworkList);
     } else if (event.id == "GET_IS_INTERNET_ACCESS" && !m_results.empty()) {
         m_results.back().isReport = true;
-    } else if (event.id == kList) {
+    } else if (event.id == kNetworkList) {
         return judge(networkList(payload), std::exchange(m_results, {}), now);
     }
     return Outcome::Open;
 }
 
-// Another client's question has the same answer. He would have to ask twice at the very moment to mislead us.
-Outcome ConnectionJudge::applyCard(const Event& event) {
-    if (event.id == "CARD_PLUG_OUT") return Outcome::AdapterOut;
-    if (event.source != kService || m_answersOwed == 0) return Outcome::Open;
-    if (--m_answersOwed > 0) m_questions.push_back(kCheck);
-    return Outcome::Open;
-}
-
 Outcome JoinJudge::judge(const NetworkList& list, const std::vector<Result>& results, Time now) {
-    const Network* const wanted = find(list);
+    const Network* const wanted = findNetwork(list, network());
     if (wanted == nullptr || !wanted->isConnected) return judgeAbsent(wanted != nullptr, results, now);
     m_missingSince.reset();
     const bool isTold =
@@ -86,7 +76,7 @@ Outcome JoinJudge::judgeFailure(bool isInList, const Result& result) {
 }
 
 Outcome LeaveJudge::judge(const NetworkList& list, const std::vector<Result>& results, Time /*now*/) {
-    const Network* const wanted = find(list);
+    const Network* const wanted = findNetwork(list, network());
     if (wanted != nullptr && wanted->isConnected) {
         m_isConnected = true;
         return Outcome::Open;

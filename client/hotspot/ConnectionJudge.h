@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "client/hotspot/Network.h"
+#include "client/port/Checkpoints.h"
 #include "client/port/Event.h"
 
 namespace vexa::client {
@@ -30,7 +31,7 @@ class ConnectionJudge {
 public:
     using Time = std::chrono::steady_clock::time_point;
 
-    explicit ConnectionJudge(std::string network) : m_network(std::move(network)) {}
+    explicit ConnectionJudge(std::string network);
     virtual ~ConnectionJudge() = default;
     ConnectionJudge(const ConnectionJudge&) = delete;
     ConnectionJudge& operator=(const ConnectionJudge&) = delete;
@@ -57,14 +58,13 @@ protected:
     virtual Outcome judge(const NetworkList& list, const std::vector<Result>& results, Time now) = 0;
 
     const std::string& network() const { return m_network; }
-    const Network* find(const NetworkList& list) const;
 
 private:
-    Outcome applyCard(const Event& event);
+    void check();
 
     std::string m_network;
-    std::vector<const char*> m_questions{"GET_IS_CARD_IN"};
-    int m_answersOwed = 2;
+    std::vector<const char*> m_questions;
+    Checkpoints m_checkpoints;
     std::vector<Result> m_results;
 };
 

@@ -9,7 +9,6 @@
 namespace vexa::client {
 
 using std::chrono::milliseconds;
-using std::chrono::steady_clock;
 
 namespace {
 
@@ -34,21 +33,20 @@ constexpr std::array kReasons{Reason{Outcome::NotStarted, false, "the service co
 }  // namespace
 
 Outcome awaitOutcome(HotspotPort& port, ConnectionJudge& judge, milliseconds limit) try {
-    const auto end = steady_clock::now() + limit;
-    auto nextLook = steady_clock::now() + kBetweenLooks;
+    const Deadline end = Deadline::in(limit);
+    Deadline nextLook = Deadline::in(kBetweenLooks);
     ask(port, judge);
     while (true) {
         const auto event = port.next(std::min(end, nextLook));
-        const auto now = steady_clock::now();
         if (event) {
-            const Outcome outcome = judge.apply(*event, now);
+            const Outcome outcome = judge.apply(*event, Deadline::Clock::now());
             if (outcome != Outcome::Open) return outcome;
             ask(port, judge);
         }
-        if (now >= end) return Outcome::Open;
-        if (now < nextLook) continue;
+        if (end.isOver()) return Outcome::Open;
+        if (!nextLook.isOver()) continue;
         if (judge.wantsLists()) port.tell(kNetworkList);
-        nextLook = now + kBetweenLooks;
+        nextLook = Deadline::in(kBetweenLooks);
     }
 } catch (const StoppedByUser&) {
     throw StoppedByUser("not waited for: the service goes on with it");

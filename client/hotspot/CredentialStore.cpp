@@ -12,7 +12,6 @@ namespace vexa::client {
 
 namespace {
 
-constexpr const char* kListEvent = "GET_ALL_CREDENTIAL_LIST";
 constexpr const char* kNoList = "the service tells of no credentials: it has no adapter";
 constexpr const char* kNotKnown = "; whether the change was made is not known";
 constexpr const char* kUnknownReason = "the service refused it; its log may say why";
@@ -63,7 +62,7 @@ std::string reasonAgainst(const CredentialList& list, const Credential& wanted) 
 }  // namespace
 
 const CredentialList& CredentialStore::read() {
-    const auto answer = m_port.question(kListEvent, acceptsAny);
+    const auto answer = m_port.question(kCredentialList, acceptsAny);
     if (!answer.payload) throw ClientError(kNoList);
     return m_list = credentialList(*answer.payload);
 }
@@ -72,7 +71,7 @@ const CredentialList& CredentialStore::read() {
 const CredentialList& CredentialStore::reload() {
     m_port.tell("READ_CREDENTIAL_FROM_FILE");
     const auto answer =
-        m_port.ask(kListEvent, std::nullopt, kListEvent, [](const Json::Value&) { return false; });
+        m_port.ask(kCredentialList, std::nullopt, kCredentialList, [](const Json::Value&) { return false; });
     if (!answer.payload) throw ClientError(kNoList);
     return m_list = credentialList(*answer.payload);
 }
@@ -117,7 +116,7 @@ std::size_t CredentialStore::move(int id, std::size_t position) {
 
 bool CredentialStore::change(const std::string& command, const std::string& data, const Shows& shows) {
     try {
-        const auto answer = m_port.ask(command, data, kListEvent, [&](const Json::Value& payload) {
+        const auto answer = m_port.ask(command, data, kCredentialList, [&](const Json::Value& payload) {
             m_list = credentialList(payload);
             return shows(m_list);
         });

@@ -3,6 +3,8 @@
 #include <algorithm>
 #include <iterator>
 
+#include "client/terminal/Text.h"
+
 namespace vexa::client {
 
 namespace {
@@ -42,6 +44,14 @@ std::string alternatives(const std::vector<std::string>& names) {
         text += names[i];
     }
     return text;
+}
+
+std::string withOneOf(const std::vector<std::string>& names) {
+    if (names.empty()) return ", with no credential of ours";
+    std::vector<std::string> quoted;
+    std::transform(names.begin(), names.end(), std::back_inserter(quoted),
+                   [](const std::string& name) { return inQuotes(name); });
+    return " with the credential " + alternatives(quoted);
 }
 
 }  // namespace vexa::client

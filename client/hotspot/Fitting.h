@@ -22,4 +22,7 @@ std::vector<std::string> credentialsBehind(const CredentialList& all, const Netw
 /// "A", "A or B", "A, B or C"; empty for none.
 std::string alternatives(const std::vector<std::string>& names);
 
+/// What stands behind "connected to X": one of the credentials of these names, or none of ours.
+std::string withOneOf(const std::vector<std::string>& names);
+
 }  // namespace vexa::client

@@ -15,25 +15,9 @@ namespace vexa::client {
 
 namespace {
 
-constexpr const char* kNetworks = "GET_ALL_NETWORK_LIST";
-constexpr const char* kCredentials = "GET_ALL_CREDENTIAL_LIST";
-
-const Network* find(const NetworkList& list, const std::string& name) {
-    const auto found =
-        std::find_if(list.begin(), list.end(), [&](const Network& network) { return network.name == name; });
-    return found == list.end() ? nullptr : &*found;
-}
-
 std::string connectedName(const NetworkList& list) {
     const Network* const network = connectedNetwork(list);
     return network == nullptr ? "" : network->name;
-}
-
-std::string namesOf(const NetworkList& list) {
-    std::string names;
-    for (const Network& network : list)
-        names += (names.empty() ? "" : ", ") + inQuotes(network.name);
-    return names.empty() ? "none" : names;
 }
 
 /// Said when a flag has another value than before.
@@ -52,12 +36,12 @@ struct HotspotNarrator::Entry {
 };
 
 const HotspotNarrator::Entry* HotspotNarrator::entryOf(const std::string& event) {
-    static constexpr std::array kEntries{Entry{kNetworks, &HotspotNarrator::tellNetworks},
-                                         Entry{kCredentials, &HotspotNarrator::tellCredentials},
+    static constexpr std::array kEntries{Entry{kNetworkList, &HotspotNarrator::tellNetworks},
+                                         Entry{kCredentialList, &HotspotNarrator::tellCredentials},
                                          Entry{"GET_RADIO", &HotspotNarrator::tellRadio},
                                          Entry{"SET_HOTSPOT_AUTO_CONNECT", &HotspotNarrator::tellSwitch},
-                                         Entry{"CARD_PLUG_IN", &HotspotNarrator::tellCardIn},
-                                         Entry{"CARD_PLUG_OUT", &HotspotNarrator::tellCardOut},
+                                         Entry{kCardIn, &HotspotNarrator::tellCardIn},
+                                         Entry{kCardOut, &HotspotNarrator::tellCardOut},
                                          Entry{"CONNECT_DISCONNECT", &HotspotNarrator::tellResult},
                                          Entry{"GET_IS_INTERNET_ACCESS", &HotspotNarrator::tellInternet},
                                          Entry{"DETECTED_HOTSPOT", &HotspotNarrator::tellDetected},
@@ -68,11 +52,11 @@ const HotspotNarrator::Entry* HotspotNarrator::entryOf(const std::string& event)
 }
 
 std::vector<const char*> HotspotNarrator::firstQuestions() {
-    return {"GET_IS_CARD_IN", "GET_RADIO", kCredentials, kNetworks, "GET_IS_INTERNET_ACCESS"};
+    return {"GET_IS_CARD_IN", "GET_RADIO", kCredentialList, kNetworkList, "GET_IS_INTERNET_ACCESS"};
 }
 
 std::vector<std::string> HotspotNarrator::tell(const Event& event) {
-    const Json::Value payload = parseJson(event.data).value_or(Json::Value());
+    const Json::Value payload = payloadOf(event);
     if (const Entry* const entry = entryOf(event.id)) return (this->*entry->teller)(payload);
     return {printable(event.data.empty() ? event.id : event.id + " " + jsonLine(payload))};
 }
@@ -84,7 +68,7 @@ std::vector<const char*> HotspotNarrator::takeQuestions() {
 // A success does not name its network; the list that was asked for then does. A connection of the system's
 // own is told as a success whatever came of it.
 HotspotNarrator::Sentences HotspotNarrator::tellResult(const Json::Value& payload) {
-    m_questions.push_back(kNetworks);
+    m_questions.push_back(kNetworkList);
     if (payload != Json::Value(1)) return {"an attempt to connect has failed"};
     m_isResultOpen = true;
     return {};
@@ -106,7 +90,7 @@ HotspotNarrator::Sentences HotspotNarrator::tellNetworks(const Json::Value& payl
 }
 
 HotspotNarrator::Sentences HotspotNarrator::firstNetworks() const {
-    Sentences told{"hotspots in range: " + namesOf(m_networks)};
+    Sentences told{"hotspots in range: " + (m_networks.empty() ? "none" : namesOf(m_networks))};
     if (const Network* const connected = connectedNetwork(m_networks))
         told.push_back("connected to " + withCredential(*connected));
     return told;
@@ -118,11 +102,11 @@ HotspotNarrator::Sentences HotspotNarrator::newNetworks(const NetworkList& befor
     if (!connected.empty() && connected != connectedName(m_networks))
         told.push_back("the connection to " + inQuotes(connected) + " has ended");
     for (const Network& network : before) {
-        if (find(m_networks, network.name) == nullptr)
+        if (findNetwork(m_networks, network.name) == nullptr)
             told.push_back(inQuotes(network.name) + " is out of range");
     }
     for (const Network& network : m_networks) {
-        const Network* const known = find(before, network.name);
+        const Network* const known = findNetwork(before, network.name);
         const std::string realms = printable(realmsText(network));
         if (known == nullptr)
             told.push_back(inQuotes(network.name) + " is in range; realms: " + realms);
@@ -133,11 +117,7 @@ HotspotNarrator::Sentences HotspotNarrator::newNetworks(const NetworkList& befor
 }
 
 std::string HotspotNarrator::withCredential(const Network& network) const {
-    std::vector<std::string> names;
-    for (const std::string& name : credentialsBehind(m_credentials, network, m_method()))
-        names.push_back(inQuotes(name));
-    return inQuotes(network.name) +
-           (names.empty() ? ", with no credential of ours" : " with the credential " + alternatives(names));
+    return inQuotes(network.name) + withOneOf(credentialsBehind(m_credentials, network, m_method()));
 }
 
 HotspotNarrator::Sentences HotspotNarrator::tellCredentials(const Json::Value& payload) {
@@ -158,7 +138,7 @@ HotspotNarrator::Sentences HotspotNarrator::tellSwitch(const Json::Value& payloa
 // One that comes has networks and credentials to tell; all later lists come by themselves.
 HotspotNarrator::Sentences HotspotNarrator::tellCardIn(const Json::Value& /*payload*/) {
     if (m_isCardIn == true) return {};
-    if (m_isCardIn) m_questions.insert(m_questions.end(), {kCredentials, kNetworks});
+    if (m_isCardIn) m_questions.insert(m_questions.end(), {kCredentialList, kNetworkList});
     return flagChange(m_isCardIn, true, "the adapter is in", "");
 }
 

@@ -11,7 +11,6 @@
 
 namespace vexa::client {
 
-inline constexpr const char* kNetworkList = "GET_ALL_NETWORK_LIST";
 inline constexpr const char* kNoAdapter = "no adapter is in";
 
 // What the hotspot half can be asked. Each throws NoAnswer.

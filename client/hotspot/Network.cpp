@@ -4,6 +4,7 @@
 #include <array>
 
 #include "client/hotspot/Credential.h"
+#include "client/port/JsonLine.h"
 #include "client/terminal/Text.h"
 
 namespace vexa::client {
@@ -75,6 +76,25 @@ const Network* connectedNetwork(const NetworkList& list) {
     const auto found =
         std::find_if(list.begin(), list.end(), [](const Network& network) { return network.isConnected; });
     return found == list.end() ? nullptr : &*found;
+}
+
+const Network* findNetwork(const NetworkList& list, const std::string& name) {
+    const auto found =
+        std::find_if(list.begin(), list.end(), [&](const Network& network) { return network.name == name; });
+    return found == list.end() ? nullptr : &*found;
+}
+
+std::string namesOf(const NetworkList& list) {
+    std::string names;
+    for (const Network& network : list)
+        names += (names.empty() ? "" : ", ") + inQuotes(network.name);
+    return names;
+}
+
+std::string networkData(const std::string& name) {
+    Json::Value data(Json::objectValue);
+    data["NetWorkName"] = name;
+    return jsonLine(data);
 }
 
 std::string realmsText(const Network& network) {

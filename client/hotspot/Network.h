@@ -28,11 +28,23 @@ struct Network {
 
 using NetworkList = std::vector<Network>;
 
+/// The command that asks for the list, and the event that tells it.
+inline constexpr const char* kNetworkList = "GET_ALL_NETWORK_LIST";
+
 /// The list out of the payload of its event, in its order; entries that are none are left out.
 NetworkList networkList(const Json::Value& payload);
 
 /// Nothing if none is connected.
 const Network* connectedNetwork(const NetworkList& list);
+
+/// Nothing if none has the name.
+const Network* findNetwork(const NetworkList& list, const std::string& name);
+
+/// Their names in quotes; empty for none.
+std::string namesOf(const NetworkList& list);
+
+/// The data of a command for the network of this name.
+std::string networkData(const std::string& name);
 
 /// Its realms with their methods, in words.
 std::string realmsText(const Network& network);

@@ -6,6 +6,9 @@
 #include <tuple>
 #include <utility>
 
+#include "client/port/JsonLine.h"
+#include "client/terminal/Text.h"
+
 namespace vexa::client {
 
 namespace fs = std::filesystem;
@@ -85,6 +88,13 @@ std::vector<fs::path> LogFiles::filesByTime() const {
     for (Found& file : found)
         paths.push_back(std::move(file.path));
     return paths;
+}
+
+std::string jsonOf(const LogFiles::Line& line) {
+    Json::Value object(Json::objectValue);
+    object["file"] = line.file;
+    object["line"] = asUtf8(line.text);
+    return jsonLine(object);
 }
 
 }  // namespace vexa::client

@@ -40,4 +40,7 @@ private:
     std::map<std::string, Place> m_places;
 };
 
+/// The line as a JSON object on one line.
+std::string jsonOf(const LogFiles::Line& line);
+
 }  // namespace vexa::client

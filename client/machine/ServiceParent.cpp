@@ -13,7 +13,6 @@ namespace vexa::client {
 namespace fs = std::filesystem;
 using std::chrono::milliseconds;
 using std::chrono::seconds;
-using std::chrono::steady_clock;
 
 namespace {
 
@@ -97,15 +96,15 @@ void ServiceParent::start(const StartRequest& request) {
 }
 
 ServiceParent::State ServiceParent::waitUntilReady() {
-    const auto deadline = steady_clock::now() + kReadyLimit;
+    const Deadline deadline = Deadline::in(kReadyLimit);
     for (milliseconds pause = kFirstCheck;; pause = std::min(pause + milliseconds(1), kLongestCheck)) {
         if (const auto code = m_process->exitCode()) {
             reportEarlyEnd(*code);
             return State::Ended;
         }
         if (portsListen()) break;
-        if (steady_clock::now() >= deadline) giveUp();
-        if (m_stop.wait(pause) == StopSource::Wake::Stop) return State::StopRequested;
+        if (deadline.isOver()) giveUp();
+        if (!m_stop.wait(Deadline::in(pause))) return State::StopRequested;
     }
     m_reserved.clear();
     if (!writePortsFile(m_folder.portsFile(), m_ports)) {
@@ -116,7 +115,7 @@ ServiceParent::State ServiceParent::waitUntilReady() {
 
 ServiceParent::State ServiceParent::waitForEnd() {
     while (!m_process->exitCode()) {
-        if (m_stop.wait(std::nullopt) == StopSource::Wake::Stop) return State::StopRequested;
+        if (!m_stop.wait(Deadline::never())) return State::StopRequested;
     }
     return State::Ended;
 }
@@ -154,11 +153,10 @@ bool ServiceParent::portsListen() const {
 }
 
 bool ServiceParent::waitForExit(milliseconds limit) {
-    const auto deadline = steady_clock::now() + limit;
+    const Deadline deadline = Deadline::in(limit);
     while (!m_process->exitCode()) {
-        const auto left = std::chrono::ceil<milliseconds>(deadline - steady_clock::now());
-        if (left <= milliseconds(0)) return false;
-        m_stop.wait(left);
+        if (deadline.isOver()) return false;
+        m_stop.wait(deadline);
     }
     return true;
 }

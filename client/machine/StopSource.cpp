@@ -1,50 +1,28 @@
 #include "client/machine/StopSource.h"
 
-#include <algorithm>
 #include <array>
 
-#include "client/terminal/Poll.h"
 #include "client/terminal/StandardInput.h"
 
 namespace vexa::client {
 
-using std::chrono::milliseconds;
-using std::chrono::steady_clock;
+namespace {
 
-StopSource::StopSource(Signals& signals, bool stopOnEndOfInput)
-    : m_signals(signals), m_watchInput(stopOnEndOfInput) {}
-
-StopSource::Wake StopSource::wait(std::optional<milliseconds> limit) {
-    const auto deadline = steady_clock::now() + limit.value_or(milliseconds(0));
-    while (true) {
-        if (const auto wake = takeSignals()) return *wake;
-        std::optional<milliseconds> left;
-        if (limit) {
-            left = std::chrono::ceil<milliseconds>(deadline - steady_clock::now());
-            if (*left <= milliseconds(0)) return Wake::Timeout;
-        }
-        std::array<Polled, 2> watched{
-            {{m_signals.descriptor(), kReadable}, {m_watchInput ? kStandardInput : -1, kReadable}}};
-        waitFor(watched, left);
-        if (watched[1].happened != 0 && inputEnded()) {
-            m_watchInput = false;
-            return Wake::Stop;
-        }
-    }
-}
-
-std::optional<StopSource::Wake> StopSource::takeSignals() {
-    while (const auto signal = m_signals.take()) {
-        if (Signals::isStop(*signal)) return Wake::Stop;
-        if (*signal == Signal::Child) return Wake::Child;
-        if (*signal == Signal::Suspend) Signals::suspend();
-    }
-    return std::nullopt;
-}
-
-bool StopSource::inputEnded() {
+bool inputEnded() {
     std::array<char, 512> dropped{};
     return readStandardInput(dropped) == 0;
+}
+
+}  // namespace
+
+StopSource::StopSource(Signals& signals, bool stopOnEndOfInput)
+    : m_loop(signals), m_watchInput(stopOnEndOfInput) {}
+
+bool StopSource::wait(Deadline deadline) {
+    Polled input{m_watchInput ? kStandardInput : -1, kReadable};
+    if (!m_loop.wait(std::span(&input, 1), deadline)) return false;
+    if (input.happened != 0 && inputEnded()) m_watchInput = false;
+    return input.happened == 0 || m_watchInput;
 }
 
 }  // namespace vexa::client

@@ -1,28 +1,20 @@
 #pragma once
 
-#include <chrono>
-#include <optional>
-
-#include "client/terminal/Signals.h"
+#include "client/terminal/EventLoop.h"
 
 namespace vexa::client {
 
 /// Where a parent waits: for a request to stop, for something to have happened to a child, or for a while.
 class StopSource {
 public:
-    enum class Wake { Stop, Child, Timeout };
-
     /// `stopOnEndOfInput`: the end of standard input is a request to stop as well.
     StopSource(Signals& signals, bool stopOnEndOfInput);
 
-    /// Without a limit it waits for ever. Every request is told once.
-    Wake wait(std::optional<std::chrono::milliseconds> limit);
+    /// May return early. False: it is to stop; every request is told once.
+    bool wait(Deadline deadline);
 
 private:
-    std::optional<Wake> takeSignals();
-    bool inputEnded();
-
-    Signals& m_signals;
+    EventLoop m_loop;
     bool m_watchInput;
 };
 

@@ -1,7 +1,5 @@
 #include "client/port/Event.h"
 
-#include <json/value.h>
-
 #include "client/port/JsonLine.h"
 
 namespace vexa::client {
@@ -14,6 +12,10 @@ std::optional<Event> parseEvent(std::string_view text) {
     if (!id.isString() || !(data.isString() || data.isNull())) return std::nullopt;
     const Json::Value& source = (*envelope)["Source"];
     return Event{id.asString(), data.asString(), source.isString() ? source.asString() : ""};
+}
+
+Json::Value payloadOf(const Event& event) {
+    return parseJson(event.data).value_or(Json::Value());
 }
 
 std::string commandText(const std::string& id, const std::optional<std::string>& data) {

@@ -1,10 +1,15 @@
 #pragma once
 
+#include <json/value.h>
+
 #include <optional>
 #include <string>
 #include <string_view>
 
 namespace vexa::client {
+
+inline constexpr const char* kCardIn = "CARD_PLUG_IN";
+inline constexpr const char* kCardOut = "CARD_PLUG_OUT";
 
 /// What the service tells, taken out of its envelope. Without a payload `data` is empty.
 struct Event {
@@ -15,6 +20,9 @@ struct Event {
 
 /// Nothing if the text is no event.
 std::optional<Event> parseEvent(std::string_view text);
+
+/// Its data as JSON; null if it is none.
+Json::Value payloadOf(const Event& event);
 
 /// The text of a command; `data` goes along as it is given.
 std::string commandText(const std::string& id, const std::optional<std::string>& data = std::nullopt);

@@ -10,13 +10,12 @@ namespace vexa::client {
 
 bool printEvents(WebSocketClient& client) {
     while (const auto text = client.take())
-        printEvent(*text);
+        std::cout << eventLine(*text) << '\n';
     return static_cast<bool>(std::cout << std::flush);
 }
 
-// What is not JSON is shown all the same, as a JSON string.
-void printEvent(const std::string& text) {
-    std::cout << jsonLine(parseJson(text).value_or(Json::Value(text))) << '\n';
+std::string eventLine(const std::string& text) {
+    return jsonLine(parseJson(text).value_or(Json::Value(text)));
 }
 
 }  // namespace vexa::client

@@ -9,7 +9,7 @@ namespace vexa::client {
 /// Prints the messages that the client has taken in, JSON on one line each. False once nobody reads them.
 bool printEvents(WebSocketClient& client);
 
-/// Prints one message likewise.
-void printEvent(const std::string& text);
+/// One message likewise. What is not JSON is shown all the same, as a JSON string.
+std::string eventLine(const std::string& text);
 
 }  // namespace vexa::client

@@ -2,32 +2,16 @@
 
 #include <algorithm>
 
-#include "client/port/Activity.h"
-#include "client/port/JsonLine.h"
-
 namespace vexa::client {
 
 using std::chrono::milliseconds;
-using std::chrono::steady_clock;
 
 namespace {
 
-constexpr const char* kCheckCommand = "GET_IS_CARD_IN";
-constexpr const char* kCardOut = "CARD_PLUG_OUT";
-constexpr const char* kSource = "HotSpot20";
-
 // How long a command may stay without an event before we ask whether the service has gone past it.
 constexpr milliseconds kFirstCheck{200};
-// The answer to another client's question looks like the answer to ours. He would have to ask twice at the
-// very moment, ahead of our command, to mislead us.
-constexpr int kChecks = 2;
 constexpr milliseconds kStartLimit{5000};
 constexpr milliseconds kGoodbyeLimit{2000};
-
-/// An adapter that comes or goes makes the same event, from another source.
-bool isCheckAnswer(const Event& event) {
-    return event.source == kSource && (event.id == kCardIn || event.id == kCardOut);
-}
 
 std::string silenceText(milliseconds limit) {
     return "the service did not answer within " +
@@ -37,87 +21,72 @@ std::string silenceText(milliseconds limit) {
 }  // namespace
 
 HotspotPort::HotspotPort(std::uint16_t port, Signals& signals, milliseconds limit)
-    : m_client(port), m_signals(signals), m_limit(limit) {}
+    : m_client(port), m_loop(signals), m_limit(limit) {}
 
 HotspotPort::Answer HotspotPort::ask(const std::string& command, const std::optional<std::string>& data,
                                      const std::string& event, const Accepts& accepts) {
+    m_checkpoints.begin();
     tell(command, data);
-    const auto end = steady_clock::now() + m_limit;
-    auto wake = std::min(end, steady_clock::now() + kFirstCheck);
+    const Deadline end = Deadline::in(m_limit);
+    Deadline firstCheck = Deadline::in(kFirstCheck);
     Answer answer;
-    // What is still owed for an earlier question tells nothing about this one.
-    int stale = m_checksOwed;
-    int asked = 0;
-    int answered = 0;
     const auto checkNow = [&] {
-        check();
-        ++asked;
-        wake = end;
+        sendCheck();
+        firstCheck = end;
     };
-    while (answered < kChecks) {
-        const auto told = next(wake);
+    while (!m_checkpoints.isPassed()) {
+        const auto told = next(std::min(end, firstCheck));
         if (!told) {
-            if (steady_clock::now() >= end) throw NoAnswer(silenceText(m_limit));
+            if (end.isOver()) throw NoAnswer(silenceText(m_limit));
             checkNow();
         } else if (told->id == event) {
-            answer.payload = parseJson(told->data).value_or(Json::Value());
-            if (accepts(*answer.payload)) {
-                answer.isAccepted = true;
-                return answer;
-            }
-            if (asked == 0) checkNow();
-        } else if (isCheckAnswer(*told) && m_checksOwed > 0) {
-            --m_checksOwed;
-            if (stale > 0) {
-                --stale;
-                continue;
-            }
+            answer.payload = payloadOf(*told);
+            answer.isAccepted = accepts(*answer.payload);
+            if (answer.isAccepted) break;
+            if (!m_checkpoints.isAsked()) checkNow();
+        } else if (m_checkpoints.take(*told)) {
             answer.cardIn = told->id == kCardIn;
-            if (++answered < kChecks) checkNow();
+            if (!m_checkpoints.isPassed()) checkNow();
         }
     }
     return answer;
 }
 
 HotspotPort::Answer HotspotPort::question(const std::string& command, const Accepts& accepts) {
-    const auto end = steady_clock::now() + std::min(m_limit, kStartLimit);
+    const Deadline end = Deadline::in(std::min(m_limit, kStartLimit));
     while (true) {
         Answer answer = ask(command, std::nullopt, command, accepts);
-        if (answer.payload || !answer.cardIn || steady_clock::now() >= end) return answer;
+        if (answer.payload || !answer.cardIn || end.isOver()) return answer;
     }
 }
 
 bool HotspotPort::hasAdapter() {
-    const auto end = steady_clock::now() + m_limit;
-    check();
+    m_checkpoints.begin();
+    sendCheck();
+    const Deadline end = Deadline::in(m_limit);
     while (const auto told = next(end)) {
-        if (isCheckAnswer(*told) && --m_checksOwed == 0) return told->id == kCardIn;
+        if (m_checkpoints.take(*told)) return told->id == kCardIn;
     }
     throw NoAnswer(silenceText(m_limit));
 }
 
-void HotspotPort::check() {
-    tell(kCheckCommand);
-    ++m_checksOwed;
+void HotspotPort::sendCheck() {
+    tell(Checkpoints::kQuestion);
+    m_checkpoints.ask();
 }
 
 void HotspotPort::tell(const std::string& command, const std::optional<std::string>& data) {
     m_client.send(commandText(command, data));
 }
 
-std::optional<Event> HotspotPort::next(std::optional<steady_clock::time_point> deadline) {
+std::optional<Event> HotspotPort::next(Deadline deadline) {
     while (true) {
         while (const auto text = m_client.take()) {
             if (auto event = parseEvent(*text)) return event;
         }
-        if (!m_client.isOpen()) throw NoAnswer("the service has closed the connection");
-        std::optional<milliseconds> left;
-        if (deadline) {
-            left = std::chrono::ceil<milliseconds>(*deadline - steady_clock::now());
-            if (*left <= milliseconds(0)) return std::nullopt;
-        }
-        const Awaited service{m_client.descriptor(), m_client.events()};
-        if (waitForActivity(std::span(&service, 1), m_signals, m_keys, left) == Activity::StopAsked)
+        m_client.requireOpen();
+        if (deadline.isOver()) return std::nullopt;
+        if (!m_loop.wait(m_client.polled(), deadline))
             throw StoppedByUser("stopped before the service had answered");
         m_client.process();
     }

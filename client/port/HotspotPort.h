@@ -8,19 +8,17 @@
 #include <optional>
 #include <string>
 
+#include "client/port/Checkpoints.h"
 #include "client/port/Event.h"
 #include "client/port/WebSocketClient.h"
 #include "client/terminal/ClientError.h"
-#include "client/terminal/Signals.h"
-#include "client/terminal/TerminalKeys.h"
+#include "client/terminal/Deadline.h"
+#include "client/terminal/EventLoop.h"
 
 namespace vexa::client {
 
-inline constexpr const char* kCardIn = "CARD_PLUG_IN";
-
 /// A conversation with the hotspot port. Every client hears every event, and an event does not say whose
-/// command it answers: what has arrived is told apart by its content, and by a question of which the answer
-/// must come later.
+/// command it answers: what has arrived is told apart by its content, and by checkpoints behind the command.
 class HotspotPort {
 public:
     /// Connects. Throws ClientError. Each question waits for `limit` at most.
@@ -47,30 +45,32 @@ public:
     /// its adapter well enough to answer; it is asked again, for a while.
     Answer question(const std::string& command, const Accepts& accepts);
 
-    /// Whether the service has an adapter. Everything that was told before has been handled then. Throws
-    /// NoAnswer.
+    /// Whether the service has an adapter. Throws NoAnswer.
     bool hasAdapter();
+
+    /// Returns when the service has handled everything that was told before; what it tells until then is
+    /// passed over. Throws NoAnswer.
+    void waitUntilHandled() { hasAdapter(); }
 
     /// Sends a command that nothing answers.
     void tell(const std::string& command, const std::optional<std::string>& data = std::nullopt);
 
     /// The next event. Nothing if none comes before the deadline. Throws NoAnswer.
-    std::optional<Event> next(std::optional<std::chrono::steady_clock::time_point> deadline);
+    std::optional<Event> next(Deadline deadline);
 
     /// From now on `q` ends the waiting too.
-    void endWith(TerminalKeys& keys) { m_keys = &keys; }
+    void endWith(TerminalMode& keys) { m_loop.use(keys); }
 
     /// Sees to it that the service gets what was told.
     void close();
 
 private:
-    void check();
+    void sendCheck();
 
     WebSocketClient m_client;
-    Signals& m_signals;
-    TerminalKeys* m_keys = nullptr;
+    EventLoop m_loop;
     std::chrono::milliseconds m_limit;
-    int m_checksOwed = 0;
+    Checkpoints m_checkpoints;
 };
 
 /// For events of which the first will do.

@@ -9,7 +9,6 @@
 #include <deque>
 
 #include "client/terminal/ClientError.h"
-#include "client/terminal/Poll.h"
 
 namespace vexa::client {
 
@@ -46,8 +45,10 @@ public:
     }
 
     // Also where a socket is no small number, it fits: handles have 32 bits.
-    int descriptor() { return static_cast<int>(m_stream.next_layer().native_handle()); }
-    bool isSending() const { return !m_outgoing.empty(); }
+    Polled polled() {
+        const auto descriptor = static_cast<int>(m_stream.next_layer().native_handle());
+        return {descriptor, m_outgoing.empty() ? kReadable : static_cast<short>(kReadable | kWritable)};
+    }
     bool isOpen() const { return m_open; }
 
     void process() {
@@ -143,11 +144,8 @@ WebSocketClient::~WebSocketClient() {
     }
 }
 
-int WebSocketClient::descriptor() const {
-    return m_impl->descriptor();
-}
-short WebSocketClient::events() const {
-    return m_impl->isSending() ? kReadable | kWritable : kReadable;
+Polled WebSocketClient::polled() const {
+    return m_impl->polled();
 }
 void WebSocketClient::process() {
     m_impl->process();
@@ -158,8 +156,8 @@ void WebSocketClient::send(std::string text) {
 std::optional<std::string> WebSocketClient::take() {
     return m_impl->take();
 }
-bool WebSocketClient::isOpen() const {
-    return m_impl->isOpen();
+void WebSocketClient::requireOpen() const {
+    if (!m_impl->isOpen()) throw NoAnswer("the service has closed the connection");
 }
 void WebSocketClient::close(std::chrono::milliseconds limit) {
     m_impl->close(limit);

@@ -6,9 +6,11 @@
 #include <optional>
 #include <string>
 
+#include "client/terminal/Poll.h"
+
 namespace vexa::client {
 
-/// A client of one port of the service. One thread uses it: it polls descriptor(), lets process() do what is
+/// A client of one port of the service. One thread uses it: it waits for polled(), lets process() do what is
 /// due, and takes the messages.
 class WebSocketClient {
 public:
@@ -20,9 +22,8 @@ public:
     WebSocketClient(const WebSocketClient&) = delete;
     WebSocketClient& operator=(const WebSocketClient&) = delete;
 
-    /// To be waited for, for these events().
-    int descriptor() const;
-    short events() const;
+    /// What has to be waited for until process() has something to do.
+    Polled polled() const;
 
     /// Sends and receives what can be without waiting.
     void process();
@@ -33,8 +34,8 @@ public:
     /// The oldest message not yet taken.
     std::optional<std::string> take();
 
-    /// False once the connection is lost.
-    bool isOpen() const;
+    /// Throws NoAnswer once the connection is lost.
+    void requireOpen() const;
 
     /// Sends what is queued and says goodbye; waits for the answer up to `limit`.
     void close(std::chrono::milliseconds limit);

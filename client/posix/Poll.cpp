@@ -26,12 +26,13 @@ short fromSystem(short events) {
 
 }  // namespace
 
-int waitFor(std::span<Polled> polled, std::optional<std::chrono::milliseconds> limit) {
+int waitFor(std::span<Polled> polled, Deadline deadline) {
     std::vector<pollfd> watched;
     watched.reserve(polled.size());
     for (const Polled& one : polled)
         watched.push_back({one.descriptor, toSystem(one.events), 0});
-    const int timeout = limit ? static_cast<int>(std::max(limit->count(), decltype(limit->count()){0})) : -1;
+    const auto left = deadline.left();
+    const int timeout = left ? static_cast<int>(left->count()) : -1;
     const int count = ::poll(watched.data(), watched.size(), timeout);
     for (std::size_t i = 0; i < polled.size(); ++i)
         polled[i].happened = count > 0 ? fromSystem(watched[i].revents) : short{0};

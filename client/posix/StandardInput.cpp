@@ -3,53 +3,42 @@
 #include <termios.h>
 #include <unistd.h>
 
-#include <array>
 #include <cerrno>
 #include <iostream>
+#include <utility>
 
-#include "client/terminal/ClientError.h"
-#include "client/terminal/Poll.h"
+#include "client/terminal/InputLine.h"
 
 namespace vexa::client {
 
 namespace {
 
-/// A terminal that does not show what is typed. Does nothing where standard input is none.
-class SilentTerminal {
+/// A terminal that shows a prompt, and not what is typed. Where standard input is none, the prompt alone.
+class SilentTerminal final : public TerminalMode {
 public:
-    SilentTerminal() { enter(); }
-    ~SilentTerminal() { leave(); }
-    SilentTerminal(const SilentTerminal&) = delete;
-    SilentTerminal& operator=(const SilentTerminal&) = delete;
+    explicit SilentTerminal(std::string prompt) : m_prompt(std::move(prompt)) { enter(); }
+    ~SilentTerminal() override { leave(); }
 
-    void enter() {
+    void enter() override {
         termios settings{};
-        if (::tcgetattr(STDIN_FILENO, &settings) != 0) return;
-        m_before = settings;
-        settings.c_lflag &= ~static_cast<tcflag_t>(ECHO);
-        ::tcsetattr(STDIN_FILENO, TCSAFLUSH, &settings);
+        if (::tcgetattr(STDIN_FILENO, &settings) == 0) {
+            m_before = settings;
+            settings.c_lflag &= ~static_cast<tcflag_t>(ECHO);
+            ::tcsetattr(STDIN_FILENO, TCSAFLUSH, &settings);
+        }
+        std::cerr << m_prompt << std::flush;
     }
 
     // What was typed and not read goes: it may be half a password.
-    void leave() {
+    void leave() override {
         if (m_before) ::tcsetattr(STDIN_FILENO, TCSAFLUSH, &*m_before);
         m_before.reset();
     }
 
 private:
+    std::string m_prompt;
     std::optional<termios> m_before;
 };
-
-void handleSignals(Signals& signals, SilentTerminal& terminal, const std::string& prompt) {
-    while (const auto signal = signals.take()) {
-        if (Signals::isStop(*signal)) throw StoppedByUser("stopped before anything was changed");
-        if (*signal != Signal::Suspend) continue;
-        terminal.leave();
-        Signals::suspend();
-        terminal.enter();
-        std::cerr << prompt << std::flush;
-    }
-}
 
 }  // namespace
 
@@ -66,22 +55,9 @@ std::size_t readStandardInput(std::span<char> buffer) {
 }
 
 std::optional<std::string> readHiddenLine(Signals& signals, const std::string& prompt) {
-    SilentTerminal terminal;
-    std::cerr << prompt << std::flush;
-    std::string line;
-    while (true) {
-        std::array<Polled, 2> watched{{{kStandardInput, kReadable}, {signals.descriptor(), kReadable}}};
-        waitFor(watched, std::nullopt);
-        handleSignals(signals, terminal, prompt);
-        if (watched[0].happened == 0) continue;
-        char next = 0;
-        const bool isEnd = readStandardInput({&next, 1}) == 0;
-        if (isEnd && line.empty()) return std::nullopt;
-        if (isEnd || next == '\n') break;
-        line += next;
-    }
-    if (line.ends_with('\r')) line.pop_back();
-    return line;
+    SilentTerminal terminal(prompt);
+    EventLoop loop(signals, &terminal);
+    return readLine(loop);
 }
 
 }  // namespace vexa::client

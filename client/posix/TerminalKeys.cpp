@@ -4,8 +4,6 @@
 #include <unistd.h>
 
 #include "client/terminal/Poll.h"
-#include "client/terminal/StandardInput.h"
-#include "client/terminal/Terminal.h"
 
 namespace vexa::client {
 
@@ -20,10 +18,6 @@ TerminalKeys::TerminalKeys() : m_state(std::make_unique<State>()) {
 
 TerminalKeys::~TerminalKeys() {
     leave();
-}
-
-bool TerminalKeys::isUsable() {
-    return isInputTerminal() && isOutputTerminal();
 }
 
 void TerminalKeys::enter() {
@@ -42,7 +36,7 @@ void TerminalKeys::leave() {
     m_state->isReading = false;
 }
 
-int TerminalKeys::descriptor() const {
+int TerminalKeys::keyDescriptor() const {
     return m_state->isReading ? kStandardInput : -1;
 }
 
@@ -52,11 +46,6 @@ std::optional<char> TerminalKeys::take() {
     // With this terminal mode a readable descriptor without a key is a terminal that has gone.
     m_state->isReading = false;
     return std::nullopt;
-}
-
-bool TerminalKeys::takeQuit() {
-    const auto key = take();
-    return key && (*key == 'q' || *key == 'Q');
 }
 
 }  // namespace vexa::client

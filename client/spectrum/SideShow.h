@@ -2,10 +2,11 @@
 
 #include <json/value.h>
 
-#include <chrono>
-#include <optional>
 #include <string>
 #include <vector>
+
+#include "client/terminal/Deadline.h"
+#include "client/terminal/Poll.h"
 
 namespace vexa::client {
 
@@ -31,11 +32,11 @@ public:
     SideShow(const SideShow&) = delete;
     SideShow& operator=(const SideShow&) = delete;
 
-    virtual int descriptor() const = 0;
-    virtual short events() const = 0;
+    /// What has to be waited for until process() has something to do.
+    virtual Polled polled() const = 0;
 
-    /// When process() has something to do although nothing has arrived.
-    virtual std::optional<std::chrono::steady_clock::time_point> wake() const = 0;
+    /// When it has something to do although nothing has arrived.
+    virtual Deadline wake() const = 0;
 
     /// Takes in what has arrived, without waiting. Throws ClientError when the connection is lost.
     virtual std::vector<Item> process() = 0;

@@ -1,7 +1,5 @@
 #include "client/spectrum/SpectralScan.h"
 
-#include "client/terminal/ClientError.h"
-
 namespace vexa::client {
 
 SpectralScan::SpectralScan(std::uint16_t port) : m_client(port) {
@@ -31,7 +29,7 @@ std::vector<SpectralScan::Told> SpectralScan::process() {
         const auto update = m_view.apply(*event);
         told.push_back({std::move(*text), *event, update});
     }
-    if (told.empty() && !m_client.isOpen()) throw ClientError("the service has closed the connection");
+    if (told.empty()) m_client.requireOpen();
     return told;
 }
 

@@ -32,8 +32,7 @@ public:
 
     const SpectralView& view() const { return m_view; }
 
-    int descriptor() const { return m_client.descriptor(); }
-    short events() const { return m_client.events(); }
+    Polled polled() const { return m_client.polled(); }
 
     /// Takes in what has arrived, without waiting. Throws ClientError when the connection is lost.
     std::vector<Told> process();

@@ -29,8 +29,8 @@ SpectralView::Update SpectralView::apply(const Event& event) {
         m_radioOn = event.id == "RADIO_ON";
         return {Change::Radio};
     }
-    if (event.id == "CARD_PLUG_IN" || event.id == "CARD_PLUG_OUT") {
-        m_cardIn = event.id == "CARD_PLUG_IN";
+    if (event.id == kCardIn || event.id == kCardOut) {
+        m_cardIn = event.id == kCardIn;
         return {Change::Card};
     }
     return {};

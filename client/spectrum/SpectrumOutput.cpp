@@ -4,6 +4,7 @@
 #include <iostream>
 #include <sstream>
 
+#include "client/port/EventLines.h"
 #include "client/port/JsonLine.h"
 #include "client/spectrum/SpectralPicture.h"
 #include "client/spectrum/SpectralText.h"
@@ -34,7 +35,7 @@ void printLines(const std::vector<std::string>& lines) {
 }  // namespace
 
 SpectrumOutput::SpectrumOutput(Form form, const SideShow* side)
-    : m_form(form), m_side(side), m_start(steady_clock::now()), m_nextDrawing(m_start) {
+    : m_form(form), m_side(side), m_start(steady_clock::now()) {
     if (form == Form::Readable && TerminalScreen::isUsable()) {
         m_screen.emplace();
     } else if (m_side != nullptr) {
@@ -66,22 +67,21 @@ void SpectrumOutput::showSide(const std::vector<SideShow::Item>& items) {
 
 void SpectrumOutput::printLine(const SpectralScan::Told& told, const SpectralView& view) const {
     if (m_form == Form::Json) {
-        std::cout << jsonLine(parseJson(told.text).value_or(Json::Value())) << '\n';
+        std::cout << eventLine(told.text) << '\n';
     } else {
         std::cout << secondsSince(m_start) << "  " << describeEvent(told.event, told.update, view) << '\n';
     }
 }
 
-std::optional<milliseconds> SpectrumOutput::refresh(const SpectralView& view) {
-    if (!m_screen || !m_changed) return std::nullopt;
-    const auto now = steady_clock::now();
-    if (now < m_nextDrawing) return std::chrono::ceil<milliseconds>(m_nextDrawing - now);
+Deadline SpectrumOutput::refresh(const SpectralView& view) {
+    if (!m_screen || !(m_changed || m_screen->needsDrawing())) return Deadline::never();
+    if (!m_nextDrawing.isOver()) return m_nextDrawing;
     auto lines = picture(view);
     lines.front() += "   (q or Ctrl-C ends)";
     m_screen->draw(lines);
     m_changed = false;
-    m_nextDrawing = now + kBetweenDrawings;
-    return std::nullopt;
+    m_nextDrawing = Deadline::in(kBetweenDrawings);
+    return Deadline::never();
 }
 
 void SpectrumOutput::finish(const SpectralView& view) {
@@ -112,20 +112,6 @@ std::vector<std::string> SpectrumOutput::picture(const SpectralView& view) const
         m_side->lines({m_screen->columns(), left, m_screen->rows(), TerminalScreen::wantsColour()});
     lines.insert(lines.end(), below.begin(), below.end());
     return lines;
-}
-
-void SpectrumOutput::handleSignal(Signal signal) {
-    if (signal == Signal::Suspend) {
-        if (m_screen) m_screen->leave();
-        Signals::suspend();
-        if (m_screen) m_screen->enter();
-    }
-    if (signal == Signal::Resize && m_screen) m_screen->resized();
-    m_changed = true;
-}
-
-bool SpectrumOutput::isQuitKey() {
-    return m_screen->keys().takeQuit();
 }
 
 bool SpectrumOutput::isGone() const {

@@ -7,7 +7,7 @@
 
 #include "client/spectrum/SideShow.h"
 #include "client/spectrum/SpectralScan.h"
-#include "client/terminal/Signals.h"
+#include "client/terminal/Deadline.h"
 #include "client/terminal/TerminalScreen.h"
 
 namespace vexa::client {
@@ -25,20 +25,15 @@ public:
     /// What is told beside the spectrum.
     void showSide(const std::vector<SideShow::Item>& items);
 
-    /// Draws what has changed, but not too often. Gives the time until it should be called again; nothing:
-    /// not before something has happened.
-    std::optional<std::chrono::milliseconds> refresh(const SpectralView& view);
+    /// Draws what has changed, but not too often. Gives when it should be called again although nothing has
+    /// happened.
+    Deadline refresh(const SpectralView& view);
 
     /// The last picture, and one line that says what was seen.
     void finish(const SpectralView& view);
 
-    /// The terminal was resized, or this process is to be suspended.
-    void handleSignal(Signal signal);
-
-    int keyDescriptor() const { return m_screen ? m_screen->keys().descriptor() : -1; }
-
-    /// Reads a key; true if it asks for the end.
-    bool isQuitKey();
+    /// The mode that the terminal is in until finish(); null if it is in none.
+    TerminalMode* terminal() { return m_screen ? &*m_screen : nullptr; }
 
     /// Nobody reads the output any more.
     bool isGone() const;
@@ -52,7 +47,7 @@ private:
     const SideShow* m_side;
     std::optional<TerminalScreen> m_screen;
     std::chrono::steady_clock::time_point m_start;
-    std::chrono::steady_clock::time_point m_nextDrawing;
+    Deadline m_nextDrawing = Deadline::in({});
     bool m_changed = true;
 };
 

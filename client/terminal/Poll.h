@@ -1,8 +1,8 @@
 #pragma once
 
-#include <chrono>
-#include <optional>
 #include <span>
+
+#include "client/terminal/Deadline.h"
 
 namespace vexa::client {
 
@@ -20,8 +20,8 @@ struct Polled {
     short happened = 0;
 };
 
-/// Waits until something has happened on one of them, or for the limit; without one, for ever. May return
-/// early with nothing. Gives how many have something to tell.
-int waitFor(std::span<Polled> polled, std::optional<std::chrono::milliseconds> limit);
+/// Waits until something has happened on one of them, or until the deadline. May return early with
+/// nothing. Gives how many have something to tell.
+int waitFor(std::span<Polled> polled, Deadline deadline);
 
 }  // namespace vexa::client

@@ -23,8 +23,6 @@ public:
     /// The next signal, or nothing if none is waiting.
     std::optional<Signal> take();
 
-    static bool isStop(Signal signal) { return signal == Signal::Stop; }
-
     /// Stops this process as Ctrl-Z does; returns when it is continued.
     static void suspend();
 

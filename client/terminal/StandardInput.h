@@ -12,7 +12,7 @@ namespace vexa::client {
 /// A person types what comes on standard input.
 bool isInputTerminal();
 
-/// What has come on standard input, after waitFor() has told of it; 0 bytes at its end.
+/// What has come on standard input, after waitForInput() or waitFor() has told of it; 0 bytes at its end.
 std::size_t readStandardInput(std::span<char> buffer);
 
 /// The next line of standard input; nothing if the input ends before anything was read. A terminal does not

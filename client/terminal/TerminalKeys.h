@@ -3,33 +3,28 @@
 #include <memory>
 #include <optional>
 
+#include "client/terminal/TerminalMode.h"
+
 namespace vexa::client {
 
-/// Keys of the terminal, each at once and without echo. The terminal is as before once the object has gone,
-/// or while it has left. Where standard input is no terminal there are no keys.
-class TerminalKeys {
+/// Keys of the terminal, each at once and without echo. Where standard input is no terminal there are no
+/// keys.
+class TerminalKeys final : public TerminalMode {
 public:
     TerminalKeys();
-    ~TerminalKeys();
-    TerminalKeys(const TerminalKeys&) = delete;
-    TerminalKeys& operator=(const TerminalKeys&) = delete;
+    ~TerminalKeys() override;
 
     /// A person sits at both ends: he types, and reads what is printed.
     static bool isUsable();
 
-    void enter();
-    void leave();
-
-    /// To be waited for; -1 if there are no keys.
-    int descriptor() const;
-
-    /// A key that was pressed, or nothing. To be called when the descriptor is readable.
-    std::optional<char> take();
-
-    /// Takes a key; true if it asks for the end.
-    bool takeQuit();
+    void enter() override;
+    void leave() override;
+    int keyDescriptor() const override;
+    bool takeQuit() override;
 
 private:
+    std::optional<char> take();
+
     struct State;
     std::unique_ptr<State> m_state;
 };

@@ -62,9 +62,11 @@ void TerminalScreen::draw(const std::vector<std::string>& lines) {
         frame += lines[i] + kClearLine;
     }
     std::cout << frame << kClearBelow << std::flush;
+    m_needsDrawing = false;
 }
 
 void TerminalScreen::resized() {
+    m_needsDrawing = true;
     const auto size = terminalSize();
     if (!size) return;
     m_columns = size->columns;

@@ -7,9 +7,8 @@
 
 namespace vexa::client {
 
-/// The whole terminal, for a picture that is drawn again and again. The terminal is as before once the object
-/// has gone, or while it has left.
-class TerminalScreen {
+/// The whole terminal, for a picture that is drawn again and again.
+class TerminalScreen final : public TerminalMode {
 public:
     /// Standard output is a terminal that can place a cursor.
     static bool isUsable();
@@ -21,29 +20,27 @@ public:
     static bool isUtf8();
 
     TerminalScreen();
-    ~TerminalScreen();
-    TerminalScreen(const TerminalScreen&) = delete;
-    TerminalScreen& operator=(const TerminalScreen&) = delete;
+    ~TerminalScreen() override;
 
-    void enter();
-    void leave();
+    void enter() override;
+    void leave() override;
+    void resized() override;
+    int keyDescriptor() const override { return m_keys.keyDescriptor(); }
+    bool takeQuit() override { return m_keys.takeQuit(); }
 
     /// Shows these lines in place of the ones before; what does not fit is left out.
     void draw(const std::vector<std::string>& lines);
 
+    /// What was drawn last stands there no more, or does not fit any more.
+    bool needsDrawing() const { return m_needsDrawing; }
+
     int columns() const { return m_columns; }
     int rows() const { return m_rows; }
-
-    /// Asks for the size again.
-    void resized();
-
-    /// What is typed while the screen is ours.
-    TerminalKeys& keys() { return m_keys; }
-    const TerminalKeys& keys() const { return m_keys; }
 
 private:
     TerminalKeys m_keys;
     bool m_entered = false;
+    bool m_needsDrawing = true;
     int m_columns = 80;
     int m_rows = 24;
 };

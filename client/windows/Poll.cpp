@@ -13,9 +13,6 @@
 
 namespace vexa::client {
 
-using std::chrono::milliseconds;
-using std::chrono::steady_clock;
-
 namespace {
 
 SOCKET socketOf(const Polled& one) {
@@ -108,17 +105,16 @@ private:
     std::vector<HANDLE> m_handles;
 };
 
-DWORD waitTime(std::optional<steady_clock::time_point> deadline) {
-    if (!deadline) return INFINITE;
-    const auto left = std::chrono::ceil<milliseconds>(*deadline - steady_clock::now());
-    return static_cast<DWORD>(std::clamp<milliseconds::rep>(left.count(), 0, INFINITE - 1));
+DWORD waitTime(Deadline deadline) {
+    const auto left = deadline.left();
+    if (!left) return INFINITE;
+    return static_cast<DWORD>(std::min<std::chrono::milliseconds::rep>(left->count(), INFINITE - 1));
 }
 
 }  // namespace
 
 // Looked at again once all events are armed: what came before that would set none.
-int waitFor(std::span<Polled> polled, std::optional<milliseconds> limit) {
-    const auto deadline = limit ? std::optional(steady_clock::now() + *limit) : std::nullopt;
+int waitFor(std::span<Polled> polled, Deadline deadline) {
     if (const int count = look(polled); count > 0) return count;
     const Handles handles(polled);
     for (;;) {

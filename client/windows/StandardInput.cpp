@@ -2,11 +2,9 @@
 
 #include <windows.h>
 
-#include <array>
 #include <iostream>
 
-#include "client/terminal/ClientError.h"
-#include "client/terminal/Poll.h"
+#include "client/terminal/InputLine.h"
 #include "client/terminal/TerminalKeys.h"
 #include "client/windows/ConsoleKeys.h"
 #include "client/windows/InputReader.h"
@@ -19,21 +17,11 @@ namespace {
 constexpr wchar_t kBackspace = L'\b';
 constexpr wchar_t kEnter = L'\r';
 
-void waitForInput(Signals& signals) {
-    while (true) {
-        std::array<Polled, 2> watched{{{kStandardInput, kReadable}, {signals.descriptor(), kReadable}}};
-        waitFor(watched, std::nullopt);
-        while (const auto signal = signals.take())
-            if (Signals::isStop(*signal)) throw StoppedByUser("stopped before anything was changed");
-        if (watched[0].happened != 0) return;
-    }
-}
-
-std::string lineFromConsole(Signals& signals) {
+std::string lineFromConsole(EventLoop& loop) {
     const TerminalKeys withoutEcho;
     std::wstring line;
     while (true) {
-        waitForInput(signals);
+        waitForInput(loop);
         const auto key = takeKey();
         if (!key) continue;
         if (*key == kEnter) return utf8FromWide(line);
@@ -42,20 +30,6 @@ std::string lineFromConsole(Signals& signals) {
         else if (!line.empty())
             line.pop_back();
     }
-}
-
-std::optional<std::string> lineFromPipe(Signals& signals) {
-    std::string line;
-    while (true) {
-        waitForInput(signals);
-        char next = 0;
-        const bool isEnd = readStandardInput({&next, 1}) == 0;
-        if (isEnd && line.empty()) return std::nullopt;
-        if (isEnd || next == '\n') break;
-        line += next;
-    }
-    if (line.ends_with('\r')) line.pop_back();
-    return line;
 }
 
 }  // namespace
@@ -75,7 +49,8 @@ std::size_t readStandardInput(std::span<char> buffer) {
 
 std::optional<std::string> readHiddenLine(Signals& signals, const std::string& prompt) {
     std::cerr << prompt << std::flush;
-    return isInputTerminal() ? lineFromConsole(signals) : lineFromPipe(signals);
+    EventLoop loop(signals);
+    return isInputTerminal() ? lineFromConsole(loop) : readLine(loop);
 }
 
 }  // namespace vexa::client

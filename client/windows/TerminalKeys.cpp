@@ -3,8 +3,6 @@
 #include <windows.h>
 
 #include "client/terminal/Poll.h"
-#include "client/terminal/StandardInput.h"
-#include "client/terminal/Terminal.h"
 #include "client/windows/ConsoleKeys.h"
 
 namespace vexa::client {
@@ -21,10 +19,6 @@ TerminalKeys::~TerminalKeys() {
     leave();
 }
 
-bool TerminalKeys::isUsable() {
-    return isInputTerminal() && isOutputTerminal();
-}
-
 void TerminalKeys::enter() {
     const HANDLE input = GetStdHandle(STD_INPUT_HANDLE);
     DWORD mode = 0;
@@ -37,7 +31,7 @@ void TerminalKeys::leave() {
     m_state->before.reset();
 }
 
-int TerminalKeys::descriptor() const {
+int TerminalKeys::keyDescriptor() const {
     return m_state->before ? kStandardInput : -1;
 }
 
@@ -45,11 +39,6 @@ std::optional<char> TerminalKeys::take() {
     const auto key = takeKey();
     if (!key || *key >= 0x80) return std::nullopt;
     return static_cast<char>(*key);
-}
-
-bool TerminalKeys::takeQuit() {
-    const auto key = take();
-    return key && (*key == 'q' || *key == 'Q');
 }
 
 }  // namespace vexa::client

@@ -1,8 +1,6 @@
 #include "client/command/credential/CredentialSession.h"
 
-#include <iostream>
-
-#include "client/port/JsonLine.h"
+#include "client/command/Output.h"
 
 namespace vexa::client {
 
@@ -27,14 +25,10 @@ CredentialStore& CredentialSession::begin() {
 
 void CredentialSession::report(const std::string& verb, const std::string& sentence,
                                const Credential& credential, std::size_t position) const {
-    if (!m_options.json) {
-        std::cout << sentence << '\n';
-        return;
-    }
     Json::Value object(Json::objectValue);
     object["done"] = verb;
     object["credential"] = credentialJson(credential, position, Passwords::Hidden);
-    std::cout << jsonLine(object) << '\n';
+    print(m_options.json, object, sentence);
 }
 
 }  // namespace vexa::client

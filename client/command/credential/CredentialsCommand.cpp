@@ -1,12 +1,11 @@
 #include <CLI/CLI.hpp>
-#include <iostream>
 #include <memory>
 
 #include "client/command/Commands.h"
 #include "client/command/HotspotOptions.h"
+#include "client/command/Output.h"
 #include "client/hotspot/CredentialStore.h"
 #include "client/hotspot/CredentialText.h"
-#include "client/port/JsonLine.h"
 #include "client/terminal/ClientError.h"
 #include "client/terminal/Text.h"
 
@@ -25,14 +24,9 @@ int runCredentials(const CredentialsOptions& options) {
     CredentialStore store(port);
     const CredentialList& list = store.read();
     const Passwords passwords = options.showPasswords ? Passwords::Shown : Passwords::Hidden;
-    if (options.hotspot.json) {
-        std::cout << jsonLine(credentialsJson(list, passwords)) << '\n';
-    } else if (list.empty()) {
-        std::cout << "No credentials are stored.\n";
-    } else {
-        for (const auto& line : credentialTable(list, passwords))
-            std::cout << line << '\n';
-    }
+    print(options.hotspot.json, credentialsJson(list, passwords),
+          list.empty() ? std::vector<std::string>{"No credentials are stored."}
+                       : credentialTable(list, passwords));
     return kExitOk;
 }
 
@@ -41,13 +35,9 @@ int runReload(const HotspotOptions& options) {
     HotspotPort port(options.port.find(), signals, options.limit());
     CredentialStore store(port);
     const std::size_t count = store.reload().size();
-    if (options.json) {
-        Json::Value object(Json::objectValue);
-        object["credentials"] = static_cast<Json::UInt64>(count);
-        std::cout << jsonLine(object) << '\n';
-    } else {
-        std::cout << "The configuration was read again: " << counted(count, "credential") << ".\n";
-    }
+    Json::Value object(Json::objectValue);
+    object["credentials"] = static_cast<Json::UInt64>(count);
+    print(options.json, object, "The configuration was read again: " + counted(count, "credential") + ".");
     return kExitOk;
 }
 
