@@ -1,37 +1,31 @@
 #include <gtest/gtest.h>
 
 #include "Station.h"
+#include "platform/Session.h"
 
 namespace vexa::simulation {
 namespace {
 
 const std::string kHeader = hex("005ec403 00000000");
-
-/// A record: BSSID, SSID in hex, and the three numbers in hex.
-std::string record(const std::string& bssid, const std::string& ssid, const std::string& isHs20 = "01000000",
-                   const std::string& type = "02000000", const std::string& internet = "01000000") {
-    return bssid + ssid + zeros(34 - ssid.size() / 2) + isHs20 + type + internet;
-}
-
-const std::string kCafe = record("020000000001", "43616665");
 const std::string kCompleted = kHeader + hex("04000000 00000000");
 
-std::string network(const std::string& number, const std::string& ssid, const std::string& more = "") {
-    return "{'bssid': '02:00:00:00:00:" + number + "', 'ssid': '" + ssid + "'" + (more.empty() ? "" : ", ") +
-           more + "}";
+std::string record(const std::string& bssid, const std::string& ssidHex, const std::string& numbers) {
+    return bssid + ssidHex + zeros(34 - ssidHex.size() / 2) + hex(numbers);
 }
 
-std::string scenarioWith(const std::string& networks) {
-    return "{'networks': [" + networks + "]}";
+const std::string kCafe = record("020000000001", "43616665", "01000000 02000000 01000000");
+
+std::string network(const std::string& number, const std::string& more) {
+    return "{'bssid': '02:00:00:00:00:" + number + "', 'ssid': 'Cafe'" + more + "}";
 }
 
 /// The client's side of the module.
 class Air : public Station {
 public:
-    using Station::Station;
+    explicit Air(const std::string& networks) : Station("{'networks': [" + networks + "]}") {}
 
     DWORD send(const std::string& request, DWORD capacity) {
-        return control(wlan_ihv_control_type_service, bytesFromHex(request).value_or(Bytes{}), capacity);
+        return control(wlan_ihv_control_type_service, *bytesFromHex(request), capacity);
     }
 
     std::string bssList(DWORD capacity = 10240) {
@@ -39,37 +33,28 @@ public:
         return hexText(output);
     }
 
-    DWORD askAnqp(const std::string& bssid, DWORD capacity = 10240) {
-        return send(kHeader + "0800000034000000" + record(bssid, "00"), capacity);
-    }
-
     std::string anqp(const std::string& bssid) {
-        EXPECT_EQ(askAnqp(bssid), ERROR_SUCCESS);
+        EXPECT_EQ(send(kHeader + "0800000034000000" + bssid + zeros(46), 10240), ERROR_SUCCESS);
         return hexText(output);
     }
 
     void query() { EXPECT_EQ(send(kHeader + "03000000" + zeros(8), 0), ERROR_SUCCESS); }
 };
 
-TEST(HotspotModule, TheListHoldsTheVisibleReportedNetworksInOrder) {
+TEST(HotspotModule, TheListHoldsTheVisibleReportedNetworksInOrderAsFarAsTheyFit) {
     const std::string ssid = "00ff" + std::string(60, '1');
-    Air air(scenarioWith(network("01", "Cafe") + "," + network("02", "Away", "'visible': false") + "," +
-                         network("03", "Quiet", "'reported': false") + ",{'bssid': '0a:Bc:00:00:00:04'," +
-                         "'ssidHex': '" + ssid + "', 'hs20': false, 'networkType': 7, 'internetAccess': 0}"));
-    const std::string away = record("020000000002", "41776179");
-    const std::string last = record("0abc00000004", ssid, "00000000", "07000000", "00000000");
-    EXPECT_EQ(air.bssList(), kCafe + last);
-    air.act("{'do': 'show', 'bssid': '02:00:00:00:00:02'}");
-    EXPECT_EQ(air.bssList(), kCafe + away + last);
-    for (const DWORD capacity : {0U, 51U, 52U, 103U, 104U})
-        EXPECT_EQ(air.bssList(capacity), (kCafe + away).substr(0, capacity / 52 * 104)) << capacity;
-    air.act("{'do': 'hide', 'bssid': '02:00:00:00:00:01'}");
-    EXPECT_EQ(air.bssList(), away + last);
-    EXPECT_EQ(air.told(), Texts{});
+    Air air(network("01", "") + "," + network("02", ", 'visible': false") + "," +
+            network("03", ", 'reported': false") + ",{'bssid': '0a:Bc:00:00:00:04', 'ssidHex': '" + ssid +
+            "', 'hs20': false, 'networkType': 7, 'internetAccess': 0}");
+    const std::string list = kCafe + record("0abc00000004", ssid, "00000000 07000000 00000000");
+    for (const DWORD capacity : {0U, 51U, 52U, 103U, 104U, 10240U})
+        EXPECT_EQ(air.bssList(capacity), list.substr(0, capacity / 52 * 104)) << capacity;
+    air.act("{'do': 'reportNetworks'}");
+    EXPECT_EQ(air.blocks(), Texts{kHeader + "0200000068000000" + list});
 }
 
 TEST(HotspotModule, RequestsOfAnotherFormOrToAnotherAdapterAreRefused) {
-    Air air("{'adapters': [{}, {}]}");
+    Air air("");
     const std::string requests[] = {
         kHeader + "05000000" + zeros(4),                // too short
         kHeader + "05000000" + zeros(9),                // too long
@@ -83,43 +68,33 @@ TEST(HotspotModule, RequestsOfAnotherFormOrToAnotherAdapterAreRefused) {
     for (const std::string& request : requests)
         EXPECT_EQ(air.send(request, 100), ERROR_INVALID_PARAMETER) << request;
     EXPECT_EQ(air.bssList(), "");
-    air.guid = air.machine->adapters().guid(1);
-    EXPECT_EQ(air.send(kHeader + "05000000" + zeros(8), 100), ERROR_INVALID_PARAMETER);
 }
 
-TEST(HotspotModule, TheRealmListIsBuiltAsTheNetworkGivesIt) {
+TEST(HotspotModule, TheRealmListIsBuiltAsTheNetworkGivesItLast) {
     const struct {
-        std::string members;
+        std::string member;
         std::string info;
     } cases[] = {
-        {"", "00000000"},
+        {"'visible': true", "00000000"},
         {"'realms': []", "02000000 0000"},
-        {"'realms': [{}]", "07000000 0100 0300 000000"},
-        {"'realms': [{'names': ['a.b', 'c'], 'eapMethods': [13, 21]}]",
-         "12000000 0100 0e00 00 05 612e623b63 02 020d00 021500"},
-        {"'realms': [{'names': ['a']}, {'eapMethods': [255]}]",
-         "10000000 0200 0400 00 01 61 00 0600 00 00 01 02ff00"},
-        {"'naiRealmHex': ''", "00000000"},
         {"'naiRealmHex': 'FfEe01'", "03000000 ffee01"},
+        {"'realms': [{'names': ['a.b', 'c'], 'eapMethods': [13, 255]}, {}]",
+         "17000000 0200 0e00 00 05 612e623b63 02 020d00 02ff00 0300 00 00 00"},
+        {"'naiRealmHex': ''", "00000000"},
     };
-    for (const auto& [members, info] : cases) {
-        Air air(scenarioWith(network("01", "Cafe", members)));
-        EXPECT_EQ(air.anqp("020000000001"), hex(info)) << members;
+    Air air(network("01", ""));
+    for (const auto& [member, info] : cases) {
+        air.act("{'do': 'setNetwork', 'bssid': '02:00:00:00:00:01', " + member + "}");
+        EXPECT_EQ(air.anqp("020000000001"), hex(info)) << member;
     }
-}
-
-TEST(HotspotModule, AnAnswerThatDoesNotFitIsAnError) {
-    Air air(scenarioWith(network("01", "Cafe", "'naiRealmHex': '" + zeros(10236) + "'") + "," +
-                         network("02", "Cafe", "'naiRealmHex': '" + zeros(10237) + "'")));
-    EXPECT_EQ(air.anqp("020000000001").size(), 2U * 10240);
-    EXPECT_EQ(air.askAnqp("020000000002"), ERROR_INSUFFICIENT_BUFFER);
-    EXPECT_EQ(air.askAnqp("020000000001", 3), ERROR_INSUFFICIENT_BUFFER);
+    air.act("{'do': 'setNetwork', 'bssid': '02:00:00:00:00:01', 'naiRealmHex': '" + zeros(10237) + "'}");
+    EXPECT_EQ(air.send(kHeader + "0800000034000000" + "020000000001" + zeros(46), 10240),
+              ERROR_INSUFFICIENT_BUFFER);
 }
 
 TEST(HotspotModule, ANetworkWithoutAnAnswerYetGivesNothing) {
-    Air air(scenarioWith(network("01", "Ready") + "," + network("02", "Later", "'anqp': 'onQuery'") + "," +
-                         network("03", "Never", "'anqp': 'never'") + "," +
-                         network("04", "Quiet", "'reported': false")));
+    Air air(network("01", "") + "," + network("02", ", 'anqp': 'onQuery'") + "," +
+            network("03", ", 'anqp': 'never'") + "," + network("04", ", 'reported': false"));
     const auto answers = [&] {
         std::string out;
         for (const char* bssid :
@@ -127,104 +102,75 @@ TEST(HotspotModule, ANetworkWithoutAnAnswerYetGivesNothing) {
             out += air.anqp(bssid).empty() ? "-" : "+";
         return out;
     };
+    std::string during;
+    air.listener.onNotification = [&](const WLAN_NOTIFICATION_DATA&) { during = answers(); };
     EXPECT_EQ(answers(), "+----");
     air.query();
     air.machine.advance(199);
     EXPECT_EQ(answers(), "+----");
-    EXPECT_EQ(air.blocks(), Texts{});
     air.machine.advance(1);
-    EXPECT_EQ(answers(), "++---");
-    EXPECT_EQ(air.blocks(), Texts{kCompleted});
+    EXPECT_EQ(during, "++---");
     air.act("{'do': 'setNetwork', 'bssid': '02:00:00:00:00:02', 'anqp': 'onQuery'}");
     EXPECT_EQ(answers(), "+----");
     air.act("{'do': 'reportAnqp', 'bssid': '02:00:00:00:00:02'}");
     air.act("{'do': 'reportAnqp', 'bssid': '02:00:00:00:00:03'}");
-    EXPECT_EQ(answers(), "++---");
+    EXPECT_EQ(during, "++---");
 }
 
 TEST(HotspotModule, EachQueryHasItsOwnCompletion) {
-    Air air("{'anqpMs': 50}");
+    Air air("");
+    const auto expectCompletions = [&](std::initializer_list<std::pair<int, std::size_t>> steps) {
+        for (const auto& [milliseconds, completions] : steps) {
+            air.machine.advance(milliseconds);
+            EXPECT_EQ(air.blocks(), Texts(completions, kCompleted));
+        }
+    };
+    air.act("{'do': 'set', 'anqpMs': 50}");
     air.query();
     air.machine.advance(20);
     air.query();
     air.act("{'do': 'set', 'anqpMs': 10}");
     air.query();
-    const struct {
-        int milliseconds;
-        std::size_t completions;
-    } steps[] = {{9, 0}, {1, 1}, {19, 0}, {1, 1}, {19, 0}, {1, 1}, {1000, 0}};
-    for (const auto& [milliseconds, completions] : steps) {
-        air.machine.advance(milliseconds);
-        EXPECT_EQ(air.blocks(), Texts(completions, kCompleted));
-    }
+    expectCompletions({{9, 0}, {1, 1}, {19, 0}, {1, 1}, {19, 0}, {1, 1}, {1000, 0}});
+    air.query();
+    air.machine.advance(5);
+    air.query();
+    air.act("{'do': 'completeAnqpQuery'}");  // in place of the first
+    expectCompletions({{0, 1}, {9, 0}, {1, 1}, {1000, 0}});
     air.query();
     air.act("{'do': 'pullAdapter'}");
     air.act("{'do': 'insertAdapter'}");
-    air.machine.advance(1000);
-    EXPECT_EQ(air.blocks(), Texts{});
+    expectCompletions({{1000, 0}});
 }
 
-TEST(HotspotModule, CompletingByHandTakesThePlaceOfTheNextOneDue) {
-    Air air(scenarioWith(network("01", "Later", "'anqp': 'onQuery'")));
-    std::string during;
-    air.listener.onNotification = [&](const WLAN_NOTIFICATION_DATA&) { during = air.anqp("020000000001"); };
-    air.query();
-    air.machine.advance(100);
-    air.query();
-    air.act("{'do': 'completeAnqpQuery'}");
-    EXPECT_EQ(air.blocks(), Texts{kCompleted});
-    EXPECT_EQ(during, "00000000");
-    air.machine.advance(199);
-    EXPECT_EQ(air.blocks(), Texts{});
-    air.machine.advance(1);
-    EXPECT_EQ(air.blocks(), Texts{kCompleted});
-}
-
-TEST(HotspotModule, ReportsHaveExactlyTheirBytes) {
-    Air air(scenarioWith(network("01", "Cafe") + "," + network("02", "Away", "'visible': false")));
+TEST(HotspotModule, AUserWhoLeavesIsToldWithTheNetworkAsItIsKnown) {
+    Air air(network("01", ""));
     const struct {
-        const char* action;
-        std::string message;
+        const char* members;
+        std::string record;
     } cases[] = {
-        {"{'do': 'reportNetworks'}", "0200000034000000" + kCafe},
-        {"{'do': 'reportAnqp', 'bssid': '02:00:00:00:00:01'}", "0300000034000000" + kCafe},
-        {"{'do': 'completeAnqpQuery'}", hex("04000000 00000000")},
-        {"{'do': 'userDisconnect', 'ssid': 'Cafe'}", "0500000034000000" + kCafe},
-        {"{'do': 'userDisconnect', 'ssid': 'Cafe', 'isHs20': 2}",
-         "0500000034000000" + record("020000000001", "43616665", "02000000")},
-        {"{'do': 'userDisconnect', 'ssid': 'Other'}",
-         "0500000034000000" + record(zeros(6), "4f74686572", "01000000", "00000000", "00000000")},
-        {"{'do': 'sessionChange', 'eventType': 7, 'sessionId': 258}",
-         hex("06000000 08000000 07000000 02010000")},
-        {"{'do': 'driverState', 'current': 4294967295, 'previous': 3}",
-         hex("01000000 08000000 ffffffff 03000000")},
+        {"'ssid': 'Cafe'", kCafe},
+        {"'ssid': 'Cafe', 'isHs20': 2", record("020000000001", "43616665", "02000000 02000000 01000000")},
+        {"'ssid': 'Other'", record(zeros(6), "4f74686572", "01000000 00000000 00000000")},
     };
-    for (const auto& [action, message] : cases) {
-        air.act(action);
-        EXPECT_EQ(air.blocks(), Texts{kHeader + message}) << action;
+    for (const auto& [members, record] : cases) {
+        air.act(std::string("{'do': 'userDisconnect', ") + members + "}");
+        EXPECT_EQ(air.blocks(), Texts{kHeader + "0500000034000000" + record}) << members;
     }
 }
 
 TEST(HotspotModule, ASessionChangesJustBeforeItsMessage) {
-    Air air("{}");
-    SessionState during = SessionState::Active;
-    air.listener.onNotification = [&](const WLAN_NOTIFICATION_DATA&) { during = air.machine->session(); };
-    air.act("{'do': 'sessionChange', 'eventType': 4, 'session': 'disconnected'}");
-    EXPECT_EQ(during, SessionState::Disconnected);
-    air.act("{'do': 'sessionChange', 'eventType': 3}");
-    EXPECT_EQ(air.machine->session(), SessionState::Disconnected);
-}
-
-TEST(HotspotModule, NetworksComeAndChange) {
-    Air air("{}");
-    air.act("{'do': 'addNetwork', 'network': " + network("01", "Cafe", "'realms': []") + "}");
-    EXPECT_EQ(air.bssList(), kCafe);
-    EXPECT_EQ(air.anqp("020000000001"), "020000000000");
-    air.act("{'do': 'setNetwork', 'bssid': '02:00:00:00:00:01', 'naiRealmHex': 'aa', 'networkType': 3}");
-    EXPECT_EQ(air.anqp("020000000001"), "01000000aa");
-    EXPECT_EQ(air.bssList(), record("020000000001", "43616665", "01000000", "03000000"));
-    air.act("{'do': 'setNetwork', 'bssid': '02:00:00:00:00:01', 'realms': []}");
-    EXPECT_EQ(air.anqp("020000000001"), "020000000000");
+    Station station("{'session': 'disconnected'}");
+    EXPECT_FALSE(platform::isSessionActive());
+    bool wasActive = false;
+    station.listener.onNotification = [&](const WLAN_NOTIFICATION_DATA&) {
+        wasActive = platform::isSessionActive();
+    };
+    station.act("{'do': 'sessionChange', 'eventType': 4, 'sessionId': 258, 'session': 'active'}");
+    EXPECT_TRUE(wasActive);
+    EXPECT_EQ(station.blocks(), Texts{kHeader + hex("06000000 08000000 04000000 02010000")});
+    station.act("{'do': 'sessionChange', 'eventType': 3}");
+    EXPECT_TRUE(wasActive);
 }
 
 }  // namespace
