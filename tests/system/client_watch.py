@@ -7,7 +7,7 @@ import signal
 from client_networks import NETWORKS, REPORT, NetworkStory
 from harness import network, wait_until
 
-LINE = re.compile(r"\d\d:\d\d:\d\d  (hotspot |spectrum)  (\S.*)")
+LINE = re.compile(r"\d\d:\d\d:\d\d  (hotspot |spectrum)  \S.*")
 CHANNELS = {"channels": [1, 6], "levels": {"1": {"congestion": 30, "power": 30}, "6": {"congestion": 60, "power": 60}}}
 
 
@@ -21,38 +21,32 @@ class WatchStory(NetworkStory):
     def watch(self, *options):
         return self.running("watch", "--machine", self.machine.folder, *options)
 
-    def sentences(self, watch, half="hotspot"):
-        matches = [LINE.fullmatch(line) for line in list(watch.lines)]
-        self.assertTrue(all(matches), watch.lines)
-        return [match[2] for match in matches if match[1].strip() == half]
-
-    def wait_told(self, watch, *parts, half="hotspot"):
-        for part in parts:
-            wait_until(lambda: any(part in told for told in self.sentences(watch, half)), f"{part!r}; {watch.lines}")
-
     def started(self):
         """A watch that has told how things stand."""
         watch = self.watch()
-        self.wait_told(watch, "hotspots in range", "the internet is")
-        self.wait_told(watch, "channels: 1 6", half="spectrum")
+        for told in ("hotspots in range", "the internet is", "spectrum  2 channels: 1 6"):
+            watch.wait_line(told)
         return watch
 
     def assert_quiet_end(self, watch, number=signal.SIGINT):
         self.assertEqual((watch.stop(number), watch.errors), (0, []))
+        self.assertTrue(all(map(LINE.fullmatch, watch.lines)), watch.lines)
 
 
 class Telling(WatchStory):
     def test_the_life_of_a_connection(self):
         watch = self.started()
-        self.assertEqual(self.sentences(watch)[:4], ["the adapter is in", "the radio is on", "0 credentials stored",
-                                                     'hotspots in range: "Airport Free", "Café"'])  # fmt: skip
+        told = [line[20:] for line in watch.lines if line[10:].startswith("hotspot   ")]
+        expected = ["the adapter is in", "the radio is on", "0 credentials stored"]
+        self.assertEqual(told[:4], [*expected, 'hotspots in range: "Airport Free", "Café"'])
         self.add_user("Roam", realm="roam.example")
-        self.wait_told(watch, 'credential 1 "Roam" was added', 'joined "Airport Free" with the credential "Roam"')
+        watch.wait_line('credential 1 "Roam" was added')
+        watch.wait_line('joined "Airport Free" with the credential "Roam"')
         self.done("disconnect")
-        self.wait_told(watch, 'the connection to "Airport Free" has ended')
+        watch.wait_line('the connection to "Airport Free" has ended')
         self.control.do("setNetwork", bssid=NETWORKS[0]["bssid"], accepts=[])
         self.vexa("connect", "Airport Free")
-        self.wait_told(watch, "an attempt to connect has failed")
+        watch.wait_line("an attempt to connect has failed")
         self.assert_quiet_end(watch)
 
     def test_the_air_the_radio_and_the_adapter(self):
@@ -60,22 +54,22 @@ class Telling(WatchStory):
         gate = network(9, "Gate", {})
         self.control.do("addNetwork", network=gate)
         self.control.do("reportNetworks")
-        self.wait_told(watch, '"Gate" is in range; realms: none')
+        watch.wait_line('"Gate" is in range; realms: none')
         self.hide(gate["bssid"])
-        self.wait_told(watch, '"Gate" is out of range')
+        watch.wait_line('"Gate" is out of range')
         self.done("scan")
-        self.wait_told(watch, "channel 6: congestion 60", half="spectrum")
+        watch.wait_line("spectrum  channel 6: congestion 60")
         self.control.do("driverState", current=3, previous=1)
-        self.wait_told(watch, "the hotspot module went from state 1 to 3")
+        watch.wait_line("the hotspot module went from state 1 to 3")
         self.control.do("radio", software="off")
-        self.wait_told(watch, "the radio is off")
-        self.wait_told(watch, "radio off", half="spectrum")
+        watch.wait_line("the radio is off")
+        watch.wait_line("spectrum  radio off")
         self.done("disable")
-        self.wait_told(watch, "hotspot networks are disabled")
+        watch.wait_line("hotspot networks are disabled")
         self.control.do("pullAdapter")
-        self.wait_told(watch, "the adapter is out")
+        watch.wait_line("the adapter is out")
         self.control.do("insertAdapter")
-        wait_until(lambda: self.sentences(watch).count("the adapter is in") == 2, "its return")
+        watch.wait_line("hotspot   the adapter is in", count=2)
         self.assert_quiet_end(watch, signal.SIGTERM)
 
     def test_json_is_each_event_of_both_ports(self):
@@ -85,7 +79,7 @@ class Telling(WatchStory):
             return {json.loads(line)["Source"] for line in list(watch.lines)}
 
         wait_until(lambda: sources() == {"HotSpot20", "SpectralAnalyser"}, "both")
-        self.assert_quiet_end(watch)
+        self.assertEqual((watch.stop(signal.SIGINT), watch.errors), (0, []))
 
 
 class Ending(WatchStory):

@@ -527,12 +527,20 @@ class Machine:
 class Story(unittest.TestCase):
     """A test with machines, programs and folders that go when it ends."""
 
+    def run(self, result=None):
+        self._result = result
+        return super().run(result)
+
+    def _end(self, machine):
+        failed = [getattr(test, "test_case", test) for test, _ in self._result.failures + self._result.errors]
+        machine.__exit__(AssertionError if self in failed else None)
+
     def start(self, folder=None, arguments=(), **scenario):
         """Gives a machine, whose time is twenty times as fast if the scenario does not say otherwise."""
-        scenario = {"speed": 20, **scenario}
-        self.machine = self.enterContext(Machine(scenario, folder=folder, arguments=arguments))
-        self.control = self.machine.control
-        return self.machine
+        machine = Machine({"speed": 20, **scenario}, folder=folder, arguments=arguments).__enter__()
+        self.addCleanup(self._end, machine)
+        self.machine, self.control = machine, machine.control
+        return machine
 
     def new_folder(self):
         folder = tempfile.TemporaryDirectory(prefix="vexa-test-", ignore_cleanup_errors=True)

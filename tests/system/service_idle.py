@@ -12,23 +12,15 @@ TERABYTE = 1 << 30  # in kB
 
 
 def status(path):
-    return dict(line.split(":\t", 1) for line in path.read_text().splitlines() if ":\t" in line)
-
-
-def kilobytes(text):
-    return int(text.split()[0])
-
-
-def process(machine):
-    return pathlib.Path(f"/proc/{machine.service_pid()}")
+    return dict(line.split(":\t", 1) for line in (path / "status").read_text().splitlines() if ":\t" in line)
 
 
 class Idle(Story):
     def assert_rests(self, machine):
-        tasks = process(machine) / "task"
+        tasks = pathlib.Path(f"/proc/{machine.service_pid()}/task")
 
         def switches():
-            return {task.name: int(status(task / "status")["voluntary_ctxt_switches"]) for task in tasks.iterdir()}
+            return {task.name: int(status(task)["voluntary_ctxt_switches"]) for task in tasks.iterdir()}
 
         looks = []
 
@@ -46,10 +38,11 @@ class Idle(Story):
         self.assertLessEqual(sum(woken.values()), 3, woken)
 
     def assert_small(self, machine):
-        memory = status(process(machine) / "status")
-        if kilobytes(memory["VmSize"]) > TERABYTE:
+        told = status(pathlib.Path(f"/proc/{machine.service_pid()}"))
+        virtual, resident = (int(told[name].split()[0]) for name in ("VmSize", "VmRSS"))
+        if virtual > TERABYTE:
             self.skipTest("built with a sanitizer, which has memory of its own")
-        self.assertLess(kilobytes(memory["VmRSS"]), MEMORY_LIMIT)
+        self.assertLess(resident, MEMORY_LIMIT)
 
     def test_with_a_parent_and_then_with_clients_that_say_nothing(self):
         with Machine({"speed": 1}, control=False) as machine:

@@ -50,7 +50,7 @@ class Life(ConnectionStory):
         self.begin(CAFE)
         self.control.wait_connected("Cafe")
         self.assertEqual(self.machine.parent.stop(timeout=40), 0)
-        (path,) = (wine.store() / "Dump").iterdir()
+        (path,) = (self.machine.config().parent / "Dump").iterdir()
         self.assertEqual(path.name, "hs20log.txt_user.txt")
         lines = path.read_bytes().split(b"\r\n")
         self.assertEqual(lines[-1], b"")

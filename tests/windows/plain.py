@@ -18,5 +18,5 @@ class WithoutAnAdapter(unittest.TestCase):
             self.assertEqual(sa.next_event()["Data"], "null\n")
             status = wine.run_client("status", "--json")
             self.assertEqual((status.returncode, json.loads(status.stdout)["adapter"]), (0, False), status)
-            self.assertTrue((wine.store() / "config.xml").is_file())
+            self.assertTrue(machine.config().is_file())
             self.assertEqual(machine.stop(), 0)

@@ -31,6 +31,9 @@ STAND_INS = ("wlanapi", "iphlpapi", "wtsapi32", "secur32")
 CLONE_NEWUSER, CLONE_NEWNET = 0x10000000, 0x40000000
 SIOCGIFFLAGS, SIOCSIFFLAGS, IFF_UP = 0x8913, 0x8914, 1
 
+BUILD, PREFIX = (pathlib.Path(os.environ[name]) for name in ("VEXA_WINDOWS_BUILD", "WINEPREFIX"))
+USERS = PREFIX / "drive_c" / "users"
+
 open_direct = harness.open_connection  # as a process that is not Wine's
 NativeMachine = harness.Machine
 
@@ -54,22 +57,6 @@ def enter_own_network():
         fcntl.ioctl(any_socket, SIOCSIFFLAGS, request)
 
 
-def build():
-    return pathlib.Path(os.environ["VEXA_WINDOWS_BUILD"])
-
-
-def prefix():
-    return pathlib.Path(os.environ["WINEPREFIX"])
-
-
-def users():
-    return prefix() / "drive_c" / "users"
-
-
-def store():
-    return users() / STORE
-
-
 def windows_path(path):
     return "Z:" + str(pathlib.Path(path).resolve()).replace("/", "\\")
 
@@ -77,7 +64,7 @@ def windows_path(path):
 def environment(**variables):
     """Without a window, a menu or a word of Wine's own; the stand-ins go first where they stand beside a program."""
     overrides = ";".join([f"{','.join(STAND_INS)}=n,b", "mscoree,mshtml,winemenubuilder.exe="])
-    return clean_environment(WINEPREFIX=str(prefix()), WINEDEBUG="-all", WINEDLLOVERRIDES=overrides, **variables)
+    return clean_environment(WINEPREFIX=str(PREFIX), WINEDEBUG="-all", WINEDLLOVERRIDES=overrides, **variables)
 
 
 @functools.cache
@@ -90,7 +77,7 @@ def stage():
     for name, files in parts.items():
         (folder / name).mkdir()
         for file in files:
-            shutil.copy(build() / file, folder / name)
+            shutil.copy(BUILD / file, folder / name)
     return folder
 
 
@@ -133,14 +120,14 @@ def end_all():
 
 
 def remove_prefix():
-    if prefix().exists():
+    if PREFIX.exists():
         end_all()
-        shutil.rmtree(prefix())
+        shutil.rmtree(PREFIX)
 
 
 def make_prefix():
     remove_prefix()
-    prefix().parent.mkdir(parents=True, exist_ok=True)
+    PREFIX.parent.mkdir(parents=True, exist_ok=True)
     quiet = {"stdin": subprocess.DEVNULL, "stdout": subprocess.DEVNULL, "stderr": subprocess.DEVNULL}
     subprocess.run(["wineboot", "--init"], env=environment(), check=True, **quiet)
     end_all()
@@ -149,8 +136,8 @@ def make_prefix():
 def forget_machine():
     """As if no service had ever run here."""
     run("reg", "delete", "HKCU\\Software\\Korvane", "/f")
-    shutil.rmtree(store().parent, ignore_errors=True)
-    for folder in users().glob("*/AppData/Local/Korvane"):
+    shutil.rmtree((USERS / STORE).parent, ignore_errors=True)
+    for folder in USERS.glob("*/AppData/Local/Korvane"):
         shutil.rmtree(folder, ignore_errors=True)
 
 
@@ -162,7 +149,7 @@ def relay():
     output = stage() / "relay"
     with output.open("w") as file:
         process = subprocess.Popen(
-            ["wine", str(build() / "stand-ins" / "vexa-test-relay.exe")],
+            ["wine", str(BUILD / "stand-ins" / "vexa-test-relay.exe")],
             env=environment(),
             stdin=subprocess.PIPE,
             stdout=file,
@@ -232,7 +219,7 @@ class Machine(NativeMachine):
         self.folder = pathlib.Path(folder or tempfile.mkdtemp(prefix="vexa-test-"))
         if self._own_folder:
             forget_machine()
-            (self.folder / "Public").symlink_to(users() / "Public")
+            (self.folder / "Public").symlink_to(USERS / "Public")
         self.sa_port = self.hs20_port = self.control_port = 0
         self.parent = Parent(
             arguments,
@@ -259,7 +246,7 @@ class Machine(NativeMachine):
         return service_pid(self.sa_port) if self.sa_port else None
 
     def _content(self, name):
-        (path,) = list(users().glob(f"*/AppData/Local/Korvane/Vexa/{name}")) or (self.folder / name,)
+        (path,) = list(USERS.glob(f"*/AppData/Local/Korvane/Vexa/{name}")) or (self.folder / name,)
         return path.read_text(encoding="latin-1") if path.exists() else ""
 
 
