@@ -101,12 +101,17 @@ class Alone(Story):
                 ("the rows of the first check", {"error": 5, "skip": 1}, 5),
                 ("the rows of the second check", {"error": 1784, "skip": 3}, 1784),
                 ("the size, so that the room is too small for the rows", {"error": 5}, 122),
-                ("a size that is not told", {"error": 122}, 122),
+                ("a table that grows at each question", {"error": 122, "times": 20}, 122),
             ):
                 with self.subTest(name):
                     timeline = [{"atMs": 0, "do": "fail", "call": "GetTcpTable", **fault}]
                     result = self.run_service(*ports, timeline=timeline)
                     self.assertEqual(result, (1, f"\tGetTcpTable failed with {told}\n", ""))
+
+    def test_a_table_that_grows_meanwhile_is_asked_for_again(self):
+        fault = {"atMs": 0, "do": "fail", "call": "GetTcpTable", "error": 122, "times": 5}
+        sa, hs20 = free_ports(2)
+        self.assertEqual(self.run_service(sa, hs20, timeline=[fault]), (0, created(sa, hs20), ""))
 
 
 class WithParent(Story):

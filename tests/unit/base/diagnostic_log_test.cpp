@@ -101,8 +101,24 @@ TEST_F(LogFile, KeepsTheLastHundredThousandAtMost) {
     addLines(100010);
     while (m_machine->faults().nextError("open", "log.txt"))
         continue;
-    EXPECT_TRUE(flushed().starts_with("[11] x\n[12] x\n"));
+    EXPECT_NE(flushed().find("  10 lines of the log were lost.\n[11] x\n[12] x\n"), std::string::npos);
     EXPECT_TRUE(content().ends_with("[100010] x\n"));
+}
+
+TEST_F(LogFile, KeepsTheLastMebibyteThatAFullDiskDidNotTake) {
+    start();
+    addLines(1);
+    EXPECT_EQ(flushed(), "[1] x\n");
+    m_machine.ask("{'do':'fail','call':'write','error':112,'match':'log.txt','times':3}");
+    addLines(1);
+    EXPECT_EQ(flushed(), "[1] x\n");
+    const std::string half(1 << 19, 'h');
+    for (int i = 0; i < 3; ++i)
+        m_log.addLine(half, false);
+    EXPECT_EQ(flushed(), "[1] x\n");
+    EXPECT_EQ(flushed(), "[1] x\n");
+    EXPECT_EQ(flushed().substr(flushed().find("  2 lines")),
+              "  2 lines of the log were lost.\n" + half + half);
 }
 
 TEST_F(LogFile, WithoutAPathIsLikeOneThatCannotBeOpened) {

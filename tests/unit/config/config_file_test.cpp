@@ -72,7 +72,7 @@ TEST(ConfigFile, GlobalKeys) {
     }
 }
 
-TEST(ConfigFile, CountsDumpFilesUpToAHundredAndCutsTheirPaths) {
+TEST(ConfigFile, CountsDumpFilesUpToAHundred) {
     const std::string counting = "<create_new_dump_file>true</create_new_dump_file>";
     StoreMachine store;
     std::filesystem::create_directories(store.folder() / "Dump");
@@ -86,10 +86,25 @@ TEST(ConfigFile, CountsDumpFilesUpToAHundredAndCutsTheirPaths) {
     }
     ASSERT_EQ(open(store.config()), kSuccess);
     EXPECT_EQ(store.config().dumpFilePath(), L"hs20log.txt");
+}
 
-    const std::string longPath = "<dump_file_path>" + std::string(300, 'n') + "</dump_file_path>";
-    ASSERT_EQ(store.openWith(document("", "", counting + longPath)), kSuccess);
-    EXPECT_EQ(store.config().dumpFilePath(), kDump + std::wstring(254 - kDump.size(), L'n'));
+TEST(ConfigFile, KeepsTheDumpFileInItsFolderAndItsEnding) {
+    const std::size_t longest = 254 - kDump.size() - std::string("_alice_99.txt").size();
+    const std::pair<std::string, std::wstring> cases[] = {
+        {"..\\..\\x", L"hs20log.txt"},
+        {"a/b", L"hs20log.txt"},
+        {"C:x", L"hs20log.txt"},
+        {"x.txt:stream", L"hs20log.txt"},
+        {"a..txt", L"hs20log.txt"},
+        {".x", L".x"},
+        {std::string(longest, 'n'), std::wstring(longest, L'n')},
+        {std::string(longest + 1, 'n'), L"hs20log.txt"}};
+    for (const auto& [name, taken] : cases) {
+        StoreMachine store;
+        ASSERT_EQ(store.openWith(document("", "", "<dump_file_path>" + name + "</dump_file_path>")),
+                  kSuccess);
+        EXPECT_EQ(store.config().dumpFilePath(), kDump + taken + L"_alice.txt") << name;
+    }
 }
 
 TEST(ConfigFile, NamesTheDumpFileAfterTheUserAndIsNotMadeForNobody) {

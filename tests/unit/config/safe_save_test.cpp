@@ -20,13 +20,16 @@ TEST(SafeSave, ReplacesTheFileAndRemovesWhatAKilledProcessLeftAndNothingElse) {
     ASSERT_TRUE(saveSafely(pathOf(L"f"), "one"));
     EXPECT_FALSE(saveSafely(pathOf(L"f"), "two", platform::Existing::Keep));
     EXPECT_EQ(store.read("f"), "one");
-    const auto held = platform::NewFile::create(pathOf(L"f.held.tmp"));
+    const auto held = platform::NewFile::create(pathOf(L"f.00112233445566aa.tmp"));
     ASSERT_TRUE(held);
-    for (const char* name : {"f.0123.tmp", "f.x.tmp", "f.tmp", "g.0123.tmp", "f.0123.txt"})
+    for (const char* name : {"f.0123456789abcdef.tmp", "f.0123456789abcdeg.tmp", "f.0123.tmp", "f.tmp",
+                             "g.0123456789abcdef.tmp", "f.0123456789abcdef.txt"})
         store.write(name, "left");
     ASSERT_TRUE(saveSafely(pathOf(L"f"), "three"));
     EXPECT_EQ(store.read("f"), "three");
-    EXPECT_EQ(store.listing(), "f f.0123.txt f.held.tmp f.tmp g.0123.tmp");
+    EXPECT_EQ(store.listing(),
+              "f f.00112233445566aa.tmp f.0123.tmp f.0123456789abcdef.txt f.0123456789abcdeg.tmp f.tmp "
+              "g.0123456789abcdef.tmp");
 }
 
 TEST(SafeSave, LeavesTheOldFileWholeWhereverItFails) {
