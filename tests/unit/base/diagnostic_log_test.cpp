@@ -71,19 +71,6 @@ TEST_F(LogFile, ThousandthAndFirstLineWaitsAndTheNextWritesThemOut) {
     EXPECT_TRUE(flushed().ends_with("[1001] x\n[1002] x\n"));
 }
 
-TEST_F(LogFile, IsWrittenEveryTenSecondsAlsoWhenThereIsNothing) {
-    start();
-    m_machine.advance(9900);
-    EXPECT_EQ(content(), "no file");
-    m_machine.advance(200);
-    EXPECT_EQ(content(), "");
-    addLines(1);
-    m_machine.advance(9800);
-    EXPECT_EQ(content(), "");
-    m_machine.advance(200);
-    EXPECT_EQ(content(), "[1] x\n");
-}
-
 TEST_F(LogFile, KeepsItsLinesWhileTheFileCannotBeOpened) {
     start();
     addLines(1);

@@ -69,7 +69,7 @@ TEST(SpectralView, MalformedPayloadsChangeNothing) {
     SpectralView view = viewOf({channelList(kTwoChannels)});
     for (const Event& event :
          {channelList("nonsense"), channelList("{}"), channelList("[7]"), channelList(R"([{"Channel": 1}])"),
-          Event{"SPECTRAL_ANALYSER_SAMPLE_DATA_CONGESTION", ""},
+          channelList(std::string(100000, '[')), Event{"SPECTRAL_ANALYSER_SAMPLE_DATA_CONGESTION", ""},
           Event{"SPECTRAL_ANALYSER_SAMPLE_DATA_CONGESTION", R"({"order": 1})"},
           Event{"SPECTRAL_ANALYSER_SAMPLE_DATA_CONGESTION", R"({"order": "1", "congestion_value": 2})"},
           Event{"SPECTRAL_ANALYSER_SAMPLE_DATA_INTERFERENCE", R"({"order": 1, "congestion_value": 2})"}})
@@ -146,7 +146,8 @@ TEST(SpectralPicture, BarsAreAsLongAsTheirValues) {
     EXPECT_EQ(lines[2], "     36      1  ###         30  ########## 100");
     EXPECT_NE(picture(35, 0, {49, false, true})[2].find("███▌······  35"), std::string::npos);
     for (const int columns : {40, 80, 81, 120, 300})
-        EXPECT_LT(picture(100, 100, {columns, false, false})[2].size(), static_cast<std::size_t>(columns));
+        for (const std::string& line : picture(100, 100, {columns, false, false}))
+            EXPECT_LT(line.size(), static_cast<std::size_t>(columns));
 }
 
 TEST(SpectralPicture, TheColourGoesWithTheValueAndIsEndedInEveryRow) {

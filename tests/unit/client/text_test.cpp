@@ -14,12 +14,6 @@ TEST(Text, WhatIsNoUtf8IsKnown) {
         EXPECT_FALSE(isValidUtf8(text)) << text;
 }
 
-TEST(Text, LengthCountsUtf16Units) {
-    EXPECT_EQ(utf16Length(""), 0U);
-    EXPECT_EQ(utf16Length("aé空"), 3U);
-    EXPECT_EQ(utf16Length("😀😀x"), 5U);
-}
-
 TEST(Text, PrintableTextHasNoControlCharacters) {
     EXPECT_EQ(printable("a\x1B[31mb"), "a\\x1b[31mb");
     EXPECT_EQ(printable("\x7F\xC2\x9B"), "\\x7f\\x9b");

@@ -169,12 +169,5 @@ TEST(ConfigFile, GetsALostNextIdBackWithTheNextSave) {
     }
 }
 
-TEST(ConfigFile, CannotBeSpoiledByAnAccountThatXmlCannotHold) {
-    StoreMachine store("PC\\\\a\\u0001");
-    ASSERT_EQ(store.openWith(document("", "")), kSuccess);
-    EXPECT_EQ(store.config().saveConfig(), kFailure);
-    EXPECT_EQ(store.config().readConfig(nullptr), kSuccess);
-}
-
 }  // namespace
 }  // namespace vexa::test

@@ -85,10 +85,10 @@ TEST(Sharing, WhatASaveKeepsAndWhatItTakesAway) {
         {"what another's holds stays", odd, odd},
         {"what his own holds beyond the known goes",
          element("<id>1</id><type>eaptls</type><accesstype>alluser</accesstype><realm>r</realm><x>y</x>"
-                 "<username>u</username>"),
+                 "<username>u</username><cacert>ca</cacert><clientcert>client</clientcert>"),
          element("<id>1</id><type>eaptls</type><accesstype>alluser</accesstype><creator>PC\\alice</creator>"
                  "<eap>1</eap><autoconnect>true</autoconnect><credname>r</credname><realm>r</realm>"
-                 "<cacert></cacert><clientcert></clientcert>")},
+                 "<cacert>ca</cacert><clientcert>client</clientcert>")},
         {"an outer method without a number",
          element(
              "<id>1</id><type>eapttls</type><accesstype>alluser</accesstype><autoconnect>True</autoconnect>"

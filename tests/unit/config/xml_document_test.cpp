@@ -142,14 +142,6 @@ TEST_F(XmlFile, HoldsWhateverTextXmlCan) {
     }
 }
 
-TEST_F(XmlFile, RefusesTextThatXmlCannotHoldAndStaysAsItWas) {
-    for (const std::wstring& value : {L"a\x01"s, L"\x1F"s, L"a\0b"s, L"\uFFFE"s, L"\uFFFF"s}) {
-        ASSERT_EQ(load("<r><t>old</t></r>"), kSuccess);
-        EXPECT_EQ(m_document.setChild("t", value, select("/r"), false), kFailure);
-        EXPECT_EQ(text("/r/t"), L"old");
-    }
-}
-
 TEST_F(XmlFile, SetsAChildElementOrMakesOne) {
     ASSERT_EQ(load("<r><c><?id 5?><id>7</id></c></r>"), kSuccess);
     const XmlDocument::Node parent = select("/r/c");
@@ -189,13 +181,6 @@ TEST_F(XmlFile, MayBeOfAnyDepth) {
     XmlDocument::remove(select("/r/c"));
     ASSERT_EQ(save(), kSuccess);
     EXPECT_TRUE(saved().ends_with("<r></r>"));
-}
-
-TEST_F(XmlFile, IsNothingWithoutADocument) {
-    m_document.release();
-    EXPECT_EQ(m_document.load(path()), kNoDocument);
-    m_document.create();
-    EXPECT_EQ(m_document.load(*platform::publicFolder() + L"\\none.xml"), kFailure);
 }
 
 }  // namespace

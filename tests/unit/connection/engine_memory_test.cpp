@@ -1,5 +1,7 @@
 #include <gtest/gtest.h>
 
+#include <functional>
+
 #include "config/CredentialTable.h"
 #include "config/ResultCodes.h"
 #include "connection/BlockedNetworkList.h"
@@ -33,11 +35,6 @@ protected:
         credential->m_password = L"p";
         credential->m_bAutoConnect = autoConnect;
         m_table.appendUnplaced(std::move(credential));
-    }
-
-    void block(const std::vector<std::string>& ssids) {
-        for (const std::string& ssid : ssids)
-            m_blocked.blockNetwork(ssid, true);
     }
 
     // Of these names, the blocked ones.
@@ -74,51 +71,44 @@ TEST_F(EngineMemory, ABlockIsForOneNameExactly) {
     EXPECT_EQ(blocked({"cafe", kLongest}), kLongest);
 }
 
-TEST_F(EngineMemory, ANewCredentialOpensWhatItFits) {
-    inRange({"cafe", "hotel"});
-    block({"cafe", "gone", "hotel", "caf"});
-    store(3, true);
-    LogCapture log;
-    EXPECT_EQ(m_blocked.onCredentialAdded(3, m_table, m_networks), kSuccess);
-    EXPECT_NE(log.text().find("ERROR: Invalid BSS.\n"), std::string::npos);
-    EXPECT_EQ(blocked({"cafe", "gone", "hotel", "caf"}), "gone hotel")
-        << "the beginning of a name counts for the network that has it";
-}
-
-TEST_F(EngineMemory, ANewCredentialOpensNothingWhereItCanNot) {
+TEST_F(EngineMemory, ACredentialThatIsNewOrMayConnectNowOpensWhatItFits) {
+    using Change = int (BlockedNetworkList::*)(std::int32_t, const CredentialTable&, const Hs20NetworkList&);
+    const Change added = &BlockedNetworkList::onCredentialAdded;
+    const Change changed = &BlockedNetworkList::onCredentialAutoConnectChanged;
     struct Case {
+        Change change;
         std::int32_t id;
         int result;
+        const char* blocked;
         const char* line;
     };
+    // The beginning of a name counts for the network that has it, but not where networks are gone through.
     const Case cases[] = {
-        {4, kSuccess, "Credential is not auto-connected, don't unblock any network.\n"},
-        {5, kFailure, "ERROR: Cannot get credential.\n"},
-        {-1, kInvalidArgument, ""},
+        {added, 3, kSuccess, "gone hotel", "ERROR: Invalid BSS.\n"},
+        {added, 4, kSuccess, "cafe gone hotel caf",
+         "Credential is not auto-connected, don't unblock any network.\n"},
+        {added, 0, kFailure, "cafe gone hotel caf", "ERROR: Cannot get credential.\n"},
+        {added, 5, kFailure, "cafe gone hotel caf", "ERROR: Cannot get credential.\n"},
+        {added, -1, kInvalidArgument, "cafe gone hotel caf", "Newly added credential with id=-1.\n"},
+        {changed, 4, kSuccess, "gone hotel caf",
+         "Unblock network with ssid=cafe and mac address=01:02:03:04:05:00 due to corresponding credential "
+         "changed from 'manual connect' to 'auto connect'\n"},
+        {changed, 5, kFailure, "cafe gone hotel caf", "ERROR: Cannot get credential.\n"},
+        {changed, -1, kInvalidArgument, "cafe gone hotel caf",
+         "Credential with id=-1 has auto connect property changed.\n"},
     };
-    inRange({"cafe"});
+    inRange({"cafe", "hotel"});
+    store(3, true);
     store(4, false);
-    block({"cafe"});
     LogCapture log;
     for (const Case& c : cases) {
-        EXPECT_EQ(m_blocked.onCredentialAdded(c.id, m_table, m_networks), c.result) << c.id;
-        EXPECT_EQ(log.text(), "Newly added credential with id=" + std::to_string(c.id) + ".\n" + c.line);
+        for (const char* ssid : {"cafe", "gone", "hotel", "caf"})
+            m_blocked.blockNetwork(ssid, true);
+        log.lines();
+        EXPECT_EQ((m_blocked.*c.change)(c.id, m_table, m_networks), c.result) << c.line;
+        EXPECT_NE(log.text().find(c.line), std::string::npos) << c.line;
+        EXPECT_EQ(blocked({"cafe", "gone", "hotel", "caf"}), c.blocked) << c.line;
     }
-    EXPECT_EQ(blocked({"cafe"}), "cafe");
-}
-
-TEST_F(EngineMemory, ACredentialThatMayConnectNowOpensTheNetworksInRangeThatItFits) {
-    inRange({"cafe", "hotel"});
-    block({"cafe", "hotel", "caf"});
-    store(3, false);
-    LogCapture log;
-    EXPECT_EQ(m_blocked.onCredentialAutoConnectChanged(3, m_table, m_networks), kSuccess);
-    EXPECT_NE(log.text().find("Unblock network with ssid=cafe and mac address=01:02:03:04:05:00 due to "
-                              "corresponding credential changed from 'manual connect' to 'auto connect'\n"),
-              std::string::npos);
-    EXPECT_EQ(blocked({"cafe", "hotel", "caf"}), "hotel caf");
-    EXPECT_EQ(m_blocked.onCredentialAutoConnectChanged(9, m_table, m_networks), kFailure);
-    EXPECT_EQ(m_blocked.onCredentialAutoConnectChanged(-1, m_table, m_networks), kInvalidArgument);
 }
 
 DOT11_SSID ssidOf(std::string_view name) {
@@ -197,27 +187,21 @@ TEST_F(EngineMemory, RetriesAreCountedForEachPairAloneAndToldTheLog) {
 }
 
 TEST_F(EngineMemory, RetriesComeBackForAPairACredentialOrAll) {
-    struct Case {
-        const char* counts;
-        std::function<void()> change;
-    };
-    const Case cases[] = {
+    const std::pair<int, const char*> all[] = {{1, "a"}, {1, "b"}, {2, "a"}, {2, "b"}};
+    const std::pair<const char*, std::function<void()>> cases[] = {
         {"2022", [this] { m_retries.removeNumRetryEntries(1, "b"); }},
         {"2200", [this] { m_retries.removeAllCredNumRetryEntries(2); }},
         {"0022", [this] { m_retries.resetNumRetries(1); }},
         {"0000", [this] { m_retries.resetAllNumRetries(); }},
     };
-    for (const Case& c : cases) {
-        m_retries.clear();
+    for (const auto& [left, change] : cases) {
+        for (const auto& [id, ssid] : all)
+            m_retries.setNumRetries(id, ssid, 2);
+        change();
         std::string counts;
-        for (const std::int32_t id : {1, 2})
-            for (const char* ssid : {"a", "b"})
-                m_retries.setNumRetries(id, ssid, 2);
-        c.change();
-        for (const std::int32_t id : {1, 2})
-            for (const char* ssid : {"a", "b"})
-                counts += std::to_string(m_retries.getNumRetries(id, ssid));
-        EXPECT_EQ(counts, c.counts);
+        for (const auto& [id, ssid] : all)
+            counts += std::to_string(m_retries.getNumRetries(id, ssid));
+        EXPECT_EQ(counts, left);
     }
 }
 

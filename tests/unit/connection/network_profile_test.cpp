@@ -8,7 +8,7 @@
 namespace vexa::test {
 namespace {
 
-// The profile of ttls() for the network "cafe", and the inner part of that of tls(), as the platform gets
+// The profile of kTtls for the network "cafe", and the inner part of that of kTls, as the platform gets
 // them.
 const std::wstring kTtlsProfile =
     L"<?xml version=\"1.0\"?><WLANProfile xmlns=\"http://www.microsoft.com/networking/WLAN/profile/v1\"> "
@@ -60,20 +60,17 @@ std::wstring tlsProfile() {
     return with({{inner, kTlsPart}, {L">21<", L">13<"}, {L">9442<", L">0<"}});
 }
 
-Credential ttls(std::int32_t id = 1) {
-    Credential credential(id, L"PC\\user", CRED_TYPE_EAP_TTLS, CRED_ACCESS_ALL_USER);
-    credential.m_eapMethod = kEapMethodTtls;
-    credential.m_username = L"someone";
-    credential.m_password = L"secret";
-    return credential;
+Credential credential(std::int32_t method, std::int32_t id = 1) {
+    Credential result(id, L"PC\\user", CRED_TYPE_EAP_TTLS, CRED_ACCESS_ALL_USER);
+    result.m_eapMethod = method;
+    result.m_username = L"someone";
+    result.m_password = L"secret";
+    result.m_caCert = L"0a1b2c";
+    return result;
 }
 
-Credential tls(std::int32_t id = 1) {
-    Credential credential(id, L"PC\\user", CRED_TYPE_EAP_TLS, CRED_ACCESS_ALL_USER);
-    credential.m_eapMethod = kEapMethodTls;
-    credential.m_caCert = L"0a1b2c";
-    return credential;
-}
+const Credential kTtls = credential(kEapMethodTtls);
+const Credential kTls = credential(kEapMethodTls);
 
 class Profiles : public testing::Test {
 protected:
@@ -81,28 +78,23 @@ protected:
                         bool isForMachine = false, const std::wstring& domain = L"") {
         const Hs20Network network(Hs20BssRecord{{1, 2, 3, 4, 5, 6}, ssid, 1, 2, 1});
         NetworkProfile* added = nullptr;
-        m_result = m_profiles.addProfileFromCredential(credential, network, isForMachine, domain, added);
+        const int result =
+            m_profiles.addProfileFromCredential(credential, network, isForMachine, domain, added);
+        EXPECT_EQ(result, added == nullptr ? kFailure : kSuccess);
         return added;
-    }
-
-    NetworkProfile* find(const std::wstring& name) {
-        NetworkProfile* found = nullptr;
-        m_profiles.findProfileByName(name, found);
-        return found;
     }
 
     // "name id/place" of these profiles.
     std::string shown(const std::string& names) {
         std::string text;
+        NetworkProfile* found = nullptr;
         for (const char name : names)
-            if (const NetworkProfile* const found = find(std::wstring(1, static_cast<wchar_t>(name))))
-                text += std::string(1, name) + std::to_string(found->m_id) + "/" +
-                        std::to_string(found->m_priority) + " ";
+            if (m_profiles.findProfileByName(std::wstring(1, static_cast<wchar_t>(name)), found) == kSuccess)
+                text += name + std::to_string(found->m_id) + "/" + std::to_string(found->m_priority) + " ";
         return text;
     }
 
     NetworkProfileMgr m_profiles;
-    int m_result = -1;
 };
 
 TEST_F(Profiles, HaveTheirTextToTheLastCharacter) {
@@ -114,25 +106,22 @@ TEST_F(Profiles, HaveTheirTextToTheLastCharacter) {
         bool isForMachine = false;
         std::wstring domain = L"";
     };
-    Credential odd = ttls();
+    Credential odd = kTtls;
     odd.m_username = L"a<b>&\"'%s";
     odd.m_password = L"%d\u20AC\U0001F511 ";
-    Credential bare = tls();
-    bare.m_caCert.clear();
     const Replacements oddly{{L"someone", odd.m_username},
                              {L"secret", odd.m_password},
                              {L"<domain>", L"<domain>%s"},
                              {L"cafe", L"<&>%s"},
                              {L"63616665", L"3c263e2573"}};
     const Case cases[] = {
-        {"a password", ttls(), "cafe", kTtlsProfile},
-        {"a password is never for the machine", ttls(), "cafe", kTtlsProfile, true},
+        {"a password", kTtls, "cafe", kTtlsProfile},
+        {"a password is never for the machine", kTtls, "cafe", kTtlsProfile, true},
         {"text that means something to XML and to printf", odd, "<&>%s", with(oddly), false, L"%s"},
-        {"a certificate", tls(), "cafe", tlsProfile(), false, L"home.example"},
-        {"the machine's certificate", tls(), "cafe", with({{L">machineOrUser<", L">machine<"}}, tlsProfile()),
+        {"a certificate", kTls, "cafe", tlsProfile(), false, L"home.example"},
+        {"the machine's certificate", kTls, "cafe", with({{L">machineOrUser<", L">machine<"}}, tlsProfile()),
          true},
-        {"no authority", bare, "cafe", with({{L"0a1b2c", L""}}, tlsProfile())},
-        {"bytes that are no ASCII", ttls(), "caf\xC3\xFF",
+        {"bytes that are no ASCII", kTtls, "caf\xC3\xFF",
          with({{L"cafe", L"caf\u00C3\u00FF"}, {L"63616665", L"636166c3ff"}})},
     };
     for (const Case& c : cases) {
@@ -147,12 +136,12 @@ TEST_F(Profiles, AreCutWhereALimitIsTheirOwnOrThatOfTheirInnerText) {
     const std::size_t eapFrom = kTtlsProfile.find(L"<EapHostConfig");
     const std::wstring tail = kTtlsProfile.substr(kTtlsProfile.find(L"</EAPConfig>"));
     for (const std::size_t length : {3700U, 4400U, 4478U, 4479U, 4480U, 6000U}) {
-        Credential credential = ttls();
-        credential.m_password = std::wstring(length, L'x');
-        const std::wstring whole = with({{L"secret", credential.m_password}});
+        Credential longest = kTtls;
+        longest.m_password = std::wstring(length, L'x');
+        const std::wstring whole = with({{L"secret", longest.m_password}});
         const std::wstring eap =
             whole.substr(eapFrom, whole.size() - eapFrom - tail.size()).substr(0, kLimit);
-        const NetworkProfile* const added = add(credential);
+        const NetworkProfile* const added = add(longest);
         ASSERT_NE(added, nullptr) << length;
         EXPECT_EQ(added->m_profileXml, (whole.substr(0, eapFrom) + eap + tail).substr(0, kLimit)) << length;
     }
@@ -164,36 +153,33 @@ TEST_F(Profiles, RefuseACredentialOrANetworkThatGivesNone) {
         std::string ssid;
         std::string log;
     };
-    Credential nameless = ttls();
+    Credential nameless = kTtls;
     nameless.m_username.clear();
-    Credential sim = ttls();
-    sim.m_eapMethod = 3;
     const std::string failed = "Add network profile from credential failed.\n";
     const Case cases[] = {
-        {ttls(0), "cafe", "ERROR: Invalid credential id=0\n"},
-        {ttls(), "", "ERROR: Invalid BSS.\n"},
-        {sim, "cafe", "Unexpected EAP method.\n" + failed},
+        {credential(kEapMethodTtls, 0), "cafe", "ERROR: Invalid credential id=0\n"},
+        {kTtls, "", "ERROR: Invalid BSS.\n"},
+        {credential(3), "cafe", "Unexpected EAP method.\n" + failed},
         {nameless, "cafe",
          "Adding a new EAP-TTLS network profile...\n\tUsername=, password=secret\n" + failed},
     };
     LogCapture log;
     for (const Case& c : cases) {
         EXPECT_EQ(add(c.credential, c.ssid), nullptr) << c.log;
-        EXPECT_EQ(m_result, kFailure);
         EXPECT_EQ(log.text(), c.log);
     }
 }
 
 TEST_F(Profiles, TakeTheNextNumberAboveTheHighestAndTheFirstPlace) {
     for (const char* ssid : {"a", "b", "c"})
-        add(ttls(), ssid);
+        add(kTtls, ssid);
     EXPECT_EQ(shown("abc"), "a1/3 b2/2 c3/1 ");
     EXPECT_TRUE(m_profiles.deleteProfile(3));
     EXPECT_EQ(shown("abc"), "a1/2 b2/1 ");
-    add(ttls(), "d");
+    add(kTtls, "d");
     EXPECT_TRUE(m_profiles.deleteProfile(1));
     EXPECT_EQ(shown("abd"), "b2/2 d3/1 ");
-    add(ttls(), "e");
+    add(kTtls, "e");
     EXPECT_EQ(shown("bde"), "b2/3 d3/2 e4/1 ") << "a lower number stays unused";
     EXPECT_FALSE(m_profiles.deleteProfile(0));
     EXPECT_TRUE(m_profiles.deleteProfile(9));
@@ -201,15 +187,16 @@ TEST_F(Profiles, TakeTheNextNumberAboveTheHighestAndTheFirstPlace) {
 }
 
 TEST_F(Profiles, GoWithTheirCredential) {
-    add(ttls(5), "a");
-    add(ttls(6), "b");
-    add(tls(5), "c");
+    add(credential(kEapMethodTtls, 5), "a");
+    add(credential(kEapMethodTtls, 6), "b");
+    add(credential(kEapMethodTls, 5), "c");
     LogCapture log;
     EXPECT_EQ(m_profiles.deleteProfilesOfCredential(5), kSuccess);
     EXPECT_EQ(log.text(),
               "Cred id=5 deleted, removing profile name=c\nCred id=5 deleted, removing profile name=a\n");
     EXPECT_EQ(shown("abc"), "b2/1 ");
     EXPECT_EQ(m_profiles.deleteProfilesOfCredential(0), kInvalidArgument);
+    EXPECT_EQ(log.text(), "ERROR: Invalid credential id=0\n");
 }
 
 }  // namespace

@@ -1,5 +1,7 @@
 #include "unit/hotspot/RealmDissector.h"
 
+#include <algorithm>
+
 namespace vexa::test {
 
 namespace {
@@ -7,93 +9,78 @@ namespace {
 struct Bad {};
 
 // Offsets are absolute. Whoever asks for a byte behind the limit that he names has a bad list.
-struct Dissection {
-    const Block& list;
-    std::vector<DissectedRealm> found;
+unsigned at(const Block& list, std::size_t offset, std::size_t limit) {
+    if (offset >= limit || limit > list.size()) throw Bad();
+    return std::to_integer<unsigned>(list[offset]);
+}
 
-    unsigned at(std::size_t offset, std::size_t limit) const {
-        if (offset >= limit || limit > list.size()) throw Bad();
-        return std::to_integer<unsigned>(list[offset]);
-    }
+unsigned word(const Block& list, std::size_t offset, std::size_t limit) {
+    return at(list, offset, limit) + 256 * at(list, offset + 1, limit);
+}
 
-    unsigned word(std::size_t offset, std::size_t limit) const {
-        return at(offset, limit) + 256 * at(offset + 1, limit);
-    }
-
-    std::string text(std::size_t from, std::size_t length, std::size_t limit) const {
-        std::string text;
-        for (std::size_t i = from; i < from + length; ++i)
-            text += static_cast<char>(at(i, limit));
-        return text;
-    }
-};
-
-void keep(Dissection& dissection, const std::string& realm, const std::vector<unsigned>& methods) {
-    const std::string text = realm.c_str();
-    std::string name;
+// Up to the first NUL; a ";" that ends the text is followed by no name.
+std::vector<std::string> namesIn(std::string text) {
+    text.resize(std::min(text.find('\0'), text.size()));
+    if (text.ends_with(';')) text.pop_back();
     std::vector<std::string> names;
-    for (const char c : text) {
-        if (c == ';') {
-            names.push_back(name);
-            name.clear();
-        } else {
-            name += c;
-        }
+    for (std::size_t from = 0, end = 0; end != text.npos; from = end + 1) {
+        end = text.find(';', from);
+        names.push_back(text.substr(from, end - from));
     }
-    if (text.empty() || text.back() != ';') names.push_back(name);
-    for (const std::string& one : names)
-        for (const unsigned method : methods)
-            if (method == 13 || method == 21) dissection.found.emplace_back(one, method);
+    return names;
 }
 
 // Gives where the next method begins. Its parameters may use the bytes of what follows in the same entry.
-std::size_t method(Dissection& dissection, std::size_t offset, std::size_t limit, unsigned& number) {
-    const std::size_t length = dissection.at(offset, limit);
-    number = dissection.at(offset + 1, limit);
-    const unsigned parameters = dissection.at(offset + 2, limit);
+std::size_t method(const Block& list, std::size_t offset, std::size_t limit, unsigned& number) {
+    const std::size_t length = at(list, offset, limit);
+    number = at(list, offset + 1, limit);
+    const unsigned parameters = at(list, offset + 2, limit);
     if (length < 2 || offset + 1 + length > limit) throw Bad();
     std::size_t parameter = offset + 3;
     for (unsigned i = 0; i < parameters; ++i) {
-        parameter += 1;
-        parameter += 1 + dissection.at(parameter, limit);
+        parameter += 2 + at(list, parameter + 1, limit);
         if (parameter > limit) throw Bad();
     }
     return offset + 1 + length;
 }
 
-std::size_t entry(Dissection& dissection, std::size_t offset) {
-    const std::size_t end = dissection.list.size();
+// Gives where the next entry begins.
+std::size_t entry(const Block& list, std::size_t offset, std::vector<DissectedRealm>& found) {
+    const std::size_t end = list.size();
     if (offset + 4 > end) throw Bad();
-    const std::size_t length = dissection.word(offset, end);
+    const std::size_t length = word(list, offset, end);
     const std::size_t limit = offset + 2 + length;
     if (length < 3 || limit > end) throw Bad();
-    const std::size_t realmLength = dissection.at(offset + 3, limit);
-    const std::string realm = dissection.text(offset + 4, realmLength, limit);
-    std::size_t place = offset + 4 + realmLength;
-    const std::size_t count = dissection.at(place, limit);
-    ++place;
+    const std::size_t realmLength = at(list, offset + 3, limit);
+    std::size_t place = offset + 4;
+    std::string realm;
+    for (const std::size_t behind = place + realmLength; place < behind; ++place)
+        realm += static_cast<char>(at(list, place, limit));
+    const std::size_t count = at(list, place++, limit);
     if (place + 3 * count > limit) throw Bad();
     std::vector<unsigned> methods(count);
     for (unsigned& number : methods)
-        place = method(dissection, place, limit, number);
-    keep(dissection, realm, methods);
+        place = method(list, place, limit, number);
+    for (const std::string& name : namesIn(realm))
+        for (const unsigned number : methods)
+            if (number == 13 || number == 21) found.emplace_back(name, number);
     return limit;
 }
 
 }  // namespace
 
 std::optional<std::vector<DissectedRealm>> dissectRealms(const Block& list) {
-    Dissection dissection{list, {}};
+    std::vector<DissectedRealm> found;
     try {
-        const unsigned count = dissection.word(0, list.size());
+        const unsigned count = word(list, 0, list.size());
         if (count == 0 || 2 + 5 * count > list.size()) return std::nullopt;
         std::size_t offset = 2;
         for (unsigned i = 0; i < count; ++i)
-            offset = entry(dissection, offset);
+            offset = entry(list, offset, found);
     } catch (const Bad&) {
         return std::nullopt;
     }
-    return dissection.found;
+    return found;
 }
 
 }  // namespace vexa::test

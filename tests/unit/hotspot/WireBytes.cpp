@@ -6,11 +6,6 @@ namespace vexa::test {
 
 namespace {
 
-unsigned digit(char c) {
-    constexpr std::string_view kDigits = "0123456789abcdef";
-    return static_cast<unsigned>(kDigits.find(c));
-}
-
 Block number(unsigned value, std::size_t size) {
     Block bytes;
     for (; size > 0; --size, value >>= 8)
@@ -34,18 +29,18 @@ Block joined(const std::vector<Block>& parts) {
 Block bytesOfHex(std::string_view hex) {
     std::string digits(hex);
     std::erase(digits, ' ');
-    Block bytes(digits.size() / 2);
-    for (std::size_t i = 0; i < bytes.size(); ++i)
-        bytes[i] = static_cast<std::byte>(digit(digits[2 * i]) << 4 | digit(digits[2 * i + 1]));
+    Block bytes;
+    bytes.reserve(digits.size() / 2);
+    for (std::size_t i = 0; i < digits.size(); i += 2)
+        bytes.push_back(static_cast<std::byte>(std::stoi(digits.substr(i, 2), nullptr, 16)));
     return bytes;
 }
 
 std::string hexOf(Bytes bytes) {
     std::string hex;
-    for (const std::byte byte : bytes) {
-        hex += "0123456789abcdef"[std::to_integer<unsigned>(byte) >> 4];
-        hex += "0123456789abcdef"[std::to_integer<unsigned>(byte) & 15];
-    }
+    for (const std::byte byte : bytes)
+        for (const int shift : {4, 0})
+            hex += "0123456789abcdef"[std::to_integer<unsigned>(byte) >> shift & 15U];
     return hex;
 }
 

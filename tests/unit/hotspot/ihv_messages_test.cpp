@@ -43,24 +43,5 @@ TEST(IhvMessages, FieldsBehindTheEndOfAShortRecordAreZero) {
     }
 }
 
-TEST(IhvMessages, APayloadIsAsLongAsItClaimsButNoLongerThanItsBlock) {
-    const std::pair<const char*, std::size_t> cases[] = {
-        {"00000000", 0}, {"04000000", 4}, {"08000000", 8}, {"09000000", 8}, {"ffffffff", 8}};
-    for (const auto& [claimed, length] : cases) {
-        const Block block = bytesOfHex("005ec403 ffffffff 02000000") + bytesOfHex(claimed) + Block(8);
-        const IhvMessage message = parseIhvMessage(block);
-        EXPECT_EQ(message.subtype, IhvNotification::NetworkListChanged);
-        EXPECT_EQ(message.payload.size(), length) << claimed;
-        EXPECT_EQ(message.block.size(), 8U) << claimed;
-    }
-}
-
-TEST(IhvMessages, ANumberThatIsNotThereReadsAsZero) {
-    const Block payload = bytesOfHex("01020304 05060708");
-    EXPECT_EQ(numberAt(payload, 3), 0x07060504U);
-    EXPECT_EQ(numberAt(payload, 4), 0x08070605U);
-    EXPECT_EQ(numberAt(payload, 5), 0U);
-}
-
 }  // namespace
 }  // namespace vexa::test

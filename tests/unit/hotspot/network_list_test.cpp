@@ -58,18 +58,6 @@ TEST(NetworkList, ANewAddressIsANewNetworkWhateverItsName) {
     EXPECT_EQ(list.findByMac(bss(1, "").macAddress), nullptr);
 }
 
-TEST(NetworkList, FindsTheFirstNameThatBeginsWithTheBytes) {
-    Hs20NetworkList list;
-    list.replace({bss(1, "abcd"), bss(2, "abc"), bss(3, std::string(32, 'z'))});
-    const std::pair<std::string, int> cases[] = {
-        {"abc", 1}, {std::string("abc\0", 4), 2}, {"abcde", 0},
-        {"", 0},    {std::string(32, 'z'), 3},    {std::string(33, 'z'), 0}};
-    for (const auto& [ssid, id] : cases) {
-        const Hs20Network* const network = list.findBySsid(ssid);
-        EXPECT_EQ(network == nullptr ? 0 : network->m_macAddress[5], id) << ssid;
-    }
-}
-
 TEST(NetworkList, OfOneNameTheFirstKnownNetworkStaysOrElseTheFirst) {
     struct Case {
         std::vector<Hs20BssRecord> known;
