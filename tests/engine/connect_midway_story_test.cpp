@@ -1,7 +1,6 @@
 #include <gtest/gtest.h>
 
-#include "engine/StoreStory.h"
-#include "engine/connect_story.h"
+#include "engine/world/ConnectStory.h"
 
 namespace vexa::test {
 namespace {
@@ -10,262 +9,187 @@ using namespace std::chrono_literals;
 
 constexpr const char* kSlow = R"(,"connectMs":2000)";
 
-/// What comes over an attempt of auto-connect one second before its result.
-struct Midway {
-    const char* what;
-    bool isLetIn;
-    std::vector<std::string> actions;
-    std::string command;
-    std::string data;
-    std::string requests;
-    std::string outcomes;
-    std::string connected;
-};
+/// Something comes over an attempt of auto-connect one second before its result.
+void comesBetween(const char* what, const Standing& end, const Tale& change, bool isLetIn = true) {
+    const std::string network = isLetIn ? open(1, "cafe", tls()) : test::network(1, "cafe", tls());
+    EXPECT_STORY(air({network}, storing({{.isTls = true}}) + kSlow), [&](Story& story) {
+        story.advance(1s);
+        story.forget();
+        change(story);
+        story.advance(60s);
+        expectStanding(story, end);
+    }) << what;
+}
 
-const std::vector<Midway>& midways() {
-    static const std::vector<Midway> all = {
-        {"the radio goes off", true, {R"({"do":"radio","software":"off"})"}, "", "", "", "1 no access", "-"},
-        {"the radio goes off and on",
-         true,
-         {R"({"do":"radio","software":"off"})", R"({"do":"radio","software":"on"})"},
-         "",
-         "",
-         "cafe tls ca1 machineOrUser\n",
-         "1 no access 1 access",
-         "cafe"},
-        {"the adapter is pulled: there is nothing to ask for the machine's turn",
-         true,
-         {R"({"do":"pullAdapter"})"},
-         "",
-         "",
-         "cafe tls ca1 machine = 1168\n",
-         "",
-         "-"},
-        {"the adapter is pulled and comes back",
-         true,
-         {R"({"do":"pullAdapter"})", R"({"do":"insertAdapter"})"},
-         "",
-         "",
-         "cafe tls ca1 machine = 1168\ncafe tls ca1 machineOrUser\n",
-         "1 access",
-         "cafe"},
-        {"the credential is deleted, and its network lets it in",
-         true,
-         {},
-         "DELETE_CREDENTIAL",
-         R"({"Id":1})",
-         "",
-         "",
-         "cafe"},
-        {"the credential is deleted, and its network doesn't let it in",
-         false,
-         {},
-         "DELETE_CREDENTIAL",
-         R"({"Id":1})",
-         "",
-         "",
-         "-"},
-        {"the network goes, but not from the list",
-         true,
-         {on("hide", 1)},
-         "",
-         "",
-         "cafe tls ca1 machine\n",
-         "0 no access",
-         "-"},
-        {"the network goes from the list too",
-         true,
-         {on("hide", 1), R"({"do":"reportNetworks"})"},
-         "",
-         "",
-         "cafe tls ca1 machine\n",
-         "0 no access",
-         "-"},
-        {"the adapter arrives once more: the result is the system's now",
-         true,
-         {R"({"do":"insertAdapter"})"},
-         "",
-         "",
-         "",
-         "1 access",
-         "cafe"},
-    };
-    return all;
+void deleteCredential(Story& story) {
+    story.order("DELETE_CREDENTIAL", R"({"Id":1})");
 }
 
 TEST(Midway, EndsAsItShould) {
-    for (const Midway& c : midways()) {
-        const std::string scenario =
-            air({network(1, "cafe", tls() + "," + lettingIn(c.isLetIn ? R"({"eapMethod":13})" : ""))},
-                storing({{.isTls = true}}) + kSlow);
-        const Ending ending = runStory(61, scenario, [&](World& world) {
-            world.advance(1s);
-            world.perform(R"({"do":"clearCalls"})");
-            world.hotspot().events();
-            for (const std::string& action : c.actions)
-                world.perform(action);
-            if (!c.command.empty()) world.hotspot().send(c.command, c.data);
-            world.advance(60s);
-            return requests(world) + "| " + results(world) + " | " + connectedTo(world);
-        });
-        EXPECT_TRUE(ending.isOrderly) << c.what << ending.errors;
-        EXPECT_EQ(ending.text, c.requests + "| " + c.outcomes + " | " + c.connected) << c.what;
-    }
+    comesBetween("the radio goes off", {"", "1 no access", "-"},
+                 [](Story& story) { story.perform(kRadioOff); });
+    comesBetween("the radio goes off and on", {"cafe tls ca1 machineOrUser", "1 no access 1 access", "cafe"},
+                 [](Story& story) {
+                     story.perform(kRadioOff);
+                     story.perform(kRadioOn);
+                 });
+    comesBetween("the adapter is pulled: there is nothing to ask for the machine's turn",
+                 {"cafe tls ca1 machine = 1168", "", "-"}, [](Story& story) { story.act("pullAdapter"); });
+    comesBetween("the adapter is pulled and comes back",
+                 {"cafe tls ca1 machine = 1168; cafe tls ca1 machineOrUser", "1 access", "cafe"},
+                 [](Story& story) {
+                     story.act("pullAdapter");
+                     story.act("insertAdapter");
+                 });
+    comesBetween("the credential is deleted, and its network lets it in", {"", "", "cafe"}, deleteCredential);
+    comesBetween("the credential is deleted, and its network doesn't let it in", {"", "", "-"},
+                 deleteCredential, false);
+    const Standing failure{"cafe tls ca1 machine", "0 no access", "-"};
+    comesBetween("the network goes, but not from the list", failure,
+                 [](Story& story) { story.perform(on("hide", 1)); });
+    comesBetween("the network goes from the list too", failure, [](Story& story) {
+        story.perform(on("hide", 1));
+        story.perform(kReport);
+    });
+    comesBetween("the adapter arrives once more: the result is the system's now", {"", "1 access", "cafe"},
+                 [](Story& story) { story.act("insertAdapter"); });
 }
 
 TEST(Midway, ADeletedCredentialTakesItsProfileWithItAndEndsTheAttemptWithoutAWord) {
-    const std::string scenario =
-        air({network(1, "cafe", ttls() + "," + lettingInAll())}, storing({{}}) + kSlow);
-    const Ending ending = runStory(62, scenario, [](World& world) {
-        world.advance(1s);
-        world.hotspot().send("DELETE_CREDENTIAL", R"({"Id":1})");
-        world.advance(5s);
-        return missingInOrder(
-                   world, {"Deleting the credential with id=1", "removeAllCredNumRetryEntries for CredId=1",
-                           "Cred id=1 deleted, removing profile name=cafe",
-                           "Connection result initiated by HS20, clearing the cache, profile "
-                           "name=cafe.",
-                           "ERROR: Cannot get profile in profile manager."}) +
-               std::to_string(eapMethod(world));
+    EXPECT_STORY(air({kCafe}, storing({{}}) + kSlow), [](Story& story) {
+        story.advance(1s);
+        deleteCredential(story);
+        story.advance(5s);
+        story.expectLog({"Deleting the credential with id=1", "removeAllCredNumRetryEntries for CredId=1",
+                         "Cred id=1 deleted, removing profile name=cafe",
+                         "Connection result initiated by HS20, clearing the cache, profile name=cafe.",
+                         "ERROR: Cannot get profile in profile manager."});
+        expectStanding(story, {.eapMethod = 0});
     });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text, "0");
 }
 
 // The attempt that runs keeps what it was begun with; the next one builds its profile anew.
 TEST(Midway, AnEditedCredentialIsTriedAfreshWithWhatItHoldsNow) {
-    const std::string scenario =
-        air({network(1, "cafe", ttls() + "," + lettingIn(R"({"eapMethod":21,"username":"right"})"))},
-            storing({{}}) + kSlow);
-    const Ending ending = runStory(63, scenario, [](World& world) {
-        world.advance(1s);
-        Json::Value data = parsed(ttlsData("a.example"));
-        data["Id"] = 1;
-        data["AutoConnect"] = true;
-        data["AccessType"] = 1;
-        data["Username"] = "right";
-        world.hotspot().send("EDIT_CREDENTIAL", data.toStyledString());
-        world.advance(30s);
-        return requests(world) + connectedTo(world) + std::to_string(eapMethod(world)) +
-               missingInOrder(
-                   world,
-                   {"Updating the credential with id=1", "Cred id=1 deleted, removing profile name=cafe",
-                    "ERROR: Cannot get profile in profile manager.", "!!!Creating a new network profile",
-                    "Connection succeeded! profile name=cafe"});
+    const std::string letIn = lettingIn(R"({"eapMethod":21,"username":"right"})");
+    EXPECT_STORY(air({network(1, "cafe", ttls() + "," + letIn)}, storing({{}}) + kSlow), [](Story& story) {
+        story.advance(1s);
+        story.order("EDIT_CREDENTIAL",
+                    ttlsData("a.example", R"("Id":1,"AutoConnect":true,"Username":"right")"));
+        story.advance(30s);
+        expectStanding(story,
+                       {.requests = "cafe ttls u1; cafe ttls right", .connected = "cafe", .eapMethod = 2});
+        story.expectLog({"Updating the credential with id=1", "Cred id=1 deleted, removing profile name=cafe",
+                         "ERROR: Cannot get profile in profile manager.", "!!!Creating a new network profile",
+                         "Connection succeeded! profile name=cafe"});
     });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text, "cafe ttls u1\ncafe ttls right\ncafe2");
+}
+
+TEST(Midway, AnArrivalOfAnAdapterThatIsThereForgetsWhatWasUnderWay) {
+    const std::string scenario =
+        air({kCafe, kHotel}, storing({{}, {.id = 2, .realm = "b.example", .autoConnect = false}}) + kSlow);
+    EXPECT_STORY(scenario, [](Story& story) {
+        story.advance(1s);
+        connect(story, "hotel");
+        story.hotspot().events();
+        story.act("insertAdapter");
+        story.advance(60s);
+        expectStanding(story, {"cafe ttls u1", "1 access", "cafe"});
+        story.expect("pending requests", count(story.messages(), "User manual connecting request pending"),
+                     0);
+    });
+}
+
+/// A story about a realm update or the hotspot switch, which begins when all has come to rest.
+void atRest(const std::string& scenario, const Tale& tale) {
+    EXPECT_STORY(scenario, [&](Story& story) {
+        story.advance(15s);
+        story.forget();
+        tale(story);
+    });
 }
 
 TEST(RealmUpdate, LetsGoOfTheConnectionAsksAnewAndComesBack) {
-    const std::string scenario =
-        air({network(1, "cafe", ttls() + "," + lettingInAll())}, storing({{}}) + R"(,"anqpMs":1000)");
-    const Ending ending = runStory(64, scenario, [](World& world) {
-        world.advance(15s);
-        world.perform(R"({"do":"clearCalls"})");
-        world.hotspot().events();
-        world.hotspot().send("UPDATE_NETWORK_REALM");
-        world.advance(0ms);
-        std::string text = requests(world) + std::to_string(moduleRequests(world, 3)) +
-                           std::to_string(eapMethod(world)) + outcomes(world) + "\n";
-        world.advance(30s);
-        return text + outcomes(world) + " " + connectedTo(world) +
-               missingInOrder(
-                   world, {"UI requested to update HS20 network realm.",
-                           "Disconnecting from connecting/connected BSS...",
-                           "Manually disconnect from a HS20 network.", "Received Wlan disconnected event.",
-                           "We are querying the HS20 network ANQP info, wait."});
+    atRest(air({kCafe}, storing({{}}) + R"(,"anqpMs":1000)"), [](Story& story) {
+        story.order("UPDATE_NETWORK_REALM");
+        expectStanding(story, {.requests = "disconnect", .eapMethod = 0, .outcomes = ""});
+        story.expect("queries", moduleRequests(story, 3), 1);
+        story.advance(30s);
+        expectStanding(story, {.connected = "cafe", .outcomes = "networks 1 access"});
+        story.expectLog({"UI requested to update HS20 network realm.",
+                         "Disconnecting from connecting/connected BSS...",
+                         "Manually disconnect from a HS20 network.", "Received Wlan disconnected event.",
+                         "We are querying the HS20 network ANQP info, wait."});
     });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text, "disconnect\n10\nnetworks 1 access cafe");
 }
 
 TEST(RealmUpdate, OfAConnectionThatIsNoHotspotLetsGoOfItToo) {
-    const Ending ending = runStory(65, air({network(1, "cafe", ttls())}), [](World& world) {
-        world.perform(R"({"do":"osConnect","ssid":"home"})");
-        world.advance(5s);
-        world.perform(R"({"do":"clearCalls"})");
-        world.hotspot().send("UPDATE_NETWORK_REALM");
-        world.advance(0ms);
-        return requests(world) + std::to_string(moduleRequests(world, 3)) +
-               missingInOrder(world, {"Manually disconnect from a non-HS20 network."});
+    atRest(air({network(1, "cafe", ttls())}), [](Story& story) {
+        story.act("osConnect", R"("ssid":"home")");
+        story.advance(5s);
+        story.order("UPDATE_NETWORK_REALM");
+        expectStanding(story, {.requests = "disconnect"});
+        story.expect("queries", moduleRequests(story, 3), 1);
+        story.expectLog({"Manually disconnect from a non-HS20 network."});
     });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text, "disconnect\n1");
+}
+
+TEST(RealmUpdate, AsksAtOnceWhileNothingIsConnected) {
+    atRest(air({network(1, "A", R"("anqp":"onQuery",)" + ttls())}), [](Story& story) {
+        story.order("UPDATE_NETWORK_REALM");
+        story.expect("queries", moduleRequests(story, 3), 1);
+        story.expect("heard before the answer", heard(story), "");
+        story.advance(200ms);
+        story.expect("heard", heard(story), "networks A[a.example TTLS]");
+    });
+}
+
+TEST(RealmUpdate, DoesNothingWithoutAnAdapter) {
+    atRest(air({network(1, "A")}), [](Story& story) {
+        story.act("pullAdapter");
+        story.forget();
+        story.order("UPDATE_NETWORK_REALM");
+        story.expect("log", story.messages(), "UI requested to update HS20 network realm.\n");
+        story.expect("calls", story.perform(R"({"query":"calls"})").size(), 0U);
+    });
 }
 
 TEST(HotspotSwitch, OffWhileConnectedLeavesTheNetworkWithoutBlockingIt) {
-    const Ending ending = runStory(
-        66, air({network(1, "cafe", ttls() + "," + lettingInAll())}, storing({{}})), [](World& world) {
-            world.advance(5s);
-            world.perform(R"({"do":"clearCalls"})");
-            world.hotspot().events();
-            switchHs20(world, false);
-            std::string text = requests(world) + outcomes(world) + "\n";
-            world.advance(30s);
-            text += connectedTo(world);
-            switchHs20(world, true);
-            text += " " + outcomes(world);
-            world.advance(5s);
-            return text + " " + connectedTo(world) + " " + outcomes(world) +
-                   missingInOrder(
-                       world,
-                       {"Set enable/disable HS20, param=false", "Enter resetAllNumRetries.",
-                        "Send all HS20 networks to vexa.",
-                        "STA is in connected state when user turns of HS20,trying to disconnect from any "
-                        "connected HS20 network.",
-                        "Disconnecting from connecting/connected BSS...",
-                        "Manually disconnect from a HS20 network.",
-                        "HS20 functionality not enabled, wait for user turning it on.",
-                        "Enable/disable HS20 event signaled."});
-        });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text, "disconnect\nnetworks hs20 false networks\n- networks hs20 true cafe 1 access");
+    atRest(air({kCafe}, storing({{}})), [](Story& story) {
+        switchHs20(story, false);
+        expectStanding(story, {.requests = "disconnect", .outcomes = "networks hs20 false networks"});
+        story.advance(30s);
+        expectStanding(story, {.connected = "-"});
+        switchHs20(story, true);
+        expectStanding(story, {.outcomes = "networks hs20 true"});
+        story.advance(5s);
+        expectStanding(story, {.connected = "cafe", .outcomes = "1 access"});
+        story.expectLog({"Set enable/disable HS20, param=false", "Enter resetAllNumRetries.",
+                         "Send all HS20 networks to vexa.",
+                         "STA is in connected state when user turns of HS20,trying to disconnect from any "
+                         "connected HS20 network.",
+                         "Disconnecting from connecting/connected BSS...",
+                         "Manually disconnect from a HS20 network.",
+                         "HS20 functionality not enabled, wait for user turning it on.",
+                         "Enable/disable HS20 event signaled."});
+    });
 }
 
 TEST(HotspotSwitch, OffLeavesAConnectionOfTheSystemAlone) {
-    const Ending ending = runStory(67, air({network(1, "cafe", ttls())}, storing({{}})), [](World& world) {
-        world.advance(5s);
-        world.perform(R"({"do":"osConnect","ssid":"cafe"})");
-        world.advance(5s);
-        world.perform(R"({"do":"clearCalls"})");
-        switchHs20(world, false);
-        world.advance(5s);
-        return requests(world) + connectedTo(world);
+    atRest(air({network(1, "cafe", ttls())}, storing({{}})), [](Story& story) {
+        story.act("osConnect", R"("ssid":"cafe")");
+        story.advance(5s);
+        story.forget();
+        switchHs20(story, false);
+        story.advance(5s);
+        expectStanding(story, {.requests = "", .connected = "cafe"});
     });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text, "cafe");
 }
 
 TEST(HotspotSwitch, ToTheValueThatItHasOnlyAnswers) {
-    const Ending ending = runStory(
-        68, air({network(1, "cafe", ttls() + "," + lettingInAll())}, storing({{}})), [](World& world) {
-            world.advance(5s);
-            world.perform(R"({"do":"clearCalls"})");
-            world.hotspot().events();
-            switchHs20(world, true);
-            return requests(world) + outcomes(world) + " " + connectedTo(world);
-        });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text, "hs20 true cafe");
-}
-
-TEST(Arrival, OfAnAdapterThatIsThereForgetsWhatWasUnderWay) {
-    const std::string scenario =
-        air({network(1, "cafe", ttls() + "," + lettingInAll()),
-             network(2, "hotel", ttls("b.example") + "," + lettingInAll())},
-            storing({{}, {.id = 2, .realm = "b.example", .autoConnect = false}}) + kSlow);
-    const Ending ending = runStory(69, scenario, [](World& world) {
-        world.advance(1s);
-        connect(world, "hotel");
-        world.hotspot().events();
-        world.perform(R"({"do":"insertAdapter"})");
-        world.advance(60s);
-        return requests(world) + results(world) + " " + connectedTo(world) + " " +
-               count(messagesSince(world, 0), "User manual connecting request pending");
+    atRest(air({kCafe}, storing({{}})), [](Story& story) {
+        switchHs20(story, true);
+        expectStanding(story, {.requests = "", .connected = "cafe", .outcomes = "hs20 true"});
     });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text, "cafe ttls u1\n1 access cafe 0 ");
 }
 
 }  // namespace

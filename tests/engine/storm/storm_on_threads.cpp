@@ -10,8 +10,8 @@
 #include <string>
 #include <string_view>
 
-#include "engine/StormSteps.h"
-#include "engine/connect_calm.h"
+#include "engine/storm/ConnectCalm.h"
+#include "engine/storm/StormSteps.h"
 #include "platform/ClockControl.h"
 
 namespace {

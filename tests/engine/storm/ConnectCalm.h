@@ -3,7 +3,7 @@
 #include <cstdint>
 #include <string>
 
-#include "engine/World.h"
+#include "engine/world/World.h"
 
 namespace vexa::test {
 

@@ -1,11 +1,11 @@
-#include "engine/connect_calm.h"
+#include "engine/storm/ConnectCalm.h"
 
 #include <array>
 #include <random>
 
-#include "engine/StoreStory.h"
-#include "engine/StormSteps.h"
-#include "engine/connect_story.h"
+#include "engine/storm/StormSteps.h"
+#include "engine/world/ConnectStory.h"
+#include "engine/world/StoreStory.h"
 
 namespace vexa::test {
 
@@ -19,12 +19,7 @@ constexpr int kStepsOfAPart = 24;
 constexpr int kTriesToHeal = 5;
 constexpr auto kPatience = 60s;
 
-std::string credentialFor(const std::string& realm, bool isTls) {
-    Json::Value data = parsed(isTls ? tlsData(realm) : ttlsData(realm));
-    data["AutoConnect"] = true;
-    data["AccessType"] = 1;
-    return data.toStyledString();
-}
+constexpr const char* kAutoConnect = R"("AutoConnect":true,"AccessType":1)";
 
 // An adapter whose start failed twice stays as it is until it has been pulled.
 void heal(World& world) {
@@ -40,11 +35,10 @@ void heal(World& world) {
     for (const char* action : kActions)
         world.perform(action);
     for (int number = 0; number < kNetworksOfTheStorm; ++number)
-        world.perform(on("setNetwork", number, R"("anqp":"ready",)" + realms("a.example", "13,21")));
+        world.perform(on("setNetwork", number, R"("anqp":"ready",)" + both()));
     switchHs20(world, true);
-    world.perform(R"({"do":"reportNetworks"})");
-    world.hotspot().send("ADD_CREDENTIAL", credentialFor("haven.example", false));
-    world.advance(0ms);
+    world.perform(kReport);
+    world.order("ADD_CREDENTIAL", ttlsData("haven.example", kAutoConnect));
 }
 
 // Faults that wait for their call take these requests instead of the last ones.
@@ -52,7 +46,7 @@ void useUpFaults(World& world) {
     for (int tries = 0; tries < kTriesToHeal; ++tries) {
         heal(world);
         connect(world, "Haven");
-        world.perform(R"({"do":"dropConnection"})");
+        world.act("dropConnection");
         world.advance(15s);
     }
     heal(world);
@@ -62,13 +56,13 @@ void useUpFaults(World& world) {
 std::string joinsWhenLeftAlone(World& world) {
     world.perform(on("show", kHavenNumber));
     useUpFaults(world);
-    const std::size_t before = world.logSize();
-    world.perform(R"({"do":"dropConnection"})");
+    world.forget();
+    world.act("dropConnection");
     std::string missing;
     platform::Duration passed{};
     for (; passed < kPatience && connectedTo(world) == "-"; passed += 1s)
         world.advance(1s);
-    if (connectedTo(world) == "-") missing = "not connected:\n" + messagesSince(world, before);
+    if (connectedTo(world) == "-") missing = "not connected:\n" + world.messages();
     world.perform(on("hide", kHavenNumber));
     return missing;
 }
@@ -78,14 +72,13 @@ std::string joinsWhenLeftAlone(World& world) {
 std::string stormOfConnections(World& world, std::uint64_t seed, int steps) {
     Storm storm(world, seed);
     std::mt19937_64 random(seed);
-    world.perform(
-        R"({"do":"addNetwork","network":)" +
-        network(kHavenNumber, "Haven", ttls("haven.example") + "," + lettingInAll() + R"(,"visible":false)") +
-        "}");
+    const std::string haven = open(kHavenNumber, "Haven", ttls("haven.example") + R"(,"visible":false)");
+    world.perform(adding(haven));
     for (int step = 0; step < steps; step += kStepsOfAPart) {
-        for (const bool isTls : {false, true})
-            world.hotspot().send("ADD_CREDENTIAL",
-                                 credentialFor(random() % 2 == 0 ? "a.example" : "b.example", isTls));
+        world.hotspot().send("ADD_CREDENTIAL",
+                             ttlsData(random() % 2 == 0 ? "a.example" : "b.example", kAutoConnect));
+        world.hotspot().send("ADD_CREDENTIAL",
+                             tlsData(random() % 2 == 0 ? "a.example" : "b.example", kAutoConnect));
         for (int i = 0; i < kStepsOfAPart; ++i)
             storm.step();
         if (const std::string wrong = joinsWhenLeftAlone(world); !wrong.empty())

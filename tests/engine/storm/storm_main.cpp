@@ -7,9 +7,9 @@
 #include <string>
 #include <string_view>
 
-#include "engine/StormSteps.h"
-#include "engine/Story.h"
-#include "engine/connect_calm.h"
+#include "engine/storm/ConnectCalm.h"
+#include "engine/storm/StormSteps.h"
+#include "engine/world/RunStory.h"
 
 namespace {
 
@@ -42,19 +42,16 @@ bool readOptions(int count, char** arguments, Options& options) {
     return true;
 }
 
-std::string happens(World& world, std::uint64_t seed, const Options& options) {
-    const int steps = static_cast<int>(options.steps);
-    return options.connections ? stormOfConnections(world, seed, steps) : storm(world, seed, steps);
-}
-
 bool isCalm(std::uint64_t seed, const Options& options) {
-    const Ending ending =
-        runStory(seed, Storm::scenario(1), [&](World& world) { return happens(world, seed, options); });
-    if (ending.isOrderly && ending.text.empty()) return true;
-    std::printf("seed %llu: %s%s\n", static_cast<unsigned long long>(seed), ending.text.c_str(),
-                ending.errors.c_str());
+    const Ending ending = runStory({.seed = seed}, Storm::scenario(1), [&](Story& story) {
+        const int steps = static_cast<int>(options.steps);
+        story.expect("storm",
+                     options.connections ? stormOfConnections(story, seed, steps) : storm(story, seed, steps),
+                     "");
+    });
+    std::fputs(ending.wrong.c_str(), stdout);
     std::fflush(stdout);
-    return false;
+    return ending.wrong.empty();
 }
 
 }  // namespace

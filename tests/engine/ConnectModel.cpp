@@ -1,9 +1,17 @@
-#include "engine/connect_model.h"
+#include "engine/ConnectModel.h"
 
 #include <algorithm>
-#include <optional>
+#include <iterator>
 
 namespace vexa::test {
+
+namespace {
+
+bool fits(const ModelCredential& credential, const ModelNetwork& network) {
+    return credential.realm == network.realm && (credential.isTls ? network.takesTls : network.takesTtls);
+}
+
+}  // namespace
 
 ConnectModel::ConnectModel(std::vector<ModelCredential> credentials, std::vector<ModelNetwork> networks)
     : m_credentials(std::move(credentials)), m_networks(std::move(networks)) {
@@ -17,58 +25,50 @@ void ConnectModel::settle() {
 
 std::vector<ModelCredential> ConnectModel::matching(const ModelNetwork& network) const {
     std::vector<ModelCredential> found;
-    for (const ModelCredential& credential : m_credentials)
-        if (credential.realm == network.realm && (credential.isTls ? network.takesTls : network.takesTtls))
-            found.push_back(credential);
+    std::copy_if(m_credentials.begin(), m_credentials.end(), std::back_inserter(found),
+                 [&](const ModelCredential& credential) { return fits(credential, network); });
     return found;
 }
 
-bool ConnectModel::isUsable(const ModelCredential& credential, const std::string& ssid) const {
-    const auto count = m_counts.find({credential.id, ssid});
-    return credential.autoConnect && (count == m_counts.end() || count->second < (credential.isTls ? 1 : 2));
+bool ConnectModel::isUsable(const ModelCredential& credential, const ModelNetwork& network) const {
+    if (!credential.autoConnect || !fits(credential, network) || m_blocked.contains(network.ssid))
+        return false;
+    const auto count = m_counts.find({credential.id, network.ssid});
+    return count == m_counts.end() || count->second < (credential.isTls ? 1 : 2);
 }
 
 // False if nothing is left to try.
 bool ConnectModel::joinBest() {
-    const ModelNetwork* network = nullptr;
-    std::optional<ModelCredential> best;
-    const auto placeOf = [this](const ModelCredential& wanted) {
-        return std::find_if(m_credentials.begin(), m_credentials.end(),
-                            [&](const ModelCredential& c) { return c.id == wanted.id; });
-    };
-    for (const std::size_t index : m_list) {
-        const ModelNetwork& candidate = m_networks[index];
-        if (m_blocked.contains(candidate.ssid)) continue;
-        for (const ModelCredential& credential : matching(candidate)) {
-            if (!isUsable(credential, candidate.ssid)) continue;
-            if (!best || placeOf(credential) < placeOf(*best)) {
-                best = credential;
-                network = &candidate;
+    for (const ModelCredential& credential : m_credentials)
+        for (const std::size_t index : m_list)
+            if (isUsable(credential, m_networks[index])) {
+                join(m_networks[index], credential);
+                return true;
             }
-            break;
-        }
-    }
-    if (!best) return false;
-    const auto held = m_profiles.find(network->ssid);
+    return false;
+}
+
+void ConnectModel::join(const ModelNetwork& network, const ModelCredential& credential) {
+    const auto held = m_profiles.find(network.ssid);
+    int& count = m_counts[{credential.id, network.ssid}];
     if (held == m_profiles.end() || held->second.isForMachine ||
-        held->second.credential.isTls != best->isTls) {
-        m_profiles[network->ssid] = {*best, false};
-        m_counts[{best->id, network->ssid}] = 0;
+        held->second.credential.isTls != credential.isTls) {
+        m_profiles[network.ssid] = {credential, false};
+        count = 0;
     }
-    ++m_counts[{best->id, network->ssid}];
-    const Profile profile = m_profiles[network->ssid];
-    if (!attempt(*network, profile) && profile.credential.isTls) attemptWithMachine(*network);
-    return true;
+    ++count;
+    const Profile profile = m_profiles[network.ssid];
+    if (!attempt(network, profile) && profile.credential.isTls) attemptWithMachine(network);
 }
 
 bool ConnectModel::attempt(const ModelNetwork& network, const Profile& profile) {
     const ModelCredential& credential = profile.credential;
     const std::string id = std::to_string(credential.id);
     m_connected.clear();
-    m_requests += network.ssid +
-                  (credential.isTls ? " tls ca" + id + (profile.isForMachine ? " machine" : " machineOrUser")
-                                    : " ttls u" + id) +
-                  "\n";
+    m_requests.push_back(network.ssid +
+                         (credential.isTls
+                              ? " tls ca" + id + (profile.isForMachine ? " machine" : " machineOrUser")
+                              : " ttls u" + id));
     const bool isCertificateFine = network.letsInUser || (network.letsInMachineOnly && profile.isForMachine);
     const bool isPasswordFine = network.letsInPassword && credential.id == network.friendId;
     if (!network.isVisible || !(credential.isTls ? isCertificateFine : isPasswordFine)) return false;
@@ -129,7 +129,7 @@ void ConnectModel::connect(const std::string& ssid) {
         if (attempt(network, m_profiles[ssid]) || (credential.isTls && attemptWithMachine(network))) break;
     }
     if (matching(network).empty()) {
-        m_requests += "plain " + ssid + "\n";
+        m_requests.push_back("plain " + ssid);
         m_connected.clear();
     }
     settle();

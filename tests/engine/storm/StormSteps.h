@@ -6,7 +6,7 @@
 #include <string>
 #include <vector>
 
-#include "engine/World.h"
+#include "engine/world/World.h"
 
 namespace vexa::test {
 
@@ -37,9 +37,7 @@ private:
         bool isReported = true;
     };
 
-    bool chance(unsigned oneIn) { return m_random() % oneIn == 0; }
     std::string changeOfTheAir();
-    std::string action();
     void sendCommands();
     bool hear();
     bool waitForAnswers();

@@ -15,6 +15,14 @@
 
 namespace vexa::test {
 
+/// Null if the text is no JSON.
+Json::Value parsed(const std::string& text);
+
+std::string contentOf(const std::filesystem::path& file);
+
+/// The text of an action: doing("radio", R"("software":"off")").
+std::string doing(const std::string& action, const std::string& members = "");
+
 /// One event that a client got, its `Data` parsed where it is JSON.
 struct ClientEvent {
     std::string id;
@@ -35,9 +43,6 @@ public:
     /// Events since the last call, oldest first.
     std::vector<ClientEvent> events();
 
-    /// Their ids, joined by blanks.
-    std::string ids();
-
     /// All that ever came, as it came.
     const std::string& transcript() const { return m_transcript; }
 
@@ -50,23 +55,35 @@ private:
 /// seeded world. Time passes by advance() alone, as far as the story is concerned.
 class World {
 public:
-    World(const std::string& scenario, const std::filesystem::path& folder);
+    /// The diagnostic log is on in a scenario that brings no configuration of its own; without `withLog` it
+    /// is off in any.
+    World(const std::string& scenario, const std::filesystem::path& folder, bool withLog = true);
 
     /// Carries out an action or query of the control channel; throws if it is refused.
     Json::Value perform(const std::string& message);
+    void act(const std::string& action, const std::string& members = "") { perform(doing(action, members)); }
 
     /// Lets this time pass and everything come to rest that falls due in it.
     void advance(platform::Duration span);
 
+    /// Sends a command to the hotspot port and lets it be carried out.
+    void order(const std::string& command, const std::string& data = "");
+
+    /// From now on requests, events and the messages of the log count anew.
+    void forget();
+
     /// Everything that the diagnostic log wrote so far.
     std::string log();
-    std::size_t logSize();
-    /// The text of config.xml, and the folder that holds it.
-    std::string config() const;
-    std::filesystem::path store() const;
+    /// Its messages since the last forget(), without numbers, times and empty lines.
+    std::string messages();
 
+    std::string config() const { return contentOf(store() / "config.xml"); }
+    void writeConfig(const std::string& text);
+    /// The folder that holds config.xml.
+    std::filesystem::path store() const { return m_folder / "Public" / "Roaming" / "Korvane"; }
+    std::filesystem::path logFile() const { return store() / "Dump" / "hs20log.txt_user.txt"; }
     /// One line per call.
-    std::string debugLog() const;
+    std::string debugLog() const { return contentOf(m_folder / "debug.log"); }
 
     Client& spectral() { return *m_spectral; }
     Client& hotspot() { return *m_hotspot; }
@@ -75,8 +92,6 @@ public:
     int stop();
 
 private:
-    std::filesystem::path logFile() const;
-
     std::filesystem::path m_folder;
     simulation::Machine m_machine;
     std::unique_ptr<platform::NamedMutex> m_stopMutex;
@@ -84,6 +99,7 @@ private:
     int m_exitCode = -1;
     std::unique_ptr<Client> m_spectral;
     std::unique_ptr<Client> m_hotspot;
+    std::size_t m_forgotten = 0;  // of the log
 };
 
 }  // namespace vexa::test

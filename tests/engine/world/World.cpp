@@ -1,4 +1,4 @@
-#include "engine/World.h"
+#include "engine/world/World.h"
 
 #include <json/reader.h>
 #include <json/writer.h>
@@ -20,41 +20,22 @@ namespace {
 
 using namespace std::chrono_literals;
 
-Json::Value parse(const std::string& text) {
-    Json::Value value;
-    std::string errors;
-    std::istringstream stream(text);
-    Json::CharReaderBuilder builder;
-    if (!text.empty() && !Json::parseFromStream(builder, stream, &value, &errors))
-        return Json::Value::nullSingleton();
-    return value;
-}
-
 std::string oneLine(const Json::Value& value) {
     Json::StreamWriterBuilder builder;
     builder["indentation"] = "";
     return Json::writeString(builder, value);
 }
 
-std::string contentOf(const std::filesystem::path& file) {
-    const std::ifstream stream(file, std::ios::binary);
-    std::ostringstream content;
-    content << stream.rdbuf();
-    return content.str();
-}
+constexpr const char* kConfig = R"(<?xml version="1.0" encoding="UTF-8"?><configurations><global>
+<dump_file_path>hs20log.txt</dump_file_path><create_new_dump_file>false</create_new_dump_file>
+<autoconnect>true</autoconnect><enabledump>true</enabledump><dumplevel>0</dumplevel><homerealm></homerealm>
+<nextcredid>1</nextcredid></global><credentials></credentials><users></users></configurations>)";
 
-constexpr const char* kConfigWithLog =
-    "<?xml version=\"1.0\" "
-    "encoding=\"UTF-8\"?><configurations><global><dump_file_path>hs20log.txt</dump_file_path>"
-    "<create_new_dump_file>false</create_new_dump_file><autoconnect>true</autoconnect><enabledump>true</"
-    "enabledump>"
-    "<dumplevel>0</dumplevel><homerealm></homerealm><nextcredid>1</nextcredid></global><credentials></"
-    "credentials>"
-    "<users></users></configurations>";
-
-// A story wants to read the log, unless it brings a configuration of its own.
-simulation::Scenario withLog(simulation::Scenario scenario) {
-    if (!scenario.config) scenario.config = kConfigWithLog;
+simulation::Scenario configured(simulation::Scenario scenario, bool withLog) {
+    const std::string on = "<enabledump>true";
+    if (!scenario.config) scenario.config = kConfig;
+    if (const std::size_t at = scenario.config->find(on); !withLog && at != std::string::npos)
+        scenario.config->replace(at, on.size(), "<enabledump>false");
     return scenario;
 }
 
@@ -67,7 +48,33 @@ std::int32_t unusedPort(std::int32_t from) {
     }
 }
 
+bool hasPrefix(const std::string& line) {
+    const std::size_t end = line.find("] ");
+    return !line.empty() && line[0] == '[' && end != std::string::npos && line.size() >= end + 18 &&
+           line[end + 4] == '/';
+}
+
 }  // namespace
+
+Json::Value parsed(const std::string& text) {
+    Json::Value value;
+    std::string errors;
+    std::istringstream stream(text);
+    const Json::CharReaderBuilder builder;
+    if (text.empty() || !Json::parseFromStream(builder, stream, &value, &errors)) return {};
+    return value;
+}
+
+std::string contentOf(const std::filesystem::path& file) {
+    const std::ifstream stream(file, std::ios::binary);
+    std::ostringstream content;
+    content << stream.rdbuf();
+    return content.str();
+}
+
+std::string doing(const std::string& action, const std::string& members) {
+    return R"({"do":")" + action + "\"" + (members.empty() ? "" : ",") + members + "}";
+}
 
 Client::Client(std::int32_t port) : m_client(InProcessClient::connect(port)) {
     for (int tries = 0; !m_client; ++tries) {
@@ -88,24 +95,17 @@ std::vector<ClientEvent> Client::events() {
     std::vector<ClientEvent> events;
     for (const std::string& text : m_client->receive()) {
         m_transcript += text;
-        const Json::Value event = parse(text);
+        const Json::Value event = parsed(text);
         const std::string data = event.get("Data", "").asString();
         events.push_back({event["EventId"].asString(), event["Source"].asString(), event.isMember("Data"),
-                          data, parse(data)});
+                          data, parsed(data)});
     }
     return events;
 }
 
-std::string Client::ids() {
-    std::string ids;
-    for (const ClientEvent& event : events())
-        ids += (ids.empty() ? "" : " ") + event.id;
-    return ids;
-}
-
-World::World(const std::string& scenario, const std::filesystem::path& folder)
+World::World(const std::string& scenario, const std::filesystem::path& folder, bool withLog)
     : m_folder(folder),
-      m_machine(withLog(simulation::parseScenario(scenario)), folder),
+      m_machine(configured(simulation::parseScenario(scenario), withLog), folder),
       m_stopMutex(std::make_unique<platform::NamedMutex>("{39EAA3ED-1A26-46B7-90A7-AAFFECE80392}",
                                                          platform::NamedMutex::Owner::Yes)) {
     const std::int32_t saPort = unusedPort(2100);
@@ -119,7 +119,7 @@ World::World(const std::string& scenario, const std::filesystem::path& folder)
 }
 
 Json::Value World::perform(const std::string& message) {
-    Json::Value answer = m_machine.perform(parse(message));
+    Json::Value answer = m_machine.perform(parsed(message));
     if (!answer["ok"].asBool()) throw std::runtime_error(message + ": " + oneLine(answer));
     return answer["result"];
 }
@@ -128,32 +128,35 @@ void World::advance(platform::Duration span) {
     platform::advance(span);
 }
 
+void World::order(const std::string& command, const std::string& data) {
+    hotspot().send(command, data);
+    advance(0ms);
+}
+
+void World::forget() {
+    act("clearCalls");
+    spectral().events();
+    hotspot().events();
+    m_forgotten = log().size();
+}
+
 std::string World::log() {
     DiagnosticLog::instance().flushToFile();
     return contentOf(logFile());
 }
 
-std::size_t World::logSize() {
-    DiagnosticLog::instance().flushToFile();
-    std::error_code error;
-    const std::uintmax_t size = std::filesystem::file_size(logFile(), error);
-    return error ? 0 : size;
+std::string World::messages() {
+    std::istringstream stream(log().substr(m_forgotten));
+    std::string messages;
+    for (std::string line; std::getline(stream, line);) {
+        if (hasPrefix(line)) line.erase(0, line.find("] ") + 18);
+        if (!line.empty()) messages += line + "\n";
+    }
+    return messages;
 }
 
-std::filesystem::path World::logFile() const {
-    return store() / "Dump" / "hs20log.txt_user.txt";
-}
-
-std::filesystem::path World::store() const {
-    return m_folder / "Public" / "Roaming" / "Korvane";
-}
-
-std::string World::config() const {
-    return contentOf(store() / "config.xml");
-}
-
-std::string World::debugLog() const {
-    return contentOf(m_folder / "debug.log");
+void World::writeConfig(const std::string& text) {
+    std::ofstream(store() / "config.xml", std::ios::binary | std::ios::trunc) << text;
 }
 
 int World::stop() {

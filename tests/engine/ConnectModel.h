@@ -46,8 +46,8 @@ public:
     void editCredential(int id, bool autoConnect);
     void addCredential(const ModelCredential& credential);
 
-    /// All requests so far, one a line.
-    const std::string& requests() const { return m_requests; }
+    /// All requests so far.
+    const std::vector<std::string>& requests() const { return m_requests; }
     const std::string& connected() const { return m_connected; }
     const std::vector<ModelNetwork>& networks() const { return m_networks; }
     const std::vector<ModelCredential>& credentials() const { return m_credentials; }
@@ -60,8 +60,9 @@ private:
     using Pair = std::pair<int, std::string>;
 
     std::vector<ModelCredential> matching(const ModelNetwork& network) const;
-    bool isUsable(const ModelCredential& credential, const std::string& ssid) const;
+    bool isUsable(const ModelCredential& credential, const ModelNetwork& network) const;
     bool joinBest();
+    void join(const ModelNetwork& network, const ModelCredential& credential);
     bool attempt(const ModelNetwork& network, const Profile& profile);
     bool attemptWithMachine(const ModelNetwork& network);
     void forgetProfilesOf(int id);
@@ -73,7 +74,7 @@ private:
     std::map<std::string, Profile> m_profiles;
     std::set<std::string> m_blocked;
     std::string m_connected;
-    std::string m_requests;
+    std::vector<std::string> m_requests;
 };
 
 }  // namespace vexa::test
