@@ -79,23 +79,22 @@ TEST(Air, RealmDataThatCanNotBeReadCountsAsFetchedAndLeavesTheRealms) {
                                            {kReport, "networks Airport[]"}});
 }
 
-TEST(Air, WithTheFunctionOrTheRadioOffTheListIsNullAndWithoutAnAdapterThereIsNone) {
-    EXPECT_STORY(air({network(1, "Airport")}), [](Story& story) {
-        settle(story);
-        switchHs20(story, false);
-        story.expect("switched off", heard(story), "networks null; SET_HOTSPOT_AUTO_CONNECT");
-        walk(story, {{adding(network(2, "Cafe")), ""}, {kReport, "networks null"}});
-        switchHs20(story, true);
-        story.expect("switched on", heard(story), "networks Airport Cafe; SET_HOTSPOT_AUTO_CONNECT");
-        walk(story, {{kRadioOff, "GET_RADIO; networks null"}, {kReport, "networks null"}});
-        story.expect("list", askedList(story), "null");
-        walk(story, {{kRadioOn, "GET_RADIO; networks Airport Cafe"}});
-        story.act("pullAdapter");
-        story.expect("list", askedList(story), "nothing");
-        story.order("GET_IS_INTERNET_ACCESS");
-        switchHs20(story, false);
-        story.expect("heard without an adapter", heard(story), "SET_HOTSPOT_AUTO_CONNECT");
-    });
+STORY(Air, WithTheFunctionOrTheRadioOffTheListIsNullAndWithoutAnAdapterThereIsNone,
+      air({network(1, "Airport")})) {
+    settle(story);
+    story.play({kHs20Off});
+    story.expect("switched off", heard(story), "networks null; SET_HOTSPOT_AUTO_CONNECT");
+    walk(story, {{adding(network(2, "Cafe")), ""}, {kReport, "networks null"}});
+    story.play({kHs20On});
+    story.expect("switched on", heard(story), "networks Airport Cafe; SET_HOTSPOT_AUTO_CONNECT");
+    walk(story, {{kRadioOff, "GET_RADIO; networks null"}, {kReport, "networks null"}});
+    story.expect("list", askedList(story), "null");
+    walk(story, {{kRadioOn, "GET_RADIO; networks Airport Cafe"}});
+    story.act("pullAdapter");
+    story.expect("list", askedList(story), "nothing");
+    story.order("GET_IS_INTERNET_ACCESS");
+    story.play({kHs20Off});
+    story.expect("heard without an adapter", heard(story), "SET_HOTSPOT_AUTO_CONNECT");
 }
 
 constexpr const char* kList = R"([
@@ -122,19 +121,16 @@ constexpr const char* kList = R"([
 ]
 )";
 
-TEST(Air, TheListIsWrittenFieldByField) {
-    EXPECT_STORY("{}", [](Story& story) {
-        settle(story);
-        story.order("GET_ALL_NETWORK_LIST");
-        story.expect("no list", story.hotspot().events().at(0).dataText, "null\n");
-        story.perform(adding(network(1, "Airport", R"("networkType":7,"internetAccess":0,)" + ttls())));
-        story.perform(adding(network(2, "Cafe", R"("networkType":4294967295,"internetAccess":5)")));
-        story.perform(kReport);
-        const auto events = story.hotspot().events();
-        story.expect("first", events.at(0).id + " " + events.at(0).source + " " + events.at(0).dataText,
-                     "DETECTED_HOTSPOT HotSpot20 null\n");
-        story.expect("list", events.at(1).dataText, kList);
-    });
+STORY(Air, TheListIsWrittenFieldByField, "{}") {
+    settle(story);
+    story.order("GET_ALL_NETWORK_LIST");
+    story.expect("no list", story.hotspot().events().at(0).dataText, "null\n");
+    story.play({adding(network(1, "Airport", R"("networkType":7,"internetAccess":0,)" + ttls())),
+                adding(network(2, "Cafe", R"("networkType":4294967295,"internetAccess":5)")), kReport});
+    const auto events = story.hotspot().events();
+    story.expect("first", events.at(0).id + " " + events.at(0).source + " " + events.at(0).dataText,
+                 "DETECTED_HOTSPOT HotSpot20 null\n");
+    story.expect("list", events.at(1).dataText, kList);
 }
 
 }  // namespace

@@ -51,8 +51,7 @@ TEST(AirModule, AnAnswerAboutABssIsReadWithinItsBytes) {
             story.about(c.what);
             story.perform(kReport);
             story.forget();
-            story.perform(reply("anqpInfo", c.reply));
-            story.perform(on("reportAnqp", 1));
+            story.play({reply("anqpInfo", c.reply), on("reportAnqp", 1)});
             story.expectLog(
                 {"Fetching BSS with ssid=Airport and mac address=02:aa:00:00:00:01  ANQP info "
                  "from HS20 IHV..."});
@@ -84,32 +83,26 @@ TEST(AirModule, TheAnswerWithTheListIsReadByWholeRecords) {
             story.about(std::to_string(c.size));
             story.perform(moduleMessage(2, bssRecord("02aa00000009", "Airport")));
             story.forget();
-            story.perform(reply("bssList", cut(kTwo, c.size)));
-            story.perform(moduleMessage(4, {}));
+            story.play({reply("bssList", cut(kTwo, c.size)), moduleMessage(4, {})});
             story.expectLog(c.lines);
             story.expect("list", askedList(story), c.list);
         }
     });
 }
 
-TEST(AirModule, ARequestThatFailsLeavesItsLineAndChangesNothing) {
-    EXPECT_STORY(
-        air({network(1, "Airport", tls()), network(2, "Cafe", ttls("c.example"))}), [](Story& story) {
-            settle(story);
-            story.perform(failing("WlanIhvControl", 31, R"("match":"bssList")"));
-            story.perform(moduleMessage(4, {}));
-            story.expect("log", story.messages(),
-                         "IHV reports HS20 network query ANQP info completed.\n"
-                         "Get HS20 BSS list from IHV.\n"
-                         "WlanIhvControl failed with error code=31\n"
-                         "Error: getHs20BssListFromIHV failed in hs20Associate.\n");
-            story.expect("heard", heard(story), "");
-            story.perform(on("setNetwork", 1, tls("x.example")));
-            story.perform(on("setNetwork", 2, tls("y.example")));
-            story.perform(failing("WlanIhvControl", 31, R"("match":"anqpInfo")"));
-            story.perform(kReport);
-            story.expect("heard", heard(story), "networks Airport[a.example TLS] Cafe[y.example TLS]");
-        });
+STORY(AirModule, ARequestThatFailsLeavesItsLineAndChangesNothing,
+      air({network(1, "Airport", tls()), network(2, "Cafe", ttls("c.example"))})) {
+    settle(story);
+    story.play({failing("WlanIhvControl", 31, R"("match":"bssList")"), moduleMessage(4, {})});
+    story.expect("log", story.messages(),
+                 "IHV reports HS20 network query ANQP info completed.\n"
+                 "Get HS20 BSS list from IHV.\n"
+                 "WlanIhvControl failed with error code=31\n"
+                 "Error: getHs20BssListFromIHV failed in hs20Associate.\n");
+    story.expect("heard", heard(story), "");
+    story.play({on("setNetwork", 1, tls("x.example")), on("setNetwork", 2, tls("y.example")),
+                failing("WlanIhvControl", 31, R"("match":"anqpInfo")"), kReport});
+    story.expect("heard", heard(story), "networks Airport[a.example TLS] Cafe[y.example TLS]");
 }
 
 TEST(AirModule, AReportIsAsLongAsItClaimsAndNoLongerThanItsBlock) {
@@ -193,69 +186,64 @@ TEST(AirModule, TheRequestsAreMadeByteForByte) {
     });
 }
 
-TEST(AirModule, TheDriversStateIsPassedOnWhereItsTwoNumbersAre) {
-    EXPECT_STORY("{}", [](Story& story) {
-        settle(story);
-        const auto expectHeard = [&](const std::string& action, const std::string& wanted) {
-            story.perform(action);
-            std::string text;
-            for (const ClientEvent& event : story.hotspot().events())
-                text += event.id + " " + event.data["PreviousState"].asString() + ">" +
-                        event.data["CurrentState"].asString() + " " + std::to_string(event.data.size());
-            story.expect(action, text, wanted);
-        };
-        const std::string state = doing("driverState", R"("current":5,"previous":3)");
-        expectHeard(state, "SUPPLICANT_STATE_CHANGE 3>5 2");
-        expectHeard(moduleMessage(1, bytesOfHex("07000000 08000000"), 0), "SUPPLICANT_STATE_CHANGE 8>7 2");
-        expectHeard(moduleMessage(1, bytesOfHex("07000000 080000"), 8), "");
-        expectHeard(moduleMessage(1, {}, 0), "");
-        story.act("pullAdapter");
-        story.forget();
-        expectHeard(state, "");
-    });
+STORY(AirModule, TheDriversStateIsPassedOnWhereItsTwoNumbersAre, "{}") {
+    settle(story);
+    const auto expectHeard = [&](const std::string& action, const std::string& wanted) {
+        story.perform(action);
+        std::string text;
+        for (const ClientEvent& event : story.hotspot().events())
+            text += event.id + " " + event.data["PreviousState"].asString() + ">" +
+                    event.data["CurrentState"].asString() + " " + std::to_string(event.data.size());
+        story.expect(action, text, wanted);
+    };
+    const std::string state = doing("driverState", R"("current":5,"previous":3)");
+    expectHeard(state, "SUPPLICANT_STATE_CHANGE 3>5 2");
+    expectHeard(moduleMessage(1, bytesOfHex("07000000 08000000"), 0), "SUPPLICANT_STATE_CHANGE 8>7 2");
+    expectHeard(moduleMessage(1, bytesOfHex("07000000 080000"), 8), "");
+    expectHeard(moduleMessage(1, {}, 0), "");
+    story.act("pullAdapter");
+    story.forget();
+    expectHeard(state, "");
 }
 
-TEST(AirModule, SubtypesThatNobodyKnowsAreIgnored) {
-    EXPECT_STORY(air({network(1, "Airport")}), [](Story& story) {
-        settle(story);
-        for (const unsigned subtype : {0U, 7U, 8U, 0x80000001U, 0xFFFFFFFFU})
-            story.perform(moduleMessage(subtype, bssRecord("02aa00000001", "Airport")));
-        story.expect("log", story.messages(), "");
-        story.expect("heard", heard(story), "");
-    });
+STORY(AirModule, SubtypesThatNobodyKnowsAreIgnored, air({network(1, "Airport")})) {
+    settle(story);
+    for (const unsigned subtype : {0U, 7U, 8U, 0x80000001U, 0xFFFFFFFFU})
+        story.perform(moduleMessage(subtype, bssRecord("02aa00000001", "Airport")));
+    story.expect("log", story.messages(), "");
+    story.expect("heard", heard(story), "");
 }
 
-TEST(AirModule, AnUpdateRunsThroughItsStepsInOrder) {
-    EXPECT_STORY(air({network(1, "Airport"), network(2, "Airport", tls())}), [](Story& story) {
-        settle(story);
-        story.perform(kReport);
-        const std::string log = story.messages();
-        story.expect(
-            "log", log.substr(0, log.find("Send all HS20 networks to vexa.\n")),
-            "IHV reports HS20 network list changed.\n"
-            "There already exists a network with ssid=Airport, updating network info....\n"
-            "We scanned a new HS20 network with ssid=Airport, adding to the network list...\n"
-            "\tssid=Airport\n"
-            "Fetching BSS with ssid=Airport and mac address=02:aa:00:00:00:01  ANQP info from HS20 IHV...\n"
-            "ANQP info fetched from IHV: ____\n"
-            "No ANQP NAI realm info.\n"
-            "Fetching BSS with ssid=Airport and mac address=02:aa:00:00:00:02  ANQP info from HS20 IHV...\n"
-            "ANQP info fetched from IHV: __________a.example____\n"
-            "Parsing NAI Realm list from 02:aa:00:00:00:02\n"
-            "\tParsing NAI Realm...\n"
-            "\tNAI Realm Count: 1\n"
-            "\tNAI Realm=a.example\n"
-            "\t\tEAP Method: len=2 method=13 auth_count=0\n"
-            "\tWe have parsed 1 realms:\n"
-            "\t\ta.example EAP-TLS\n"
-            "Processing duplicated HS20 networks...\n"
-            "Found duplicate HS20 networks with same ssid=Airport\n"
-            "\tMacAddress=02:aa:00:00:00:01\n"
-            "\tMacAddress=02:aa:00:00:00:02\n"
-            "This network with index=0 and mac address02:aa:00:00:00:01 exists before, thus we will keep "
-            "it.\n"
-            "\tSet events m_hHs20NetworkChangedEvent and m_hAnqpInfoReadyEvent.\n");
-    });
+STORY(AirModule, AnUpdateRunsThroughItsStepsInOrder,
+      air({network(1, "Airport"), network(2, "Airport", tls())})) {
+    settle(story);
+    story.perform(kReport);
+    const std::string log = story.messages();
+    story.expect(
+        "log", log.substr(0, log.find("Send all HS20 networks to vexa.\n")),
+        "IHV reports HS20 network list changed.\n"
+        "There already exists a network with ssid=Airport, updating network info....\n"
+        "We scanned a new HS20 network with ssid=Airport, adding to the network list...\n"
+        "\tssid=Airport\n"
+        "Fetching BSS with ssid=Airport and mac address=02:aa:00:00:00:01  ANQP info from HS20 IHV...\n"
+        "ANQP info fetched from IHV: ____\n"
+        "No ANQP NAI realm info.\n"
+        "Fetching BSS with ssid=Airport and mac address=02:aa:00:00:00:02  ANQP info from HS20 IHV...\n"
+        "ANQP info fetched from IHV: __________a.example____\n"
+        "Parsing NAI Realm list from 02:aa:00:00:00:02\n"
+        "\tParsing NAI Realm...\n"
+        "\tNAI Realm Count: 1\n"
+        "\tNAI Realm=a.example\n"
+        "\t\tEAP Method: len=2 method=13 auth_count=0\n"
+        "\tWe have parsed 1 realms:\n"
+        "\t\ta.example EAP-TLS\n"
+        "Processing duplicated HS20 networks...\n"
+        "Found duplicate HS20 networks with same ssid=Airport\n"
+        "\tMacAddress=02:aa:00:00:00:01\n"
+        "\tMacAddress=02:aa:00:00:00:02\n"
+        "This network with index=0 and mac address02:aa:00:00:00:01 exists before, thus we will keep "
+        "it.\n"
+        "\tSet events m_hHs20NetworkChangedEvent and m_hAnqpInfoReadyEvent.\n");
 }
 
 }  // namespace

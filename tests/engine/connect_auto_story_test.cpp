@@ -15,7 +15,6 @@ const std::string kTwice = "cafe ttls u1; cafe ttls u1";
 const StoredCredential kPassword;
 const StoredCredential kSecondPassword{.id = 2};
 const StoredCredential kCertificate{.isTls = true};
-const StoredCredential kByHand{.autoConnect = false};
 const std::string kSecondIsLetIn = lettingIn(R"({"eapMethod":21,"username":"u2"})");
 
 void joins(const char* what, const std::vector<std::string>& networks,
@@ -39,13 +38,9 @@ TEST(AutoConnect, JoinsWhatItMay) {
     joins("the network of the better credential, though it comes later",
           {open(1, "first", ttls("b.example")), open(2, "second", ttls())},
           {kPassword, {.id = 2, .realm = "b.example"}}, {"second ttls u1", "1 access", "second", 2});
-    joins("the earlier network of two for one credential", {kCafe, open(2, "second", ttls())}, {kPassword},
-          {"cafe ttls u1", "1 access", "cafe", 2});
     joins("the other network when the first is exhausted, with a count of its own",
           {network(1, "first", ttls()), open(2, "second", ttls())}, {kPassword},
           {"first ttls u1; first ttls u1; second ttls u1", "0 no access 0 no access 1 access", "second", 2});
-    joins("with the credential behind one that is for the user's hand alone", {kCafe},
-          {kByHand, kSecondPassword}, {"cafe ttls u2", "1 access", "cafe", 2});
 }
 
 TEST(AutoConnect, GivesUpAfterItsAttempts) {
@@ -61,170 +56,147 @@ TEST(AutoConnect, GivesUpAfterItsAttempts) {
           {longName + " ttls u1; " + longName + " ttls u1", "0 no access 0 no access", "-", 0});
     joins("a name that XML can not hold costs its attempts", {open(1, "a&b", ttls())}, {kPassword},
           {"a&b ttls u1 = 1206; a&b ttls u1 = 1206", "", "-", -1});
-    joins("a credential that is for the user's hand alone is not tried", {kCafe}, {kByHand},
-          {"", "", "-", -1});
-    joins("nor is one of a realm that the network doesn't know", {kHotel}, {kPassword}, {"", "", "-", -1});
 }
 
 // What the log tells while it joins: the story of one success, line for line in its order.
-TEST(AutoConnect, TellsInTheLogWhyItChoseWhatItChose) {
-    const std::string scenario = air({open(1, "first", ttls("b.example")), open(2, "second", ttls())},
-                                     storing({kPassword, {.id = 2, .realm = "b.example"}}));
-    EXPECT_STORY(scenario, [](Story& story) {
-        story.advance(5s);
-        story.expectLog(
-            {">>>> Enter connectNetwork",
-             "\tIterate over all BSS list to find if any matches with any stored credential.",
-             "Enter findBestMatchBssAndCredential...",
-             "------------------------------------------------------------------",
-             "\t[1] Checking HS20 network with ssid=####first#### and bssid=02:aa:00:00:00:01",
-             "\tFound 1 credentials",
-             "\tChecking found credentials...",
-             "\tChecking credential with id=2 name=name2, realm=b.example, priority=2",
-             "\tSelected cred id=2",
-             "\tSelecting credential with id=2 name=name2 and bss with ssid=first",
-             "\tHome SP ssid=first, bHomeSP=0",
-             "\t[2] Checking HS20 network with ssid=####second#### and bssid=02:aa:00:00:00:02",
-             "\tSelected cred id=1",
-             "\tSelecting credential with id=1 name=name1 and bss with ssid=second\tReplacing credential "
-             "with id=2 name=name2 and ssid=first",
-             "\tHome SP ssid=second, bHomeSP=0",
-             "!!!Found a credential with id=1 for network with ssid=second",
-             "!!!Creating a new network profile",
-             "Adding a new EAP-TTLS network profile...",
-             "\tUsername=u1, password=p1",
-             "Not found cred2ssid entry: credId=1, ssid=second, adding a new entry with numRetries=0",
-             "Going to connect to network with ssid=second",
-             "Increase retry numbers for cred id=1, ssid=second",
-             "\tIncrease cred2ssid num retries: credId=1, ssid=second, numRetries=0",
-             "Connect to network second",
-             "Network profile for ssid=second",
-             "\tInterworking: Connect with 02:aa:00:00:00:02",
-             "Connection start event: connection initiated by HS20, profile name=second",
-             "Connection result initiated by HS20, clearing the cache, profile name=second.",
-             "Connection succeeded! profile name=second",
-             "Supplicant state changed from Initialized to Connected",
-             ">>>>Clear cred num retries on conn success: profileName=second",
-             "Reason code desc=The operation was successful.",
-             "Send connection result to vexa.",
-             "Send connection status to vexa"});
-    });
+STORY(AutoConnect, TellsInTheLogWhyItChoseWhatItChose,
+      air({open(1, "first", ttls("b.example")), open(2, "second", ttls())},
+          storing({kPassword, {.id = 2, .realm = "b.example"}}))) {
+    story.advance(5s);
+    story.expectLog(
+        {">>>> Enter connectNetwork",
+         "\tIterate over all BSS list to find if any matches with any stored credential.",
+         "Enter findBestMatchBssAndCredential...",
+         "------------------------------------------------------------------",
+         "\t[1] Checking HS20 network with ssid=####first#### and bssid=02:aa:00:00:00:01",
+         "\tFound 1 credentials",
+         "\tChecking found credentials...",
+         "\tChecking credential with id=2 name=name2, realm=b.example, priority=2",
+         "\tSelected cred id=2",
+         "\tSelecting credential with id=2 name=name2 and bss with ssid=first",
+         "\tHome SP ssid=first, bHomeSP=0",
+         "\t[2] Checking HS20 network with ssid=####second#### and bssid=02:aa:00:00:00:02",
+         "\tSelected cred id=1",
+         "\tSelecting credential with id=1 name=name1 and bss with ssid=second\tReplacing credential "
+         "with id=2 name=name2 and ssid=first",
+         "\tHome SP ssid=second, bHomeSP=0",
+         "!!!Found a credential with id=1 for network with ssid=second",
+         "!!!Creating a new network profile",
+         "Adding a new EAP-TTLS network profile...",
+         "\tUsername=u1, password=p1",
+         "Not found cred2ssid entry: credId=1, ssid=second, adding a new entry with numRetries=0",
+         "Going to connect to network with ssid=second",
+         "Increase retry numbers for cred id=1, ssid=second",
+         "\tIncrease cred2ssid num retries: credId=1, ssid=second, numRetries=0",
+         "Connect to network second",
+         "Network profile for ssid=second",
+         "\tInterworking: Connect with 02:aa:00:00:00:02",
+         "Connection start event: connection initiated by HS20, profile name=second",
+         "Connection result initiated by HS20, clearing the cache, profile name=second.",
+         "Connection succeeded! profile name=second",
+         "Supplicant state changed from Initialized to Connected",
+         ">>>>Clear cred num retries on conn success: profileName=second",
+         "Reason code desc=The operation was successful.",
+         "Send connection result to vexa.",
+         "Send connection status to vexa"});
 }
 
-TEST(AutoConnect, TellsInTheLogHowItGaveUp) {
-    const std::string scenario = air({network(1, "cafe", both())}, storing({kCertificate, kSecondPassword}));
-    EXPECT_STORY(scenario, [](Story& story) {
-        story.advance(60s);
-        story.expectLog(
-            {"!!!Creating a new network profile",
-             "Adding a new EAP-TLS network profile with auth mode=machineOrUser...",
-             "Connection failed! profile name=cafe",
-             "Connection using EAP-TLS with authMode=machineOrUser failed,trying to use EAP-TLS with "
-             "authMode=machine.",
-             "Adding a new EAP-TLS network profile with auth mode=machine...",
-             "Connection failed! profile name=cafe",
-             "Reason code desc=The user name or password is not correct, or the certificate wa",
-             "\tRetry number exceeds maximum retry limit, skip this credential id=1, ssid=cafe",
-             "\tSelected cred id=2",
-             "Profile exists for ssid=cafe",
-             "\tEAP method doesn't matches, create new profile.",
-             "!!!Creating a new network profile",
-             "Adding a new EAP-TTLS network profile...",
-             "Connection failed! profile name=cafe",
-             "\tSelected cred id=2",
-             "\tEAP method matches, don't create new profile.",
-             "\tIncrease cred2ssid num retries: credId=2, ssid=cafe, numRetries=1",
-             "Connection failed! profile name=cafe",
-             "\tRetry number exceeds maximum retry limit, skip this credential id=1, ssid=cafe",
-             "\tRetry number exceeds maximum retry limit, skip this credential id=2, ssid=cafe",
-             "\t No credential found.",
-             "No matching network was found based on configured credentials."});
-    });
+STORY(AutoConnect, TellsInTheLogHowItGaveUp,
+      air({network(1, "cafe", both())}, storing({kCertificate, kSecondPassword}))) {
+    story.advance(60s);
+    story.expectLog({"!!!Creating a new network profile",
+                     "Adding a new EAP-TLS network profile with auth mode=machineOrUser...",
+                     "Connection failed! profile name=cafe",
+                     "Connection using EAP-TLS with authMode=machineOrUser failed,trying to use EAP-TLS with "
+                     "authMode=machine.",
+                     "Adding a new EAP-TLS network profile with auth mode=machine...",
+                     "Connection failed! profile name=cafe",
+                     "Reason code desc=The user name or password is not correct, or the certificate wa",
+                     "\tRetry number exceeds maximum retry limit, skip this credential id=1, ssid=cafe",
+                     "\tSelected cred id=2",
+                     "Profile exists for ssid=cafe",
+                     "\tEAP method doesn't matches, create new profile.",
+                     "!!!Creating a new network profile",
+                     "Adding a new EAP-TTLS network profile...",
+                     "Connection failed! profile name=cafe",
+                     "\tSelected cred id=2",
+                     "\tEAP method matches, don't create new profile.",
+                     "\tIncrease cred2ssid num retries: credId=2, ssid=cafe, numRetries=1",
+                     "Connection failed! profile name=cafe",
+                     "\tRetry number exceeds maximum retry limit, skip this credential id=1, ssid=cafe",
+                     "\tRetry number exceeds maximum retry limit, skip this credential id=2, ssid=cafe",
+                     "\t No credential found.",
+                     "No matching network was found based on configured credentials."});
 }
 
-TEST(AutoConnect, SwitchedOffInTheFileItBuildsTheProfileOnceAndConnectsNothing) {
-    EXPECT_STORY(air({kCafe}, storing({kPassword}, {.autoConnect = false})), [](Story& story) {
-        story.advance(60s);
-        expectStanding(story, {.requests = ""});
-        story.expectLog({"!!!Creating a new network profile", "connectNetwork returns with op succeeded.",
-                         "\tEAP method matches, don't create new profile.",
-                         "connectNetwork returns with op succeeded."});
-        story.expect("profiles", count(story.messages(), "!!!Creating"), 1);
-        story.expect("attempts that count", count(story.messages(), "Increase retry"), 0);
-    });
+STORY(AutoConnect, SwitchedOffInTheFileItBuildsTheProfileOnceAndConnectsNothing,
+      air({kCafe}, storing({kPassword}, {.autoConnect = false}))) {
+    story.advance(60s);
+    expectStanding(story, {.requests = ""});
+    story.expectLog({"!!!Creating a new network profile", "connectNetwork returns with op succeeded.",
+                     "\tEAP method matches, don't create new profile.",
+                     "connectNetwork returns with op succeeded."});
+    story.expect("profiles", count(story.messages(), "!!!Creating"), 1);
+    story.expect("attempts that count", count(story.messages(), "Increase retry"), 0);
 }
 
-TEST(AutoConnect, ComesBackAfterADropAndAfterTheNetworkWasAway) {
-    EXPECT_STORY(air({kCafe, kHotel}, storing({kPassword})), [](Story& story) {
-        story.advance(kBehindStart);
-        expectStanding(story, {.connected = "cafe"});
-        story.act("dropConnection");
-        expectStanding(story, {.eapMethod = 0});
-        story.advance(1s);
-        expectStanding(story, {.connected = "cafe"});
-        story.perform(on("hide", 1));
-        story.perform(kReport);
-        story.advance(30s);
-        expectStanding(story, {.connected = "-"});
-        story.perform(on("show", 1));
-        story.perform(kReport);
-        story.advance(30s);
-        expectStanding(story, {.connected = "cafe", .eapMethod = 2});
-    });
+STORY(AutoConnect, ComesBackAfterADropAndAfterTheNetworkWasAway, air({kCafe, kHotel}, storing({kPassword}))) {
+    story.advance(kBehindStart);
+    expectStanding(story, {.connected = "cafe"});
+    story.act("dropConnection");
+    expectStanding(story, {.eapMethod = 0});
+    story.advance(1s);
+    expectStanding(story, {.connected = "cafe"});
+    story.play({on("hide", 1), kReport});
+    story.advance(30s);
+    expectStanding(story, {.connected = "-"});
+    story.play({on("show", 1), kReport});
+    story.advance(30s);
+    expectStanding(story, {.connected = "cafe", .eapMethod = 2});
 }
 
-void triesAgain(const char* what, const std::string& requests, const Tale& change) {
+void triesAgain(const char* what, const std::string& requests, const std::vector<std::string>& deeds) {
     const std::string other = network(2, "other", ttls("other.example"));
     EXPECT_STORY(air({network(1, "cafe", ttls()), other}, storing({kPassword})), [&](Story& story) {
         story.advance(60s);
         story.forget();
-        change(story);
+        story.play(deeds);
         story.advance(60s);
         expectStanding(story, {.requests = requests});
     }) << what;
 }
 
-Tale doingAll(const std::vector<std::string>& actions) {
-    return [actions](Story& story) {
-        for (const std::string& action : actions)
-            story.perform(action);
-    };
-}
-
 TEST(AutoConnect, TriesAgainWhenSomethingHasChanged) {
-    triesAgain("nothing", "", [](Story&) {});
-    triesAgain("the session", kTwice, doingAll({doing("sessionChange", R"("eventType":8,"sessionId":1)")}));
-    triesAgain("the radio", kTwice, doingAll({kRadioOff, kRadioOn}));
-    triesAgain("the credential", kTwice, [](Story& story) {
-        story.order("EDIT_CREDENTIAL", ttlsData("a.example", R"("Id":1,"AutoConnect":true,"Username":"u1")"));
-    });
-    triesAgain("the adapter", kTwice, doingAll({doing("pullAdapter"), doing("insertAdapter")}));
-    triesAgain("an arrival of what is there", kTwice, doingAll({doing("insertAdapter")}));
+    triesAgain("nothing", "", {});
+    triesAgain("the session", kTwice, {doing("sessionChange", R"("eventType":8,"sessionId":1)")});
+    triesAgain("the radio", kTwice, {kRadioOff, kRadioOn});
+    triesAgain(
+        "the credential", kTwice,
+        {sending("EDIT_CREDENTIAL", ttlsData("a.example", R"("Id":1,"AutoConnect":true,"Username":"u1")"))});
+    triesAgain("the adapter", kTwice, {doing("pullAdapter"), doing("insertAdapter")});
+    triesAgain("an arrival of what is there", kTwice, {doing("insertAdapter")});
     triesAgain("a report that lacks the network, and one that has it", kTwice,
-               doingAll({on("hide", 1), kReport, on("show", 1), kReport}));
-    triesAgain("a report of the same network", "", doingAll({kReport}));
-    triesAgain("an arrival of a credential elsewhere", "", [](Story& story) {
-        story.order("ADD_CREDENTIAL", ttlsData("b.example", R"("AutoConnect":true)"));
-    });
+               {on("hide", 1), kReport, on("show", 1), kReport});
+    triesAgain("a report of the same network", "", {kReport});
+    triesAgain("an arrival of a credential elsewhere", "",
+               {sending("ADD_CREDENTIAL", ttlsData("b.example", R"("AutoConnect":true)"))});
 }
 
-TEST(AutoConnect, ARefusedRequestCostsAnAttempt) {
-    const std::string failure = R"(,"timeline":[{"atMs":0,"do":"fail","call":"WlanConnect","error":50}])";
-    EXPECT_STORY(air({kCafe}, storing({kPassword}) + failure), [](Story& story) {
-        story.advance(60s);
-        expectStanding(story, {.requests = "cafe ttls u1 = 50; cafe ttls u1"});
-        story.expectLog({"WlanConnect call failed with error code=50.", "ERROR: Connect to network failed.",
-                         "connectNetwork returns error.",
-                         "\tIncrease cred2ssid num retries: credId=1, ssid=cafe, numRetries=1",
-                         "Connection succeeded! profile name=cafe"});
-    });
+STORY(AutoConnect, ARefusedRequestCostsAnAttempt,
+      air({kCafe},
+          storing({kPassword}) + R"(,"timeline":[{"atMs":0,"do":"fail","call":"WlanConnect","error":50}])")) {
+    story.advance(60s);
+    expectStanding(story, {.requests = "cafe ttls u1 = 50; cafe ttls u1"});
+    story.expectLog({"WlanConnect call failed with error code=50.", "ERROR: Connect to network failed.",
+                     "connectNetwork returns error.",
+                     "\tIncrease cred2ssid num retries: credId=1, ssid=cafe, numRetries=1",
+                     "Connection succeeded! profile name=cafe"});
 }
 
-TEST(AutoConnect, SaysThatThereIsNoAccessWithoutANameServer) {
-    EXPECT_STORY(air({kCafe}, storing({kPassword}) + R"(,"adapters":[{"dns":[]}])"), [](Story& story) {
-        story.advance(5s);
-        expectStanding(story, {.results = "1 no access"});
-    });
+STORY(AutoConnect, SaysThatThereIsNoAccessWithoutANameServer,
+      air({kCafe}, storing({kPassword}) + R"(,"adapters":[{"dns":[]}])")) {
+    story.advance(5s);
+    expectStanding(story, {.results = "1 no access"});
 }
 
 }  // namespace

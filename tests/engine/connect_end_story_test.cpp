@@ -10,12 +10,11 @@ using std::chrono::milliseconds;
 
 const std::string kUserLeft = doing("userDisconnect", R"("ssid":"cafe")");
 constexpr const char* kBlocks = "We are going to block network with ssid=cafe\n";
-const StoredCredential kForTheHotel{.id = 2, .realm = "b.example"};
+constexpr const char* kSlow = R"(,"connectMs":2000)";
 
 /// A story that begins in the cafe, which was joined by itself; the hotel is for the user's hand.
 void inTheCafe(const std::string& what, const Tale& tale) {
-    StoredCredential byHand = kForTheHotel;
-    byHand.autoConnect = false;
+    const StoredCredential byHand{.id = 2, .realm = "b.example", .autoConnect = false};
     EXPECT_STORY(air({kCafe, kHotel}, storing({{}, byHand})), [&](Story& story) {
         story.advance(5s);
         expectStanding(story, {.connected = "cafe"});
@@ -30,7 +29,7 @@ int blocks(Story& story) {
 
 TEST(Disconnect, KeepsAutoConnectAwayUntilTheUserAsksAgain) {
     inTheCafe("", [](Story& story) {
-        disconnect(story, "cafe");
+        story.play({disconnecting("cafe")});
         expectStanding(story, {.requests = "disconnect", .eapMethod = 0, .outcomes = "networks"});
         story.advance(120s);
         expectStanding(story, {.requests = "disconnect", .connected = "-"});
@@ -42,7 +41,7 @@ TEST(Disconnect, KeepsAutoConnectAwayUntilTheUserAsksAgain) {
                          "Received Wlan disconnected event.", "Reason code desc=The user disconnected.",
                          "This network has been disconnected by user, skip auto connecting to ssid=cafe",
                          "No matching network was found based on configured credentials."});
-        connect(story, "cafe");
+        story.play({connecting("cafe")});
         story.advance(5s);
         expectStanding(story, {.connected = "cafe"});
         story.act("dropConnection");
@@ -54,7 +53,7 @@ TEST(Disconnect, KeepsAutoConnectAwayUntilTheUserAsksAgain) {
 TEST(Disconnect, OfWhatIsNotConnectedChangesNothing) {
     for (const std::string& name : {std::string("cafe\0x", 6), std::string("hotel"), std::string("caf")})
         inTheCafe(name, [&](Story& story) {
-            disconnect(story, name);
+            story.play({disconnecting(name)});
             story.advance(5s);
             expectStanding(story, {.requests = "", .connected = "cafe"});
             story.expectLog({"ERROR: Connected ssid=cafe while requesting disconnect from ssid=" +
@@ -62,27 +61,23 @@ TEST(Disconnect, OfWhatIsNotConnectedChangesNothing) {
         });
 }
 
-TEST(Disconnect, WithNothingConnectedSaysSo) {
-    EXPECT_STORY(air({kCafe}), [](Story& story) {
-        story.advance(5s);
-        disconnect(story, "cafe");
-        expectStanding(story, {.requests = ""});
-        story.expectLog({"ERROR: Cannot get connected BSS."});
-    });
+STORY(Disconnect, WithNothingConnectedSaysSo, air({kCafe})) {
+    story.advance(5s);
+    story.play({disconnecting("cafe")});
+    expectStanding(story, {.requests = ""});
+    story.expectLog({"ERROR: Cannot get connected BSS."});
 }
 
 // One result, and no next step: neither for the machine nor with another credential.
 void endsForGood(const std::vector<StoredCredential>& credentials, const std::string& request) {
-    const std::string scenario =
-        air({open(1, "cafe", both())}, storing(credentials) + R"(,"connectMs":2000)");
-    EXPECT_STORY(scenario, [&](Story& story) {
+    EXPECT_STORY(air({open(1, "cafe", both())}, storing(credentials) + kSlow), [&](Story& story) {
         story.advance(1s);
         if (!credentials[0].autoConnect) {
-            connect(story, "cafe");
+            story.play({connecting("cafe")});
             story.advance(1s);
         }
         story.hotspot().events();
-        disconnect(story, "cafe");
+        story.play({disconnecting("cafe")});
         story.advance(60s);
         expectStanding(story, {request + "; disconnect", "0 no access", "-", 0});
         story.expectLog(
@@ -97,39 +92,34 @@ TEST(Disconnect, InTheMiddleOfAnAttemptEndsItForGood) {
 }
 
 // The flag that says so is gone with the first result: the next attempt fails as any other.
-TEST(Disconnect, IsForgottenWithTheNextResult) {
-    const std::string scenario =
-        air({network(1, "cafe", tls())},
-            storing({{.isTls = true, .autoConnect = false}}) + R"(,"connectMs":2000)");
-    EXPECT_STORY(scenario, [](Story& story) {
-        story.advance(1s);
-        connect(story, "cafe");
-        story.advance(1s);
-        disconnect(story, "cafe");
-        story.advance(5s);
-        story.forget();
-        connect(story, "cafe");
-        story.advance(10s);
-        expectStanding(story, {.requests = "cafe tls ca1 machineOrUser; cafe tls ca1 machine"});
-    });
+STORY(Disconnect, IsForgottenWithTheNextResult,
+      air({network(1, "cafe", tls())}, storing({{.isTls = true, .autoConnect = false}}) + kSlow)) {
+    story.advance(1s);
+    story.play({connecting("cafe")});
+    story.advance(1s);
+    story.play({disconnecting("cafe")});
+    story.advance(5s);
+    story.forget();
+    story.play({connecting("cafe")});
+    story.advance(10s);
+    expectStanding(story, {.requests = "cafe tls ca1 machineOrUser; cafe tls ca1 machine"});
 }
 
-TEST(UserLeavesBySystem, BlocksTheNetworkThatIsConnected) {
-    EXPECT_STORY(air({kCafe, kHotel}, storing({{}, kForTheHotel})), [](Story& story) {
-        story.advance(5s);
-        expectStanding(story, {.connected = "cafe"});
-        story.perform(kUserLeft);
-        story.act("dropConnection", R"("reason":163842)");
-        story.advance(60s);
-        expectStanding(story, {.connected = "hotel"});
-    });
+STORY(UserLeavesBySystem, BlocksTheNetworkThatIsConnected,
+      air({kCafe, kHotel}, storing({{}, {.id = 2, .realm = "b.example"}}))) {
+    story.advance(5s);
+    expectStanding(story, {.connected = "cafe"});
+    story.play({kUserLeft, doing("dropConnection", R"("reason":163842)")});
+    story.advance(60s);
+    expectStanding(story, {.connected = "hotel"});
 }
 
-/// Something came before the report, which is no act of the user against the network then.
-void blocksNothing(const char* what, const std::string& report, std::vector<std::string> lines,
-                   const Tale& before) {
-    inTheCafe(what, [&](Story& story) {
-        before(story);
+/// What came a second before the report, which is no act of the user against the network then.
+void blocksNothing(const std::vector<std::string>& before, const std::string& report,
+                   std::vector<std::string> lines) {
+    inTheCafe(lines.back(), [&](Story& story) {
+        story.play(before);
+        story.advance(1s);
         story.forget();
         story.perform(report);
         lines.insert(lines.begin(),
@@ -140,53 +130,35 @@ void blocksNothing(const char* what, const std::string& report, std::vector<std:
 }
 
 TEST(UserLeavesBySystem, BlocksNothingThatMayBeASideEffect) {
-    blocksNothing("the session is away", kUserLeft,
-                  {"Current session is not active, don't update the blocked network list."},
-                  [](Story& story) { story.act("setSession", R"("session":"disconnected")"); });
-    blocksNothing("the radio is off", kUserLeft, {"Radio turned off, don't update the blocked network list."},
-                  [](Story& story) { story.perform(kRadioOff); });
-    blocksNothing("the function is off", kUserLeft,
-                  {"HS20 not enabled, don't update the blocked network list."},
-                  [](Story& story) { switchHs20(story, false); });
-    blocksNothing("another network is being joined by hand", kUserLeft,
+    const std::string slow = doing("set", R"("connectMs":5000)");
+    blocksNothing({doing("setSession", R"("session":"disconnected")")}, kUserLeft,
+                  {"Current session is not active, don't update the blocked network list."});
+    blocksNothing({kRadioOff}, kUserLeft, {"Radio turned off, don't update the blocked network list."});
+    blocksNothing({kHs20Off}, kUserLeft, {"HS20 not enabled, don't update the blocked network list."});
+    blocksNothing({slow, connecting("hotel")}, kUserLeft,
                   {"Manually connect to HS20 network started, this network maybe disconnected for we are "
-                   "going to connect another network."},
-                  [](Story& story) {
-                      story.act("set", R"("connectMs":5000)");
-                      connect(story, "hotel");
-                      story.advance(1s);
-                  });
-    blocksNothing("the system is joining another", kUserLeft,
+                   "going to connect another network."});
+    blocksNothing({slow, doing("osConnect", R"("ssid":"home")")}, kUserLeft,
                   {"Connection started by OS, HS20 network may be disconected,we should not block any HS20 "
-                   "network from auto connecting in this case."},
-                  [](Story& story) {
-                      story.act("set", R"("connectMs":5000)");
-                      story.act("osConnect", R"("ssid":"home")");
-                      story.advance(1s);
-                  });
+                   "network from auto connecting in this case."});
 }
 
 TEST(UserLeavesBySystem, BlocksNothingForAnotherNetwork) {
-    const Tale nothing = [](Story&) {};
     const std::string checks = "Check if the active connection is the connection to be disconnected.";
-    blocksNothing("a hotel", doing("userDisconnect", R"("ssid":"hotel")"),
-                  {"Connection still in active.", checks,
-                   "Windows disconnected network with ssid=hotel while the active connection with ssid=cafe"},
-                  nothing);
-    blocksNothing("no hotspot", doing("userDisconnect", R"("ssid":"cafe","isHs20":0)"),
-                  {checks, "ERROR: Not a HS20 network."}, nothing);
-    blocksNothing("an SSID too long",
-                  moduleMessage(5, bssRecord("02aa00000001", "cafe" + std::string(30, 'x'))), {checks},
-                  nothing);
+    blocksNothing(
+        {}, doing("userDisconnect", R"("ssid":"hotel")"),
+        {"Connection still in active.", checks,
+         "Windows disconnected network with ssid=hotel while the active connection with ssid=cafe"});
+    blocksNothing({}, doing("userDisconnect", R"("ssid":"cafe","isHs20":0)"),
+                  {checks, "ERROR: Not a HS20 network."});
+    blocksNothing({}, moduleMessage(5, bssRecord("02aa00000001", "cafe" + std::string(30, 'x'))), {checks});
 }
 
-TEST(UserLeavesBySystem, BlocksNothingBeforeTheFirstConnection) {
-    EXPECT_STORY(air({kCafe}), [](Story& story) {
-        story.advance(5s);
-        story.perform(kUserLeft);
-        story.expectLog({"No last connection history."});
-        story.expect("blocks", blocks(story), 0);
-    });
+STORY(UserLeavesBySystem, BlocksNothingBeforeTheFirstConnection, air({kCafe})) {
+    story.advance(5s);
+    story.perform(kUserLeft);
+    story.expectLog({"No last connection history."});
+    story.expect("blocks", blocks(story), 0);
 }
 
 // The network is hidden, so that its connection ends and no new one comes of it.
@@ -204,9 +176,9 @@ TEST(UserLeavesBySystem, BlocksUpToASecondAfterTheEndOfTheConnection) {
 TEST(UserLeavesBySystem, BlocksFromTwoSecondsAfterTheFunctionWasSwitched) {
     for (const int pause : {500, 1999, 2000, 2001})
         inTheCafe(std::to_string(pause), [&](Story& story) {
-            switchHs20(story, false);
+            story.play({kHs20Off});
             story.advance(5s);
-            switchHs20(story, true);
+            story.play({kHs20On});
             story.advance(milliseconds(pause));
             expectStanding(story, {.connected = "cafe"});
             story.perform(kUserLeft);
@@ -220,22 +192,19 @@ TEST(UserLeavesBySystem, BlocksFromTwoSecondsAfterTheFunctionWasSwitched) {
 }
 
 // Also on a clock that was set back since: the switch seems to lie ahead, but there was none.
-TEST(UserLeavesBySystem, BlocksRightAfterTheStart) {
-    EXPECT_STORY(air({kCafe}, storing({{}})), [](Story& story) {
-        story.advance(300ms);
-        expectStanding(story, {.connected = "cafe"});
-        story.perform(kUserLeft);
-        story.expect("blocks", blocks(story), 1);
-    });
+STORY(UserLeavesBySystem, BlocksRightAfterTheStart, air({kCafe}, storing({{}}))) {
+    story.advance(300ms);
+    expectStanding(story, {.connected = "cafe"});
+    story.perform(kUserLeft);
+    story.expect("blocks", blocks(story), 1);
 }
 
 void changesSession(bool isByClient, int pause, const char* connected, const char* line) {
     inTheCafe(std::to_string(pause) + line, [&](Story& story) {
         if (isByClient) {
-            disconnect(story, "cafe");
+            story.play({disconnecting("cafe")});
         } else {
-            story.perform(kUserLeft);
-            story.act("dropConnection");
+            story.play({kUserLeft, doing("dropConnection")});
         }
         story.advance(milliseconds(pause));
         story.act("sessionChange", R"("eventType":7,"sessionId":3)");
@@ -307,48 +276,38 @@ TEST(Unblocking, ByTheSystemsOwnConnectionTakesWhatIsFresh) {
 }
 
 // What opens a network that the user has left by the client, or doesn't.
-void opens(const char* what, const char* connected, const Tale& change) {
-    const std::string scenario =
-        air({open(1, "cafe", both())}, storing({{}, {.id = 2, .autoConnect = false}}));
-    EXPECT_STORY(scenario, [&](Story& story) {
+void opens(const char* what, const char* connected, const std::vector<std::string>& deeds) {
+    const StoredCredential byHand{.id = 2, .autoConnect = false};
+    EXPECT_STORY(air({open(1, "cafe", both())}, storing({{}, byHand})), [&](Story& story) {
         story.advance(5s);
-        disconnect(story, "cafe");
+        story.play({disconnecting("cafe")});
         story.advance(5s);
-        change(story);
+        story.play(deeds);
         story.advance(60s);
         expectStanding(story, {.connected = connected});
     }) << what;
 }
 
-Tale adding(const std::string& realm, const std::string& autoConnect) {
-    return [=](Story& story) {
-        story.order("ADD_CREDENTIAL", tlsData(realm, R"("AutoConnect":)" + autoConnect));
-    };
+std::string addingCredential(const std::string& realm, const std::string& autoConnect) {
+    return sending("ADD_CREDENTIAL", tlsData(realm, R"("AutoConnect":)" + autoConnect));
 }
 
-Tale letting(int id) {
+std::string lettingConnect(int id) {
     const std::string members = R"("AutoConnect":true,"Id":)" + std::to_string(id);
-    return [=](Story& story) { story.order("EDIT_CREDENTIAL", ttlsData("a.example", members)); };
+    return sending("EDIT_CREDENTIAL", ttlsData("a.example", members));
 }
 
 TEST(Unblocking, ByTheRightCredentialOrAFreshStartAlone) {
-    opens("nothing", "-", [](Story&) {});
-    opens("a credential that fits", "cafe", adding("a.example", "true"));
-    opens("a credential for another realm", "-", adding("b.example", "true"));
-    opens("a credential for the user's hand", "-", adding("a.example", "false"));
-    opens("one that may connect now and might not before", "cafe", letting(2));
-    opens("one that may connect now and might before", "-", letting(1));
-    opens("the radio", "cafe", [](Story& story) {
-        story.perform(kRadioOff);
-        story.perform(kRadioOn);
-    });
-    opens("an arrival of the adapter", "cafe", [](Story& story) { story.act("insertAdapter"); });
-    opens("the function off and on", "-", [](Story& story) {
-        switchHs20(story, false);
-        switchHs20(story, true);
-    });
-    opens("a session change", "-",
-          [](Story& story) { story.act("sessionChange", R"("eventType":8,"sessionId":1)"); });
+    opens("nothing", "-", {});
+    opens("a credential that fits", "cafe", {addingCredential("a.example", "true")});
+    opens("a credential for another realm", "-", {addingCredential("b.example", "true")});
+    opens("a credential for the user's hand", "-", {addingCredential("a.example", "false")});
+    opens("one that may connect now and might not before", "cafe", {lettingConnect(2)});
+    opens("one that may connect now and might before", "-", {lettingConnect(1)});
+    opens("the radio", "cafe", {kRadioOff, kRadioOn});
+    opens("an arrival of the adapter", "cafe", {doing("insertAdapter")});
+    opens("the function off and on", "-", {kHs20Off, kHs20On});
+    opens("a session change", "-", {doing("sessionChange", R"("eventType":8,"sessionId":1)")});
 }
 
 }  // namespace

@@ -12,24 +12,24 @@ StoredCredential byHand(int id, bool isTls = false, const std::string& realm = "
     return {.id = id, .realm = realm, .isTls = isTls, .autoConnect = false};
 }
 
-/// A story that begins when the service has come to rest with these networks and credentials.
-void atRest(const std::string& what, const std::vector<std::string>& networks,
-            const std::vector<StoredCredential>& credentials, const Tale& tale) {
-    EXPECT_STORY(air(networks, storing(credentials)), [&](Story& story) {
-        story.advance(6s);
-        story.forget();
-        tale(story);
-    }) << what;
+const std::string kOne = air({kCafe}, storing({byHand(1)}));
+const std::string kSlow = doing("set", R"("connectMs":5000)");
+
+/// A story begins when the service has come to rest.
+void rest(Story& story) {
+    story.advance(6s);
+    story.forget();
 }
 
 /// The user asks for a network by its name.
 void asksFor(const std::string& what, const std::string& name, const std::vector<std::string>& networks,
              const std::vector<StoredCredential>& credentials, const Standing& end) {
-    atRest(what, networks, credentials, [&](Story& story) {
-        connect(story, name);
+    EXPECT_STORY(air(networks, storing(credentials)), [&](Story& story) {
+        rest(story);
+        story.play({connecting(name)});
         story.advance(5s);
         expectStanding(story, end);
-    });
+    }) << what;
 }
 
 TEST(ManualConnect, TriesWhatFitsInOrderAndTellsOneResult) {
@@ -71,135 +71,109 @@ TEST(ManualConnect, LeavesToTheSystemWhatNoCredentialFits) {
             {byHand(1)}, {"plain caf", "", "-", 0});
 }
 
-TEST(ManualConnect, TellsInTheLogHowItWalksThroughTheCredentials) {
-    atRest("", {network(1, "cafe", both())}, {byHand(1), byHand(2, true), byHand(3)}, [](Story& story) {
-        connect(story, "cafe");
-        story.advance(5s);
-        story.expectLog(
-            {"###Manually connect to a BSS started.###",
-             "###We are actually going to connect to HS20 network now.###",
-             "Unblocked network with ssid=cafe and mac address=02:aa:00:00:00:01 due to user has manually "
-             "connected to it.",
-             "Try to connect to HS20 network using next credential.",
-             "Selecting credential with id=1",
-             "Adding a new EAP-TTLS network profile...",
-             "Connection start event: connection initiated by HS20, profile name=cafe",
-             "Manual connection started.",
-             "Connection failed! profile name=cafe",
-             "Manual connection failed, we will try to use next credential.",
-             "Try to connect to HS20 network using next credential.",
-             "We have tried credential with id=1, skipping...",
-             "Selecting credential with id=2",
-             "Adding a new EAP-TLS network profile with auth mode=machineOrUser...",
-             "connResult=1 after invoking tryConnectHs20BssUsingNextCredential.",
-             "Successfully initiated connection to HS20 network=cafe using next credential.",
-             "Connection using EAP-TLS with authMode=machineOrUser failed,trying to use EAP-TLS with "
-             "authMode=machine.",
-             "Manual connection failed, we will try to use next credential.",
-             "Selecting credential with id=3",
-             "Manual connection failed, we will try to use next credential.",
-             "We have tried credential with id=1, skipping...",
-             "We have tried credential with id=2, skipping...",
-             "We have tried credential with id=3, skipping...",
-             "connResult=2 after invoking tryConnectHs20BssUsingNextCredential.",
-             "We have tried all credentials, connection failed.",
-             "Reason code desc=The user name or password is not correct, or the certificate wa",
-             "Send connection result to vexa."});
-    });
+STORY(ManualConnect, TellsInTheLogHowItWalksThroughTheCredentials,
+      air({network(1, "cafe", both())}, storing({byHand(1), byHand(2, true), byHand(3)}))) {
+    rest(story);
+    story.play({connecting("cafe")});
+    story.advance(5s);
+    story.expectLog(
+        {"###Manually connect to a BSS started.###",
+         "###We are actually going to connect to HS20 network now.###",
+         "Unblocked network with ssid=cafe and mac address=02:aa:00:00:00:01 due to user has manually "
+         "connected to it.",
+         "Try to connect to HS20 network using next credential.",
+         "Selecting credential with id=1",
+         "Adding a new EAP-TTLS network profile...",
+         "Connection start event: connection initiated by HS20, profile name=cafe",
+         "Manual connection started.",
+         "Connection failed! profile name=cafe",
+         "Manual connection failed, we will try to use next credential.",
+         "Try to connect to HS20 network using next credential.",
+         "We have tried credential with id=1, skipping...",
+         "Selecting credential with id=2",
+         "Adding a new EAP-TLS network profile with auth mode=machineOrUser...",
+         "connResult=1 after invoking tryConnectHs20BssUsingNextCredential.",
+         "Successfully initiated connection to HS20 network=cafe using next credential.",
+         "Connection using EAP-TLS with authMode=machineOrUser failed,trying to use EAP-TLS with "
+         "authMode=machine.",
+         "Manual connection failed, we will try to use next credential.",
+         "Selecting credential with id=3",
+         "Manual connection failed, we will try to use next credential.",
+         "We have tried credential with id=1, skipping...",
+         "We have tried credential with id=2, skipping...",
+         "We have tried credential with id=3, skipping...",
+         "connResult=2 after invoking tryConnectHs20BssUsingNextCredential.",
+         "We have tried all credentials, connection failed.",
+         "Reason code desc=The user name or password is not correct, or the certificate wa",
+         "Send connection result to vexa."});
 }
 
-TEST(ManualConnect, TakesTheSameWalkTwice) {
-    atRest("", {network(1, "cafe", ttls())}, {byHand(1), byHand(2)}, [](Story& story) {
-        for (int i = 0; i < 2; ++i) {
-            connect(story, "cafe");
-            story.advance(5s);
-        }
-        expectStanding(story, {.requests = "cafe ttls u1; cafe ttls u2; cafe ttls u1; cafe ttls u2"});
-    });
+STORY(ManualConnect, ARefusedRequestIsToldAtOnce, kOne) {
+    rest(story);
+    story.play({failing("WlanConnect", 50), connecting("cafe")});
+    expectStanding(story, {.requests = "cafe ttls u1 = 50", .outcomes = "0"});
+    story.expectLog({"WlanConnect call failed with error code=50.", "Try to connect to HS20 network failed.",
+                     "connectBss failed."});
 }
 
-TEST(ManualConnect, LeavesTheRetriesOfAutoConnectAlone) {
-    atRest("", {network(1, "cafe", ttls())}, {{}}, [](Story& story) {
-        story.advance(24s);
-        story.forget();
-        connect(story, "cafe");
-        story.advance(60s);
-        expectStanding(story, {.requests = "cafe ttls u1"});
-    });
-}
-
-TEST(ManualConnect, ARefusedRequestIsToldAtOnce) {
-    atRest("", {kCafe}, {byHand(1)}, [](Story& story) {
-        story.perform(failing("WlanConnect", 50));
-        connect(story, "cafe");
-        expectStanding(story, {.requests = "cafe ttls u1 = 50", .outcomes = "0"});
-        story.expectLog({"WlanConnect call failed with error code=50.",
-                         "Try to connect to HS20 network failed.", "connectBss failed."});
-    });
-}
-
-TEST(ManualConnect, ANextCredentialThatCanNotStartEndsWithoutAWord) {
-    atRest("", {network(1, "cafe", ttls())}, {byHand(1), byHand(2)}, [](Story& story) {
-        story.perform(failing("WlanConnect", 50, R"("skip":1)"));
-        connect(story, "cafe");
-        story.advance(5s);
-        expectStanding(story, {.requests = "cafe ttls u1; cafe ttls u2 = 50", .outcomes = ""});
-        story.expectLog({"connResult=0 after invoking tryConnectHs20BssUsingNextCredential.",
-                         "ERROR: Try to connect to HS20 network using next credential failed."});
-    });
+STORY(ManualConnect, ANextCredentialThatCanNotStartEndsWithoutAWord,
+      air({network(1, "cafe", ttls())}, storing({byHand(1), byHand(2)}))) {
+    rest(story);
+    story.play({failing("WlanConnect", 50, R"("skip":1)"), connecting("cafe")});
+    story.advance(5s);
+    expectStanding(story, {.requests = "cafe ttls u1; cafe ttls u2 = 50", .outcomes = ""});
+    story.expectLog({"connResult=0 after invoking tryConnectHs20BssUsingNextCredential.",
+                     "ERROR: Try to connect to HS20 network using next credential failed."});
 }
 
 // The system's own connections carry nothing of this program, whatever their outcome.
-TEST(ForeignConnection, IsToldAsASuccessWhateverItsOutcome) {
-    for (const bool succeeds : {true, false})
-        atRest(succeeds ? "success" : "failure", {kCafe}, {byHand(1)}, [&](Story& story) {
-            story.act("osConnect",
-                      std::string(R"("ssid":"home","succeeds":)") + (succeeds ? "true" : "false"));
-            story.advance(1s);
-            expectStanding(story,
-                           {.connected = succeeds ? "home" : "-", .eapMethod = 0, .outcomes = "1 no access"});
-            story.expectLog(
-                {"Connection start event: connection not initiated by HS20, profile name=home",
-                 std::string("Connection result not initiated by HS20, profile name=home, result=") +
-                     (succeeds ? "Success" : "Failure"),
-                 "Send connection result to vexa."});
-            story.expect("results without a start",
-                         count(story.messages(), "m_bConnectionStartedByOs is not set"), 0);
-        });
+void isForeign(const std::string& succeeds, const std::string& result, const std::string& connected) {
+    EXPECT_STORY(kOne, [&](Story& story) {
+        rest(story);
+        story.act("osConnect", R"("ssid":"home","succeeds":)" + succeeds);
+        story.advance(1s);
+        expectStanding(story, {.connected = connected, .eapMethod = 0, .outcomes = "1 no access"});
+        story.expectLog({"Connection start event: connection not initiated by HS20, profile name=home",
+                         "Connection result not initiated by HS20, profile name=home, result=" + result,
+                         "Send connection result to vexa."});
+        story.expect("results without a start",
+                     count(story.messages(), "m_bConnectionStartedByOs is not set"), 0);
+    });
 }
 
-TEST(ForeignConnection, ThatDisplacesOursEndsItAndIsToldApart) {
-    atRest("", {kCafe}, {byHand(1)}, [](Story& story) {
-        story.act("set", R"("connectMs":2000)");
-        connect(story, "cafe");
-        story.advance(500ms);
-        story.act("osConnect", R"("ssid":"home")");
-        story.advance(5s);
-        expectStanding(story, {.connected = "home", .eapMethod = 0, .outcomes = "0 no access 1 no access"});
-    });
+TEST(ForeignConnection, IsToldAsASuccessWhateverItsOutcome) {
+    isForeign("true", "Success", "home");
+    isForeign("false", "Failure", "-");
+}
+
+STORY(ForeignConnection, ThatDisplacesOursEndsItAndIsToldApart, kOne) {
+    rest(story);
+    story.play({kSlow, connecting("cafe")});
+    story.advance(500ms);
+    story.act("osConnect", R"("ssid":"home")");
+    story.advance(8s);
+    expectStanding(story, {.connected = "home", .eapMethod = 0, .outcomes = "0 no access 1 no access"});
 }
 
 // The result of another network whose name begins like the one asked for counts as its own.
-TEST(ForeignConnection, ALongerNameWithTheSameBeginningCountsAsOwn) {
-    atRest("", {kCafe, network(2, "cafeteria", ttls("x.example"))}, {byHand(1)}, [](Story& story) {
-        story.act("set", R"("connectMs":5000)");
-        connect(story, "cafe");
-        story.advance(1s);
-        story.act("connection", R"("code":10,"profileName":"cafe","ssidHex":"636166657465726961")");
-        expectStanding(story, {.eapMethod = 2, .outcomes = "1 no access"});
-        story.expectLog({"Connection result initiated by HS20, clearing the cache, profile name=cafe.",
-                         "Connection succeeded! profile name=cafe"});
-    });
+STORY(ForeignConnection, ALongerNameWithTheSameBeginningCountsAsOwn,
+      air({kCafe, network(2, "cafeteria", ttls("x.example"))}, storing({byHand(1)}))) {
+    rest(story);
+    story.play({kSlow, connecting("cafe")});
+    story.advance(1s);
+    story.act("connection", R"("code":10,"profileName":"cafe","ssidHex":"636166657465726961")");
+    expectStanding(story, {.eapMethod = 2, .outcomes = "1 no access"});
+    story.expectLog({"Connection result initiated by HS20, clearing the cache, profile name=cafe.",
+                     "Connection succeeded! profile name=cafe"});
 }
 
 void endsWithItsLine(const std::string& result, const char* line) {
-    atRest(line, {kCafe}, {byHand(1)}, [&](Story& story) {
-        story.act("set", R"("connectMs":5000)");
-        connect(story, "cafe");
-        story.perform(result);
+    EXPECT_STORY(kOne, [&](Story& story) {
+        rest(story);
+        story.play({kSlow, connecting("cafe"), result});
         expectStanding(story, {.eapMethod = 0, .outcomes = ""});
         story.expectLog({line});
-    });
+    }) << line;
 }
 
 TEST(ConnectionResult, WithoutAProfileOrDataEndsWithItsLineAlone) {
@@ -219,8 +193,7 @@ void waits(const char* what, const char* accepts, const std::vector<std::string>
     EXPECT_STORY(scenario, [&](Story& story) {
         story.advance(500ms);
         story.hotspot().events();
-        for (const std::string& name : asked)
-            connect(story, name);
+        story.play(asked);
         story.advance(8s);
         expectStanding(story, end);
         story.expectLog(
@@ -236,11 +209,11 @@ void waits(const char* what, const char* accepts, const std::vector<std::string>
 TEST(PendingRequest, RunsWhenTheRunningAttemptHasEndedAndIsAllThatTheClientHears) {
     const char* const all = R"({"eapMethod":21})";
     const Standing inTheHotel{"cafe ttls u1; hotel ttls u2", "1 access", "hotel"};
-    waits("after a success", all, {"hotel"}, inTheHotel);
-    waits("after a failure", "", {"hotel"}, inTheHotel);
-    waits("the last of two", "", {"cafe", "hotel"}, inTheHotel);
-    waits("one that is in no list", all, {"motel"}, {"cafe ttls u1", "0", "cafe"});
-    waits("the network that is just being joined", all, {"cafe"},
+    waits("after a success", all, {connecting("hotel")}, inTheHotel);
+    waits("after a failure", "", {connecting("hotel")}, inTheHotel);
+    waits("the last of two", "", {connecting("cafe"), connecting("hotel")}, inTheHotel);
+    waits("one that is in no list", all, {connecting("motel")}, {"cafe ttls u1", "0", "cafe"});
+    waits("the network that is just being joined", all, {connecting("cafe")},
           {"cafe ttls u1; cafe ttls u1", "1 access", "cafe"});
 }
 

@@ -9,63 +9,51 @@ using namespace std::chrono_literals;
 
 constexpr const char* kSlow = R"(,"connectMs":2000)";
 
+const std::string kDeletion = sending("DELETE_CREDENTIAL", R"({"Id":1})");
+
 /// Something comes over an attempt of auto-connect one second before its result.
-void comesBetween(const char* what, const Standing& end, const Tale& change, bool isLetIn = true) {
-    const std::string network = isLetIn ? open(1, "cafe", tls()) : test::network(1, "cafe", tls());
-    EXPECT_STORY(air({network}, storing({{.isTls = true}}) + kSlow), [&](Story& story) {
+void comesBetween(const std::string& what, const Standing& end, const std::vector<std::string>& deeds,
+                  const std::string& cafe = open(1, "cafe", tls())) {
+    EXPECT_STORY(air({cafe}, storing({{.isTls = true}}) + kSlow), [&](Story& story) {
         story.advance(1s);
         story.forget();
-        change(story);
+        story.play(deeds);
         story.advance(60s);
         expectStanding(story, end);
     }) << what;
 }
 
-void deleteCredential(Story& story) {
-    story.order("DELETE_CREDENTIAL", R"({"Id":1})");
-}
-
 TEST(Midway, EndsAsItShould) {
-    comesBetween("the radio goes off", {"", "1 no access", "-"},
-                 [](Story& story) { story.perform(kRadioOff); });
+    const std::string pull = doing("pullAdapter");
+    const std::string insert = doing("insertAdapter");
+    comesBetween("the radio goes off", {"", "1 no access", "-"}, {kRadioOff});
     comesBetween("the radio goes off and on", {"cafe tls ca1 machineOrUser", "1 no access 1 access", "cafe"},
-                 [](Story& story) {
-                     story.perform(kRadioOff);
-                     story.perform(kRadioOn);
-                 });
+                 {kRadioOff, kRadioOn});
     comesBetween("the adapter is pulled: there is nothing to ask for the machine's turn",
-                 {"cafe tls ca1 machine = 1168", "", "-"}, [](Story& story) { story.act("pullAdapter"); });
+                 {"cafe tls ca1 machine = 1168", "", "-"}, {pull});
     comesBetween("the adapter is pulled and comes back",
                  {"cafe tls ca1 machine = 1168; cafe tls ca1 machineOrUser", "1 access", "cafe"},
-                 [](Story& story) {
-                     story.act("pullAdapter");
-                     story.act("insertAdapter");
-                 });
-    comesBetween("the credential is deleted, and its network lets it in", {"", "", "cafe"}, deleteCredential);
-    comesBetween("the credential is deleted, and its network doesn't let it in", {"", "", "-"},
-                 deleteCredential, false);
+                 {pull, insert});
+    comesBetween("the credential is deleted, and its network lets it in", {"", "", "cafe"}, {kDeletion});
+    comesBetween("the credential is deleted, and its network doesn't let it in", {"", "", "-"}, {kDeletion},
+                 network(1, "cafe", tls()));
     const Standing failure{"cafe tls ca1 machine", "0 no access", "-"};
-    comesBetween("the network goes, but not from the list", failure,
-                 [](Story& story) { story.perform(on("hide", 1)); });
-    comesBetween("the network goes from the list too", failure, [](Story& story) {
-        story.perform(on("hide", 1));
-        story.perform(kReport);
-    });
+    comesBetween("the network goes, but not from the list", failure, {on("hide", 1)});
+    comesBetween("the network goes from the list too", failure, {on("hide", 1), kReport});
     comesBetween("the adapter arrives once more: the result is the system's now", {"", "1 access", "cafe"},
-                 [](Story& story) { story.act("insertAdapter"); });
+                 {insert});
 }
 
-TEST(Midway, ADeletedCredentialTakesItsProfileWithItAndEndsTheAttemptWithoutAWord) {
-    EXPECT_STORY(air({kCafe}, storing({{}}) + kSlow), [](Story& story) {
-        story.advance(1s);
-        deleteCredential(story);
-        story.advance(5s);
-        story.expectLog({"Deleting the credential with id=1", "removeAllCredNumRetryEntries for CredId=1",
-                         "Cred id=1 deleted, removing profile name=cafe",
-                         "Connection result initiated by HS20, clearing the cache, profile name=cafe.",
-                         "ERROR: Cannot get profile in profile manager."});
-        expectStanding(story, {.eapMethod = 0});
-    });
+STORY(Midway, ADeletedCredentialTakesItsProfileWithItAndEndsTheAttemptWithoutAWord,
+      air({kCafe}, storing({{}}) + kSlow)) {
+    story.advance(1s);
+    story.play({kDeletion});
+    story.advance(5s);
+    story.expectLog({"Deleting the credential with id=1", "removeAllCredNumRetryEntries for CredId=1",
+                     "Cred id=1 deleted, removing profile name=cafe",
+                     "Connection result initiated by HS20, clearing the cache, profile name=cafe.",
+                     "ERROR: Cannot get profile in profile manager."});
+    expectStanding(story, {.eapMethod = 0});
 }
 
 // The attempt that runs keeps what it was begun with; the next one builds its profile anew.
@@ -84,112 +72,100 @@ TEST(Midway, AnEditedCredentialIsTriedAfreshWithWhatItHoldsNow) {
     });
 }
 
-TEST(Midway, AnArrivalOfAnAdapterThatIsThereForgetsWhatWasUnderWay) {
-    const std::string scenario =
-        air({kCafe, kHotel}, storing({{}, {.id = 2, .realm = "b.example", .autoConnect = false}}) + kSlow);
-    EXPECT_STORY(scenario, [](Story& story) {
-        story.advance(1s);
-        connect(story, "hotel");
-        story.hotspot().events();
-        story.act("insertAdapter");
-        story.advance(60s);
-        expectStanding(story, {"cafe ttls u1", "1 access", "cafe"});
-        story.expect("pending requests", count(story.messages(), "User manual connecting request pending"),
-                     0);
-    });
+STORY(Midway, AnArrivalOfAnAdapterThatIsThereForgetsWhatWasUnderWay,
+      air({kCafe, kHotel}, storing({{}, {.id = 2, .realm = "b.example", .autoConnect = false}}) + kSlow)) {
+    story.advance(1s);
+    story.play({connecting("hotel")});
+    story.hotspot().events();
+    story.act("insertAdapter");
+    story.advance(60s);
+    expectStanding(story, {"cafe ttls u1", "1 access", "cafe"});
+    story.expect("pending requests", count(story.messages(), "User manual connecting request pending"), 0);
 }
 
-/// A story about a realm update or the hotspot switch, which begins when all has come to rest.
-void atRest(const std::string& scenario, const Tale& tale) {
-    EXPECT_STORY(scenario, [&](Story& story) {
-        story.advance(15s);
-        story.forget();
-        tale(story);
-    });
+/// The thread sleeps for ten seconds behind the start.
+void awake(Story& story) {
+    story.advance(15s);
+    story.forget();
 }
 
-TEST(RealmUpdate, LetsGoOfTheConnectionAsksAnewAndComesBack) {
-    atRest(air({kCafe}, storing({{}}) + R"(,"anqpMs":1000)"), [](Story& story) {
-        story.order("UPDATE_NETWORK_REALM");
-        expectStanding(story, {.requests = "disconnect", .eapMethod = 0, .outcomes = ""});
-        story.expect("queries", moduleRequests(story, 3), 1);
-        story.advance(30s);
-        expectStanding(story, {.connected = "cafe", .outcomes = "networks 1 access"});
-        story.expectLog({"UI requested to update HS20 network realm.",
-                         "Disconnecting from connecting/connected BSS...",
-                         "Manually disconnect from a HS20 network.", "Received Wlan disconnected event.",
-                         "We are querying the HS20 network ANQP info, wait."});
-    });
+STORY(RealmUpdate, LetsGoOfTheConnectionAsksAnewAndComesBack,
+      air({kCafe}, storing({{}}) + R"(,"anqpMs":1000)")) {
+    awake(story);
+    story.order("UPDATE_NETWORK_REALM");
+    expectStanding(story, {.requests = "disconnect", .eapMethod = 0, .outcomes = ""});
+    story.expect("queries", moduleRequests(story, 3), 1);
+    story.advance(30s);
+    expectStanding(story, {.connected = "cafe", .outcomes = "networks 1 access"});
+    story.expectLog({"UI requested to update HS20 network realm.",
+                     "Disconnecting from connecting/connected BSS...",
+                     "Manually disconnect from a HS20 network.", "Received Wlan disconnected event.",
+                     "We are querying the HS20 network ANQP info, wait."});
 }
 
-TEST(RealmUpdate, OfAConnectionThatIsNoHotspotLetsGoOfItToo) {
-    atRest(air({network(1, "cafe", ttls())}), [](Story& story) {
-        story.act("osConnect", R"("ssid":"home")");
-        story.advance(5s);
-        story.order("UPDATE_NETWORK_REALM");
-        expectStanding(story, {.requests = "disconnect"});
-        story.expect("queries", moduleRequests(story, 3), 1);
-        story.expectLog({"Manually disconnect from a non-HS20 network."});
-    });
+STORY(RealmUpdate, OfAConnectionThatIsNoHotspotLetsGoOfItToo, air({network(1, "cafe", ttls())})) {
+    awake(story);
+    story.act("osConnect", R"("ssid":"home")");
+    story.advance(5s);
+    story.order("UPDATE_NETWORK_REALM");
+    expectStanding(story, {.requests = "disconnect"});
+    story.expect("queries", moduleRequests(story, 3), 1);
+    story.expectLog({"Manually disconnect from a non-HS20 network."});
 }
 
-TEST(RealmUpdate, AsksAtOnceWhileNothingIsConnected) {
-    atRest(air({network(1, "A", R"("anqp":"onQuery",)" + ttls())}), [](Story& story) {
-        story.order("UPDATE_NETWORK_REALM");
-        story.expect("queries", moduleRequests(story, 3), 1);
-        story.expect("heard before the answer", heard(story), "");
-        story.advance(200ms);
-        story.expect("heard", heard(story), "networks A[a.example TTLS]");
-    });
+STORY(RealmUpdate, AsksAtOnceWhileNothingIsConnected,
+      air({network(1, "A", R"("anqp":"onQuery",)" + ttls())})) {
+    awake(story);
+    story.order("UPDATE_NETWORK_REALM");
+    story.expect("queries", moduleRequests(story, 3), 1);
+    story.expect("heard before the answer", heard(story), "");
+    story.advance(200ms);
+    story.expect("heard", heard(story), "networks A[a.example TTLS]");
 }
 
-TEST(RealmUpdate, DoesNothingWithoutAnAdapter) {
-    atRest(air({network(1, "A")}), [](Story& story) {
-        story.act("pullAdapter");
-        story.forget();
-        story.order("UPDATE_NETWORK_REALM");
-        story.expect("log", story.messages(), "UI requested to update HS20 network realm.\n");
-        story.expect("calls", story.perform(R"({"query":"calls"})").size(), 0U);
-    });
+STORY(RealmUpdate, DoesNothingWithoutAnAdapter, air({network(1, "A")})) {
+    awake(story);
+    story.act("pullAdapter");
+    story.forget();
+    story.order("UPDATE_NETWORK_REALM");
+    story.expect("log", story.messages(), "UI requested to update HS20 network realm.\n");
+    story.expect("calls", story.perform(R"({"query":"calls"})").size(), 0U);
 }
 
-TEST(HotspotSwitch, OffWhileConnectedLeavesTheNetworkWithoutBlockingIt) {
-    atRest(air({kCafe}, storing({{}})), [](Story& story) {
-        switchHs20(story, false);
-        expectStanding(story, {.requests = "disconnect", .outcomes = "networks hs20 false networks"});
-        story.advance(30s);
-        expectStanding(story, {.connected = "-"});
-        switchHs20(story, true);
-        expectStanding(story, {.outcomes = "networks hs20 true"});
-        story.advance(5s);
-        expectStanding(story, {.connected = "cafe", .outcomes = "1 access"});
-        story.expectLog({"Set enable/disable HS20, param=false", "Enter resetAllNumRetries.",
-                         "Send all HS20 networks to vexa.",
-                         "STA is in connected state when user turns of HS20,trying to disconnect from any "
-                         "connected HS20 network.",
-                         "Disconnecting from connecting/connected BSS...",
-                         "Manually disconnect from a HS20 network.",
-                         "HS20 functionality not enabled, wait for user turning it on.",
-                         "Enable/disable HS20 event signaled."});
-    });
+STORY(HotspotSwitch, OffWhileConnectedLeavesTheNetworkWithoutBlockingIt, air({kCafe}, storing({{}}))) {
+    awake(story);
+    story.play({kHs20Off});
+    expectStanding(story, {.requests = "disconnect", .outcomes = "networks hs20 false networks"});
+    story.advance(30s);
+    expectStanding(story, {.connected = "-"});
+    story.play({kHs20On});
+    expectStanding(story, {.outcomes = "networks hs20 true"});
+    story.advance(5s);
+    expectStanding(story, {.connected = "cafe", .outcomes = "1 access"});
+    story.expectLog({"Set enable/disable HS20, param=false", "Enter resetAllNumRetries.",
+                     "Send all HS20 networks to vexa.",
+                     "STA is in connected state when user turns of HS20,trying to disconnect from any "
+                     "connected HS20 network.",
+                     "Disconnecting from connecting/connected BSS...",
+                     "Manually disconnect from a HS20 network.",
+                     "HS20 functionality not enabled, wait for user turning it on.",
+                     "Enable/disable HS20 event signaled."});
 }
 
-TEST(HotspotSwitch, OffLeavesAConnectionOfTheSystemAlone) {
-    atRest(air({network(1, "cafe", ttls())}, storing({{}})), [](Story& story) {
-        story.act("osConnect", R"("ssid":"cafe")");
-        story.advance(5s);
-        story.forget();
-        switchHs20(story, false);
-        story.advance(5s);
-        expectStanding(story, {.requests = "", .connected = "cafe"});
-    });
+STORY(HotspotSwitch, OffLeavesAConnectionOfTheSystemAlone, air({network(1, "cafe", ttls())}, storing({{}}))) {
+    awake(story);
+    story.act("osConnect", R"("ssid":"cafe")");
+    story.advance(5s);
+    story.forget();
+    story.play({kHs20Off});
+    story.advance(5s);
+    expectStanding(story, {.requests = "", .connected = "cafe"});
 }
 
-TEST(HotspotSwitch, ToTheValueThatItHasOnlyAnswers) {
-    atRest(air({kCafe}, storing({{}})), [](Story& story) {
-        switchHs20(story, true);
-        expectStanding(story, {.requests = "", .connected = "cafe", .outcomes = "hs20 true"});
-    });
+STORY(HotspotSwitch, ToTheValueThatItHasOnlyAnswers, air({kCafe}, storing({{}}))) {
+    awake(story);
+    story.play({kHs20On});
+    expectStanding(story, {.requests = "", .connected = "cafe", .outcomes = "hs20 true"});
 }
 
 }  // namespace

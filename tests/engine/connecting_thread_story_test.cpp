@@ -95,151 +95,128 @@ TEST(ConnectingThread, TellsInEachRoundWhichGateHeldIt) {
         }) << gate.action;
 }
 
-TEST(ConnectingThread, WithTheFunctionOffNoRoundAsksTheAdapterAnything) {
-    EXPECT_STORY(air({network(1, "A")}), [](Story& story) {
-        settle(story);
-        switchHs20(story, false);
-        story.perform(kRadioOff);
-        story.advance(40s);
-        const std::string off = round("HS20 functionality not enabled, wait for user turning it on.");
-        story.expect("rounds", roundsIn(story, 30s), off + off + off);
-        story.expect("calls", story.perform(R"({"query":"calls","all":true})").size(), 0U);
-    });
+STORY(ConnectingThread, WithTheFunctionOffNoRoundAsksTheAdapterAnything, air({network(1, "A")})) {
+    settle(story);
+    story.play({kHs20Off, kRadioOff});
+    story.advance(40s);
+    const std::string off = round("HS20 functionality not enabled, wait for user turning it on.");
+    story.expect("rounds", roundsIn(story, 30s), off + off + off);
+    story.expect("calls", story.perform(R"({"query":"calls","all":true})").size(), 0U);
 }
 
-TEST(ConnectingThread, RunsARoundEveryTenSecondsWhenNothingHappens) {
-    EXPECT_STORY("{}", [](Story& story) {
-        settle(story);
-        std::string wanted;
-        for (int i = 0; i < 6; ++i)
-            wanted += round(kNoNetwork);
-        story.expect("rounds", roundsIn(story, 60s), wanted);
-    });
+STORY(ConnectingThread, RunsARoundEveryTenSecondsWhenNothingHappens, "{}") {
+    settle(story);
+    std::string wanted;
+    for (int i = 0; i < 6; ++i)
+        wanted += round(kNoNetwork);
+    story.expect("rounds", roundsIn(story, 60s), wanted);
 }
 
-TEST(ConnectingThread, AnUpdateWakesItTwiceOnceForTheListAndOnceForTheData) {
-    EXPECT_STORY(air({kNetwork}), [](Story& story) {
-        settle(story);
-        story.perform(kReport);
-        story.advance(0ms);
-        story.expectLog({kListChanged, kAnqpReady});
-        for (const auto& [line, times] : {std::pair(kListChanged, 1), {kAnqpReady, 1}, {kNoCredential, 2}})
-            story.expect(line, count(story.messages(), line), times);
-    });
+STORY(ConnectingThread, AnUpdateWakesItTwiceOnceForTheListAndOnceForTheData, air({kNetwork})) {
+    settle(story);
+    story.perform(kReport);
+    story.advance(0ms);
+    story.expectLog({kListChanged, kAnqpReady});
+    for (const auto& [line, times] : {std::pair(kListChanged, 1), {kAnqpReady, 1}, {kNoCredential, 2}})
+        story.expect(line, count(story.messages(), line), times);
 }
 
 // All of them are signalled while the thread sleeps after a radio event, which has the last place.
-TEST(ConnectingThread, TakesTheEventsThatWaitInTheirOrder) {
-    EXPECT_STORY({.seed = 100, .seeds = 30}, air({kNetwork}), [](Story& story) {
-        settle(story);
-        story.perform(kRadioOff);
-        story.advance(1s);
-        story.forget();
-        story.perform(kRadioOn);
-        addCredential(story);
-        story.perform(kReport);
-        switchHs20(story, false);
-        story.advance(9s);
-        std::string wakes;
-        std::istringstream stream(story.messages());
-        for (std::string line; std::getline(stream, line);)
-            if (line.find(" signaled.") != std::string::npos) wakes += line.substr(0, line.find(' ')) + " ";
-        story.expect("wakes", wakes, "Enable/disable HS20 Credential ANQP Supplicant Radio ");
-    });
+STORY(ConnectingThread, TakesTheEventsThatWaitInTheirOrder, {.seed = 100, .seeds = 30}, air({kNetwork})) {
+    settle(story);
+    story.perform(kRadioOff);
+    story.advance(1s);
+    story.forget();
+    story.perform(kRadioOn);
+    addCredential(story);
+    story.play({kReport, kHs20Off});
+    story.advance(9s);
+    std::string wakes;
+    std::istringstream stream(story.messages());
+    for (std::string line; std::getline(stream, line);)
+        if (line.find(" signaled.") != std::string::npos) wakes += line.substr(0, line.find(' ')) + " ";
+    story.expect("wakes", wakes, "Enable/disable HS20 Credential ANQP Supplicant Radio ");
 }
 
-TEST(ConnectingThread, SleepsTenSecondsAfterARadioEventBeforeItsGates) {
-    EXPECT_STORY("{}", [](Story& story) {
-        settle(story);
-        story.perform(kRadioOff);
-        story.expect("before ten seconds", roundsIn(story, 9999ms), "");
-        story.advance(1ms);
-        story.expectLog({"Radio turned off, wait it be turned on."});
-    });
+STORY(ConnectingThread, SleepsTenSecondsAfterARadioEventBeforeItsGates, "{}") {
+    settle(story);
+    story.perform(kRadioOff);
+    story.expect("before ten seconds", roundsIn(story, 9999ms), "");
+    story.advance(1ms);
+    story.expectLog({"Radio turned off, wait it be turned on."});
 }
 
-TEST(ConnectingThread, AsksForMissingDataFirstAndWaitsForTheEndOfTheQuery) {
-    EXPECT_STORY(air({kMute, network(2, "B", ttls())}, R"("anqpMs":3000)"), [](Story& story) {
-        addCredential(story);
-        settle(story);
-        story.advance(20s);
-        const std::string told = roundsIn(story, 13s);
-        story.expectLog(
-            {"Not all HS20 network ANQP info fetched, we will query the ANQP info first before "
-             "auto connecting.",
-             "SIGMA: Enter Supplicant::queryHs20NetworkAnqpInfo.",
-             "Supplicant::queryHs20NetworkAnqpInfo completed.", "ANQP querying finished."});
-        story.expect("one network without data stops them all", count(told, "connectNetwork"), 0);
-    });
+STORY(ConnectingThread, AsksForMissingDataFirstAndWaitsForTheEndOfTheQuery,
+      air({kMute, network(2, "B", ttls())}, R"("anqpMs":3000)")) {
+    addCredential(story);
+    settle(story);
+    story.advance(20s);
+    const std::string told = roundsIn(story, 13s);
+    story.expectLog(
+        {"Not all HS20 network ANQP info fetched, we will query the ANQP info first before "
+         "auto connecting.",
+         "SIGMA: Enter Supplicant::queryHs20NetworkAnqpInfo.",
+         "Supplicant::queryHs20NetworkAnqpInfo completed.", "ANQP querying finished."});
+    story.expect("one network without data stops them all", count(told, "connectNetwork"), 0);
 }
 
-TEST(ConnectingThread, AQueryThatWasRefusedIsAskedAgainInTheNextRound) {
-    EXPECT_STORY(air({kMute}), [](Story& story) {
-        settle(story);
-        story.perform(failing("WlanIhvControl", 31, R"("match":"anqpQuery","times":2)"));
-        addCredential(story);
-        story.expectLog({"WlanIhvControl call failed in sendIhvCmd with result code=31"});
-        story.expect("waits", count(story.messages(), kQuerying), 0);
-    });
+STORY(ConnectingThread, AQueryThatWasRefusedIsAskedAgainInTheNextRound, air({kMute})) {
+    settle(story);
+    story.perform(failing("WlanIhvControl", 31, R"("match":"anqpQuery","times":2)"));
+    addCredential(story);
+    story.expectLog({"WlanIhvControl call failed in sendIhvCmd with result code=31"});
+    story.expect("waits", count(story.messages(), kQuerying), 0);
 }
 
-TEST(ConnectingThread, AnEndOfTheQueryThatBringsNoListLeavesTheQueryRunning) {
-    EXPECT_STORY(air({kMute}, R"("anqpMs":3000)"), [](Story& story) {
-        settle(story);
-        story.perform(failing("WlanIhvControl", 31, R"("match":"bssList")"));
-        addCredential(story);
-        story.advance(5s);
-        story.expect("rounds", roundsIn(story, 20s), round(kQuerying) + round(kQuerying));
-        story.act("completeAnqpQuery");
-        story.advance(0ms);
-        story.expectLog({"ANQP querying finished."});
-    });
+STORY(ConnectingThread, AnEndOfTheQueryThatBringsNoListLeavesTheQueryRunning,
+      air({kMute}, R"("anqpMs":3000)")) {
+    settle(story);
+    story.perform(failing("WlanIhvControl", 31, R"("match":"bssList")"));
+    addCredential(story);
+    story.advance(5s);
+    story.expect("rounds", roundsIn(story, 20s), round(kQuerying) + round(kQuerying));
+    story.act("completeAnqpQuery");
+    story.advance(0ms);
+    story.expectLog({"ANQP querying finished."});
 }
 
-TEST(ConnectingThread, ARoundInADisconnectedSessionLastsFiveSecondsMore) {
-    EXPECT_STORY(air({kNetwork}, kAway), [](Story& story) {
-        addCredential(story);
-        settle(story);
-        story.advance(40s);
-        const std::string told = roundsIn(story, 60s);
-        story.expect("rounds", count(told, kAsleep), 4);
-        story.expect("attempts", count(told, "connectNetwork"), 0);
-    });
+STORY(ConnectingThread, ARoundInADisconnectedSessionLastsFiveSecondsMore, air({kNetwork}, kAway)) {
+    addCredential(story);
+    settle(story);
+    story.advance(40s);
+    const std::string told = roundsIn(story, 60s);
+    story.expect("rounds", count(told, kAsleep), 4);
+    story.expect("attempts", count(told, "connectNetwork"), 0);
 }
 
-TEST(ConnectingThread, WithEveryGateOpenItFindsNothingToDoAndSaysSo) {
-    EXPECT_STORY(air({kNetwork}), [](Story& story) {
-        addCredential(story);
-        settle(story);
-        story.advance(20s);
-        const std::string told = roundsIn(story, 10s);
-        story.expect("beginning", told.starts_with(kTimeOut), true);
-        story.expect("end", told.ends_with("connectNetwork returns with op cancelled.\n"), true);
-    });
+STORY(ConnectingThread, WithEveryGateOpenItFindsNothingToDoAndSaysSo, air({kNetwork})) {
+    addCredential(story);
+    settle(story);
+    story.advance(20s);
+    const std::string told = roundsIn(story, 10s);
+    story.expect("beginning", told.starts_with(kTimeOut), true);
+    story.expect("end", told.ends_with("connectNetwork returns with op cancelled.\n"), true);
 }
 
-TEST(ConnectingThread, WaitsForTheResultOfAnAttemptThatIsUnderWay) {
-    EXPECT_STORY(air({kNetwork}, R"("connectMs":100000)"), [](Story& story) {
-        addFittingCredential(story);
-        settle(story);
-        story.act("interfaceState", R"("value":4)");
-        story.advance(20s);
-        story.expect("rounds", roundsIn(story, 10s),
-                     round("Connection already started, wait for connection operation completed event "
-                           "signaled."));
-    });
+STORY(ConnectingThread, WaitsForTheResultOfAnAttemptThatIsUnderWay,
+      air({kNetwork}, R"("connectMs":100000)")) {
+    addFittingCredential(story);
+    settle(story);
+    story.act("interfaceState", R"("value":4)");
+    story.advance(20s);
+    story.expect("rounds", roundsIn(story, 10s),
+                 round("Connection already started, wait for connection operation completed event "
+                       "signaled."));
 }
 
-TEST(ConnectingThread, ConnectsToNobodyUntilTheLastNetworkHasAnswered) {
-    EXPECT_STORY(air({kMute, network(2, "A", ttls())}, R"("connectMs":100000)"), [](Story& story) {
-        addFittingCredential(story);
-        story.advance(100s);
-        expectStanding(story, {.requests = ""});
-        story.perform(on("setNetwork", 1, R"("anqp":"ready",)" + tls("m.example")));
-        story.perform(kReport);
-        story.advance(30s);
-        expectStanding(story, {.requests = "A ttls user"});
-    });
+STORY(ConnectingThread, ConnectsToNobodyUntilTheLastNetworkHasAnswered,
+      air({kMute, network(2, "A", ttls())}, R"("connectMs":100000)")) {
+    addFittingCredential(story);
+    story.advance(100s);
+    expectStanding(story, {.requests = ""});
+    story.play({on("setNetwork", 1, R"("anqp":"ready",)" + tls("m.example")), kReport});
+    story.advance(30s);
+    expectStanding(story, {.requests = "A ttls user"});
 }
 
 void endsWhenTheAdapterGoes(const char* what, const std::vector<std::string>& before, int pauseMs,
@@ -255,8 +232,7 @@ void endsWhenTheAdapterGoes(const char* what, const std::vector<std::string>& be
         story.forget();
         story.act("pullAdapter");
         story.advance(30s);
-        story.act("insertAdapter");
-        story.perform(kRadioOn);
+        story.play({doing("insertAdapter"), kRadioOn});
         story.advance(30s);
         story.act("pullAdapter");
         story.expect("ends", count(story.messages(), kEnds), 2);
@@ -280,9 +256,7 @@ TEST(ConnectingThread, OneThatIsLateLeavesItsLineAndEndsByItself) {
         const Ending ending = runStory({.seed = seed}, air({kNetwork}), [](Story& story) {
             addCredential(story);
             settle(story);
-            story.perform(kRadioOff);
-            story.act("pullAdapter");
-            story.act("insertAdapter");
+            story.play({kRadioOff, doing("pullAdapter"), doing("insertAdapter")});
             story.advance(60s);
             story.expect("ends", count(story.messages(), kEnds), 1);
             const char* const line = "Time out when waiting for network connecting thread termination.";
@@ -294,11 +268,10 @@ TEST(ConnectingThread, OneThatIsLateLeavesItsLineAndEndsByItself) {
     EXPECT_NE(late, "") << "no seed was late";
 }
 
-TEST(ConnectingThread, AServiceThatStopsWhileItSleepsStopsInOrder) {
-    EXPECT_STORY({.seed = 400, .seeds = 20}, air({kNetwork}), [](Story& story) {
-        settle(story);
-        story.perform(kRadioOff);
-    });
+STORY(ConnectingThread, AServiceThatStopsWhileItSleepsStopsInOrder, {.seed = 400, .seeds = 20},
+      air({kNetwork})) {
+    settle(story);
+    story.perform(kRadioOff);
 }
 
 }  // namespace

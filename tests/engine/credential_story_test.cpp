@@ -22,29 +22,26 @@ void remove(Story& story, const Json::Value& credential) {
     list(story, "DELETE_CREDENTIAL", R"({"Id":)" + credential["Id"].asString() + "}");
 }
 
-TEST(Credentials, AreStoredMovedEditedAndDeletedByTheClient) {
-    EXPECT_STORY("{}", [](Story& story) {
-        story.expect("list", list(story), "null\n");
-        const auto expectList = [&](const char* command, const std::string& data, const char* wanted) {
-            story.expect(command, list(story, command, data), wanted);
-        };
-        expectList("ADD_CREDENTIAL", ttlsData("a.example"), "1 a.example");
-        expectList("ADD_CREDENTIAL", tlsData("b.example"), "2 b.example, 1 a.example");
-        expectList("SET_POSITION_CREDENTIAL", R"({"Id":1,"Order":0})", "1 a.example, 2 b.example");
-        expectList("EDIT_CREDENTIAL", ttlsData("c.example", R"("Id":1,"CredentialName":"n")"),
-                   "1 n, 2 b.example");
-        expectList("DELETE_CREDENTIAL", R"({"Id":2})", "1 n");
-    });
+STORY(Credentials, AreStoredMovedEditedAndDeletedByTheClient, "{}") {
+    story.expect("list", list(story), "null\n");
+    const auto expectList = [&](const char* command, const std::string& data, const char* wanted) {
+        story.expect(command, list(story, command, data), wanted);
+    };
+    expectList("ADD_CREDENTIAL", ttlsData("a.example"), "1 a.example");
+    expectList("ADD_CREDENTIAL", tlsData("b.example"), "2 b.example, 1 a.example");
+    expectList("SET_POSITION_CREDENTIAL", R"({"Id":1,"Order":0})", "1 a.example, 2 b.example");
+    expectList("EDIT_CREDENTIAL", ttlsData("c.example", R"("Id":1,"CredentialName":"n")"),
+               "1 n, 2 b.example");
+    expectList("DELETE_CREDENTIAL", R"({"Id":2})", "1 n");
 }
 
-TEST(Credentials, AreToldWithEveryMember) {
-    EXPECT_STORY("{}", [](Story& story) {
-        list(story, "ADD_CREDENTIAL", tlsData("b.example"));
-        story.order("ADD_CREDENTIAL",
-                    R"({"CredentialEapMethod":2,"Type":1,"AccessType":2,"CredentialName":"n","RealName":"r",)"
-                    R"("Creator":"someone","IsPrefered":true,"AutoConnect":true,"Username":"u",)"
-                    R"("Password":"p","CaCert":"not read","ClientCert":"not read"})");
-        story.expect("list", story.hotspot().events().at(0).dataText, R"([
+STORY(Credentials, AreToldWithEveryMember, "{}") {
+    list(story, "ADD_CREDENTIAL", tlsData("b.example"));
+    story.order("ADD_CREDENTIAL",
+                R"({"CredentialEapMethod":2,"Type":1,"AccessType":2,"CredentialName":"n","RealName":"r",)"
+                R"("Creator":"someone","IsPrefered":true,"AutoConnect":true,"Username":"u",)"
+                R"("Password":"p","CaCert":"not read","ClientCert":"not read"})");
+    story.expect("list", story.hotspot().events().at(0).dataText, R"([
    {
       "AccessType" : 2,
       "AutoConnect" : true,
@@ -75,7 +72,6 @@ TEST(Credentials, AreToldWithEveryMember) {
    }
 ]
 )");
-    });
 }
 
 // Each command is refused or changes nothing; the list comes in every case.
@@ -115,21 +111,19 @@ TEST(Credentials, ACommandThatCannotBeCarriedOutChangesNothingAndStillTellsTheLi
 }
 
 // Data comes as text. A client that sends it otherwise learns so by the list, and the log has one line of it.
-TEST(Credentials, DataThatIsNoTextIsTheSame) {
-    EXPECT_STORY("{}", [&](Story& story) {
-        list(story, "ADD_CREDENTIAL", ttlsData("a.example"));
-        for (const std::string command : {"GET_ALL_CREDENTIAL_LIST", "ADD_CREDENTIAL", "EDIT_CREDENTIAL",
-                                          "DELETE_CREDENTIAL", "SET_POSITION_CREDENTIAL"})
-            for (const std::string data : {R"({"Id":1,"Order":0})", "7", "[]", "1.5"}) {
-                story.forget();
-                story.about(command + " " + data);
-                story.hotspot().sendRaw(R"({"CommandId":")" + command + R"(","Data":)" + data + "}");
-                story.advance(0ms);
-                story.expect("heard", heard(story), "GET_ALL_CREDENTIAL_LIST");
-                story.expect("errors", count(story.messages(), "ERROR: "), 1);
-                story.expect("list", list(story), "1 a.example");
-            }
-    });
+STORY(Credentials, DataThatIsNoTextIsTheSame, "{}") {
+    list(story, "ADD_CREDENTIAL", ttlsData("a.example"));
+    for (const std::string command : {"GET_ALL_CREDENTIAL_LIST", "ADD_CREDENTIAL", "EDIT_CREDENTIAL",
+                                      "DELETE_CREDENTIAL", "SET_POSITION_CREDENTIAL"})
+        for (const std::string data : {R"({"Id":1,"Order":0})", "7", "[]", "1.5"}) {
+            story.forget();
+            story.about(command + " " + data);
+            story.hotspot().sendRaw(R"({"CommandId":")" + command + R"(","Data":)" + data + "}");
+            story.advance(0ms);
+            story.expect("heard", heard(story), "GET_ALL_CREDENTIAL_LIST");
+            story.expect("errors", count(story.messages(), "ERROR: "), 1);
+            story.expect("list", list(story), "1 a.example");
+        }
 }
 
 // A member that isn't there, is null or, for one of them, an empty container.
@@ -201,58 +195,50 @@ TEST(Credentials, AnyTextComesBackFromTheFile) {
     });
 }
 
-TEST(Credentials, NeedAnAdapter) {
-    EXPECT_STORY(R"({"adapters":[{"inserted":false}]})", [](Story& story) {
-        const std::string file = story.config();
-        for (const char* command :
-             {"GET_ALL_CREDENTIAL_LIST", "ADD_CREDENTIAL", "EDIT_CREDENTIAL", "DELETE_CREDENTIAL",
-              "SET_POSITION_CREDENTIAL", "READ_CREDENTIAL_FROM_FILE"})
-            story.order(command, ttlsData("a.example"));
-        story.expect("heard", heard(story), "");
-        story.expect("file", story.config(), file);
-    });
+STORY(Credentials, NeedAnAdapter, R"({"adapters":[{"inserted":false}]})") {
+    const std::string file = story.config();
+    for (const char* command : {"GET_ALL_CREDENTIAL_LIST", "ADD_CREDENTIAL", "EDIT_CREDENTIAL",
+                                "DELETE_CREDENTIAL", "SET_POSITION_CREDENTIAL", "READ_CREDENTIAL_FROM_FILE"})
+        story.order(command, ttlsData("a.example"));
+    story.expect("heard", heard(story), "");
+    story.expect("file", story.config(), file);
 }
 
-TEST(Credentials, AReloadTakesWhatOthersWroteAndAnswersNothing) {
-    EXPECT_STORY("{}", [](Story& story) {
-        list(story, "ADD_CREDENTIAL", ttlsData("a.example"));
-        std::string file = story.config();
-        file.insert(file.find("</credentials><users>"),
-                    "<credential><id>7</id><type>eaptls</type><accesstype>alluser</accesstype>"
-                    "<realm>b.example</realm></credential>");
-        story.writeConfig(file);
-        for (const int saves : {1, 0}) {
-            story.forget();
-            story.order("READ_CREDENTIAL_FROM_FILE");
-            story.expect("heard", heard(story), "");
-            story.expect("reloads", count(story.messages(), kReloaded), 1);
-            story.expect("saves", count(story.messages(), kChangesSaved), saves);
-            story.expect("list", list(story), "7 b.example, 1 a.example");
-        }
-        story.writeConfig("<half");
+STORY(Credentials, AReloadTakesWhatOthersWroteAndAnswersNothing, "{}") {
+    list(story, "ADD_CREDENTIAL", ttlsData("a.example"));
+    std::string file = story.config();
+    file.insert(file.find("</credentials><users>"),
+                "<credential><id>7</id><type>eaptls</type><accesstype>alluser</accesstype>"
+                "<realm>b.example</realm></credential>");
+    story.writeConfig(file);
+    for (const int saves : {1, 0}) {
+        story.forget();
         story.order("READ_CREDENTIAL_FROM_FILE");
-        story.expect("list", list(story, "ADD_CREDENTIAL", ttlsData("c.example")),
-                     "2 c.example, 7 b.example, 1 a.example");
-        story.expect("file", story.config(), "<half");
-        story.expect("failures", count(story.messages(), kNotSaved), 1);
-    });
+        story.expect("heard", heard(story), "");
+        story.expect("reloads", count(story.messages(), kReloaded), 1);
+        story.expect("saves", count(story.messages(), kChangesSaved), saves);
+        story.expect("list", list(story), "7 b.example, 1 a.example");
+    }
+    story.writeConfig("<half");
+    story.order("READ_CREDENTIAL_FROM_FILE");
+    story.expect("list", list(story, "ADD_CREDENTIAL", ttlsData("c.example")),
+                 "2 c.example, 7 b.example, 1 a.example");
+    story.expect("file", story.config(), "<half");
+    story.expect("failures", count(story.messages(), kNotSaved), 1);
 }
 
-TEST(Credentials, AFullDiskIsToldInOneLineAndTheNextSaveHeals) {
-    EXPECT_STORY("{}", [](Story& story) {
-        list(story, "ADD_CREDENTIAL", ttlsData("a.example"));
-        const std::string file = story.config();
-        story.perform(failing("write", 112, R"("times":3,"match":"config.xml")"));
-        story.expect("list", list(story, "ADD_CREDENTIAL", ttlsData("b.example")),
-                     "2 b.example, 1 a.example");
-        story.expect("file", story.config(), file);
-        story.expect("failures", count(story.messages(), kNotSaved), 1);
-        story.expect("list", list(story, "ADD_CREDENTIAL", ttlsData("c.example")),
-                     "3 c.example, 2 b.example, 1 a.example");
-        story.expect("next id", count(story.config(), "<nextcredid>4</nextcredid>"), 1);
-        story.expect("realms", count(story.config(), "<realm>"), 3);
-        story.expect("failures", count(story.messages(), kNotSaved), 1);
-    });
+STORY(Credentials, AFullDiskIsToldInOneLineAndTheNextSaveHeals, "{}") {
+    list(story, "ADD_CREDENTIAL", ttlsData("a.example"));
+    const std::string file = story.config();
+    story.perform(failing("write", 112, R"("times":3,"match":"config.xml")"));
+    story.expect("list", list(story, "ADD_CREDENTIAL", ttlsData("b.example")), "2 b.example, 1 a.example");
+    story.expect("file", story.config(), file);
+    story.expect("failures", count(story.messages(), kNotSaved), 1);
+    story.expect("list", list(story, "ADD_CREDENTIAL", ttlsData("c.example")),
+                 "3 c.example, 2 b.example, 1 a.example");
+    story.expect("next id", count(story.config(), "<nextcredid>4</nextcredid>"), 1);
+    story.expect("realms", count(story.config(), "<realm>"), 3);
+    story.expect("failures", count(story.messages(), kNotSaved), 1);
 }
 
 }  // namespace

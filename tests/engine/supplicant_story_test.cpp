@@ -40,61 +40,52 @@ private:
     int m_atFirst;
 };
 
-TEST(SupplicantStory, ComesAndGoesWithTheAdapterAndLeavesNoHandle) {
-    EXPECT_STORY("{}", [](Story& story) {
-        expectState(story, "initialised");
-        Handles handles(story);
-        for (int round = 0; round < 3; ++round) {
-            story.act("pullAdapter");
-            expectState(story, "none");
-            handles.expectMore(-1);
-            story.act("insertAdapter");
-            expectState(story, "initialised");
-            handles.expectMore(0);
-        }
-    });
-}
-
-TEST(SupplicantStory, AnAdapterIsKnownHoweverItsIdentifierIsWritten) {
-    EXPECT_STORY(R"({"adapters":[{"guid":"{6b1e8a4c-5d2f-4e0b-9c37-1f5d00000001}"}]})",
-                 [](Story& story) { expectState(story, "initialised"); });
-}
-
-TEST(SupplicantStory, ASecondArrivalResetsIt) {
-    EXPECT_STORY("{}", [](Story& story) {
-        const auto before = supplicantOf(kFirst);
-        Handles handles(story);
-        before->m_bRoaming = true;
+STORY(SupplicantStory, ComesAndGoesWithTheAdapterAndLeavesNoHandle, "{}") {
+    expectState(story, "initialised");
+    Handles handles(story);
+    for (int round = 0; round < 3; ++round) {
+        story.act("pullAdapter");
+        expectState(story, "none");
+        handles.expectMore(-1);
         story.act("insertAdapter");
-        story.expect("the same object", before == supplicantOf(kFirst), true);
-        story.expect("roaming", before->m_bRoaming.load(), false);
-        handles.expectMore(0);
-        story.expectLog({"Supplicant with GUID already exists, skip adding.",
-                         "Going to reset the existed supplicant..."});
-    });
-}
-
-TEST(SupplicantStory, ARemovalWhileAnotherAdapterIsThereRemovesNothing) {
-    EXPECT_STORY(R"({"adapters":[{},{}]})", [](Story& story) {
-        story.act("pullAdapter", R"("adapter":1)");
         expectState(story, "initialised");
-        story.expectLog({"\tInterface card still inserted, don't remove supplicant."});
-        story.act("pullAdapter", R"("adapter":0)");
-        expectState(story, "none");
-        story.act("notify", R"("source":8,"code":14)");
-        story.expectLog({"\tNo supplicant, do nothing."});
-    });
+        handles.expectMore(0);
+    }
 }
 
-TEST(SupplicantStory, ASecondAdapterTakesOverWhenItArrives) {
-    EXPECT_STORY(R"({"adapters":[{},{"inserted":false}]})", [](Story& story) {
-        story.act("pullAdapter", R"("adapter":0)");
-        story.act("insertAdapter", R"("adapter":1)");
-        expectState(story, "none");
-        expectState(story, "initialised", kSecond);
-        story.expect("heard", list(story, "ADD_CREDENTIAL", ttlsData("a.example")),
-                     "CARD_PLUG_OUT CARD_PLUG_IN 1 a.example");
-    });
+STORY(SupplicantStory, AnAdapterIsKnownHoweverItsIdentifierIsWritten,
+      R"({"adapters":[{"guid":"{6b1e8a4c-5d2f-4e0b-9c37-1f5d00000001}"}]})") {
+    expectState(story, "initialised");
+}
+
+STORY(SupplicantStory, ASecondArrivalResetsIt, "{}") {
+    const auto before = supplicantOf(kFirst);
+    Handles handles(story);
+    before->m_bRoaming = true;
+    story.act("insertAdapter");
+    story.expect("the same object", before == supplicantOf(kFirst), true);
+    story.expect("roaming", before->m_bRoaming.load(), false);
+    handles.expectMore(0);
+    story.expectLog(
+        {"Supplicant with GUID already exists, skip adding.", "Going to reset the existed supplicant..."});
+}
+
+STORY(SupplicantStory, ARemovalWhileAnotherAdapterIsThereRemovesNothing, R"({"adapters":[{},{}]})") {
+    story.act("pullAdapter", R"("adapter":1)");
+    expectState(story, "initialised");
+    story.expectLog({"\tInterface card still inserted, don't remove supplicant."});
+    story.act("pullAdapter", R"("adapter":0)");
+    expectState(story, "none");
+    story.act("notify", R"("source":8,"code":14)");
+    story.expectLog({"\tNo supplicant, do nothing."});
+}
+
+STORY(SupplicantStory, ASecondAdapterTakesOverWhenItArrives, R"({"adapters":[{},{"inserted":false}]})") {
+    story.play({doing("pullAdapter", R"("adapter":0)"), doing("insertAdapter", R"("adapter":1)")});
+    expectState(story, "none");
+    expectState(story, "initialised", kSecond);
+    story.expect("heard", list(story, "ADD_CREDENTIAL", ttlsData("a.example")),
+                 "CARD_PLUG_OUT CARD_PLUG_IN 1 a.example");
 }
 
 // What goes wrong while the adapter comes back, and how the object stands then.
@@ -122,9 +113,9 @@ TEST(SupplicantStory, AnInitThatFailsIsTriedOnceMoreAndLeaksNothing) {
             "{}",
             [&](Story& story) {
                 Handles handles(story);
-                story.act("pullAdapter");
-                story.perform(failing(c.call, c.error, R"("times":)" + std::to_string(c.times)));
-                story.act("insertAdapter");
+                story.play({doing("pullAdapter"),
+                            failing(c.call, c.error, R"("times":)" + std::to_string(c.times)),
+                            doing("insertAdapter")});
                 expectState(story, c.state);
                 handles.expectMore(c.moreHandles);
                 const std::string log = story.messages();
@@ -135,25 +126,22 @@ TEST(SupplicantStory, AnInitThatFailsIsTriedOnceMoreAndLeaksNothing) {
             << c.call << " " << c.error << " " << c.times;
 }
 
-TEST(SupplicantStory, AnUnlistedAdapterGivesOneThatIsNotInitialisedButServesItsCommands) {
-    EXPECT_STORY(R"({"adapters":[{"listed":false}]})", [](Story& story) {
-        expectState(story, "not initialised");
-        story.expect("list", list(story, "ADD_CREDENTIAL", ttlsData("a.example")), "1 a.example");
-        story.expect("lines", count(story.messages(), "!!!Cannot query interface mac address."), 2);
-    });
+STORY(SupplicantStory, AnUnlistedAdapterGivesOneThatIsNotInitialisedButServesItsCommands,
+      R"({"adapters":[{"listed":false}]})") {
+    expectState(story, "not initialised");
+    story.expect("list", list(story, "ADD_CREDENTIAL", ttlsData("a.example")), "1 a.example");
+    story.expect("lines", count(story.messages(), "!!!Cannot query interface mac address."), 2);
 }
 
-TEST(SupplicantStory, LookupsKeepTheirObjectAlive) {
-    EXPECT_STORY("{}", [](Story& story) {
-        const auto kept = supplicantOf(kFirst);
-        story.act("pullAdapter");
-        expectState(story, "none");
-        story.expect("the one that is kept", kept->isInitialized(), false);
-        kept->setState(SupplicantState::Initialized);
-        kept->m_hCredentialChangedEvent.set();
-        story.expect("removing it again", SupplicantMgr::instance().removeSupplicant(kept.get()), 2);
-        story.expect("removing none", SupplicantMgr::instance().removeSupplicant(nullptr), 4);
-    });
+STORY(SupplicantStory, LookupsKeepTheirObjectAlive, "{}") {
+    const auto kept = supplicantOf(kFirst);
+    story.act("pullAdapter");
+    expectState(story, "none");
+    story.expect("the one that is kept", kept->isInitialized(), false);
+    kept->setState(SupplicantState::Initialized);
+    kept->m_hCredentialChangedEvent.set();
+    story.expect("removing it again", SupplicantMgr::instance().removeSupplicant(kept.get()), 2);
+    story.expect("removing none", SupplicantMgr::instance().removeSupplicant(nullptr), 4);
 }
 
 // The adapter comes and goes between and within the commands. Whatever the order of threads, what the client

@@ -35,9 +35,7 @@ void heal(World& world) {
     for (const char* action : kActions)
         world.perform(action);
     for (int number = 0; number < kNetworksOfTheStorm; ++number)
-        world.perform(on("setNetwork", number, R"("anqp":"ready",)" + both()));
-    switchHs20(world, true);
-    world.perform(kReport);
+        world.play({on("setNetwork", number, R"("anqp":"ready",)" + both()), kHs20On, kReport});
     world.order("ADD_CREDENTIAL", ttlsData("haven.example", kAutoConnect));
 }
 
@@ -45,8 +43,7 @@ void heal(World& world) {
 void useUpFaults(World& world) {
     for (int tries = 0; tries < kTriesToHeal; ++tries) {
         heal(world);
-        connect(world, "Haven");
-        world.act("dropConnection");
+        world.play({connecting("Haven"), doing("dropConnection")});
         world.advance(15s);
     }
     heal(world);

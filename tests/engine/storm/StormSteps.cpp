@@ -181,8 +181,7 @@ void Storm::step() {
 std::string Storm::check() {
     const std::string expected = namesInRange();
     for (int tries = 0; tries < kTriesToHeal; ++tries) {
-        m_world.act("insertAdapter");
-        m_world.act("radio", R"("hardware":"on","software":"on")");
+        m_world.play({doing("insertAdapter"), doing("radio", R"("hardware":"on","software":"on")")});
         m_world.hotspot().send("SET_HOTSPOT_AUTO_CONNECT", "true");
         if (!waitForAnswers()) return "no answer to a command\n";
         m_shown = "nothing";

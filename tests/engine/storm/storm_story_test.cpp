@@ -23,13 +23,11 @@ void turmoil(Story& story) {
         story.advance(350ms);
         story.act("pullAdapter");
         story.hotspot().send("GET_IS_CARD_IN");
-        story.act("roam");
-        story.act("radio", R"("software":"off")");
+        story.play({doing("roam"), doing("radio", R"("software":"off")")});
         for (int code = 0; code < 16; ++code)
-            story.act("notify", R"("source":16,"code":)" + std::to_string(code));
-        story.act("ihv", R"("dataHex":"005ec4060000000001000000325c0000ffff0102")");
-        story.act("insertAdapter");
-        story.act("radio", R"("software":"on")");
+            story.play({doing("notify", R"("source":16,"code":)" + std::to_string(code)),
+                        doing("ihv", R"("dataHex":"005ec4060000000001000000325c0000ffff0102")"),
+                        doing("insertAdapter"), doing("radio", R"("software":"on")")});
         story.spectral().send("GET_CURRENT_CHANNEL");
     }
     story.spectral().send("FULL_SCAN");

@@ -121,16 +121,12 @@ std::string connectedTo(World& world) {
     return state["state"] == "connected" ? state["ssid"].asString() : "-";
 }
 
-void connect(World& world, const std::string& name) {
-    world.order("CONNECT_NETWORK", nameData(name));
+std::string connecting(const std::string& name) {
+    return sending("CONNECT_NETWORK", nameData(name));
 }
 
-void disconnect(World& world, const std::string& name) {
-    world.order("DISCONNECT_NETWORK", nameData(name));
-}
-
-void switchHs20(World& world, bool on) {
-    world.order("SET_HOTSPOT_AUTO_CONNECT", on ? "true" : "false");
+std::string disconnecting(const std::string& name) {
+    return sending("DISCONNECT_NETWORK", nameData(name));
 }
 
 }  // namespace vexa::test

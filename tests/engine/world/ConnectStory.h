@@ -42,8 +42,10 @@ std::vector<std::string> requests(World& world);
 std::string joined(const std::vector<std::string>& requests);
 std::string connectedTo(World& world);
 
-void connect(World& world, const std::string& name);
-void disconnect(World& world, const std::string& name);
-void switchHs20(World& world, bool on);
+/// The user's messages.
+std::string connecting(const std::string& name);
+std::string disconnecting(const std::string& name);
+inline const std::string kHs20Off = sending("SET_HOTSPOT_AUTO_CONNECT", "false");
+inline const std::string kHs20On = sending("SET_HOTSPOT_AUTO_CONNECT", "true");
 
 }  // namespace vexa::test

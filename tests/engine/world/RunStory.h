@@ -39,3 +39,11 @@ std::string wrongIn(const std::string& scenario, const Tale& tale);
     GTEST_AMBIGUOUS_ELSE_BLOCKER_                                                                   \
     if (const std::string wrongInStory = ::vexa::test::wrongIn(__VA_ARGS__); !wrongInStory.empty()) \
     ADD_FAILURE() << wrongInStory
+
+/// A test that is one such story: its body follows.
+#define STORY(suite, name, ...)                          \
+    static void suite##name(::vexa::test::Story& story); \
+    TEST(suite, name) {                                  \
+        EXPECT_STORY(__VA_ARGS__, suite##name);          \
+    }                                                    \
+    static void suite##name(::vexa::test::Story& story)

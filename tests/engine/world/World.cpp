@@ -76,19 +76,19 @@ std::string doing(const std::string& action, const std::string& members) {
     return R"({"do":")" + action + "\"" + (members.empty() ? "" : ",") + members + "}";
 }
 
+std::string sending(const std::string& command, const std::string& data) {
+    Json::Value message;
+    message["CommandId"] = command;
+    if (!data.empty()) message["Data"] = data;
+    return oneLine(message);
+}
+
 Client::Client(std::int32_t port) : m_client(InProcessClient::connect(port)) {
     for (int tries = 0; !m_client; ++tries) {
         if (tries == 1000) throw std::runtime_error("nothing serves port " + std::to_string(port));
         platform::advance(1ms);
         m_client = InProcessClient::connect(port);
     }
-}
-
-void Client::send(const std::string& command, const std::string& data) {
-    Json::Value message;
-    message["CommandId"] = command;
-    if (!data.empty()) message["Data"] = data;
-    m_client->send(oneLine(message));
 }
 
 std::vector<ClientEvent> Client::events() {
@@ -128,9 +128,14 @@ void World::advance(platform::Duration span) {
     platform::advance(span);
 }
 
-void World::order(const std::string& command, const std::string& data) {
-    hotspot().send(command, data);
-    advance(0ms);
+void World::play(const std::vector<std::string>& deeds) {
+    for (const std::string& deed : deeds)
+        if (deed.starts_with(R"({"do":)")) {
+            perform(deed);
+        } else {
+            hotspot().sendRaw(deed);
+            advance(0ms);
+        }
 }
 
 void World::forget() {

@@ -23,6 +23,9 @@ std::string contentOf(const std::filesystem::path& file);
 /// The text of an action: doing("radio", R"("software":"off")").
 std::string doing(const std::string& action, const std::string& members = "");
 
+/// The text of a client's message.
+std::string sending(const std::string& command, const std::string& data = "");
+
 /// One event that a client got, its `Data` parsed where it is JSON.
 struct ClientEvent {
     std::string id;
@@ -37,7 +40,7 @@ class Client {
 public:
     explicit Client(std::int32_t port);
 
-    void send(const std::string& command, const std::string& data = "");
+    void send(const std::string& command, const std::string& data = "") { sendRaw(sending(command, data)); }
     void sendRaw(const std::string& text) { m_client->send(text); }
 
     /// Events since the last call, oldest first.
@@ -66,8 +69,10 @@ public:
     /// Lets this time pass and everything come to rest that falls due in it.
     void advance(platform::Duration span);
 
-    /// Sends a command to the hotspot port and lets it be carried out.
-    void order(const std::string& command, const std::string& data = "");
+    /// Lets all this happen: actions, and messages to the hotspot port, each of which is carried out before
+    /// the next deed.
+    void play(const std::vector<std::string>& deeds);
+    void order(const std::string& command, const std::string& data = "") { play({sending(command, data)}); }
 
     /// From now on requests, events and the messages of the log count anew.
     void forget();
