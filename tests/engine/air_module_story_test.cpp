@@ -20,74 +20,54 @@ Block number(unsigned value) {
 }
 
 // What the module's answer to the question for one BSS leads to.
-TEST(AirModule, AnAnswerAboutABssIsReadWithinItsBytes) {
+STORY(AirModule, AnAnswerAboutABssIsReadWithinItsBytes, air({network(1, "Airport", tls())})) {
     const Block list = realmList({realmData("b.example", {eapMethod(21)})});
     const auto length = static_cast<unsigned>(list.size());
-    const char* const old = "Airport[a.example TLS]";
-    const char* const noSize =
+    const std::string noSize =
         "ERROR: Output buffer overflow in fetchBssAnqpInfo:No room for realm size field.\n";
-    const char* const noName = "ERROR: Output buffer overflow in fetchBssAnqpInfo.No room for realm name\n";
-    struct Case {
-        const char* what;
-        Block reply;
-        const char* list;
-        const char* line;
+    const std::string noName = "ERROR: Output buffer overflow in fetchBssAnqpInfo.No room for realm name\n";
+    settle(story);
+    const auto expectRead = [&](const char* what, const Block& bytes, const std::string& line,
+                                const char* wanted = "Airport[a.example TLS]") {
+        story.about(what);
+        story.perform(kReport);
+        story.forget();
+        story.play({reply("anqpInfo", bytes), on("reportAnqp", 1)});
+        story.expectLog(
+            "Fetching BSS with ssid=Airport and mac address=02:aa:00:00:00:01  ANQP info "
+            "from HS20 IHV...");
+        story.expect(line, story.messages().find(line) != std::string::npos, true);
+        story.expect("list", askedList(story), wanted);
     };
-    const Case cases[] = {
-        {"nothing", {}, old, ""},
-        {"one byte", Block(1), old, noSize},
-        {"three bytes", Block(3), old, noSize},
-        {"ten bytes in nine", number(10) + Block(9), old, noName},
-        {"a length without end", number(0xFFFFFFFF) + Block(20), old, noName},
-        {"no realm data", number(0) + Block(20), old, "No ANQP NAI realm info.\n"},
-        {"ten bytes", number(10) + Block(10), old, "Parsing NAI Realm list from 02:aa:00:00:00:01\n"},
-        {"a list and more", number(length) + list + Block(40), "Airport[b.example TTLS]",
-         "\t\tb.example EAP-TTLS\n"},
-        {"a list in part", number(length - 1) + list, old, "No room for NAI Realm Data (len="},
-    };
-    EXPECT_STORY(air({network(1, "Airport", tls())}), [&](Story& story) {
-        settle(story);
-        for (const Case& c : cases) {
-            story.about(c.what);
-            story.perform(kReport);
-            story.forget();
-            story.play({reply("anqpInfo", c.reply), on("reportAnqp", 1)});
-            story.expectLog(
-                {"Fetching BSS with ssid=Airport and mac address=02:aa:00:00:00:01  ANQP info "
-                 "from HS20 IHV..."});
-            story.expect("line", story.messages().find(c.line) != std::string::npos, true);
-            story.expect("list", askedList(story), c.list);
-        }
-    });
+    expectRead("nothing", {}, "");
+    expectRead("one byte", Block(1), noSize);
+    expectRead("three bytes", Block(3), noSize);
+    expectRead("ten bytes in nine", number(10) + Block(9), noName);
+    expectRead("a length without end", number(0xFFFFFFFF) + Block(20), noName);
+    expectRead("no realm data", number(0) + Block(20), "No ANQP NAI realm info.\n");
+    expectRead("ten bytes", number(10) + Block(10), "Parsing NAI Realm list from 02:aa:00:00:00:01\n");
+    expectRead("a list and more", number(length) + list + Block(40), "\t\tb.example EAP-TTLS\n",
+               "Airport[b.example TTLS]");
+    expectRead("a list in part", number(length - 1) + list, "No room for NAI Realm Data (len=");
 }
 
-TEST(AirModule, TheAnswerWithTheListIsReadByWholeRecords) {
-    struct Case {
-        std::size_t size;
-        const char* list;
-        std::vector<std::string> lines;
+STORY(AirModule, TheAnswerWithTheListIsReadByWholeRecords, air({network(1, "Airport")})) {
+    settle(story);
+    const auto expectRead = [&](std::size_t size, const char* list, const std::vector<std::string>& lines) {
+        story.about(std::to_string(size));
+        story.perform(moduleMessage(2, bssRecord("02aa00000009", "Airport")));
+        story.forget();
+        story.play({reply("bssList", cut(kTwo, size)), moduleMessage(4, {})});
+        story.expectLines(lines);
+        story.expect("list", askedList(story), list);
     };
-    const Case cases[] = {
-        {104, "One Two", {"Get 2 HS20 networks from IHV"}},
-        {103, "One", {"Get 1 HS20 networks from IHV"}},
-        {52, "One", {"Get 1 HS20 networks from IHV"}},
-        {51,
-         "Airport",
-         {"Get 0 HS20 networks from IHV", "ERROR: Update HS20 network list failed.",
-          "Error: getHs20BssListFromIHV failed in hs20Associate."}},
-        {0, "Airport", {"Get HS20 BSS list from IHV.", "dwBytesWritten equals 0."}},
-    };
-    EXPECT_STORY(air({network(1, "Airport")}), [&](Story& story) {
-        settle(story);
-        for (const Case& c : cases) {
-            story.about(std::to_string(c.size));
-            story.perform(moduleMessage(2, bssRecord("02aa00000009", "Airport")));
-            story.forget();
-            story.play({reply("bssList", cut(kTwo, c.size)), moduleMessage(4, {})});
-            story.expectLog(c.lines);
-            story.expect("list", askedList(story), c.list);
-        }
-    });
+    expectRead(104, "One Two", {"Get 2 HS20 networks from IHV"});
+    expectRead(103, "One", {"Get 1 HS20 networks from IHV"});
+    expectRead(52, "One", {"Get 1 HS20 networks from IHV"});
+    expectRead(51, "Airport",
+               {"Get 0 HS20 networks from IHV", "ERROR: Update HS20 network list failed.",
+                "Error: getHs20BssListFromIHV failed in hs20Associate."});
+    expectRead(0, "Airport", {"Get HS20 BSS list from IHV.", "dwBytesWritten equals 0."});
 }
 
 STORY(AirModule, ARequestThatFailsLeavesItsLineAndChangesNothing,
@@ -105,85 +85,64 @@ STORY(AirModule, ARequestThatFailsLeavesItsLineAndChangesNothing,
     story.expect("heard", heard(story), "networks Airport[a.example TLS] Cafe[y.example TLS]");
 }
 
-TEST(AirModule, AReportIsAsLongAsItClaimsAndNoLongerThanItsBlock) {
-    struct Case {
-        unsigned claimed;
-        std::size_t sent;
-        std::string heard;
+STORY(AirModule, AReportIsAsLongAsItClaimsAndNoLongerThanItsBlock,
+      air({network(1, "One"), network(2, "Two")})) {
+    settle(story);
+    const auto expectHeard = [&](unsigned claimed, std::size_t sent, const std::string& wanted) {
+        story.about(std::to_string(claimed) + " of " + std::to_string(sent));
+        story.forget();
+        story.perform(moduleMessage(2, cut(kTwo, sent), claimed));
+        story.expect("heard", heard(story), wanted);
+        if (wanted.empty())
+            story.expect("log", story.messages(),
+                         "IHV reports HS20 network list changed.\nERROR: Update HS20 network list failed.\n");
+        story.advance(0ms);
     };
-    const Case cases[] = {
-        {104, 104, "networks One Two"},
-        {103, 104, "networks One"},
-        {4294967295U, 104, "DETECTED_HOTSPOT; networks One Two"},
-        {104, 103, "networks One"},
-        {51, 104, ""},
-        {0, 104, ""},
-        {104, 51, ""},
-        {104, 0, ""},
-    };
-    EXPECT_STORY(air({network(1, "One"), network(2, "Two")}), [&](Story& story) {
-        settle(story);
-        for (const Case& c : cases) {
-            story.about(std::to_string(c.claimed) + " of " + std::to_string(c.sent));
-            story.forget();
-            story.perform(moduleMessage(2, cut(kTwo, c.sent), c.claimed));
-            story.expect("heard", heard(story), c.heard);
-            if (c.heard.empty())
-                story.expect(
-                    "log", story.messages(),
-                    "IHV reports HS20 network list changed.\nERROR: Update HS20 network list failed.\n");
-            story.advance(0ms);
-        }
-    });
+    expectHeard(104, 104, "networks One Two");
+    expectHeard(103, 104, "networks One");
+    expectHeard(4294967295U, 104, "DETECTED_HOTSPOT; networks One Two");
+    expectHeard(104, 103, "networks One");
+    for (const unsigned tooFew : {51U, 0U})
+        expectHeard(tooFew, 104, "");
+    for (const std::size_t tooFew : {51U, 0U})
+        expectHeard(104, tooFew, "");
 }
 
-TEST(AirModule, NewsOfOneBssNeedsItsAddressAndItsMark) {
+STORY(AirModule, NewsOfOneBssNeedsItsAddressAndItsMark, air({network(1, "Airport")})) {
     const Block record = bssRecord("02aa00000001", "Airport");
-    struct Case {
-        const char* what;
-        Block payload;
-        unsigned claimed;
-        int fetches;
+    settle(story);
+    const auto expectFetches = [&](int wanted, const char* what, const Block& payload, unsigned claimed) {
+        story.about(what);
+        story.perform(moduleMessage(3, payload, claimed));
+        story.expectLog("IHV reports HS20 BSS ANQP info changed.");
+        story.expect("fetches", moduleRequests(story, 8), wanted);
+        story.expect("heard", heard(story), "");
+        story.forget();
     };
-    const Case cases[] = {
-        {"a record", record, 52, 1},
-        {"its first 44 bytes", cut(record, 44), 44, 1},
-        {"a claim of 44", record, 44, 1},
-        {"its first 43 bytes", cut(record, 43), 43, 0},
-        {"a claim beyond 43 bytes", cut(record, 43), 52, 0},
-        {"a claim of 43", record, 43, 0},
-        {"nothing", {}, 0, 0},
-        {"no hotspot", bssRecord("02aa00000001", "Airport", 0), 52, 0},
-        {"another mark", bssRecord("02aa00000001", "Airport", 2), 52, 0},
-        {"an unknown address", bssRecord("02aa00000009", "Airport"), 52, 0},
-    };
-    EXPECT_STORY(air({network(1, "Airport")}), [&](Story& story) {
-        settle(story);
-        for (const Case& c : cases) {
-            story.about(c.what);
-            story.perform(moduleMessage(3, c.payload, c.claimed));
-            story.expectLog({"IHV reports HS20 BSS ANQP info changed."});
-            story.expect("fetches", moduleRequests(story, 8), c.fetches);
-            story.expect("heard", heard(story), "");
-            story.forget();
-        }
-    });
+    expectFetches(1, "a record", record, 52);
+    expectFetches(1, "its first 44 bytes", cut(record, 44), 44);
+    expectFetches(1, "a claim of 44", record, 44);
+    expectFetches(0, "its first 43 bytes", cut(record, 43), 43);
+    expectFetches(0, "a claim beyond 43 bytes", cut(record, 43), 52);
+    expectFetches(0, "a claim of 43", record, 43);
+    expectFetches(0, "nothing", {}, 0);
+    expectFetches(0, "no hotspot", bssRecord("02aa00000001", "Airport", 0), 52);
+    expectFetches(0, "another mark", bssRecord("02aa00000001", "Airport", 2), 52);
+    expectFetches(0, "an unknown address", bssRecord("02aa00000009", "Airport"), 52);
 }
 
-TEST(AirModule, TheRequestsAreMadeByteForByte) {
-    const std::string airport = network(1, "Airport", R"("hs20":false,"networkType":3,"internetAccess":9)");
-    EXPECT_STORY(air({airport}), [](Story& story) {
-        settle(story);
-        story.act("completeAnqpQuery");
-        std::string requests;
-        for (const Json::Value& call : story.perform(R"({"query":"calls"})"))
-            requests += call["type"].asString() + " " + call["outSize"].asString() + " " +
-                        call["inHex"].asString() + "\n";
-        story.expect("requests", requests,
-                     "0 10240 005ec40300000000050000000000000000000000\n"
-                     "0 10240 005ec403000000000800000034000000" +
-                         hexOf(bssRecord("02aa00000001", "Airport", 1, 3, 9)) + "\n");
-    });
+STORY(AirModule, TheRequestsAreMadeByteForByte,
+      air({network(1, "Airport", R"("hs20":false,"networkType":3,"internetAccess":9)")})) {
+    settle(story);
+    story.act("completeAnqpQuery");
+    std::string requests;
+    for (const Json::Value& call : story.perform(R"({"query":"calls"})"))
+        requests += call["type"].asString() + " " + call["outSize"].asString() + " " +
+                    call["inHex"].asString() + "\n";
+    story.expect("requests", requests,
+                 "0 10240 005ec40300000000050000000000000000000000\n"
+                 "0 10240 005ec403000000000800000034000000" +
+                     hexOf(bssRecord("02aa00000001", "Airport", 1, 3, 9)) + "\n");
 }
 
 STORY(AirModule, TheDriversStateIsPassedOnWhereItsTwoNumbersAre, "{}") {
@@ -216,34 +175,24 @@ STORY(AirModule, SubtypesThatNobodyKnowsAreIgnored, air({network(1, "Airport")})
 
 STORY(AirModule, AnUpdateRunsThroughItsStepsInOrder,
       air({network(1, "Airport"), network(2, "Airport", tls())})) {
+    const std::string fetching = "Fetching BSS with ssid=Airport and mac address=02:aa:00:00:00:0";
     settle(story);
     story.perform(kReport);
-    const std::string log = story.messages();
-    story.expect(
-        "log", log.substr(0, log.find("Send all HS20 networks to vexa.\n")),
-        "IHV reports HS20 network list changed.\n"
-        "There already exists a network with ssid=Airport, updating network info....\n"
-        "We scanned a new HS20 network with ssid=Airport, adding to the network list...\n"
-        "\tssid=Airport\n"
-        "Fetching BSS with ssid=Airport and mac address=02:aa:00:00:00:01  ANQP info from HS20 IHV...\n"
-        "ANQP info fetched from IHV: ____\n"
-        "No ANQP NAI realm info.\n"
-        "Fetching BSS with ssid=Airport and mac address=02:aa:00:00:00:02  ANQP info from HS20 IHV...\n"
-        "ANQP info fetched from IHV: __________a.example____\n"
-        "Parsing NAI Realm list from 02:aa:00:00:00:02\n"
-        "\tParsing NAI Realm...\n"
-        "\tNAI Realm Count: 1\n"
-        "\tNAI Realm=a.example\n"
-        "\t\tEAP Method: len=2 method=13 auth_count=0\n"
-        "\tWe have parsed 1 realms:\n"
-        "\t\ta.example EAP-TLS\n"
-        "Processing duplicated HS20 networks...\n"
-        "Found duplicate HS20 networks with same ssid=Airport\n"
-        "\tMacAddress=02:aa:00:00:00:01\n"
-        "\tMacAddress=02:aa:00:00:00:02\n"
-        "This network with index=0 and mac address02:aa:00:00:00:01 exists before, thus we will keep "
-        "it.\n"
-        "\tSet events m_hHs20NetworkChangedEvent and m_hAnqpInfoReadyEvent.\n");
+    story.expectLog(
+        "IHV reports HS20 network list changed.",
+        "There already exists a network with ssid=Airport, updating network info....",
+        "We scanned a new HS20 network with ssid=Airport, adding to the network list...", "\tssid=Airport",
+        fetching + "1  ANQP info from HS20 IHV...", "ANQP info fetched from IHV: ____",
+        "No ANQP NAI realm info.", fetching + "2  ANQP info from HS20 IHV...",
+        "ANQP info fetched from IHV: __________a.example____",
+        "Parsing NAI Realm list from 02:aa:00:00:00:02", "\tParsing NAI Realm...", "\tNAI Realm Count: 1",
+        "\tNAI Realm=a.example", "\t\tEAP Method: len=2 method=13 auth_count=0",
+        "\tWe have parsed 1 realms:", "\t\ta.example EAP-TLS", "Processing duplicated HS20 networks...",
+        "Found duplicate HS20 networks with same ssid=Airport", "\tMacAddress=02:aa:00:00:00:01",
+        "\tMacAddress=02:aa:00:00:00:02",
+        "This network with index=0 and mac address02:aa:00:00:00:01 exists before, thus we will keep it.",
+        "\tSet events m_hHs20NetworkChangedEvent and m_hAnqpInfoReadyEvent.",
+        "Send all HS20 networks to vexa.");
 }
 
 }  // namespace

@@ -64,78 +64,65 @@ STORY(AutoConnect, TellsInTheLogWhyItChoseWhatItChose,
           storing({kPassword, {.id = 2, .realm = "b.example"}}))) {
     story.advance(5s);
     story.expectLog(
-        {">>>> Enter connectNetwork",
-         "\tIterate over all BSS list to find if any matches with any stored credential.",
-         "Enter findBestMatchBssAndCredential...",
-         "------------------------------------------------------------------",
-         "\t[1] Checking HS20 network with ssid=####first#### and bssid=02:aa:00:00:00:01",
-         "\tFound 1 credentials",
-         "\tChecking found credentials...",
-         "\tChecking credential with id=2 name=name2, realm=b.example, priority=2",
-         "\tSelected cred id=2",
-         "\tSelecting credential with id=2 name=name2 and bss with ssid=first",
-         "\tHome SP ssid=first, bHomeSP=0",
-         "\t[2] Checking HS20 network with ssid=####second#### and bssid=02:aa:00:00:00:02",
-         "\tSelected cred id=1",
-         "\tSelecting credential with id=1 name=name1 and bss with ssid=second\tReplacing credential "
-         "with id=2 name=name2 and ssid=first",
-         "\tHome SP ssid=second, bHomeSP=0",
-         "!!!Found a credential with id=1 for network with ssid=second",
-         "!!!Creating a new network profile",
-         "Adding a new EAP-TTLS network profile...",
-         "\tUsername=u1, password=p1",
-         "Not found cred2ssid entry: credId=1, ssid=second, adding a new entry with numRetries=0",
-         "Going to connect to network with ssid=second",
-         "Increase retry numbers for cred id=1, ssid=second",
-         "\tIncrease cred2ssid num retries: credId=1, ssid=second, numRetries=0",
-         "Connect to network second",
-         "Network profile for ssid=second",
-         "\tInterworking: Connect with 02:aa:00:00:00:02",
-         "Connection start event: connection initiated by HS20, profile name=second",
-         "Connection result initiated by HS20, clearing the cache, profile name=second.",
-         "Connection succeeded! profile name=second",
-         "Supplicant state changed from Initialized to Connected",
-         ">>>>Clear cred num retries on conn success: profileName=second",
-         "Reason code desc=The operation was successful.",
-         "Send connection result to vexa.",
-         "Send connection status to vexa"});
+        ">>>> Enter connectNetwork",
+        "\tIterate over all BSS list to find if any matches with any stored credential.",
+        "Enter findBestMatchBssAndCredential...",
+        "------------------------------------------------------------------",
+        "\t[1] Checking HS20 network with ssid=####first#### and bssid=02:aa:00:00:00:01",
+        "\tFound 1 credentials", "\tChecking found credentials...",
+        "\tChecking credential with id=2 name=name2, realm=b.example, priority=2", "\tSelected cred id=2",
+        "\tSelecting credential with id=2 name=name2 and bss with ssid=first",
+        "\tHome SP ssid=first, bHomeSP=0",
+        "\t[2] Checking HS20 network with ssid=####second#### and bssid=02:aa:00:00:00:02",
+        "\tSelected cred id=1",
+        "\tSelecting credential with id=1 name=name1 and bss with ssid=second\tReplacing credential "
+        "with id=2 name=name2 and ssid=first",
+        "\tHome SP ssid=second, bHomeSP=0", "!!!Found a credential with id=1 for network with ssid=second",
+        "!!!Creating a new network profile", "Adding a new EAP-TTLS network profile...",
+        "\tUsername=u1, password=p1",
+        "Not found cred2ssid entry: credId=1, ssid=second, adding a new entry with numRetries=0",
+        "Going to connect to network with ssid=second", "Increase retry numbers for cred id=1, ssid=second",
+        "\tIncrease cred2ssid num retries: credId=1, ssid=second, numRetries=0", "Connect to network second",
+        "Network profile for ssid=second", "\tInterworking: Connect with 02:aa:00:00:00:02",
+        "Connection start event: connection initiated by HS20, profile name=second",
+        "Connection result initiated by HS20, clearing the cache, profile name=second.",
+        "Connection succeeded! profile name=second", "Supplicant state changed from Initialized to Connected",
+        ">>>>Clear cred num retries on conn success: profileName=second",
+        "Reason code desc=The operation was successful.", "Send connection result to vexa.",
+        "Send connection status to vexa");
 }
 
 STORY(AutoConnect, TellsInTheLogHowItGaveUp,
       air({network(1, "cafe", both())}, storing({kCertificate, kSecondPassword}))) {
     story.advance(60s);
-    story.expectLog({"!!!Creating a new network profile",
-                     "Adding a new EAP-TLS network profile with auth mode=machineOrUser...",
-                     "Connection failed! profile name=cafe",
-                     "Connection using EAP-TLS with authMode=machineOrUser failed,trying to use EAP-TLS with "
-                     "authMode=machine.",
-                     "Adding a new EAP-TLS network profile with auth mode=machine...",
-                     "Connection failed! profile name=cafe",
-                     "Reason code desc=The user name or password is not correct, or the certificate wa",
-                     "\tRetry number exceeds maximum retry limit, skip this credential id=1, ssid=cafe",
-                     "\tSelected cred id=2",
-                     "Profile exists for ssid=cafe",
-                     "\tEAP method doesn't matches, create new profile.",
-                     "!!!Creating a new network profile",
-                     "Adding a new EAP-TTLS network profile...",
-                     "Connection failed! profile name=cafe",
-                     "\tSelected cred id=2",
-                     "\tEAP method matches, don't create new profile.",
-                     "\tIncrease cred2ssid num retries: credId=2, ssid=cafe, numRetries=1",
-                     "Connection failed! profile name=cafe",
-                     "\tRetry number exceeds maximum retry limit, skip this credential id=1, ssid=cafe",
-                     "\tRetry number exceeds maximum retry limit, skip this credential id=2, ssid=cafe",
-                     "\t No credential found.",
-                     "No matching network was found based on configured credentials."});
+    story.expectLog("!!!Creating a new network profile",
+                    "Adding a new EAP-TLS network profile with auth mode=machineOrUser...",
+                    "Connection failed! profile name=cafe",
+                    "Connection using EAP-TLS with authMode=machineOrUser failed,trying to use EAP-TLS with "
+                    "authMode=machine.",
+                    "Adding a new EAP-TLS network profile with auth mode=machine...",
+                    "Connection failed! profile name=cafe",
+                    "Reason code desc=The user name or password is not correct, or the certificate wa",
+                    "\tRetry number exceeds maximum retry limit, skip this credential id=1, ssid=cafe",
+                    "\tSelected cred id=2", "Profile exists for ssid=cafe",
+                    "\tEAP method doesn't matches, create new profile.", "!!!Creating a new network profile",
+                    "Adding a new EAP-TTLS network profile...", "Connection failed! profile name=cafe",
+                    "\tSelected cred id=2", "\tEAP method matches, don't create new profile.",
+                    "\tIncrease cred2ssid num retries: credId=2, ssid=cafe, numRetries=1",
+                    "Connection failed! profile name=cafe",
+                    "\tRetry number exceeds maximum retry limit, skip this credential id=1, ssid=cafe",
+                    "\tRetry number exceeds maximum retry limit, skip this credential id=2, ssid=cafe",
+                    "\t No credential found.",
+                    "No matching network was found based on configured credentials.");
 }
 
 STORY(AutoConnect, SwitchedOffInTheFileItBuildsTheProfileOnceAndConnectsNothing,
       air({kCafe}, storing({kPassword}, {.autoConnect = false}))) {
     story.advance(60s);
     expectStanding(story, {.requests = ""});
-    story.expectLog({"!!!Creating a new network profile", "connectNetwork returns with op succeeded.",
-                     "\tEAP method matches, don't create new profile.",
-                     "connectNetwork returns with op succeeded."});
+    story.expectLog("!!!Creating a new network profile", "connectNetwork returns with op succeeded.",
+                    "\tEAP method matches, don't create new profile.",
+                    "connectNetwork returns with op succeeded.");
     story.expect("profiles", count(story.messages(), "!!!Creating"), 1);
     story.expect("attempts that count", count(story.messages(), "Increase retry"), 0);
 }
@@ -187,10 +174,10 @@ STORY(AutoConnect, ARefusedRequestCostsAnAttempt,
           storing({kPassword}) + R"(,"timeline":[{"atMs":0,"do":"fail","call":"WlanConnect","error":50}])")) {
     story.advance(60s);
     expectStanding(story, {.requests = "cafe ttls u1 = 50; cafe ttls u1"});
-    story.expectLog({"WlanConnect call failed with error code=50.", "ERROR: Connect to network failed.",
-                     "connectNetwork returns error.",
-                     "\tIncrease cred2ssid num retries: credId=1, ssid=cafe, numRetries=1",
-                     "Connection succeeded! profile name=cafe"});
+    story.expectLog("WlanConnect call failed with error code=50.", "ERROR: Connect to network failed.",
+                    "connectNetwork returns error.",
+                    "\tIncrease cred2ssid num retries: credId=1, ssid=cafe, numRetries=1",
+                    "Connection succeeded! profile name=cafe");
 }
 
 STORY(AutoConnect, SaysThatThereIsNoAccessWithoutANameServer,

@@ -33,14 +33,14 @@ TEST(Disconnect, KeepsAutoConnectAwayUntilTheUserAsksAgain) {
         expectStanding(story, {.requests = "disconnect", .eapMethod = 0, .outcomes = "networks"});
         story.advance(120s);
         expectStanding(story, {.requests = "disconnect", .connected = "-"});
-        story.expectLog({"Disconnecting from connecting/connected BSS...",
-                         "Manually disconnect from a HS20 network.",
-                         "We are going to block network with ssid=cafe",
-                         "The network with ssid=cafe and mac address=02:aa:00:00:00:01 has been blocked due "
-                         "to user manually disconnect from this network.",
-                         "Received Wlan disconnected event.", "Reason code desc=The user disconnected.",
-                         "This network has been disconnected by user, skip auto connecting to ssid=cafe",
-                         "No matching network was found based on configured credentials."});
+        story.expectLog("Disconnecting from connecting/connected BSS...",
+                        "Manually disconnect from a HS20 network.",
+                        "We are going to block network with ssid=cafe",
+                        "The network with ssid=cafe and mac address=02:aa:00:00:00:01 has been blocked due "
+                        "to user manually disconnect from this network.",
+                        "Received Wlan disconnected event.", "Reason code desc=The user disconnected.",
+                        "This network has been disconnected by user, skip auto connecting to ssid=cafe",
+                        "No matching network was found based on configured credentials.");
         story.play({connecting("cafe")});
         story.advance(5s);
         expectStanding(story, {.connected = "cafe"});
@@ -56,8 +56,8 @@ TEST(Disconnect, OfWhatIsNotConnectedChangesNothing) {
             story.play({disconnecting(name)});
             story.advance(5s);
             expectStanding(story, {.requests = "", .connected = "cafe"});
-            story.expectLog({"ERROR: Connected ssid=cafe while requesting disconnect from ssid=" +
-                             name.substr(0, name.find('\0'))});
+            story.expectLog("ERROR: Connected ssid=cafe while requesting disconnect from ssid=" +
+                            name.substr(0, name.find('\0')));
         });
 }
 
@@ -65,7 +65,7 @@ STORY(Disconnect, WithNothingConnectedSaysSo, air({kCafe})) {
     story.advance(5s);
     story.play({disconnecting("cafe")});
     expectStanding(story, {.requests = ""});
-    story.expectLog({"ERROR: Cannot get connected BSS."});
+    story.expectLog("ERROR: Cannot get connected BSS.");
 }
 
 // One result, and no next step: neither for the machine nor with another credential.
@@ -80,8 +80,8 @@ void endsForGood(const std::vector<StoredCredential>& credentials, const std::st
         story.play({disconnecting("cafe")});
         story.advance(60s);
         expectStanding(story, {request + "; disconnect", "0 no access", "-", 0});
-        story.expectLog(
-            {"Connection failed! profile name=cafe", "Reason code desc=The connection was cancelled."});
+        story.expectLog("Connection failed! profile name=cafe",
+                        "Reason code desc=The connection was cancelled.");
     }) << request;
 }
 
@@ -124,7 +124,7 @@ void blocksNothing(const std::vector<std::string>& before, const std::string& re
         story.perform(report);
         lines.insert(lines.begin(),
                      "### IHV reports HS20 network has been disconnected manually by user. ###");
-        story.expectLog(lines);
+        story.expectLines(lines);
         story.expect("blocks", blocks(story), 0);
     });
 }
@@ -157,7 +157,7 @@ TEST(UserLeavesBySystem, BlocksNothingForAnotherNetwork) {
 STORY(UserLeavesBySystem, BlocksNothingBeforeTheFirstConnection, air({kCafe})) {
     story.advance(5s);
     story.perform(kUserLeft);
-    story.expectLog({"No last connection history."});
+    story.expectLog("No last connection history.");
     story.expect("blocks", blocks(story), 0);
 }
 
@@ -168,7 +168,7 @@ TEST(UserLeavesBySystem, BlocksUpToASecondAfterTheEndOfTheConnection) {
             story.perform(on("hide", 1));
             story.advance(milliseconds(pause));
             story.perform(kUserLeft);
-            story.expectLog({"Connection disconnected earlier."});
+            story.expectLog("Connection disconnected earlier.");
             story.expect("blocks", blocks(story), pause <= 1000 ? 1 : 0);
         });
 }
@@ -215,7 +215,7 @@ void changesSession(bool isByClient, int pause, const char* connected, const cha
             lines.push_back("The network with ssid=cafe has been blocked for " + std::to_string(pause) +
                             " millisec");
         lines.emplace_back(line);
-        story.expectLog(lines);
+        story.expectLines(lines);
         story.advance(30s);
         expectStanding(story, {.connected = connected});
     });
@@ -233,7 +233,7 @@ TEST(SessionChange, OpensWhatWasBlockedLessThan800MillisecondsAgo) {
         changesSession(true, pause, "-", user);
 }
 
-TEST(SessionChange, IsToldByItsKind) {
+STORY(SessionChange, IsToldByItsKind, "{}") {
     const std::vector<std::pair<int, std::string>> kinds = {
         {0, "[Session] Unknown event type."},
         {1, "[Session] A session was connected to the console session."},
@@ -248,18 +248,17 @@ TEST(SessionChange, IsToldByItsKind) {
         {10, "[Session] Unknown event type."},
         {1000, "[Session] Unknown event type."},
     };
-    EXPECT_STORY("{}", [&](Story& story) {
-        for (const auto& [kind, line] : kinds) {
-            story.forget();
-            story.act("sessionChange", R"("sessionId":2,"eventType":)" + std::to_string(kind));
-            story.expectLog(
-                {"\tEventType=" + std::to_string(kind) + ", sessionId=2", line, "Enter resetAllNumRetries."});
-        }
+
+    for (const auto& [kind, line] : kinds) {
         story.forget();
-        story.perform(moduleMessage(6, bytesOfHex("01000000020000")));
-        story.expect("log of half a message", story.messages(),
-                     "### [Session] IHV reports session changed. ###\n");
-    });
+        story.act("sessionChange", R"("sessionId":2,"eventType":)" + std::to_string(kind));
+        story.expectLog("\tEventType=" + std::to_string(kind) + ", sessionId=2", line,
+                        "Enter resetAllNumRetries.");
+    }
+    story.forget();
+    story.perform(moduleMessage(6, bytesOfHex("01000000020000")));
+    story.expect("log of half a message", story.messages(),
+                 "### [Session] IHV reports session changed. ###\n");
 }
 
 TEST(Unblocking, ByTheSystemsOwnConnectionTakesWhatIsFresh) {

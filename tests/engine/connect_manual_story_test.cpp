@@ -77,43 +77,38 @@ STORY(ManualConnect, TellsInTheLogHowItWalksThroughTheCredentials,
     story.play({connecting("cafe")});
     story.advance(5s);
     story.expectLog(
-        {"###Manually connect to a BSS started.###",
-         "###We are actually going to connect to HS20 network now.###",
-         "Unblocked network with ssid=cafe and mac address=02:aa:00:00:00:01 due to user has manually "
-         "connected to it.",
-         "Try to connect to HS20 network using next credential.",
-         "Selecting credential with id=1",
-         "Adding a new EAP-TTLS network profile...",
-         "Connection start event: connection initiated by HS20, profile name=cafe",
-         "Manual connection started.",
-         "Connection failed! profile name=cafe",
-         "Manual connection failed, we will try to use next credential.",
-         "Try to connect to HS20 network using next credential.",
-         "We have tried credential with id=1, skipping...",
-         "Selecting credential with id=2",
-         "Adding a new EAP-TLS network profile with auth mode=machineOrUser...",
-         "connResult=1 after invoking tryConnectHs20BssUsingNextCredential.",
-         "Successfully initiated connection to HS20 network=cafe using next credential.",
-         "Connection using EAP-TLS with authMode=machineOrUser failed,trying to use EAP-TLS with "
-         "authMode=machine.",
-         "Manual connection failed, we will try to use next credential.",
-         "Selecting credential with id=3",
-         "Manual connection failed, we will try to use next credential.",
-         "We have tried credential with id=1, skipping...",
-         "We have tried credential with id=2, skipping...",
-         "We have tried credential with id=3, skipping...",
-         "connResult=2 after invoking tryConnectHs20BssUsingNextCredential.",
-         "We have tried all credentials, connection failed.",
-         "Reason code desc=The user name or password is not correct, or the certificate wa",
-         "Send connection result to vexa."});
+        "###Manually connect to a BSS started.###",
+        "###We are actually going to connect to HS20 network now.###",
+        "Unblocked network with ssid=cafe and mac address=02:aa:00:00:00:01 due to user has manually "
+        "connected to it.",
+        "Try to connect to HS20 network using next credential.", "Selecting credential with id=1",
+        "Adding a new EAP-TTLS network profile...",
+        "Connection start event: connection initiated by HS20, profile name=cafe",
+        "Manual connection started.", "Connection failed! profile name=cafe",
+        "Manual connection failed, we will try to use next credential.",
+        "Try to connect to HS20 network using next credential.",
+        "We have tried credential with id=1, skipping...", "Selecting credential with id=2",
+        "Adding a new EAP-TLS network profile with auth mode=machineOrUser...",
+        "connResult=1 after invoking tryConnectHs20BssUsingNextCredential.",
+        "Successfully initiated connection to HS20 network=cafe using next credential.",
+        "Connection using EAP-TLS with authMode=machineOrUser failed,trying to use EAP-TLS with "
+        "authMode=machine.",
+        "Manual connection failed, we will try to use next credential.", "Selecting credential with id=3",
+        "Manual connection failed, we will try to use next credential.",
+        "We have tried credential with id=1, skipping...", "We have tried credential with id=2, skipping...",
+        "We have tried credential with id=3, skipping...",
+        "connResult=2 after invoking tryConnectHs20BssUsingNextCredential.",
+        "We have tried all credentials, connection failed.",
+        "Reason code desc=The user name or password is not correct, or the certificate wa",
+        "Send connection result to vexa.");
 }
 
 STORY(ManualConnect, ARefusedRequestIsToldAtOnce, kOne) {
     rest(story);
     story.play({failing("WlanConnect", 50), connecting("cafe")});
     expectStanding(story, {.requests = "cafe ttls u1 = 50", .outcomes = "0"});
-    story.expectLog({"WlanConnect call failed with error code=50.", "Try to connect to HS20 network failed.",
-                     "connectBss failed."});
+    story.expectLog("WlanConnect call failed with error code=50.", "Try to connect to HS20 network failed.",
+                    "connectBss failed.");
 }
 
 STORY(ManualConnect, ANextCredentialThatCanNotStartEndsWithoutAWord,
@@ -122,8 +117,8 @@ STORY(ManualConnect, ANextCredentialThatCanNotStartEndsWithoutAWord,
     story.play({failing("WlanConnect", 50, R"("skip":1)"), connecting("cafe")});
     story.advance(5s);
     expectStanding(story, {.requests = "cafe ttls u1; cafe ttls u2 = 50", .outcomes = ""});
-    story.expectLog({"connResult=0 after invoking tryConnectHs20BssUsingNextCredential.",
-                     "ERROR: Try to connect to HS20 network using next credential failed."});
+    story.expectLog("connResult=0 after invoking tryConnectHs20BssUsingNextCredential.",
+                    "ERROR: Try to connect to HS20 network using next credential failed.");
 }
 
 // The system's own connections carry nothing of this program, whatever their outcome.
@@ -133,9 +128,9 @@ void isForeign(const std::string& succeeds, const std::string& result, const std
         story.act("osConnect", R"("ssid":"home","succeeds":)" + succeeds);
         story.advance(1s);
         expectStanding(story, {.connected = connected, .eapMethod = 0, .outcomes = "1 no access"});
-        story.expectLog({"Connection start event: connection not initiated by HS20, profile name=home",
-                         "Connection result not initiated by HS20, profile name=home, result=" + result,
-                         "Send connection result to vexa."});
+        story.expectLog("Connection start event: connection not initiated by HS20, profile name=home",
+                        "Connection result not initiated by HS20, profile name=home, result=" + result,
+                        "Send connection result to vexa.");
         story.expect("results without a start",
                      count(story.messages(), "m_bConnectionStartedByOs is not set"), 0);
     });
@@ -163,8 +158,8 @@ STORY(ForeignConnection, ALongerNameWithTheSameBeginningCountsAsOwn,
     story.advance(1s);
     story.act("connection", R"("code":10,"profileName":"cafe","ssidHex":"636166657465726961")");
     expectStanding(story, {.eapMethod = 2, .outcomes = "1 no access"});
-    story.expectLog({"Connection result initiated by HS20, clearing the cache, profile name=cafe.",
-                     "Connection succeeded! profile name=cafe"});
+    story.expectLog("Connection result initiated by HS20, clearing the cache, profile name=cafe.",
+                    "Connection succeeded! profile name=cafe");
 }
 
 void endsWithItsLine(const std::string& result, const char* line) {
@@ -172,7 +167,7 @@ void endsWithItsLine(const std::string& result, const char* line) {
         rest(story);
         story.play({kSlow, connecting("cafe"), result});
         expectStanding(story, {.eapMethod = 0, .outcomes = ""});
-        story.expectLog({line});
+        story.expectLog(line);
     }) << line;
 }
 
@@ -197,12 +192,12 @@ void waits(const char* what, const char* accepts, const std::vector<std::string>
         story.advance(8s);
         expectStanding(story, end);
         story.expectLog(
-            {"###Manually connect to a BSS started.###",
-             "\tConnection has already been started, maybe by auto connecting thread, we will wait "
-             "until the auto connecting completed, either succeed or fail.",
-             "Connection result initiated by HS20, clearing the cache, profile name=cafe.",
-             "###User manual connecting request pending, we are going to connect now.###",
-             "###We are actually going to connect to HS20 network now.###"});
+            "###Manually connect to a BSS started.###",
+            "\tConnection has already been started, maybe by auto connecting thread, we will wait "
+            "until the auto connecting completed, either succeed or fail.",
+            "Connection result initiated by HS20, clearing the cache, profile name=cafe.",
+            "###User manual connecting request pending, we are going to connect now.###",
+            "###We are actually going to connect to HS20 network now.###");
     }) << what;
 }
 

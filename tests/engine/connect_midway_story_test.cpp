@@ -49,10 +49,10 @@ STORY(Midway, ADeletedCredentialTakesItsProfileWithItAndEndsTheAttemptWithoutAWo
     story.advance(1s);
     story.play({kDeletion});
     story.advance(5s);
-    story.expectLog({"Deleting the credential with id=1", "removeAllCredNumRetryEntries for CredId=1",
-                     "Cred id=1 deleted, removing profile name=cafe",
-                     "Connection result initiated by HS20, clearing the cache, profile name=cafe.",
-                     "ERROR: Cannot get profile in profile manager."});
+    story.expectLog("Deleting the credential with id=1", "removeAllCredNumRetryEntries for CredId=1",
+                    "Cred id=1 deleted, removing profile name=cafe",
+                    "Connection result initiated by HS20, clearing the cache, profile name=cafe.",
+                    "ERROR: Cannot get profile in profile manager.");
     expectStanding(story, {.eapMethod = 0});
 }
 
@@ -66,9 +66,9 @@ TEST(Midway, AnEditedCredentialIsTriedAfreshWithWhatItHoldsNow) {
         story.advance(30s);
         expectStanding(story,
                        {.requests = "cafe ttls u1; cafe ttls right", .connected = "cafe", .eapMethod = 2});
-        story.expectLog({"Updating the credential with id=1", "Cred id=1 deleted, removing profile name=cafe",
-                         "ERROR: Cannot get profile in profile manager.", "!!!Creating a new network profile",
-                         "Connection succeeded! profile name=cafe"});
+        story.expectLog("Updating the credential with id=1", "Cred id=1 deleted, removing profile name=cafe",
+                        "ERROR: Cannot get profile in profile manager.", "!!!Creating a new network profile",
+                        "Connection succeeded! profile name=cafe");
     });
 }
 
@@ -97,10 +97,10 @@ STORY(RealmUpdate, LetsGoOfTheConnectionAsksAnewAndComesBack,
     story.expect("queries", moduleRequests(story, 3), 1);
     story.advance(30s);
     expectStanding(story, {.connected = "cafe", .outcomes = "networks 1 access"});
-    story.expectLog({"UI requested to update HS20 network realm.",
-                     "Disconnecting from connecting/connected BSS...",
-                     "Manually disconnect from a HS20 network.", "Received Wlan disconnected event.",
-                     "We are querying the HS20 network ANQP info, wait."});
+    story.expectLog("UI requested to update HS20 network realm.",
+                    "Disconnecting from connecting/connected BSS...",
+                    "Manually disconnect from a HS20 network.", "Received Wlan disconnected event.",
+                    "We are querying the HS20 network ANQP info, wait.");
 }
 
 STORY(RealmUpdate, OfAConnectionThatIsNoHotspotLetsGoOfItToo, air({network(1, "cafe", ttls())})) {
@@ -110,7 +110,7 @@ STORY(RealmUpdate, OfAConnectionThatIsNoHotspotLetsGoOfItToo, air({network(1, "c
     story.order("UPDATE_NETWORK_REALM");
     expectStanding(story, {.requests = "disconnect"});
     story.expect("queries", moduleRequests(story, 3), 1);
-    story.expectLog({"Manually disconnect from a non-HS20 network."});
+    story.expectLog("Manually disconnect from a non-HS20 network.");
 }
 
 STORY(RealmUpdate, AsksAtOnceWhileNothingIsConnected,
@@ -142,14 +142,14 @@ STORY(HotspotSwitch, OffWhileConnectedLeavesTheNetworkWithoutBlockingIt, air({kC
     expectStanding(story, {.outcomes = "networks hs20 true"});
     story.advance(5s);
     expectStanding(story, {.connected = "cafe", .outcomes = "1 access"});
-    story.expectLog({"Set enable/disable HS20, param=false", "Enter resetAllNumRetries.",
-                     "Send all HS20 networks to vexa.",
-                     "STA is in connected state when user turns of HS20,trying to disconnect from any "
-                     "connected HS20 network.",
-                     "Disconnecting from connecting/connected BSS...",
-                     "Manually disconnect from a HS20 network.",
-                     "HS20 functionality not enabled, wait for user turning it on.",
-                     "Enable/disable HS20 event signaled."});
+    story.expectLog("Set enable/disable HS20, param=false", "Enter resetAllNumRetries.",
+                    "Send all HS20 networks to vexa.",
+                    "STA is in connected state when user turns of HS20,trying to disconnect from any "
+                    "connected HS20 network.",
+                    "Disconnecting from connecting/connected BSS...",
+                    "Manually disconnect from a HS20 network.",
+                    "HS20 functionality not enabled, wait for user turning it on.",
+                    "Enable/disable HS20 event signaled.");
 }
 
 STORY(HotspotSwitch, OffLeavesAConnectionOfTheSystemAlone, air({network(1, "cafe", ttls())}, storing({{}}))) {

@@ -1,12 +1,12 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <array>
 #include <cstdlib>
 #include <random>
 
 #include "engine/ConnectModel.h"
 #include "engine/world/ConnectStory.h"
-#include "engine/world/StoreStory.h"
 
 namespace vexa::test {
 namespace {
@@ -19,12 +19,21 @@ bool chance(Random& random, int percent) {
     return static_cast<int>(random() % 100) < percent;
 }
 
-std::vector<ModelCredential> someCredentials(Random& random) {
-    std::vector<ModelCredential> credentials;
+std::string someRealm(Random& random) {
+    return random() % 2 == 0 ? "a.example" : "b.example";
+}
+
+StoredCredential someCredential(Random& random, int id) {
+    const std::string realm = someRealm(random);
+    const bool isTls = chance(random, 40);
+    return {.id = id, .realm = realm, .isTls = isTls, .autoConnect = chance(random, 80)};
+}
+
+std::vector<StoredCredential> someCredentials(Random& random) {
+    std::vector<StoredCredential> credentials;
     const int count = 1 + static_cast<int>(random() % 5);
     for (int id = 1; id <= count; ++id)
-        credentials.push_back(
-            {id, static_cast<char>('a' + random() % 2), chance(random, 40), chance(random, 80)});
+        credentials.push_back(someCredential(random, id));
     std::shuffle(credentials.begin(), credentials.end(), random);
     return credentials;
 }
@@ -35,7 +44,7 @@ std::vector<ModelNetwork> someNetworks(Random& random) {
     for (std::size_t i = 0; i < count; ++i) {
         ModelNetwork network{};
         network.ssid = std::string("net") + static_cast<char>('A' + i);
-        network.realm = static_cast<char>('a' + random() % 2);
+        network.realm = someRealm(random);
         network.takesTls = chance(random, 70);
         network.takesTtls = !network.takesTls || chance(random, 70);
         network.letsInPassword = chance(random, 60);
@@ -48,18 +57,8 @@ std::vector<ModelNetwork> someNetworks(Random& random) {
     return networks;
 }
 
-std::string realmName(char realm) {
-    return std::string(1, realm) + ".example";
-}
-
-std::string scenarioOf(const std::vector<ModelCredential>& credentials,
+std::string scenarioOf(const std::vector<StoredCredential>& credentials,
                        const std::vector<ModelNetwork>& networks) {
-    std::vector<StoredCredential> stored;
-    for (const ModelCredential& credential : credentials)
-        stored.push_back({.id = credential.id,
-                          .realm = realmName(credential.realm),
-                          .isTls = credential.isTls,
-                          .autoConnect = credential.autoConnect});
     std::vector<std::string> air;
     int number = 0;
     for (const ModelNetwork& n : networks) {
@@ -70,19 +69,19 @@ std::string scenarioOf(const std::vector<ModelCredential>& credentials,
         if (n.letsInUser) rule(R"({"eapMethod":13})");
         if (n.letsInMachineOnly) rule(R"({"eapMethod":13,"authMode":"machine"})");
         air.push_back(network(++number, n.ssid,
-                              realms(realmName(n.realm), methods) + "," + lettingIn(rules) +
-                                  R"(,"visible":)" + (n.isVisible ? "true" : "false")));
+                              realms(n.realm, methods) + "," + lettingIn(rules) + R"(,"visible":)" +
+                                  (n.isVisible ? "true" : "false")));
     }
-    return test::air(air, storing(stored));
+    return test::air(air, storing(credentials));
 }
 
-std::string credentialData(const ModelCredential& credential) {
+std::string credentialData(const StoredCredential& credential) {
     const std::string id = std::to_string(credential.id);
     const std::string members = R"("AccessType":1,"Id":)" + id + R"(,"AutoConnect":)" +
                                 (credential.autoConnect ? "true" : "false") + R"(,"CredentialName":"name)" +
                                 id + (credential.isTls ? R"(","CaCert":"ca)" : R"(","Username":"u)") + id +
                                 "\"";
-    return (credential.isTls ? tlsData : ttlsData)(realmName(credential.realm), members);
+    return (credential.isTls ? tlsData : ttlsData)(credential.realm, members);
 }
 
 /// The same steps for the model and for the machine.
@@ -115,42 +114,27 @@ private:
     }
 
     void step() {
-        switch (m_random() % 9) {
-            case 0:
-                return drop();
-            case 1:
-                m_model.changeSession();
-                return act(doing("sessionChange", R"("eventType":5,"sessionId":1)"));
-            case 2:
-                return toggleRadio();
-            case 3:
-            case 4:
-                return moveNetwork();
-            case 5:
-                return connectByHand();
-            case 6:
-                return disconnectByHand();
-            case 7:
-                return changeCredential();
-            default:
-                return addCredential();
-        }
+        static constexpr std::array<void (Play::*)(), 9> kSteps = {
+            &Play::drop,         &Play::changeSession, &Play::toggleRadio,      &Play::moveNetwork,
+            &Play::moveNetwork,  &Play::connectByHand, &Play::disconnectByHand, &Play::changeCredential,
+            &Play::addCredential};
+        (this->*kSteps[m_random() % kSteps.size()])();
     }
 
-    void act(const std::string& action) {
-        m_told += action + "\n";
-        m_story.perform(action);
-    }
-
-    void order(const std::string& command, const std::string& data) {
-        m_told += command + " " + data + "\n";
-        m_story.order(command, data);
+    void act(const std::string& deed) {
+        m_told += deed + "\n";
+        m_story.play({deed});
     }
 
     void drop() {
         if (m_model.connected().empty()) return;
         m_model.drop();
         act(doing("dropConnection"));
+    }
+
+    void changeSession() {
+        m_model.changeSession();
+        act(doing("sessionChange", R"("eventType":5,"sessionId":1)"));
     }
 
     void toggleRadio() {
@@ -179,38 +163,37 @@ private:
         const std::string name = networks[m_random() % networks.size()].ssid;
         if (name == m_model.connected()) return;
         m_model.connect(name);
-        order("CONNECT_NETWORK", R"({"NetWorkName":")" + name + "\"}");
+        act(connecting(name));
     }
 
     void disconnectByHand() {
         const std::string name = m_model.connected();
         if (name.empty()) return;
         m_model.disconnect();
-        order("DISCONNECT_NETWORK", R"({"NetWorkName":")" + name + "\"}");
+        act(disconnecting(name));
     }
 
     void changeCredential() {
         if (m_model.credentials().empty()) return;
-        ModelCredential changed = m_model.credentials()[m_random() % m_model.credentials().size()];
+        StoredCredential changed = m_model.credentials()[m_random() % m_model.credentials().size()];
         changed.autoConnect = chance(m_random, 70);
         if (chance(m_random, 40)) {
             m_model.removeCredential(changed.id);
-            order("DELETE_CREDENTIAL", "{\"Id\":" + std::to_string(changed.id) + "}");
+            act(sending("DELETE_CREDENTIAL", "{\"Id\":" + std::to_string(changed.id) + "}"));
         } else {
             m_model.editCredential(changed.id, changed.autoConnect);
-            order("EDIT_CREDENTIAL", credentialData(changed));
+            act(sending("EDIT_CREDENTIAL", credentialData(changed)));
         }
     }
 
     void addCredential() {
-        const ModelCredential added{m_nextId, static_cast<char>('a' + m_random() % 2), chance(m_random, 40),
-                                    chance(m_random, 80)};
+        const StoredCredential added = someCredential(m_random, m_nextId);
         // The table takes one credential of each kind for a realm.
-        for (const ModelCredential& held : m_model.credentials())
+        for (const StoredCredential& held : m_model.credentials())
             if (held.realm == added.realm && held.isTls == added.isTls) return;
         ++m_nextId;
         m_model.addCredential(added);
-        order("ADD_CREDENTIAL", credentialData(added));
+        act(sending("ADD_CREDENTIAL", credentialData(added)));
     }
 
     Random m_random;
@@ -231,7 +214,7 @@ TEST(ConnectModel, ForeseesEveryRequestOfRandomStories) {
     const std::uint64_t count = numberInEnvironment("VEXA_MODEL_SEEDS", 45);
     for (std::uint64_t seed = first; seed < first + count; ++seed) {
         Random random(seed);
-        const std::vector<ModelCredential> credentials = someCredentials(random);
+        const std::vector<StoredCredential> credentials = someCredentials(random);
         const std::vector<ModelNetwork> networks = someNetworks(random);
         const Ending ending = runStory({.seed = seed}, scenarioOf(credentials, networks), [&](Story& story) {
             ConnectModel model(credentials, networks);

@@ -9,11 +9,9 @@ namespace {
 
 using namespace std::chrono_literals;
 
-constexpr const char* kTimeOut = "Timeout happens in the network connecting thread.";
+const std::string kTimeOut = "Timeout happens in the network connecting thread.";
 constexpr const char* kListChanged = "HS20 network list changed event signaled.";
 constexpr const char* kAnqpReady = "ANQP info ready event signaled.";
-
-constexpr const char* kAsleep = "Current session is not active, sleep for a while and continue.";
 constexpr const char* kNoNetwork = "No HS20 BSS, wait for HS20 network list change.";
 constexpr const char* kNoCredential = "No credential, wait for user to add credential.";
 constexpr const char* kQuerying = "We are querying the HS20 network ANQP info, wait.";
@@ -21,7 +19,12 @@ constexpr const char* kEnds = "The NetworkingMgr thread is to be terminated...";
 
 const std::string kNetwork = network(1, "A", ttls());
 const std::string kMute = network(1, "Mute", R"("anqp":"never")");
-const std::string kAway = R"("session":"disconnected")";
+
+const std::string kAway = doing("setSession", R"("session":"disconnected")");
+
+// A stored credential that fits no network here, and one that does.
+const std::string kCredential = sending("ADD_CREDENTIAL", ttlsData("elsewhere.example"));
+const std::string kFitting = sending("ADD_CREDENTIAL", ttlsData("a.example", R"("AutoConnect":true)"));
 
 // What the log tells of the rounds while this time passes.
 std::string roundsIn(World& world, platform::Duration span) {
@@ -31,68 +34,42 @@ std::string roundsIn(World& world, platform::Duration span) {
 }
 
 std::string round(const std::string& gate) {
-    return std::string(kTimeOut) + " | " + gate + "\n";
+    return kTimeOut + " | " + gate + "\n";
 }
 
-// A stored credential that fits no network here, or one that does.
-void addCredential(World& world) {
-    world.order("ADD_CREDENTIAL", ttlsData("elsewhere.example"));
-}
-
-void addFittingCredential(World& world) {
-    world.order("ADD_CREDENTIAL", ttlsData("a.example", R"("AutoConnect":true)"));
-}
-
-/// There are one network and a credential, unless the case says otherwise.
-struct Gate {
-    std::string action;
-    std::string line;
-    std::string scenario = air({kNetwork});
-    bool hasCredential = true;
-};
-
-Gate notDisconnected(const std::string& action, const std::string& name) {
-    return {
-        action,
-        "Supplicant not in disconnected state, skip this round of network connecting. | Queried supplicant "
-        "state=" +
-            name};
-}
-
-std::vector<Gate> gates() {
-    std::vector<Gate> all = {
-        {kRadioOff, "Radio turned off, wait it be turned on."},
-        {doing("radio", R"("hardware":"off")"), kNoNetwork, air({})},
-        {"", kNoNetwork, "{}"},
-        {"", kNoCredential, air({kNetwork}), false},
-        {"", kNoCredential, air({network(1, "A")}), false},
-        {doing("setSession", kAway), kAsleep},
-    };
-    const std::map<int, const char*> states = {{0, "InvalidState"},  {1, "Connected"},   {2, "InvalidState"},
-                                               {3, "Disconnecting"}, {5, "Associating"}, {6, "Scanning"},
-                                               {7, "Authenticating"}};
-    for (const auto& [state, name] : states)
-        all.push_back(notDisconnected(doing("interfaceState", R"("value":)" + std::to_string(state)), name));
-    const std::string failure = failing("WlanQueryInterface", 31, R"("times":1000)");
-    all.push_back(notDisconnected(failure, "InvalidState"));
-    all.back().line = "WlanQueryInterface failed in Supplicant::queryState. | " + all.back().line;
-    return all;
+/// When all this has happened, a round begins every ten seconds and this gate holds it.
+void holds(const std::string& gate, const std::vector<std::string>& deeds,
+           const std::string& scenario = air({kNetwork})) {
+    EXPECT_STORY(scenario, [&](Story& story) {
+        settle(story);
+        story.play(deeds);
+        story.advance(40s);
+        story.expect("rounds", roundsIn(story, 30s), round(gate) + round(gate) + round(gate));
+    }) << gate;
 }
 
 TEST(ConnectingThread, TellsInEachRoundWhichGateHeldIt) {
-    for (const Gate& gate : gates())
-        EXPECT_STORY(gate.scenario, [&](Story& story) {
-            if (gate.hasCredential) addCredential(story);
-            settle(story);
-            if (!gate.action.empty()) story.perform(gate.action);
-            story.advance(40s);
-            const std::string told = roundsIn(story, 10s);
-            // A round that sleeps is not over when ten seconds are.
-            if (gate.line == kAsleep)
-                story.expect("end of the rounds", told.substr(told.rfind('|') + 2), kAsleep);
-            else
-                story.expect("rounds", told, round(gate.line));
-        }) << gate.action;
+    holds("Radio turned off, wait it be turned on.", {kCredential, kRadioOff});
+    holds(kNoNetwork, {}, "{}");
+    holds(kNoNetwork, {kCredential, doing("radio", R"("hardware":"off")")}, air({}));
+    holds(kNoCredential, {});
+    holds(kNoCredential, {}, air({network(1, "A")}));
+    holds("Connection already started, wait for connection operation completed event signaled.",
+          {kFitting, doing("interfaceState", R"("value":4)")}, air({kNetwork}, R"("connectMs":100000)"));
+}
+
+TEST(ConnectingThread, GoesOnOnlyWithASupplicantThatIsDisconnected) {
+    const std::string skips =
+        "Supplicant not in disconnected state, skip this round of network connecting. | ";
+    const std::string state = "Queried supplicant state=";
+    holds("WlanQueryInterface failed in Supplicant::queryState. | " + skips + state + "InvalidState",
+          {kCredential, failing("WlanQueryInterface", 31, R"("times":1000)")});
+    const std::pair<int, const char*> states[] = {
+        {0, "InvalidState"}, {1, "Connected"}, {2, "InvalidState"},  {3, "Disconnecting"},
+        {5, "Associating"},  {6, "Scanning"},  {7, "Authenticating"}};
+    for (const auto& [number, name] : states)
+        holds(skips + state + name,
+              {kCredential, doing("interfaceState", R"("value":)" + std::to_string(number))});
 }
 
 STORY(ConnectingThread, WithTheFunctionOffNoRoundAsksTheAdapterAnything, air({network(1, "A")})) {
@@ -104,19 +81,11 @@ STORY(ConnectingThread, WithTheFunctionOffNoRoundAsksTheAdapterAnything, air({ne
     story.expect("calls", story.perform(R"({"query":"calls","all":true})").size(), 0U);
 }
 
-STORY(ConnectingThread, RunsARoundEveryTenSecondsWhenNothingHappens, "{}") {
-    settle(story);
-    std::string wanted;
-    for (int i = 0; i < 6; ++i)
-        wanted += round(kNoNetwork);
-    story.expect("rounds", roundsIn(story, 60s), wanted);
-}
-
 STORY(ConnectingThread, AnUpdateWakesItTwiceOnceForTheListAndOnceForTheData, air({kNetwork})) {
     settle(story);
     story.perform(kReport);
     story.advance(0ms);
-    story.expectLog({kListChanged, kAnqpReady});
+    story.expectLog(kListChanged, kAnqpReady);
     for (const auto& [line, times] : {std::pair(kListChanged, 1), {kAnqpReady, 1}, {kNoCredential, 2}})
         story.expect(line, count(story.messages(), line), times);
 }
@@ -127,9 +96,7 @@ STORY(ConnectingThread, TakesTheEventsThatWaitInTheirOrder, {.seed = 100, .seeds
     story.perform(kRadioOff);
     story.advance(1s);
     story.forget();
-    story.perform(kRadioOn);
-    addCredential(story);
-    story.play({kReport, kHs20Off});
+    story.play({kRadioOn, kCredential, kReport, kHs20Off});
     story.advance(9s);
     std::string wakes;
     std::istringstream stream(story.messages());
@@ -143,54 +110,54 @@ STORY(ConnectingThread, SleepsTenSecondsAfterARadioEventBeforeItsGates, "{}") {
     story.perform(kRadioOff);
     story.expect("before ten seconds", roundsIn(story, 9999ms), "");
     story.advance(1ms);
-    story.expectLog({"Radio turned off, wait it be turned on."});
+    story.expectLog("Radio turned off, wait it be turned on.");
 }
 
 STORY(ConnectingThread, AsksForMissingDataFirstAndWaitsForTheEndOfTheQuery,
       air({kMute, network(2, "B", ttls())}, R"("anqpMs":3000)")) {
-    addCredential(story);
+    story.play({kCredential});
     settle(story);
     story.advance(20s);
     const std::string told = roundsIn(story, 13s);
     story.expectLog(
-        {"Not all HS20 network ANQP info fetched, we will query the ANQP info first before "
-         "auto connecting.",
-         "SIGMA: Enter Supplicant::queryHs20NetworkAnqpInfo.",
-         "Supplicant::queryHs20NetworkAnqpInfo completed.", "ANQP querying finished."});
+        "Not all HS20 network ANQP info fetched, we will query the ANQP info first before "
+        "auto connecting.",
+        "SIGMA: Enter Supplicant::queryHs20NetworkAnqpInfo.",
+        "Supplicant::queryHs20NetworkAnqpInfo completed.", "ANQP querying finished.");
     story.expect("one network without data stops them all", count(told, "connectNetwork"), 0);
 }
 
 STORY(ConnectingThread, AQueryThatWasRefusedIsAskedAgainInTheNextRound, air({kMute})) {
     settle(story);
-    story.perform(failing("WlanIhvControl", 31, R"("match":"anqpQuery","times":2)"));
-    addCredential(story);
-    story.expectLog({"WlanIhvControl call failed in sendIhvCmd with result code=31"});
+    story.play({failing("WlanIhvControl", 31, R"("match":"anqpQuery","times":2)"), kCredential});
+    story.expectLog("WlanIhvControl call failed in sendIhvCmd with result code=31");
     story.expect("waits", count(story.messages(), kQuerying), 0);
 }
 
 STORY(ConnectingThread, AnEndOfTheQueryThatBringsNoListLeavesTheQueryRunning,
       air({kMute}, R"("anqpMs":3000)")) {
     settle(story);
-    story.perform(failing("WlanIhvControl", 31, R"("match":"bssList")"));
-    addCredential(story);
+    story.play({failing("WlanIhvControl", 31, R"("match":"bssList")"), kCredential});
     story.advance(5s);
     story.expect("rounds", roundsIn(story, 20s), round(kQuerying) + round(kQuerying));
     story.act("completeAnqpQuery");
     story.advance(0ms);
-    story.expectLog({"ANQP querying finished."});
+    story.expectLog("ANQP querying finished.");
 }
 
-STORY(ConnectingThread, ARoundInADisconnectedSessionLastsFiveSecondsMore, air({kNetwork}, kAway)) {
-    addCredential(story);
+STORY(ConnectingThread, ARoundInADisconnectedSessionLastsFiveSecondsMore, air({kNetwork})) {
+    story.play({kCredential, kAway});
     settle(story);
     story.advance(40s);
     const std::string told = roundsIn(story, 60s);
-    story.expect("rounds", count(told, kAsleep), 4);
+    story.expect("rounds",
+                 count(told, kTimeOut + " | Current session is not active, sleep for a while and continue."),
+                 4);
     story.expect("attempts", count(told, "connectNetwork"), 0);
 }
 
 STORY(ConnectingThread, WithEveryGateOpenItFindsNothingToDoAndSaysSo, air({kNetwork})) {
-    addCredential(story);
+    story.play({kCredential});
     settle(story);
     story.advance(20s);
     const std::string told = roundsIn(story, 10s);
@@ -198,20 +165,9 @@ STORY(ConnectingThread, WithEveryGateOpenItFindsNothingToDoAndSaysSo, air({kNetw
     story.expect("end", told.ends_with("connectNetwork returns with op cancelled.\n"), true);
 }
 
-STORY(ConnectingThread, WaitsForTheResultOfAnAttemptThatIsUnderWay,
-      air({kNetwork}, R"("connectMs":100000)")) {
-    addFittingCredential(story);
-    settle(story);
-    story.act("interfaceState", R"("value":4)");
-    story.advance(20s);
-    story.expect("rounds", roundsIn(story, 10s),
-                 round("Connection already started, wait for connection operation completed event "
-                       "signaled."));
-}
-
 STORY(ConnectingThread, ConnectsToNobodyUntilTheLastNetworkHasAnswered,
       air({kMute, network(2, "A", ttls())}, R"("connectMs":100000)")) {
-    addFittingCredential(story);
+    story.play({kFitting});
     story.advance(100s);
     expectStanding(story, {.requests = ""});
     story.play({on("setNetwork", 1, R"("anqp":"ready",)" + tls("m.example")), kReport});
@@ -219,15 +175,13 @@ STORY(ConnectingThread, ConnectsToNobodyUntilTheLastNetworkHasAnswered,
     expectStanding(story, {.requests = "A ttls user"});
 }
 
-void endsWhenTheAdapterGoes(const char* what, const std::vector<std::string>& before, int pauseMs,
-                            const std::string& members = "") {
-    EXPECT_STORY({.seed = 200, .seeds = 20}, air({kNetwork}, members), [&](Story& story) {
+void endsWhenTheAdapterGoes(const char* what, int pauseMs, const std::vector<std::string>& before) {
+    EXPECT_STORY({.seed = 200, .seeds = 20}, air({kNetwork}), [&](Story& story) {
         const auto handles = [&] { return story.perform(R"({"query":"handles"})").asInt(); };
-        addCredential(story);
+        story.play({kCredential});
         settle(story);
         const int handlesBefore = handles();
-        for (const std::string& action : before)
-            story.perform(action);
+        story.play(before);
         story.advance(std::chrono::milliseconds(pauseMs));
         story.forget();
         story.act("pullAdapter");
@@ -242,11 +196,11 @@ void endsWhenTheAdapterGoes(const char* what, const std::vector<std::string>& be
 }
 
 TEST(ConnectingThread, EndsWhereverItIsWhenTheAdapterGoes) {
-    endsWhenTheAdapterGoes("waiting", {}, 0);
-    endsWhenTheAdapterGoes("waiting in the middle", {}, 4000);
-    endsWhenTheAdapterGoes("asleep after the radio", {kRadioOff}, 3000);
-    endsWhenTheAdapterGoes("asleep after the radio for no time yet", {kRadioOff}, 0);
-    endsWhenTheAdapterGoes("asleep at the session gate", {kReport}, 2000, kAway);
+    endsWhenTheAdapterGoes("waiting", 0, {});
+    endsWhenTheAdapterGoes("waiting in the middle", 4000, {});
+    endsWhenTheAdapterGoes("asleep after the radio", 3000, {kRadioOff});
+    endsWhenTheAdapterGoes("asleep after the radio for no time yet", 0, {kRadioOff});
+    endsWhenTheAdapterGoes("asleep at the session gate", 2000, {kAway, kReport});
 }
 
 // The seed decides whether the sleep or the wait for its end is over first, at the same moment.
@@ -254,7 +208,7 @@ TEST(ConnectingThread, OneThatIsLateLeavesItsLineAndEndsByItself) {
     std::string late;
     for (std::uint64_t seed = 300; seed < 360; ++seed) {
         const Ending ending = runStory({.seed = seed}, air({kNetwork}), [](Story& story) {
-            addCredential(story);
+            story.play({kCredential});
             settle(story);
             story.play({kRadioOff, doing("pullAdapter"), doing("insertAdapter")});
             story.advance(60s);

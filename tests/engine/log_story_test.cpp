@@ -65,20 +65,19 @@ STORY(Log, WritesWhatItIsGiven, "{}") {
 }
 
 // Time and text together fill the buffer but for its terminator.
-TEST(Log, CutsWhatDoesNotFit) {
+STORY(Log, CutsWhatDoesNotFit, "{}") {
     const std::string longText(30000, 'x');
     const std::string cut(20479 - std::string("01/05 08:00:00  ").size() - 1, 'x');
     std::string hex;
     while (hex.size() < 6826 * 3)
         hex += " 78";
-    EXPECT_STORY("{}", [&](Story& story) {
-        expectWritten(story, "narrow", kTime + cut + "\n", [&] { Log(3, "%s", longText.c_str()); });
-        expectWritten(story, "wide", kTime + cut + "\n",
-                      [&] { LogWide(3, L"%s", std::wstring(30000, L'x').c_str()); });
-        expectWritten(story, "bytes", kTime + "t" + cut,
-                      [&] { LogBytes(3, "t", longText.data(), 30000, false); });
-        expectWritten(story, "hex", "[#] t" + hex, [&] { LogHex(3, "t", longText.data(), 30000); });
-    });
+
+    expectWritten(story, "narrow", kTime + cut + "\n", [&] { Log(3, "%s", longText.c_str()); });
+    expectWritten(story, "wide", kTime + cut + "\n",
+                  [&] { LogWide(3, L"%s", std::wstring(30000, L'x').c_str()); });
+    expectWritten(story, "bytes", kTime + "t" + cut,
+                  [&] { LogBytes(3, "t", longText.data(), 30000, false); });
+    expectWritten(story, "hex", "[#] t" + hex, [&] { LogHex(3, "t", longText.data(), 30000); });
 }
 
 void reloadWith(Story& story, const std::string& flag) {
@@ -112,13 +111,13 @@ STORY(Log, TellsAStartLineByLineInItsFileBehindTenSeconds, "{}") {
     story.expect("file", std::filesystem::exists(story.logFile()), false);
     story.advance(2s);
     story.expect("file", std::filesystem::exists(story.logFile()), true);
-    story.expectLog({"SupplicantMgr initiailization succeeded.", "Enter addSupplicantIfInterfaceExists...",
-                     "Start to add a HS20 supplicant.", "Initializing supplicant...",
-                     "Interface GUID: {6B1E8A4C-5D2F-4E0B-9C37-1F5D00000001}",
-                     "!!!Query interface mac address succeeded, mac address 02:1f:5d:00:00:01",
-                     "Radio state changed from Off == > On",
-                     "Supplicant state changed from InvalidState to Initialized",
-                     "Supplicant State=Initialized", "Initialize supplicant succeeded."});
+    story.expectLog("SupplicantMgr initiailization succeeded.", "Enter addSupplicantIfInterfaceExists...",
+                    "Start to add a HS20 supplicant.", "Initializing supplicant...",
+                    "Interface GUID: {6B1E8A4C-5D2F-4E0B-9C37-1F5D00000001}",
+                    "!!!Query interface mac address succeeded, mac address 02:1f:5d:00:00:01",
+                    "Radio state changed from Off == > On",
+                    "Supplicant state changed from InvalidState to Initialized",
+                    "Supplicant State=Initialized", "Initialize supplicant succeeded.");
 }
 
 }  // namespace

@@ -23,7 +23,7 @@ void expectNames(Story& story, int source, const std::vector<std::string>& names
     std::vector<std::string> lines;
     for (const std::string& name : names)
         lines.push_back(prefix + name);
-    story.expectLog(lines);
+    story.expectLines(lines);
     story.expect("names", count(story.messages(), prefix), static_cast<int>(names.size()));
 }
 
@@ -45,7 +45,7 @@ STORY(Routing, EveryKnownCodeLeavesItsLineAndOthersNone, "{}") {
     story.expect("log of other sources", story.messages(), "");
 }
 
-TEST(Routing, BadIhvNotificationsEndInTheirLineAndChangeNothingElse) {
+STORY(Routing, BadIhvNotificationsEndInTheirLineAndChangeNothingElse, R"({"spectrum":{"channels":[1]}})") {
     const std::string tooSmall = "Notification data is invalid: either no data or data size is too small.\n";
     const std::string unsupported = "Unsupported module.\n";
     const std::pair<const char*, std::string> cases[] = {
@@ -58,19 +58,18 @@ TEST(Routing, BadIhvNotificationsEndInTheirLineAndChangeNothingElse) {
         {"005ec4060000000001000000325c0000", ""},
         {"005ec4060000000001000000325c0000ffff00112233", ""},
     };
-    EXPECT_STORY(R"({"spectrum":{"channels":[1]}})", [&](Story& story) {
-        settle(story);
-        for (const auto& [dataHex, line] : cases) {
-            story.forget();
-            story.perform(notify(kIhv, 3, dataHex));
-            story.expect(dataHex, story.messages(), line);
-            story.expect("spectral events", story.spectral().events().size(), 0U);
-            story.expect("hotspot events", heard(story), "");
-        }
-    });
+
+    settle(story);
+    for (const auto& [dataHex, line] : cases) {
+        story.forget();
+        story.perform(notify(kIhv, 3, dataHex));
+        story.expect(dataHex, story.messages(), line);
+        story.expect("spectral events", story.spectral().events().size(), 0U);
+        story.expect("hotspot events", heard(story), "");
+    }
 }
 
-TEST(Routing, CommandsOfTheHotspotPortLeaveOneErrorLineWhenTheyCanNotBeRead) {
+STORY(Routing, CommandsOfTheHotspotPortLeaveOneErrorLineWhenTheyCanNotBeRead, "{}") {
     const std::string command = "ERROR: Invalid command received from UI, command=";
     const std::string data = "ERROR: Invalid data received from UI, command=GET_RADIO\n";
     const std::pair<const char*, std::string> cases[] = {
@@ -84,16 +83,15 @@ TEST(Routing, CommandsOfTheHotspotPortLeaveOneErrorLineWhenTheyCanNotBeRead) {
         {R"({"CommandId":"GET_RADIO","Data":{}})", data},
         {R"({"CommandId":"GET_RADIO","Data":3})", data},
     };
-    EXPECT_STORY("{}", [&](Story& story) {
-        settle(story);
-        for (const auto& [message, line] : cases) {
-            story.forget();
-            story.hotspot().sendRaw(message);
-            story.advance(platform::Duration(0));
-            story.expect(message, story.messages(), line);
-            story.expect("heard", heard(story), "");
-        }
-    });
+
+    settle(story);
+    for (const auto& [message, line] : cases) {
+        story.forget();
+        story.hotspot().sendRaw(message);
+        story.advance(platform::Duration(0));
+        story.expect(message, story.messages(), line);
+        story.expect("heard", heard(story), "");
+    }
 }
 
 }  // namespace

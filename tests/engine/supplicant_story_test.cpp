@@ -27,29 +27,20 @@ void expectState(Story& story, const std::string& wanted, const GUID& guid = kFi
                  wanted);
 }
 
-/// A story that watches the number of open handles: it has so many more, or fewer, than at its beginning.
-class Handles {
-public:
-    explicit Handles(Story& story) : m_story(story), m_atFirst(now()) {}
-    void expectMore(int wanted) { m_story.expect("more handles", now() - m_atFirst, wanted); }
-
-private:
-    int now() { return m_story.perform(R"({"query":"handles"})").asInt(); }
-
-    Story& m_story;
-    int m_atFirst;
-};
+int handles(Story& story) {
+    return story.perform(R"({"query":"handles"})").asInt();
+}
 
 STORY(SupplicantStory, ComesAndGoesWithTheAdapterAndLeavesNoHandle, "{}") {
     expectState(story, "initialised");
-    Handles handles(story);
+    const int before = handles(story);
     for (int round = 0; round < 3; ++round) {
         story.act("pullAdapter");
         expectState(story, "none");
-        handles.expectMore(-1);
+        story.expect("handles", handles(story), before - 1);
         story.act("insertAdapter");
         expectState(story, "initialised");
-        handles.expectMore(0);
+        story.expect("handles", handles(story), before);
     }
 }
 
@@ -59,25 +50,25 @@ STORY(SupplicantStory, AnAdapterIsKnownHoweverItsIdentifierIsWritten,
 }
 
 STORY(SupplicantStory, ASecondArrivalResetsIt, "{}") {
-    const auto before = supplicantOf(kFirst);
-    Handles handles(story);
-    before->m_bRoaming = true;
+    const auto supplicant = supplicantOf(kFirst);
+    const int before = handles(story);
+    supplicant->m_bRoaming = true;
     story.act("insertAdapter");
-    story.expect("the same object", before == supplicantOf(kFirst), true);
-    story.expect("roaming", before->m_bRoaming.load(), false);
-    handles.expectMore(0);
-    story.expectLog(
-        {"Supplicant with GUID already exists, skip adding.", "Going to reset the existed supplicant..."});
+    story.expect("the same object", supplicant == supplicantOf(kFirst), true);
+    story.expect("roaming", supplicant->m_bRoaming.load(), false);
+    story.expect("handles", handles(story), before);
+    story.expectLog("Supplicant with GUID already exists, skip adding.",
+                    "Going to reset the existed supplicant...");
 }
 
 STORY(SupplicantStory, ARemovalWhileAnotherAdapterIsThereRemovesNothing, R"({"adapters":[{},{}]})") {
     story.act("pullAdapter", R"("adapter":1)");
     expectState(story, "initialised");
-    story.expectLog({"\tInterface card still inserted, don't remove supplicant."});
+    story.expectLog("\tInterface card still inserted, don't remove supplicant.");
     story.act("pullAdapter", R"("adapter":0)");
     expectState(story, "none");
     story.act("notify", R"("source":8,"code":14)");
-    story.expectLog({"\tNo supplicant, do nothing."});
+    story.expectLog("\tNo supplicant, do nothing.");
 }
 
 STORY(SupplicantStory, ASecondAdapterTakesOverWhenItArrives, R"({"adapters":[{},{"inserted":false}]})") {
@@ -88,42 +79,32 @@ STORY(SupplicantStory, ASecondAdapterTakesOverWhenItArrives, R"({"adapters":[{},
                  "CARD_PLUG_OUT CARD_PLUG_IN 1 a.example");
 }
 
-// What goes wrong while the adapter comes back, and how the object stands then.
+// What goes wrong so many times while the adapter comes back, and what the log has of it.
+void failsToInit(const char* call, int error, int times, const char* state, int moreHandles,
+                 int linesOfEach) {
+    EXPECT_STORY(
+        "{}",
+        [&](Story& story) {
+            const int before = handles(story);
+            story.play({doing("pullAdapter"), failing(call, error, R"("times":)" + std::to_string(times)),
+                        doing("insertAdapter")});
+            expectState(story, state);
+            story.expect("handles", handles(story), before + moreHandles);
+            for (const char* const line : {"Call to GetAdaptersAddresses failed with error: ",
+                                           "ERROR: Initiailize supplicant failed."})
+                story.expect(line, count(story.messages(), line), linesOfEach);
+        })
+        << call << " " << error << " " << times;
+}
+
 TEST(SupplicantStory, AnInitThatFailsIsTriedOnceMoreAndLeaksNothing) {
-    struct Case {
-        const char* call;
-        int error;
-        int times;
-        const char* state;
-        int moreHandles;
-        int failedCalls;
-        int failures;
-    };
-    const Case cases[] = {
-        {"GetAdaptersAddresses", 8, 1, "initialised", 0, 1, 1},
-        {"GetAdaptersAddresses", 8, 2, "not initialised", -1, 2, 2},
-        {"GetAdaptersAddresses", 111, 2, "initialised", 0, 0, 0},
-        {"GetAdaptersAddresses", 111, 3, "initialised", 0, 1, 1},
-        {"GetAdaptersAddresses", 111, 5, "initialised", 0, 1, 1},
-        {"GetAdaptersAddresses", 111, 6, "not initialised", -1, 2, 2},
-        {"WlanQueryInterface", 6, 2, "initialised", 0, 0, 0},
-    };
-    for (const Case& c : cases)
-        EXPECT_STORY(
-            "{}",
-            [&](Story& story) {
-                Handles handles(story);
-                story.play({doing("pullAdapter"),
-                            failing(c.call, c.error, R"("times":)" + std::to_string(c.times)),
-                            doing("insertAdapter")});
-                expectState(story, c.state);
-                handles.expectMore(c.moreHandles);
-                const std::string log = story.messages();
-                story.expect("failed calls", count(log, "Call to GetAdaptersAddresses failed with error: "),
-                             c.failedCalls);
-                story.expect("failures", count(log, "ERROR: Initiailize supplicant failed."), c.failures);
-            })
-            << c.call << " " << c.error << " " << c.times;
+    failsToInit("GetAdaptersAddresses", 8, 1, "initialised", 0, 1);
+    failsToInit("GetAdaptersAddresses", 8, 2, "not initialised", -1, 2);
+    failsToInit("GetAdaptersAddresses", 111, 2, "initialised", 0, 0);
+    failsToInit("GetAdaptersAddresses", 111, 3, "initialised", 0, 1);
+    failsToInit("GetAdaptersAddresses", 111, 5, "initialised", 0, 1);
+    failsToInit("GetAdaptersAddresses", 111, 6, "not initialised", -1, 2);
+    failsToInit("WlanQueryInterface", 6, 2, "initialised", 0, 0);
 }
 
 STORY(SupplicantStory, AnUnlistedAdapterGivesOneThatIsNotInitialisedButServesItsCommands,

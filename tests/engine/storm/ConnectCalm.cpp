@@ -1,5 +1,3 @@
-#include "engine/storm/ConnectCalm.h"
-
 #include <array>
 #include <random>
 

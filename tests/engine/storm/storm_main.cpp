@@ -7,7 +7,6 @@
 #include <string>
 #include <string_view>
 
-#include "engine/storm/ConnectCalm.h"
 #include "engine/storm/StormSteps.h"
 #include "engine/world/RunStory.h"
 

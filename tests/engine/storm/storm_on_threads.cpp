@@ -10,7 +10,6 @@
 #include <string>
 #include <string_view>
 
-#include "engine/storm/ConnectCalm.h"
 #include "engine/storm/StormSteps.h"
 #include "platform/ClockControl.h"
 

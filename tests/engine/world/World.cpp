@@ -20,12 +20,6 @@ namespace {
 
 using namespace std::chrono_literals;
 
-std::string oneLine(const Json::Value& value) {
-    Json::StreamWriterBuilder builder;
-    builder["indentation"] = "";
-    return Json::writeString(builder, value);
-}
-
 constexpr const char* kConfig = R"(<?xml version="1.0" encoding="UTF-8"?><configurations><global>
 <dump_file_path>hs20log.txt</dump_file_path><create_new_dump_file>false</create_new_dump_file>
 <autoconnect>true</autoconnect><enabledump>true</enabledump><dumplevel>0</dumplevel><homerealm></homerealm>
@@ -56,6 +50,12 @@ bool hasPrefix(const std::string& line) {
 
 }  // namespace
 
+std::string compact(const Json::Value& value) {
+    Json::StreamWriterBuilder builder;
+    builder["indentation"] = "";
+    return Json::writeString(builder, value);
+}
+
 Json::Value parsed(const std::string& text) {
     Json::Value value;
     std::string errors;
@@ -80,7 +80,7 @@ std::string sending(const std::string& command, const std::string& data) {
     Json::Value message;
     message["CommandId"] = command;
     if (!data.empty()) message["Data"] = data;
-    return oneLine(message);
+    return compact(message);
 }
 
 Client::Client(std::int32_t port) : m_client(InProcessClient::connect(port)) {
@@ -120,7 +120,7 @@ World::World(const std::string& scenario, const std::filesystem::path& folder, b
 
 Json::Value World::perform(const std::string& message) {
     Json::Value answer = m_machine.perform(parsed(message));
-    if (!answer["ok"].asBool()) throw std::runtime_error(message + ": " + oneLine(answer));
+    if (!answer["ok"].asBool()) throw std::runtime_error(message + ": " + compact(answer));
     return answer["result"];
 }
 

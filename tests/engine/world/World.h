@@ -18,6 +18,9 @@ namespace vexa::test {
 /// Null if the text is no JSON.
 Json::Value parsed(const std::string& text);
 
+/// In one line, without blanks.
+std::string compact(const Json::Value& value);
+
 std::string contentOf(const std::filesystem::path& file);
 
 /// The text of an action: doing("radio", R"("software":"off")").
