@@ -94,25 +94,20 @@ STORY(AutoConnect, TellsInTheLogWhyItChoseWhatItChose,
 
 STORY(AutoConnect, TellsInTheLogHowItGaveUp,
       air({network(1, "cafe", both())}, storing({kCertificate, kSecondPassword}))) {
+    const std::string fails = "Connection failed! profile name=cafe";
+    const std::string exhausted = "\tRetry number exceeds maximum retry limit, skip this credential id=";
     story.advance(60s);
-    story.expectLog("!!!Creating a new network profile",
-                    "Adding a new EAP-TLS network profile with auth mode=machineOrUser...",
-                    "Connection failed! profile name=cafe",
+    story.expectLog("Adding a new EAP-TLS network profile with auth mode=machineOrUser...", fails,
                     "Connection using EAP-TLS with authMode=machineOrUser failed,trying to use EAP-TLS with "
                     "authMode=machine.",
-                    "Adding a new EAP-TLS network profile with auth mode=machine...",
-                    "Connection failed! profile name=cafe",
+                    "Adding a new EAP-TLS network profile with auth mode=machine...", fails,
                     "Reason code desc=The user name or password is not correct, or the certificate wa",
-                    "\tRetry number exceeds maximum retry limit, skip this credential id=1, ssid=cafe",
-                    "\tSelected cred id=2", "Profile exists for ssid=cafe",
+                    exhausted + "1, ssid=cafe", "\tSelected cred id=2", "Profile exists for ssid=cafe",
                     "\tEAP method doesn't matches, create new profile.", "!!!Creating a new network profile",
-                    "Adding a new EAP-TTLS network profile...", "Connection failed! profile name=cafe",
-                    "\tSelected cred id=2", "\tEAP method matches, don't create new profile.",
-                    "\tIncrease cred2ssid num retries: credId=2, ssid=cafe, numRetries=1",
-                    "Connection failed! profile name=cafe",
-                    "\tRetry number exceeds maximum retry limit, skip this credential id=1, ssid=cafe",
-                    "\tRetry number exceeds maximum retry limit, skip this credential id=2, ssid=cafe",
-                    "\t No credential found.",
+                    "Adding a new EAP-TTLS network profile...", fails, "\tSelected cred id=2",
+                    "\tEAP method matches, don't create new profile.",
+                    "\tIncrease cred2ssid num retries: credId=2, ssid=cafe, numRetries=1", fails,
+                    exhausted + "1, ssid=cafe", exhausted + "2, ssid=cafe", "\t No credential found.",
                     "No matching network was found based on configured credentials.");
 }
 
@@ -134,19 +129,16 @@ STORY(AutoConnect, ComesBackAfterADropAndAfterTheNetworkWasAway, air({kCafe, kHo
     expectStanding(story, {.eapMethod = 0});
     story.advance(1s);
     expectStanding(story, {.connected = "cafe"});
-    story.play({on("hide", 1), kReport});
-    story.advance(30s);
+    story.play({on("hide", 1), kReport, passing(30s)});
     expectStanding(story, {.connected = "-"});
-    story.play({on("show", 1), kReport});
-    story.advance(30s);
+    story.play({on("show", 1), kReport, passing(30s)});
     expectStanding(story, {.connected = "cafe", .eapMethod = 2});
 }
 
 void triesAgain(const char* what, const std::string& requests, const std::vector<std::string>& deeds) {
     const std::string other = network(2, "other", ttls("other.example"));
     EXPECT_STORY(air({network(1, "cafe", ttls()), other}, storing({kPassword})), [&](Story& story) {
-        story.advance(60s);
-        story.forget();
+        settle(story, 60s);
         story.play(deeds);
         story.advance(60s);
         expectStanding(story, {.requests = requests});

@@ -41,11 +41,9 @@ TEST(Disconnect, KeepsAutoConnectAwayUntilTheUserAsksAgain) {
                         "Received Wlan disconnected event.", "Reason code desc=The user disconnected.",
                         "This network has been disconnected by user, skip auto connecting to ssid=cafe",
                         "No matching network was found based on configured credentials.");
-        story.play({connecting("cafe")});
-        story.advance(5s);
+        story.play({connecting("cafe"), passing(5s)});
         expectStanding(story, {.connected = "cafe"});
-        story.act("dropConnection");
-        story.advance(5s);
+        story.play({doing("dropConnection"), passing(5s)});
         expectStanding(story, {.connected = "cafe"});
     });
 }
@@ -53,8 +51,7 @@ TEST(Disconnect, KeepsAutoConnectAwayUntilTheUserAsksAgain) {
 TEST(Disconnect, OfWhatIsNotConnectedChangesNothing) {
     for (const std::string& name : {std::string("cafe\0x", 6), std::string("hotel"), std::string("caf")})
         inTheCafe(name, [&](Story& story) {
-            story.play({disconnecting(name)});
-            story.advance(5s);
+            story.play({disconnecting(name), passing(5s)});
             expectStanding(story, {.requests = "", .connected = "cafe"});
             story.expectLog("ERROR: Connected ssid=cafe while requesting disconnect from ssid=" +
                             name.substr(0, name.find('\0')));
@@ -62,23 +59,19 @@ TEST(Disconnect, OfWhatIsNotConnectedChangesNothing) {
 }
 
 STORY(Disconnect, WithNothingConnectedSaysSo, air({kCafe})) {
-    story.advance(5s);
-    story.play({disconnecting("cafe")});
+    story.play({passing(5s), disconnecting("cafe")});
     expectStanding(story, {.requests = ""});
     story.expectLog("ERROR: Cannot get connected BSS.");
 }
 
 // One result, and no next step: neither for the machine nor with another credential.
-void endsForGood(const std::vector<StoredCredential>& credentials, const std::string& request) {
+void endsForGood(const std::string& request, const std::vector<StoredCredential>& credentials,
+                 const std::vector<std::string>& deeds = {}) {
     EXPECT_STORY(air({open(1, "cafe", both())}, storing(credentials) + kSlow), [&](Story& story) {
         story.advance(1s);
-        if (!credentials[0].autoConnect) {
-            story.play({connecting("cafe")});
-            story.advance(1s);
-        }
+        story.play(deeds);
         story.hotspot().events();
-        story.play({disconnecting("cafe")});
-        story.advance(60s);
+        story.play({disconnecting("cafe"), passing(60s)});
         expectStanding(story, {request + "; disconnect", "0 no access", "-", 0});
         story.expectLog("Connection failed! profile name=cafe",
                         "Reason code desc=The connection was cancelled.");
@@ -86,22 +79,18 @@ void endsForGood(const std::vector<StoredCredential>& credentials, const std::st
 }
 
 TEST(Disconnect, InTheMiddleOfAnAttemptEndsItForGood) {
-    endsForGood({{.isTls = true}}, "cafe tls ca1 machineOrUser");
-    endsForGood({{}}, "cafe ttls u1");
-    endsForGood({{.autoConnect = false}, {.id = 2, .autoConnect = false}}, "cafe ttls u1");
+    endsForGood("cafe tls ca1 machineOrUser", {{.isTls = true}});
+    endsForGood("cafe ttls u1", {{}});
+    endsForGood("cafe ttls u1", {{.autoConnect = false}, {.id = 2, .autoConnect = false}},
+                {connecting("cafe"), passing(1s)});
 }
 
 // The flag that says so is gone with the first result: the next attempt fails as any other.
 STORY(Disconnect, IsForgottenWithTheNextResult,
       air({network(1, "cafe", tls())}, storing({{.isTls = true, .autoConnect = false}}) + kSlow)) {
-    story.advance(1s);
-    story.play({connecting("cafe")});
-    story.advance(1s);
-    story.play({disconnecting("cafe")});
-    story.advance(5s);
+    story.play({passing(1s), connecting("cafe"), passing(1s), disconnecting("cafe"), passing(5s)});
     story.forget();
-    story.play({connecting("cafe")});
-    story.advance(10s);
+    story.play({connecting("cafe"), passing(10s)});
     expectStanding(story, {.requests = "cafe tls ca1 machineOrUser; cafe tls ca1 machine"});
 }
 
@@ -109,8 +98,7 @@ STORY(UserLeavesBySystem, BlocksTheNetworkThatIsConnected,
       air({kCafe, kHotel}, storing({{}, {.id = 2, .realm = "b.example"}}))) {
     story.advance(5s);
     expectStanding(story, {.connected = "cafe"});
-    story.play({kUserLeft, doing("dropConnection", R"("reason":163842)")});
-    story.advance(60s);
+    story.play({kUserLeft, doing("dropConnection", R"("reason":163842)"), passing(60s)});
     expectStanding(story, {.connected = "hotel"});
 }
 
@@ -119,8 +107,7 @@ void blocksNothing(const std::vector<std::string>& before, const std::string& re
                    std::vector<std::string> lines) {
     inTheCafe(lines.back(), [&](Story& story) {
         story.play(before);
-        story.advance(1s);
-        story.forget();
+        settle(story, 1s);
         story.perform(report);
         lines.insert(lines.begin(),
                      "### IHV reports HS20 network has been disconnected manually by user. ###");
@@ -155,8 +142,7 @@ TEST(UserLeavesBySystem, BlocksNothingForAnotherNetwork) {
 }
 
 STORY(UserLeavesBySystem, BlocksNothingBeforeTheFirstConnection, air({kCafe})) {
-    story.advance(5s);
-    story.perform(kUserLeft);
+    story.play({passing(5s), kUserLeft});
     story.expectLog("No last connection history.");
     story.expect("blocks", blocks(story), 0);
 }
@@ -165,9 +151,7 @@ STORY(UserLeavesBySystem, BlocksNothingBeforeTheFirstConnection, air({kCafe})) {
 TEST(UserLeavesBySystem, BlocksUpToASecondAfterTheEndOfTheConnection) {
     for (const int pause : {0, 999, 1000, 1001, 5000})
         inTheCafe(std::to_string(pause), [&](Story& story) {
-            story.perform(on("hide", 1));
-            story.advance(milliseconds(pause));
-            story.perform(kUserLeft);
+            story.play({on("hide", 1), passing(milliseconds(pause)), kUserLeft});
             story.expectLog("Connection disconnected earlier.");
             story.expect("blocks", blocks(story), pause <= 1000 ? 1 : 0);
         });
@@ -176,10 +160,7 @@ TEST(UserLeavesBySystem, BlocksUpToASecondAfterTheEndOfTheConnection) {
 TEST(UserLeavesBySystem, BlocksFromTwoSecondsAfterTheFunctionWasSwitched) {
     for (const int pause : {500, 1999, 2000, 2001})
         inTheCafe(std::to_string(pause), [&](Story& story) {
-            story.play({kHs20Off});
-            story.advance(5s);
-            story.play({kHs20On});
-            story.advance(milliseconds(pause));
+            story.play({kHs20Off, passing(5s), kHs20On, passing(milliseconds(pause))});
             expectStanding(story, {.connected = "cafe"});
             story.perform(kUserLeft);
             const std::string skips =
@@ -199,22 +180,13 @@ STORY(UserLeavesBySystem, BlocksRightAfterTheStart, air({kCafe}, storing({{}})))
     story.expect("blocks", blocks(story), 1);
 }
 
-void changesSession(bool isByClient, int pause, const char* connected, const char* line) {
-    inTheCafe(std::to_string(pause) + line, [&](Story& story) {
-        if (isByClient) {
-            story.play({disconnecting("cafe")});
-        } else {
-            story.play({kUserLeft, doing("dropConnection")});
-        }
-        story.advance(milliseconds(pause));
-        story.act("sessionChange", R"("eventType":7,"sessionId":3)");
-        std::vector<std::string> lines = {
-            "### [Session] IHV reports session changed. ###", "\tEventType=7, sessionId=3",
-            "[Session] A session has been locked.", "Enter resetAllNumRetries."};
-        if (!isByClient)
-            lines.push_back("The network with ssid=cafe has been blocked for " + std::to_string(pause) +
-                            " millisec");
-        lines.emplace_back(line);
+void changesSession(const std::vector<std::string>& left, int pause, const char* connected,
+                    std::vector<std::string> lines) {
+    inTheCafe(std::to_string(pause) + lines.back(), [&](Story& story) {
+        story.play(left);
+        story.play({passing(milliseconds(pause)), doing("sessionChange", R"("eventType":7,"sessionId":3)")});
+        story.expectLog("### [Session] IHV reports session changed. ###", "\tEventType=7, sessionId=3",
+                        "[Session] A session has been locked.", "Enter resetAllNumRetries.");
         story.expectLines(lines);
         story.advance(30s);
         expectStanding(story, {.connected = connected});
@@ -222,38 +194,39 @@ void changesSession(bool isByClient, int pause, const char* connected, const cha
 }
 
 TEST(SessionChange, OpensWhatWasBlockedLessThan800MillisecondsAgo) {
-    const char* const recent = "\tThis network was blocked not long ago, unblock it";
-    const char* const old = "\tThis network was blocked long time ago, don't unblock it.";
-    const char* const user = "This network with ssid=cafe has been blocked by user, don't unblock it.";
+    const std::vector<std::string> bySystem = {kUserLeft, doing("dropConnection")};
+    const std::string blocked = "The network with ssid=cafe has been blocked for ";
     for (const int pause : {0, 799})
-        changesSession(false, pause, "cafe", recent);
+        changesSession(bySystem, pause, "cafe",
+                       {blocked + std::to_string(pause) + " millisec",
+                        "\tThis network was blocked not long ago, unblock it"});
     for (const int pause : {800, 801})
-        changesSession(false, pause, "-", old);
+        changesSession(bySystem, pause, "-",
+                       {blocked + std::to_string(pause) + " millisec",
+                        "\tThis network was blocked long time ago, don't unblock it."});
     for (const int pause : {0, 799})
-        changesSession(true, pause, "-", user);
+        changesSession({disconnecting("cafe")}, pause, "-",
+                       {"This network with ssid=cafe has been blocked by user, don't unblock it."});
 }
 
 STORY(SessionChange, IsToldByItsKind, "{}") {
-    const std::vector<std::pair<int, std::string>> kinds = {
-        {0, "[Session] Unknown event type."},
-        {1, "[Session] A session was connected to the console session."},
-        {2, "[Session] A session was disconnected from the console session."},
-        {3, "[Session] A session was connected to the remote session."},
-        {4, "[Session] A session was disconnected from the remote session."},
-        {5, "[Session] A user has logged on to the session."},
-        {6, "[Session] A user has logged off of the session."},
-        {7, "[Session] A session has been locked."},
-        {8, "[Session] A session has been unlocked."},
-        {9, "[Session] A session has changed its remote controlled status."},
-        {10, "[Session] Unknown event type."},
-        {1000, "[Session] Unknown event type."},
+    const std::vector<std::string> kinds = {
+        "Unknown event type.",
+        "A session was connected to the console session.",
+        "A session was disconnected from the console session.",
+        "A session was connected to the remote session.",
+        "A session was disconnected from the remote session.",
+        "A user has logged on to the session.",
+        "A user has logged off of the session.",
+        "A session has been locked.",
+        "A session has been unlocked.",
+        "A session has changed its remote controlled status.",
     };
-
-    for (const auto& [kind, line] : kinds) {
+    for (const unsigned kind : {0U, 1U, 2U, 3U, 4U, 5U, 6U, 7U, 8U, 9U, 10U, 1000U}) {
         story.forget();
         story.act("sessionChange", R"("sessionId":2,"eventType":)" + std::to_string(kind));
-        story.expectLog("\tEventType=" + std::to_string(kind) + ", sessionId=2", line,
-                        "Enter resetAllNumRetries.");
+        story.expectLog("\tEventType=" + std::to_string(kind) + ", sessionId=2",
+                        "[Session] " + kinds[kind < kinds.size() ? kind : 0], "Enter resetAllNumRetries.");
     }
     story.forget();
     story.perform(moduleMessage(6, bytesOfHex("01000000020000")));
@@ -264,12 +237,8 @@ STORY(SessionChange, IsToldByItsKind, "{}") {
 TEST(Unblocking, ByTheSystemsOwnConnectionTakesWhatIsFresh) {
     for (const int pause : {0, 799, 800})
         inTheCafe(std::to_string(pause), [&](Story& story) {
-            story.perform(kUserLeft);
-            story.advance(milliseconds(pause));
-            story.act("osConnect", R"("ssid":"home")");
-            story.advance(5s);
-            story.act("dropConnection");
-            story.advance(30s);
+            story.play({kUserLeft, passing(milliseconds(pause)), doing("osConnect", R"("ssid":"home")"),
+                        passing(5s), doing("dropConnection"), passing(30s)});
             expectStanding(story, {.connected = pause < 800 ? "cafe" : "-"});
         });
 }
@@ -278,9 +247,7 @@ TEST(Unblocking, ByTheSystemsOwnConnectionTakesWhatIsFresh) {
 void opens(const char* what, const char* connected, const std::vector<std::string>& deeds) {
     const StoredCredential byHand{.id = 2, .autoConnect = false};
     EXPECT_STORY(air({open(1, "cafe", both())}, storing({{}, byHand})), [&](Story& story) {
-        story.advance(5s);
-        story.play({disconnecting("cafe")});
-        story.advance(5s);
+        story.play({passing(5s), disconnecting("cafe"), passing(5s)});
         story.play(deeds);
         story.advance(60s);
         expectStanding(story, {.connected = connected});

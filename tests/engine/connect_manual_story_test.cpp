@@ -12,22 +12,16 @@ StoredCredential byHand(int id, bool isTls = false, const std::string& realm = "
     return {.id = id, .realm = realm, .isTls = isTls, .autoConnect = false};
 }
 
+constexpr auto kBehindStart = 6s;
 const std::string kOne = air({kCafe}, storing({byHand(1)}));
 const std::string kSlow = doing("set", R"("connectMs":5000)");
-
-/// A story begins when the service has come to rest.
-void rest(Story& story) {
-    story.advance(6s);
-    story.forget();
-}
 
 /// The user asks for a network by its name.
 void asksFor(const std::string& what, const std::string& name, const std::vector<std::string>& networks,
              const std::vector<StoredCredential>& credentials, const Standing& end) {
     EXPECT_STORY(air(networks, storing(credentials)), [&](Story& story) {
-        rest(story);
-        story.play({connecting(name)});
-        story.advance(5s);
+        settle(story, kBehindStart);
+        story.play({connecting(name), passing(5s)});
         expectStanding(story, end);
     }) << what;
 }
@@ -73,38 +67,27 @@ TEST(ManualConnect, LeavesToTheSystemWhatNoCredentialFits) {
 
 STORY(ManualConnect, TellsInTheLogHowItWalksThroughTheCredentials,
       air({network(1, "cafe", both())}, storing({byHand(1), byHand(2, true), byHand(3)}))) {
-    rest(story);
-    story.play({connecting("cafe")});
-    story.advance(5s);
+    const std::string tries = "Try to connect to HS20 network using next credential.";
+    const std::string fails = "Manual connection failed, we will try to use next credential.";
+    const std::string skips = "We have tried credential with id=";
+    settle(story, kBehindStart);
+    story.play({connecting("cafe"), passing(5s)});
     story.expectLog(
         "###Manually connect to a BSS started.###",
         "###We are actually going to connect to HS20 network now.###",
-        "Unblocked network with ssid=cafe and mac address=02:aa:00:00:00:01 due to user has manually "
-        "connected to it.",
-        "Try to connect to HS20 network using next credential.", "Selecting credential with id=1",
-        "Adding a new EAP-TTLS network profile...",
-        "Connection start event: connection initiated by HS20, profile name=cafe",
-        "Manual connection started.", "Connection failed! profile name=cafe",
-        "Manual connection failed, we will try to use next credential.",
-        "Try to connect to HS20 network using next credential.",
-        "We have tried credential with id=1, skipping...", "Selecting credential with id=2",
-        "Adding a new EAP-TLS network profile with auth mode=machineOrUser...",
-        "connResult=1 after invoking tryConnectHs20BssUsingNextCredential.",
-        "Successfully initiated connection to HS20 network=cafe using next credential.",
-        "Connection using EAP-TLS with authMode=machineOrUser failed,trying to use EAP-TLS with "
-        "authMode=machine.",
-        "Manual connection failed, we will try to use next credential.", "Selecting credential with id=3",
-        "Manual connection failed, we will try to use next credential.",
-        "We have tried credential with id=1, skipping...", "We have tried credential with id=2, skipping...",
-        "We have tried credential with id=3, skipping...",
-        "connResult=2 after invoking tryConnectHs20BssUsingNextCredential.",
-        "We have tried all credentials, connection failed.",
-        "Reason code desc=The user name or password is not correct, or the certificate wa",
-        "Send connection result to vexa.");
+        "Unblocked network with ssid=cafe and mac address=02:aa:00:00:00:01 due to user has "
+        "manually connected to it.",
+        tries, "Selecting credential with id=1", "Manual connection started.",
+        "Connection failed! profile name=cafe", fails, tries, skips + "1, skipping...",
+        "Selecting credential with id=2", "connResult=1 after invoking tryConnectHs20BssUsingNextCredential.",
+        "Successfully initiated connection to HS20 network=cafe using next credential.", fails,
+        "Selecting credential with id=3", fails, skips + "1, skipping...", skips + "2, skipping...",
+        skips + "3, skipping...", "connResult=2 after invoking tryConnectHs20BssUsingNextCredential.",
+        "We have tried all credentials, connection failed.", "Send connection result to vexa.");
 }
 
 STORY(ManualConnect, ARefusedRequestIsToldAtOnce, kOne) {
-    rest(story);
+    settle(story, kBehindStart);
     story.play({failing("WlanConnect", 50), connecting("cafe")});
     expectStanding(story, {.requests = "cafe ttls u1 = 50", .outcomes = "0"});
     story.expectLog("WlanConnect call failed with error code=50.", "Try to connect to HS20 network failed.",
@@ -113,9 +96,8 @@ STORY(ManualConnect, ARefusedRequestIsToldAtOnce, kOne) {
 
 STORY(ManualConnect, ANextCredentialThatCanNotStartEndsWithoutAWord,
       air({network(1, "cafe", ttls())}, storing({byHand(1), byHand(2)}))) {
-    rest(story);
-    story.play({failing("WlanConnect", 50, R"("skip":1)"), connecting("cafe")});
-    story.advance(5s);
+    settle(story, kBehindStart);
+    story.play({failing("WlanConnect", 50, R"("skip":1)"), connecting("cafe"), passing(5s)});
     expectStanding(story, {.requests = "cafe ttls u1; cafe ttls u2 = 50", .outcomes = ""});
     story.expectLog("connResult=0 after invoking tryConnectHs20BssUsingNextCredential.",
                     "ERROR: Try to connect to HS20 network using next credential failed.");
@@ -124,9 +106,8 @@ STORY(ManualConnect, ANextCredentialThatCanNotStartEndsWithoutAWord,
 // The system's own connections carry nothing of this program, whatever their outcome.
 void isForeign(const std::string& succeeds, const std::string& result, const std::string& connected) {
     EXPECT_STORY(kOne, [&](Story& story) {
-        rest(story);
-        story.act("osConnect", R"("ssid":"home","succeeds":)" + succeeds);
-        story.advance(1s);
+        settle(story, kBehindStart);
+        story.play({doing("osConnect", R"("ssid":"home","succeeds":)" + succeeds), passing(1s)});
         expectStanding(story, {.connected = connected, .eapMethod = 0, .outcomes = "1 no access"});
         story.expectLog("Connection start event: connection not initiated by HS20, profile name=home",
                         "Connection result not initiated by HS20, profile name=home, result=" + result,
@@ -142,21 +123,18 @@ TEST(ForeignConnection, IsToldAsASuccessWhateverItsOutcome) {
 }
 
 STORY(ForeignConnection, ThatDisplacesOursEndsItAndIsToldApart, kOne) {
-    rest(story);
-    story.play({kSlow, connecting("cafe")});
-    story.advance(500ms);
-    story.act("osConnect", R"("ssid":"home")");
-    story.advance(8s);
+    settle(story, kBehindStart);
+    story.play(
+        {kSlow, connecting("cafe"), passing(500ms), doing("osConnect", R"("ssid":"home")"), passing(8s)});
     expectStanding(story, {.connected = "home", .eapMethod = 0, .outcomes = "0 no access 1 no access"});
 }
 
 // The result of another network whose name begins like the one asked for counts as its own.
 STORY(ForeignConnection, ALongerNameWithTheSameBeginningCountsAsOwn,
       air({kCafe, network(2, "cafeteria", ttls("x.example"))}, storing({byHand(1)}))) {
-    rest(story);
-    story.play({kSlow, connecting("cafe")});
-    story.advance(1s);
-    story.act("connection", R"("code":10,"profileName":"cafe","ssidHex":"636166657465726961")");
+    settle(story, kBehindStart);
+    story.play({kSlow, connecting("cafe"), passing(1s),
+                doing("connection", R"("code":10,"profileName":"cafe","ssidHex":"636166657465726961")")});
     expectStanding(story, {.eapMethod = 2, .outcomes = "1 no access"});
     story.expectLog("Connection result initiated by HS20, clearing the cache, profile name=cafe.",
                     "Connection succeeded! profile name=cafe");
@@ -164,7 +142,7 @@ STORY(ForeignConnection, ALongerNameWithTheSameBeginningCountsAsOwn,
 
 void endsWithItsLine(const std::string& result, const char* line) {
     EXPECT_STORY(kOne, [&](Story& story) {
-        rest(story);
+        settle(story, kBehindStart);
         story.play({kSlow, connecting("cafe"), result});
         expectStanding(story, {.eapMethod = 0, .outcomes = ""});
         story.expectLog(line);

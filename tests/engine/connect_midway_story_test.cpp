@@ -7,6 +7,9 @@ namespace {
 
 using namespace std::chrono_literals;
 
+// The thread sleeps for ten seconds when it has learnt of the radio, at the start too.
+constexpr auto kBehindStart = 15s;
+
 constexpr const char* kSlow = R"(,"connectMs":2000)";
 
 const std::string kDeletion = sending("DELETE_CREDENTIAL", R"({"Id":1})");
@@ -15,8 +18,7 @@ const std::string kDeletion = sending("DELETE_CREDENTIAL", R"({"Id":1})");
 void comesBetween(const std::string& what, const Standing& end, const std::vector<std::string>& deeds,
                   const std::string& cafe = open(1, "cafe", tls())) {
     EXPECT_STORY(air({cafe}, storing({{.isTls = true}}) + kSlow), [&](Story& story) {
-        story.advance(1s);
-        story.forget();
+        settle(story, 1s);
         story.play(deeds);
         story.advance(60s);
         expectStanding(story, end);
@@ -46,9 +48,7 @@ TEST(Midway, EndsAsItShould) {
 
 STORY(Midway, ADeletedCredentialTakesItsProfileWithItAndEndsTheAttemptWithoutAWord,
       air({kCafe}, storing({{}}) + kSlow)) {
-    story.advance(1s);
-    story.play({kDeletion});
-    story.advance(5s);
+    story.play({passing(1s), kDeletion, passing(5s)});
     story.expectLog("Deleting the credential with id=1", "removeAllCredNumRetryEntries for CredId=1",
                     "Cred id=1 deleted, removing profile name=cafe",
                     "Connection result initiated by HS20, clearing the cache, profile name=cafe.",
@@ -74,24 +74,16 @@ TEST(Midway, AnEditedCredentialIsTriedAfreshWithWhatItHoldsNow) {
 
 STORY(Midway, AnArrivalOfAnAdapterThatIsThereForgetsWhatWasUnderWay,
       air({kCafe, kHotel}, storing({{}, {.id = 2, .realm = "b.example", .autoConnect = false}}) + kSlow)) {
-    story.advance(1s);
-    story.play({connecting("hotel")});
+    story.play({passing(1s), connecting("hotel")});
     story.hotspot().events();
-    story.act("insertAdapter");
-    story.advance(60s);
+    story.play({doing("insertAdapter"), passing(60s)});
     expectStanding(story, {"cafe ttls u1", "1 access", "cafe"});
     story.expect("pending requests", count(story.messages(), "User manual connecting request pending"), 0);
 }
 
-/// The thread sleeps for ten seconds behind the start.
-void awake(Story& story) {
-    story.advance(15s);
-    story.forget();
-}
-
 STORY(RealmUpdate, LetsGoOfTheConnectionAsksAnewAndComesBack,
       air({kCafe}, storing({{}}) + R"(,"anqpMs":1000)")) {
-    awake(story);
+    settle(story, kBehindStart);
     story.order("UPDATE_NETWORK_REALM");
     expectStanding(story, {.requests = "disconnect", .eapMethod = 0, .outcomes = ""});
     story.expect("queries", moduleRequests(story, 3), 1);
@@ -104,9 +96,8 @@ STORY(RealmUpdate, LetsGoOfTheConnectionAsksAnewAndComesBack,
 }
 
 STORY(RealmUpdate, OfAConnectionThatIsNoHotspotLetsGoOfItToo, air({network(1, "cafe", ttls())})) {
-    awake(story);
-    story.act("osConnect", R"("ssid":"home")");
-    story.advance(5s);
+    settle(story, kBehindStart);
+    story.play({doing("osConnect", R"("ssid":"home")"), passing(5s)});
     story.order("UPDATE_NETWORK_REALM");
     expectStanding(story, {.requests = "disconnect"});
     story.expect("queries", moduleRequests(story, 3), 1);
@@ -115,7 +106,7 @@ STORY(RealmUpdate, OfAConnectionThatIsNoHotspotLetsGoOfItToo, air({network(1, "c
 
 STORY(RealmUpdate, AsksAtOnceWhileNothingIsConnected,
       air({network(1, "A", R"("anqp":"onQuery",)" + ttls())})) {
-    awake(story);
+    settle(story, kBehindStart);
     story.order("UPDATE_NETWORK_REALM");
     story.expect("queries", moduleRequests(story, 3), 1);
     story.expect("heard before the answer", heard(story), "");
@@ -124,7 +115,7 @@ STORY(RealmUpdate, AsksAtOnceWhileNothingIsConnected,
 }
 
 STORY(RealmUpdate, DoesNothingWithoutAnAdapter, air({network(1, "A")})) {
-    awake(story);
+    settle(story, kBehindStart);
     story.act("pullAdapter");
     story.forget();
     story.order("UPDATE_NETWORK_REALM");
@@ -133,7 +124,7 @@ STORY(RealmUpdate, DoesNothingWithoutAnAdapter, air({network(1, "A")})) {
 }
 
 STORY(HotspotSwitch, OffWhileConnectedLeavesTheNetworkWithoutBlockingIt, air({kCafe}, storing({{}}))) {
-    awake(story);
+    settle(story, kBehindStart);
     story.play({kHs20Off});
     expectStanding(story, {.requests = "disconnect", .outcomes = "networks hs20 false networks"});
     story.advance(30s);
@@ -153,17 +144,15 @@ STORY(HotspotSwitch, OffWhileConnectedLeavesTheNetworkWithoutBlockingIt, air({kC
 }
 
 STORY(HotspotSwitch, OffLeavesAConnectionOfTheSystemAlone, air({network(1, "cafe", ttls())}, storing({{}}))) {
-    awake(story);
-    story.act("osConnect", R"("ssid":"cafe")");
-    story.advance(5s);
+    settle(story, kBehindStart);
+    story.play({doing("osConnect", R"("ssid":"cafe")"), passing(5s)});
     story.forget();
-    story.play({kHs20Off});
-    story.advance(5s);
+    story.play({kHs20Off, passing(5s)});
     expectStanding(story, {.requests = "", .connected = "cafe"});
 }
 
 STORY(HotspotSwitch, ToTheValueThatItHasOnlyAnswers, air({kCafe}, storing({{}}))) {
-    awake(story);
+    settle(story, kBehindStart);
     story.play({kHs20On});
     expectStanding(story, {.requests = "", .connected = "cafe", .outcomes = "hs20 true"});
 }

@@ -74,8 +74,7 @@ TEST(ConnectingThread, GoesOnOnlyWithASupplicantThatIsDisconnected) {
 
 STORY(ConnectingThread, WithTheFunctionOffNoRoundAsksTheAdapterAnything, air({network(1, "A")})) {
     settle(story);
-    story.play({kHs20Off, kRadioOff});
-    story.advance(40s);
+    story.play({kHs20Off, kRadioOff, passing(40s)});
     const std::string off = round("HS20 functionality not enabled, wait for user turning it on.");
     story.expect("rounds", roundsIn(story, 30s), off + off + off);
     story.expect("calls", story.perform(R"({"query":"calls","all":true})").size(), 0U);
@@ -83,8 +82,7 @@ STORY(ConnectingThread, WithTheFunctionOffNoRoundAsksTheAdapterAnything, air({ne
 
 STORY(ConnectingThread, AnUpdateWakesItTwiceOnceForTheListAndOnceForTheData, air({kNetwork})) {
     settle(story);
-    story.perform(kReport);
-    story.advance(0ms);
+    story.play({kReport, passing(0ms)});
     story.expectLog(kListChanged, kAnqpReady);
     for (const auto& [line, times] : {std::pair(kListChanged, 1), {kAnqpReady, 1}, {kNoCredential, 2}})
         story.expect(line, count(story.messages(), line), times);
@@ -93,11 +91,9 @@ STORY(ConnectingThread, AnUpdateWakesItTwiceOnceForTheListAndOnceForTheData, air
 // All of them are signalled while the thread sleeps after a radio event, which has the last place.
 STORY(ConnectingThread, TakesTheEventsThatWaitInTheirOrder, {.seed = 100, .seeds = 30}, air({kNetwork})) {
     settle(story);
-    story.perform(kRadioOff);
-    story.advance(1s);
+    story.play({kRadioOff, passing(1s)});
     story.forget();
-    story.play({kRadioOn, kCredential, kReport, kHs20Off});
-    story.advance(9s);
+    story.play({kRadioOn, kCredential, kReport, kHs20Off, passing(9s)});
     std::string wakes;
     std::istringstream stream(story.messages());
     for (std::string line; std::getline(stream, line);)
@@ -137,11 +133,9 @@ STORY(ConnectingThread, AQueryThatWasRefusedIsAskedAgainInTheNextRound, air({kMu
 STORY(ConnectingThread, AnEndOfTheQueryThatBringsNoListLeavesTheQueryRunning,
       air({kMute}, R"("anqpMs":3000)")) {
     settle(story);
-    story.play({failing("WlanIhvControl", 31, R"("match":"bssList")"), kCredential});
-    story.advance(5s);
+    story.play({failing("WlanIhvControl", 31, R"("match":"bssList")"), kCredential, passing(5s)});
     story.expect("rounds", roundsIn(story, 20s), round(kQuerying) + round(kQuerying));
-    story.act("completeAnqpQuery");
-    story.advance(0ms);
+    story.play({doing("completeAnqpQuery"), passing(0ms)});
     story.expectLog("ANQP querying finished.");
 }
 
@@ -167,11 +161,9 @@ STORY(ConnectingThread, WithEveryGateOpenItFindsNothingToDoAndSaysSo, air({kNetw
 
 STORY(ConnectingThread, ConnectsToNobodyUntilTheLastNetworkHasAnswered,
       air({kMute, network(2, "A", ttls())}, R"("connectMs":100000)")) {
-    story.play({kFitting});
-    story.advance(100s);
+    story.play({kFitting, passing(100s)});
     expectStanding(story, {.requests = ""});
-    story.play({on("setNetwork", 1, R"("anqp":"ready",)" + tls("m.example")), kReport});
-    story.advance(30s);
+    story.play({on("setNetwork", 1, R"("anqp":"ready",)" + tls("m.example")), kReport, passing(30s)});
     expectStanding(story, {.requests = "A ttls user"});
 }
 
@@ -184,11 +176,8 @@ void endsWhenTheAdapterGoes(const char* what, int pauseMs, const std::vector<std
         story.play(before);
         story.advance(std::chrono::milliseconds(pauseMs));
         story.forget();
-        story.act("pullAdapter");
-        story.advance(30s);
-        story.play({doing("insertAdapter"), kRadioOn});
-        story.advance(30s);
-        story.act("pullAdapter");
+        story.play({doing("pullAdapter"), passing(30s), doing("insertAdapter"), kRadioOn, passing(30s),
+                    doing("pullAdapter")});
         story.expect("ends", count(story.messages(), kEnds), 2);
         story.expect("ends in order", count(story.messages(), "Deinitialize supplicant completed."), 2);
         story.expect("handles", handles(), handlesBefore - 1);
@@ -210,8 +199,7 @@ TEST(ConnectingThread, OneThatIsLateLeavesItsLineAndEndsByItself) {
         const Ending ending = runStory({.seed = seed}, air({kNetwork}), [](Story& story) {
             story.play({kCredential});
             settle(story);
-            story.play({kRadioOff, doing("pullAdapter"), doing("insertAdapter")});
-            story.advance(60s);
+            story.play({kRadioOff, doing("pullAdapter"), doing("insertAdapter"), passing(60s)});
             story.expect("ends", count(story.messages(), kEnds), 1);
             const char* const line = "Time out when waiting for network connecting thread termination.";
             if (count(story.messages(), line) == 1) story.tell("late");

@@ -112,7 +112,6 @@ STORY(Credentials, MissingMembersAreEmpty, "{}") {
         R"({"CredentialEapMethod":1,"Type":3,"RealName":"r","CaCert":{},"AccessType":0})",
         R"({"CredentialEapMethod":5,"Type":3,"RealName":"r","CaCert":7,"Username":8})",
     };
-
     for (const char* const input : inputs) {
         list(story, "ADD_CREDENTIAL", input);
         const std::string file = story.config();

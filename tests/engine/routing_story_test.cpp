@@ -58,7 +58,6 @@ STORY(Routing, BadIhvNotificationsEndInTheirLineAndChangeNothingElse, R"({"spect
         {"005ec4060000000001000000325c0000", ""},
         {"005ec4060000000001000000325c0000ffff00112233", ""},
     };
-
     settle(story);
     for (const auto& [dataHex, line] : cases) {
         story.forget();
@@ -83,7 +82,6 @@ STORY(Routing, CommandsOfTheHotspotPortLeaveOneErrorLineWhenTheyCanNotBeRead, "{
         {R"({"CommandId":"GET_RADIO","Data":{}})", data},
         {R"({"CommandId":"GET_RADIO","Data":3})", data},
     };
-
     settle(story);
     for (const auto& [message, line] : cases) {
         story.forget();

@@ -143,8 +143,7 @@ TEST(SupplicantStory, AnAdapterPulledInTheMiddleOfACommandHarmsNothing) {
                 if (random() % 3 == 0) story.act("pullAdapter");
                 if (random() % 3 == 0) story.act("insertAdapter");
             }
-            story.act("insertAdapter");
-            story.advance(0ms);
+            story.play({doing("insertAdapter"), passing(0ms)});
             story.hotspot().events();
             const std::string seen = list(story);
             story.hotspot().send("READ_CREDENTIAL_FROM_FILE");

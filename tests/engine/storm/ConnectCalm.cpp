@@ -1,9 +1,7 @@
-#include <array>
 #include <random>
 
 #include "engine/storm/StormSteps.h"
 #include "engine/world/ConnectStory.h"
-#include "engine/world/StoreStory.h"
 
 namespace vexa::test {
 
@@ -21,28 +19,21 @@ constexpr const char* kAutoConnect = R"("AutoConnect":true,"AccessType":1)";
 
 // An adapter whose start failed twice stays as it is until it has been pulled.
 void heal(World& world) {
-    static constexpr std::array<const char*, 8> kActions = {
-        R"({"do":"pullAdapter"})",
-        R"({"do":"insertAdapter"})",
-        R"({"do":"radio","hardware":"on","software":"on"})",
-        R"({"do":"interfaceState","value":null})",
-        R"({"do":"setSession","session":"active"})",
-        R"({"do":"set","connectMs":200,"anqpMs":200})",
-        R"({"do":"completeAnqpQuery"})",
-        R"({"do":"sessionChange","eventType":5,"sessionId":1})"};
-    for (const char* action : kActions)
-        world.perform(action);
+    world.play({doing("pullAdapter"), doing("insertAdapter"),
+                doing("radio", R"("hardware":"on","software":"on")"),
+                doing("interfaceState", R"("value":null)"), doing("setSession", R"("session":"active")"),
+                doing("set", R"("connectMs":200,"anqpMs":200)"), doing("completeAnqpQuery"),
+                doing("sessionChange", R"("eventType":5,"sessionId":1)")});
     for (int number = 0; number < kNetworksOfTheStorm; ++number)
-        world.play({on("setNetwork", number, R"("anqp":"ready",)" + both()), kHs20On, kReport});
-    world.order("ADD_CREDENTIAL", ttlsData("haven.example", kAutoConnect));
+        world.perform(on("setNetwork", number, R"("anqp":"ready",)" + both()));
+    world.play({kHs20On, kReport, sending("ADD_CREDENTIAL", ttlsData("haven.example", kAutoConnect))});
 }
 
 // Faults that wait for their call take these requests instead of the last ones.
 void useUpFaults(World& world) {
     for (int tries = 0; tries < kTriesToHeal; ++tries) {
         heal(world);
-        world.play({connecting("Haven"), doing("dropConnection")});
-        world.advance(15s);
+        world.play({connecting("Haven"), doing("dropConnection"), passing(15s)});
     }
     heal(world);
 }
@@ -70,10 +61,9 @@ std::string stormOfConnections(World& world, std::uint64_t seed, int steps) {
     const std::string haven = open(kHavenNumber, "Haven", ttls("haven.example") + R"(,"visible":false)");
     world.perform(adding(haven));
     for (int step = 0; step < steps; step += kStepsOfAPart) {
-        world.hotspot().send("ADD_CREDENTIAL",
-                             ttlsData(random() % 2 == 0 ? "a.example" : "b.example", kAutoConnect));
-        world.hotspot().send("ADD_CREDENTIAL",
-                             tlsData(random() % 2 == 0 ? "a.example" : "b.example", kAutoConnect));
+        for (const auto& dataFor : {ttlsData, tlsData})
+            world.hotspot().send("ADD_CREDENTIAL",
+                                 dataFor(random() % 2 == 0 ? "a.example" : "b.example", kAutoConnect));
         for (int i = 0; i < kStepsOfAPart; ++i)
             storm.step();
         if (const std::string wrong = joinsWhenLeftAlone(world); !wrong.empty())

@@ -1,11 +1,10 @@
 // Storms on the seeded scheduler, as many as one likes: a process of its own for each, and the seeds that
 // failed.
 
-#include <charconv>
 #include <cstdint>
 #include <cstdio>
+#include <cstdlib>
 #include <string>
-#include <string_view>
 
 #include "engine/storm/StormSteps.h"
 #include "engine/world/RunStory.h"
@@ -21,22 +20,21 @@ struct Options {
     std::uint64_t steps = 48;
 };
 
-bool readNumber(std::string_view text, std::uint64_t& number) {
-    const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
-    return error == std::errc() && end == text.data() + text.size() && !text.empty();
-}
-
 bool readOptions(int count, char** arguments, Options& options) {
     for (int i = 1; i < count; ++i) {
-        const std::string_view name = arguments[i];
+        const std::string name = arguments[i];
         std::uint64_t* const number = name == "--seeds"   ? &options.seeds
                                       : name == "--from"  ? &options.from
                                       : name == "--steps" ? &options.steps
                                                           : nullptr;
-        if (name == "--connections")
+        if (name == "--connections") {
             options.connections = true;
-        else if (number == nullptr || ++i == count || !readNumber(arguments[i], *number))
-            return false;
+            continue;
+        }
+        if (number == nullptr || ++i == count) return false;
+        char* end = nullptr;
+        *number = std::strtoull(arguments[i], &end, 10);
+        if (end == arguments[i] || *end != '\0') return false;
     }
     return true;
 }
@@ -64,7 +62,6 @@ int main(int count, char** arguments) {
     std::uint64_t failed = 0;
     for (std::uint64_t i = 0; i < options.seeds; ++i)
         if (!isCalm(options.from + i, options)) ++failed;
-    std::printf("%llu storms, %llu failed\n", static_cast<unsigned long long>(options.seeds),
-                static_cast<unsigned long long>(failed));
+    std::printf("%ju storms, %ju failed\n", std::uintmax_t{options.seeds}, std::uintmax_t{failed});
     return failed == 0 ? 0 : 1;
 }

@@ -20,14 +20,13 @@ void turmoil(Story& story) {
     story.spectral().send("GET_CHANNEL_LIST");
     story.spectral().send("FULL_SCAN");
     for (int round = 0; round < 5; ++round) {
-        story.advance(350ms);
-        story.act("pullAdapter");
+        story.play({passing(350ms), doing("pullAdapter")});
         story.hotspot().send("GET_IS_CARD_IN");
         story.play({doing("roam"), doing("radio", R"("software":"off")")});
         for (int code = 0; code < 16; ++code)
-            story.play({doing("notify", R"("source":16,"code":)" + std::to_string(code)),
-                        doing("ihv", R"("dataHex":"005ec4060000000001000000325c0000ffff0102")"),
-                        doing("insertAdapter"), doing("radio", R"("software":"on")")});
+            story.act("notify", R"("source":16,"code":)" + std::to_string(code));
+        story.play({doing("ihv", R"("dataHex":"005ec4060000000001000000325c0000ffff0102")"),
+                    doing("insertAdapter"), doing("radio", R"("software":"on")")});
         story.spectral().send("GET_CURRENT_CHANNEL");
     }
     story.spectral().send("FULL_SCAN");

@@ -5,8 +5,6 @@
 
 namespace vexa::test {
 
-using namespace std::chrono_literals;
-
 namespace {
 
 std::string bssid(int number) {
@@ -117,8 +115,8 @@ int count(std::string_view text, std::string_view part) {
     return found;
 }
 
-void settle(World& world) {
-    world.advance(25s);
+void settle(World& world, platform::Duration span) {
+    world.advance(span);
     world.forget();
 }
 

@@ -49,8 +49,9 @@ std::string rounds(World& world);
 /// How often a text stands in another.
 int count(std::string_view text, std::string_view part);
 
-/// The connecting thread has had its first rounds and waits, and all that was is forgotten.
-void settle(World& world);
+/// Lets this time pass and forgets all that was. After so long the connecting thread has had its first rounds
+/// and waits.
+void settle(World& world, platform::Duration span = std::chrono::seconds(25));
 
 /// How many requests of this subtype the hotspot module got since the last forget().
 int moduleRequests(World& world, unsigned subtype);

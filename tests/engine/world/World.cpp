@@ -76,6 +76,10 @@ std::string doing(const std::string& action, const std::string& members) {
     return R"({"do":")" + action + "\"" + (members.empty() ? "" : ",") + members + "}";
 }
 
+std::string passing(platform::Duration span) {
+    return doing("advance", R"("ms":)" + std::to_string(span / 1ms));
+}
+
 std::string sending(const std::string& command, const std::string& data) {
     Json::Value message;
     message["CommandId"] = command;
@@ -130,7 +134,9 @@ void World::advance(platform::Duration span) {
 
 void World::play(const std::vector<std::string>& deeds) {
     for (const std::string& deed : deeds)
-        if (deed.starts_with(R"({"do":)")) {
+        if (deed.starts_with(R"({"do":"advance")")) {
+            advance(std::chrono::milliseconds(parsed(deed)["ms"].asInt()));
+        } else if (deed.starts_with(R"({"do":)")) {
             perform(deed);
         } else {
             hotspot().sendRaw(deed);

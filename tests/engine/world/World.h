@@ -26,6 +26,9 @@ std::string contentOf(const std::filesystem::path& file);
 /// The text of an action: doing("radio", R"("software":"off")").
 std::string doing(const std::string& action, const std::string& members = "");
 
+/// The action of letting this time pass, and everything come to rest that falls due in it.
+std::string passing(platform::Duration span);
+
 /// The text of a client's message.
 std::string sending(const std::string& command, const std::string& data = "");
 
