@@ -8,7 +8,7 @@
 #include <unordered_map>
 #include <vector>
 
-#include "engine/connect_story.h"
+#include "engine/world/ConnectStory.h"
 #include "platform/seeded/Seeded.h"
 
 // One round of the connecting thread: every network in range beside every credential. Time is the machine's,

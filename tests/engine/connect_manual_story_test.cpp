@@ -1,385 +1,193 @@
 #include <gtest/gtest.h>
 
-#include "engine/connect_story.h"
+#include "engine/world/ConnectStory.h"
 
 namespace vexa::test {
 namespace {
 
 using namespace std::chrono_literals;
 
-const std::string kOpenCafe = network(1, "cafe", ttls() + "," + lettingInAll());
-
-/// A world in which auto-connect has nothing to do: every credential waits for the user's hand.
-struct ByHand {
-    const char* what;
-    std::vector<std::string> networks;
-    std::vector<StoredCredential> credentials;
-    std::string name;
-    std::string requests;
-    std::string outcomes;
-    std::string connected;
-    int eapMethod;
-};
-
+/// Auto-connect has nothing to do in these stories: every credential waits for the user's hand.
 StoredCredential byHand(int id, bool isTls = false, const std::string& realm = "a.example") {
     return {.id = id, .realm = realm, .isTls = isTls, .autoConnect = false};
 }
 
-const std::vector<ByHand>& manualConnects() {
-    static const std::vector<ByHand> all = {
-        {"a network that lets the credential in",
-         {kOpenCafe},
-         {byHand(1)},
-         "cafe",
-         "cafe ttls u1\n",
-         "1 access",
-         "cafe",
-         2},
-        {"every credential in order, with one result for all",
-         {network(1, "cafe", both())},
-         {byHand(1), byHand(2, true), byHand(3)},
-         "cafe",
-         "cafe ttls u1\ncafe tls ca2 machineOrUser\ncafe tls ca2 machine\ncafe ttls u3\n",
-         "0 no access",
-         "-",
-         0},
-        {"the credential that is let in, behind others",
-         {network(1, "cafe", both() + "," + lettingIn(R"({"eapMethod":21,"username":"u3"})"))},
-         {byHand(1), byHand(2, true), byHand(3), byHand(4)},
-         "cafe",
-         "cafe ttls u1\ncafe tls ca2 machineOrUser\ncafe tls ca2 machine\ncafe ttls u3\n",
-         "1 access",
-         "cafe",
-         2},
-        {"a name that is in no list", {kOpenCafe}, {byHand(1)}, "hotel", "", "0", "-", -1},
-        {"a name of 33 bytes, however it begins",
-         {network(1, "0123456789abcdef0123456789abcdef", ttls() + "," + lettingInAll())},
-         {byHand(1)},
-         "0123456789abcdef0123456789abcdef!",
-         "",
-         "0",
-         "-",
-         -1},
-        {"a name of 289 bytes, which would be one of 33",
-         {kOpenCafe},
-         {byHand(1)},
-         "cafecafecafecafecafecafecafecafecafecafecafecafecafecafecafecafecafecafecafecafecafecafecafecafe"
-         "cafecafecafecafecafecafecafecafecafecafecafecafecafecafecafecafecafecafecafecafecafecafecafecafe"
-         "cafecafecafecafecafecafecafecafecafecafecafecafecafecafecafecafecafecafecafecafecafecafecafecafe!",
-         "",
-         "0",
-         "-",
-         -1},
-        {"a name that goes on behind a NUL", {kOpenCafe}, {byHand(1)}, {"cafe\0x", 6}, "", "0", "-", -1},
-        {"no name", {kOpenCafe}, {byHand(1)}, "", "", "", "-", -1},
-        {"a network without realm data",
-         {network(1, "cafe", R"("anqp":"never",)" + lettingInAll())},
-         {byHand(1)},
-         "cafe",
-         "",
-         "",
-         "-",
-         -1},
-        {"a network that no credential fits, which the system knows",
-         {network(1, "cafe", ttls("other.example") + R"(,"osProfile":true)")},
-         {byHand(1)},
-         "cafe",
-         "plain cafe\n",
-         "",
-         "cafe",
-         0},
-        {"a network that no credential fits, which the system doesn't know",
-         {network(1, "cafe", ttls("other.example"))},
-         {byHand(1)},
-         "cafe",
-         "plain cafe\n",
-         "",
-         "-",
-         0},
-        {"a network that is no hotspot",
-         {network(1, "cafe", R"("hs20":false,"osProfile":true,)" + ttls())},
-         {byHand(1)},
-         "cafe",
-         "plain cafe\n",
-         "",
-         "cafe",
-         0},
-        {"the beginning of a name goes to the system as it was asked for",
-         {network(1, "cafe", ttls("other.example"))},
-         {byHand(1)},
-         "caf",
-         "plain caf\n",
-         "",
-         "-",
-         0},
-    };
-    return all;
+constexpr auto kBehindStart = 6s;
+const std::string kOne = air({kCafe}, storing({byHand(1)}));
+const std::string kSlow = doing("set", R"("connectMs":5000)");
+
+/// The user asks for a network by its name.
+void asksFor(const std::string& what, const std::string& name, const std::vector<std::string>& networks,
+             const std::vector<StoredCredential>& credentials, const Standing& end) {
+    EXPECT_STORY(air(networks, storing(credentials)), [&](Story& story) {
+        settle(story, kBehindStart);
+        story.play({connecting(name), passing(5s)});
+        expectStanding(story, end);
+    }) << what;
 }
 
 TEST(ManualConnect, TriesWhatFitsInOrderAndTellsOneResult) {
-    for (const ByHand& c : manualConnects()) {
-        const Ending ending = runStory(21, air(c.networks, storing(c.credentials)), [&](World& world) {
-            world.advance(2s);
-            world.hotspot().events();
-            connect(world, c.name);
-            std::string text = results(world);
-            world.advance(5s);
-            text += results(world);
-            return requests(world) + "| " + text + " | " + connectedTo(world) + " | " +
-                   std::to_string(eapMethod(world));
-        });
-        EXPECT_TRUE(ending.isOrderly) << c.what << ending.errors;
-        EXPECT_EQ(ending.text,
-                  c.requests + "| " + c.outcomes + " | " + c.connected + " | " + std::to_string(c.eapMethod))
-            << c.what;
-    }
+    const std::string walk = "cafe ttls u1; cafe tls ca2 machineOrUser; cafe tls ca2 machine; cafe ttls u3";
+    asksFor("a network that lets the credential in", "cafe", {kCafe}, {byHand(1)},
+            {"cafe ttls u1", "1 access", "cafe", 2});
+    asksFor("every credential in order, with one result for all", "cafe", {network(1, "cafe", both())},
+            {byHand(1), byHand(2, true), byHand(3)}, {walk, "0 no access", "-", 0});
+    asksFor("the credential that is let in, behind others", "cafe",
+            {network(1, "cafe", both() + "," + lettingIn(R"({"eapMethod":21,"username":"u3"})"))},
+            {byHand(1), byHand(2, true), byHand(3), byHand(4)}, {walk, "1 access", "cafe", 2});
 }
 
-TEST(ManualConnect, TellsInTheLogHowItWalksThroughTheCredentials) {
-    const std::string scenario =
-        air({network(1, "cafe", both())}, storing({byHand(1), byHand(2, true), byHand(3)}));
-    const Ending ending = runStory(22, scenario, [](World& world) {
-        world.advance(2s);
-        connect(world, "cafe");
-        world.advance(5s);
-        return missingInOrder(
-            world,
-            {"###Manually connect to a BSS started.###",
-             "###We are actually going to connect to HS20 network now.###",
-             "Unblocked network with ssid=cafe and mac address=02:aa:00:00:00:01 due to user has manually "
-             "connected to it.",
-             "Try to connect to HS20 network using next credential.",
-             "Selecting credential with id=1",
-             "Adding a new EAP-TTLS network profile...",
-             "Connection start event: connection initiated by HS20, profile name=cafe",
-             "Manual connection started.",
-             "Connection failed! profile name=cafe",
-             "Manual connection failed, we will try to use next credential.",
-             "Try to connect to HS20 network using next credential.",
-             "We have tried credential with id=1, skipping...",
-             "Selecting credential with id=2",
-             "Adding a new EAP-TLS network profile with auth mode=machineOrUser...",
-             "connResult=1 after invoking tryConnectHs20BssUsingNextCredential.",
-             "Successfully initiated connection to HS20 network=cafe using next credential.",
-             "Connection using EAP-TLS with authMode=machineOrUser failed,trying to use EAP-TLS with "
-             "authMode=machine.",
-             "Manual connection failed, we will try to use next credential.",
-             "Selecting credential with id=3",
-             "Manual connection failed, we will try to use next credential.",
-             "We have tried credential with id=1, skipping...",
-             "We have tried credential with id=2, skipping...",
-             "We have tried credential with id=3, skipping...",
-             "connResult=2 after invoking tryConnectHs20BssUsingNextCredential.",
-             "We have tried all credentials, connection failed.",
-             "Reason code desc=The user name or password is not correct, or the certificate wa",
-             "Send connection result to vexa."});
-    });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text, "");
+TEST(ManualConnect, AsksForNothingWhereThereIsNoSuchNetwork) {
+    const std::string longName = "0123456789abcdef0123456789abcdef";
+    std::string longer;
+    while (longer.size() < 288)
+        longer += "cafe";
+    const Standing failure{"", "0", "-", -1};
+    asksFor("a name that is in no list", "hotel", {kCafe}, {byHand(1)}, failure);
+    asksFor("33 bytes, however they begin", longName + "!", {open(1, longName, ttls())}, {byHand(1)},
+            failure);
+    asksFor("289 bytes, which would be 33", longer + "!", {kCafe}, {byHand(1)}, failure);
+    asksFor("a name that goes on behind a NUL", {"cafe\0x", 6}, {kCafe}, {byHand(1)}, failure);
+    asksFor("no name", "", {kCafe}, {byHand(1)}, {"", "", "-", -1});
+    asksFor("a network without realm data", "cafe", {open(1, "cafe", R"("anqp":"never")")}, {byHand(1)},
+            {"", "", "-", -1});
 }
 
-TEST(ManualConnect, TakesTheSameWalkTwice) {
-    const std::string scenario = air({network(1, "cafe", ttls())}, storing({byHand(1), byHand(2)}));
-    const Ending ending = runStory(23, scenario, [](World& world) {
-        world.advance(2s);
-        for (int i = 0; i < 2; ++i) {
-            connect(world, "cafe");
-            world.advance(5s);
-        }
-        return requests(world);
-    });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text, "cafe ttls u1\ncafe ttls u2\ncafe ttls u1\ncafe ttls u2\n");
+TEST(ManualConnect, LeavesToTheSystemWhatNoCredentialFits) {
+    const std::string elsewhere = ttls("other.example");
+    asksFor("a network that it knows", "cafe", {network(1, "cafe", elsewhere + R"(,"osProfile":true)")},
+            {byHand(1)}, {"plain cafe", "", "cafe", 0});
+    asksFor("one that it doesn't know", "cafe", {network(1, "cafe", elsewhere)}, {byHand(1)},
+            {"plain cafe", "", "-", 0});
+    asksFor("no hotspot", "cafe", {network(1, "cafe", R"("hs20":false,"osProfile":true,)" + ttls())},
+            {byHand(1)}, {"plain cafe", "", "cafe", 0});
+    asksFor("the beginning of a name, as it was asked for", "caf", {network(1, "cafe", elsewhere)},
+            {byHand(1)}, {"plain caf", "", "-", 0});
 }
 
-TEST(ManualConnect, LeavesTheRetriesOfAutoConnectAlone) {
-    const std::string scenario = air({network(1, "cafe", ttls())}, storing({{}}));
-    const Ending ending = runStory(24, scenario, [](World& world) {
-        world.advance(30s);
-        world.perform(R"({"do":"clearCalls"})");
-        connect(world, "cafe");
-        world.advance(60s);
-        return requests(world);
-    });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text, "cafe ttls u1\n");
+STORY(ManualConnect, TellsInTheLogHowItWalksThroughTheCredentials,
+      air({network(1, "cafe", both())}, storing({byHand(1), byHand(2, true), byHand(3)}))) {
+    const std::string tries = "Try to connect to HS20 network using next credential.";
+    const std::string fails = "Manual connection failed, we will try to use next credential.";
+    const std::string skips = "We have tried credential with id=";
+    settle(story, kBehindStart);
+    story.play({connecting("cafe"), passing(5s)});
+    story.expectLog(
+        "###Manually connect to a BSS started.###",
+        "###We are actually going to connect to HS20 network now.###",
+        "Unblocked network with ssid=cafe and mac address=02:aa:00:00:00:01 due to user has "
+        "manually connected to it.",
+        tries, "Selecting credential with id=1", "Manual connection started.",
+        "Connection failed! profile name=cafe", fails, tries, skips + "1, skipping...",
+        "Selecting credential with id=2", "connResult=1 after invoking tryConnectHs20BssUsingNextCredential.",
+        "Successfully initiated connection to HS20 network=cafe using next credential.", fails,
+        "Selecting credential with id=3", fails, skips + "1, skipping...", skips + "2, skipping...",
+        skips + "3, skipping...", "connResult=2 after invoking tryConnectHs20BssUsingNextCredential.",
+        "We have tried all credentials, connection failed.", "Send connection result to vexa.");
 }
 
-TEST(ManualConnect, ARefusedRequestIsToldAtOnce) {
-    const std::string scenario = air({kOpenCafe}, storing({byHand(1)}));
-    const Ending ending = runStory(25, scenario, [](World& world) {
-        world.advance(2s);
-        world.hotspot().events();
-        world.perform(R"({"do":"fail","call":"WlanConnect","error":50})");
-        connect(world, "cafe");
-        return requests(world) + outcomes(world) + "\n" +
-               missingInOrder(world, {"WlanConnect call failed with error code=50.",
-                                      "Try to connect to HS20 network failed.", "connectBss failed."});
-    });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text, "cafe ttls u1 = 50\n0\n");
+STORY(ManualConnect, ARefusedRequestIsToldAtOnce, kOne) {
+    settle(story, kBehindStart);
+    story.play({failing("WlanConnect", 50), connecting("cafe")});
+    expectStanding(story, {.requests = "cafe ttls u1 = 50", .outcomes = "0"});
+    story.expectLog("WlanConnect call failed with error code=50.", "Try to connect to HS20 network failed.",
+                    "connectBss failed.");
 }
 
-TEST(ManualConnect, ANextCredentialThatCanNotStartEndsWithoutAWord) {
-    const std::string scenario = air({network(1, "cafe", ttls())}, storing({byHand(1), byHand(2)}));
-    const Ending ending = runStory(26, scenario, [](World& world) {
-        world.advance(2s);
-        world.hotspot().events();
-        world.perform(R"({"do":"fail","call":"WlanConnect","error":50,"skip":1})");
-        connect(world, "cafe");
-        world.advance(5s);
-        return requests(world) + outcomes(world) + "\n" +
-               missingInOrder(world, {"connResult=0 after invoking tryConnectHs20BssUsingNextCredential.",
-                                      "ERROR: Try to connect to HS20 network using next credential failed."});
-    });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text, "cafe ttls u1\ncafe ttls u2 = 50\n\n");
+STORY(ManualConnect, ANextCredentialThatCanNotStartEndsWithoutAWord,
+      air({network(1, "cafe", ttls())}, storing({byHand(1), byHand(2)}))) {
+    settle(story, kBehindStart);
+    story.play({failing("WlanConnect", 50, R"("skip":1)"), connecting("cafe"), passing(5s)});
+    expectStanding(story, {.requests = "cafe ttls u1; cafe ttls u2 = 50", .outcomes = ""});
+    story.expectLog("connResult=0 after invoking tryConnectHs20BssUsingNextCredential.",
+                    "ERROR: Try to connect to HS20 network using next credential failed.");
 }
 
 // The system's own connections carry nothing of this program, whatever their outcome.
-TEST(ForeignConnection, IsToldAsASuccessWhateverItsOutcome) {
-    struct Case {
-        const char* succeeds;
-        const char* line;
-        const char* connected;
-    };
-    const Case cases[] = {
-        {"true", "Connection result not initiated by HS20, profile name=home, result=Success", "home"},
-        {"false", "Connection result not initiated by HS20, profile name=home, result=Failure", "-"},
-    };
-    for (const Case& c : cases) {
-        const Ending ending = runStory(27, air({kOpenCafe}, storing({byHand(1)})), [&](World& world) {
-            world.advance(2s);
-            world.hotspot().events();
-            world.perform(std::string(R"({"do":"osConnect","ssid":"home","succeeds":)") + c.succeeds + "}");
-            world.advance(1s);
-            return outcomes(world) + " " + connectedTo(world) + " " + std::to_string(eapMethod(world)) +
-                   missingInOrder(
-                       world, {"Connection start event: connection not initiated by HS20, profile name=home",
-                               c.line, "Send connection result to vexa."}) +
-                   (messagesSince(world, 0).find("m_bConnectionStartedByOs is not set") == std::string::npos
-                        ? ""
-                        : " without a start");
-        });
-        EXPECT_TRUE(ending.isOrderly) << c.line << ending.errors;
-        EXPECT_EQ(ending.text, std::string("1 no access ") + c.connected + " 0") << c.line;
-    }
+void isForeign(const std::string& succeeds, const std::string& result, const std::string& connected) {
+    EXPECT_STORY(kOne, [&](Story& story) {
+        settle(story, kBehindStart);
+        story.play({doing("osConnect", R"("ssid":"home","succeeds":)" + succeeds), passing(1s)});
+        expectStanding(story, {.connected = connected, .eapMethod = 0, .outcomes = "1 no access"});
+        story.expectLog("Connection start event: connection not initiated by HS20, profile name=home",
+                        "Connection result not initiated by HS20, profile name=home, result=" + result,
+                        "Send connection result to vexa.");
+        story.expect("results without a start",
+                     count(story.messages(), "m_bConnectionStartedByOs is not set"), 0);
+    });
 }
 
-TEST(ForeignConnection, ThatDisplacesOursEndsItAndIsToldApart) {
-    const Ending ending =
-        runStory(28, air({kOpenCafe}, storing({byHand(1)}) + R"(,"connectMs":2000)"), [](World& world) {
-            world.advance(3s);
-            world.hotspot().events();
-            connect(world, "cafe");
-            world.advance(500ms);
-            world.perform(R"({"do":"osConnect","ssid":"home"})");
-            world.advance(5s);
-            return outcomes(world) + " " + connectedTo(world) + " " + std::to_string(eapMethod(world));
-        });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text, "0 no access 1 no access home 0");
+TEST(ForeignConnection, IsToldAsASuccessWhateverItsOutcome) {
+    isForeign("true", "Success", "home");
+    isForeign("false", "Failure", "-");
+}
+
+STORY(ForeignConnection, ThatDisplacesOursEndsItAndIsToldApart, kOne) {
+    settle(story, kBehindStart);
+    story.play(
+        {kSlow, connecting("cafe"), passing(500ms), doing("osConnect", R"("ssid":"home")"), passing(8s)});
+    expectStanding(story, {.connected = "home", .eapMethod = 0, .outcomes = "0 no access 1 no access"});
 }
 
 // The result of another network whose name begins like the one asked for counts as its own.
-TEST(ForeignConnection, ALongerNameWithTheSameBeginningCountsAsOwn) {
-    const std::string scenario = air({kOpenCafe, network(2, "cafeteria", ttls("x.example"))},
-                                     storing({byHand(1)}) + R"(,"connectMs":5000)");
-    const Ending ending = runStory(29, scenario, [](World& world) {
-        world.advance(6s);
-        world.hotspot().events();
-        connect(world, "cafe");
-        world.advance(1s);
-        world.perform(R"({"do":"connection","code":10,"profileName":"cafe","ssidHex":"636166657465726961"})");
-        return outcomes(world) + " " + std::to_string(eapMethod(world)) +
-               missingInOrder(world,
-                              {"Connection result initiated by HS20, clearing the cache, profile name=cafe.",
-                               "Connection succeeded! profile name=cafe"});
-    });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text, "1 no access 2");
+STORY(ForeignConnection, ALongerNameWithTheSameBeginningCountsAsOwn,
+      air({kCafe, network(2, "cafeteria", ttls("x.example"))}, storing({byHand(1)}))) {
+    settle(story, kBehindStart);
+    story.play({kSlow, connecting("cafe"), passing(1s),
+                doing("connection", R"("code":10,"profileName":"cafe","ssidHex":"636166657465726961")")});
+    expectStanding(story, {.eapMethod = 2, .outcomes = "1 no access"});
+    story.expectLog("Connection result initiated by HS20, clearing the cache, profile name=cafe.",
+                    "Connection succeeded! profile name=cafe");
+}
+
+void endsWithItsLine(const std::string& result, const char* line) {
+    EXPECT_STORY(kOne, [&](Story& story) {
+        settle(story, kBehindStart);
+        story.play({kSlow, connecting("cafe"), result});
+        expectStanding(story, {.eapMethod = 0, .outcomes = ""});
+        story.expectLog(line);
+    }) << line;
 }
 
 TEST(ConnectionResult, WithoutAProfileOrDataEndsWithItsLineAlone) {
-    struct Case {
-        const char* what;
-        const char* action;
-        const char* line;
-    };
-    const Case cases[] = {
-        {"no data", R"({"do":"notify","source":8,"code":10})",
-         "ERROR: No wlan connection notification data."},
-        {"no name", R"({"do":"connection","code":10,"profileName":"cafe","ssidHex":""})",
-         "ERROR: Invalid ssid or ssid length."},
-        {"a profile that isn't known",
-         R"({"do":"connection","code":10,"profileName":"other","ssidHex":"63616665"})",
-         "ERROR: Cannot get profile in profile manager."},
-    };
-    for (const Case& c : cases) {
-        const Ending ending =
-            runStory(30, air({kOpenCafe}, storing({byHand(1)}) + R"(,"connectMs":5000)"), [&](World& world) {
-                world.advance(6s);
-                world.hotspot().events();
-                connect(world, "cafe");
-                world.perform(c.action);
-                return outcomes(world) + std::to_string(eapMethod(world)) + missingInOrder(world, {c.line});
-            });
-        EXPECT_TRUE(ending.isOrderly) << c.what << ending.errors;
-        EXPECT_EQ(ending.text, "0") << c.what;
-    }
+    endsWithItsLine(doing("notify", R"("source":8,"code":10)"),
+                    "ERROR: No wlan connection notification data.");
+    endsWithItsLine(doing("connection", R"("code":10,"profileName":"cafe","ssidHex":"")"),
+                    "ERROR: Invalid ssid or ssid length.");
+    endsWithItsLine(doing("connection", R"("code":10,"profileName":"other","ssidHex":"63616665")"),
+                    "ERROR: Cannot get profile in profile manager.");
+}
+
+/// While auto-connect is on its way into the cafe the user asks for these networks.
+void waits(const char* what, const char* accepts, const std::vector<std::string>& asked,
+           const Standing& end) {
+    const std::string scenario = air({network(1, "cafe", ttls() + "," + lettingIn(accepts)), kHotel},
+                                     storing({{}, byHand(2, false, "b.example")}) + R"(,"connectMs":1000)");
+    EXPECT_STORY(scenario, [&](Story& story) {
+        story.advance(500ms);
+        story.hotspot().events();
+        story.play(asked);
+        story.advance(8s);
+        expectStanding(story, end);
+        story.expectLog(
+            "###Manually connect to a BSS started.###",
+            "\tConnection has already been started, maybe by auto connecting thread, we will wait "
+            "until the auto connecting completed, either succeed or fail.",
+            "Connection result initiated by HS20, clearing the cache, profile name=cafe.",
+            "###User manual connecting request pending, we are going to connect now.###",
+            "###We are actually going to connect to HS20 network now.###");
+    }) << what;
 }
 
 TEST(PendingRequest, RunsWhenTheRunningAttemptHasEndedAndIsAllThatTheClientHears) {
-    struct Case {
-        const char* what;
-        const char* accepts;
-        std::vector<std::string> asked;
-        std::string requests;
-        std::string outcomes;
-        std::string connected;
-    };
-    const Case cases[] = {
-        {"after a success",
-         R"({"eapMethod":21})",
-         {"hotel"},
-         "cafe ttls u1\nhotel ttls u2\n",
-         "1 access",
-         "hotel"},
-        {"after a failure", "", {"hotel"}, "cafe ttls u1\nhotel ttls u2\n", "1 access", "hotel"},
-        {"the last of two", "", {"cafe", "hotel"}, "cafe ttls u1\nhotel ttls u2\n", "1 access", "hotel"},
-        {"one that is in no list", R"({"eapMethod":21})", {"motel"}, "cafe ttls u1\n", "0", "cafe"},
-        {"the network that is just being joined",
-         R"({"eapMethod":21})",
-         {"cafe"},
-         "cafe ttls u1\ncafe ttls u1\n",
-         "1 access",
-         "cafe"},
-    };
-    for (const Case& c : cases) {
-        const std::string scenario =
-            air({network(1, "cafe", ttls() + "," + lettingIn(c.accepts)),
-                 network(2, "hotel", ttls("b.example") + "," + lettingInAll())},
-                storing({{}, byHand(2, false, "b.example")}) + R"(,"connectMs":1000)");
-        const Ending ending = runStory(31, scenario, [&](World& world) {
-            world.advance(500ms);
-            world.hotspot().events();
-            for (const std::string& name : c.asked)
-                connect(world, name);
-            std::string early = results(world);
-            world.advance(8s);
-            return early + requests(world) + "| " + results(world) + " | " + connectedTo(world) +
-                   missingInOrder(
-                       world, {"###Manually connect to a BSS started.###",
-                               "\tConnection has already been started, maybe by auto connecting thread, we "
-                               "will wait "
-                               "until the auto connecting completed, either succeed or fail.",
-                               "Connection result initiated by HS20, clearing the cache, profile name=cafe.",
-                               "###User manual connecting request pending, we are going to connect now.###",
-                               "###We are actually going to connect to HS20 network now.###"});
-        });
-        EXPECT_TRUE(ending.isOrderly) << c.what << ending.errors;
-        EXPECT_EQ(ending.text, c.requests + "| " + c.outcomes + " | " + c.connected) << c.what;
-    }
+    const char* const all = R"({"eapMethod":21})";
+    const Standing inTheHotel{"cafe ttls u1; hotel ttls u2", "1 access", "hotel"};
+    waits("after a success", all, {connecting("hotel")}, inTheHotel);
+    waits("after a failure", "", {connecting("hotel")}, inTheHotel);
+    waits("the last of two", "", {connecting("cafe"), connecting("hotel")}, inTheHotel);
+    waits("one that is in no list", all, {connecting("motel")}, {"cafe ttls u1", "0", "cafe"});
+    waits("the network that is just being joined", all, {connecting("cafe")},
+          {"cafe ttls u1; cafe ttls u1", "1 access", "cafe"});
 }
 
 }  // namespace

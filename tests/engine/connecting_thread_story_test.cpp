@@ -1,302 +1,219 @@
 #include <gtest/gtest.h>
 
-#include "engine/AirStory.h"
-#include "engine/StoreStory.h"
+#include <sstream>
+
+#include "engine/world/ConnectStory.h"
 
 namespace vexa::test {
 namespace {
 
 using namespace std::chrono_literals;
 
-constexpr const char* kReport = R"({"do":"reportNetworks"})";
-constexpr const char* kTimeOut = "Timeout happens in the network connecting thread.";
+const std::string kTimeOut = "Timeout happens in the network connecting thread.";
 constexpr const char* kListChanged = "HS20 network list changed event signaled.";
 constexpr const char* kAnqpReady = "ANQP info ready event signaled.";
-
-constexpr const char* kAsleep = "Current session is not active, sleep for a while and continue.";
 constexpr const char* kNoNetwork = "No HS20 BSS, wait for HS20 network list change.";
 constexpr const char* kNoCredential = "No credential, wait for user to add credential.";
+constexpr const char* kQuerying = "We are querying the HS20 network ANQP info, wait.";
+constexpr const char* kEnds = "The NetworkingMgr thread is to be terminated...";
 
-std::string fetched(int number, const std::string& ssid) {
-    return network(number, ssid, realms("a.example", "21"));
-}
+const std::string kNetwork = network(1, "A", ttls());
+const std::string kMute = network(1, "Mute", R"("anqp":"never")");
+
+const std::string kAway = doing("setSession", R"("session":"disconnected")");
+
+// A stored credential that fits no network here, and one that does.
+const std::string kCredential = sending("ADD_CREDENTIAL", ttlsData("elsewhere.example"));
+const std::string kFitting = sending("ADD_CREDENTIAL", ttlsData("a.example", R"("AutoConnect":true)"));
 
 // What the log tells of the rounds while this time passes.
 std::string roundsIn(World& world, platform::Duration span) {
-    const std::size_t before = world.logSize();
+    world.forget();
     world.advance(span);
-    return roundsSince(world, before);
+    return rounds(world);
 }
 
-std::string round(const std::string& wake, const std::string& gate) {
-    return wake + " | " + gate + "\n";
+std::string round(const std::string& gate) {
+    return kTimeOut + " | " + gate + "\n";
 }
 
-// A stored credential that fits no network here.
-void addCredential(World& world) {
-    world.hotspot().send("ADD_CREDENTIAL", ttlsData("elsewhere.example"));
-    world.advance(0ms);
-}
-
-// One that fits the networks here.
-std::string autoConnectData() {
-    std::string data = ttlsData("a.example");
-    return data.insert(data.find('{') + 1, R"("AutoConnect":true,)");
-}
-
-/// A world with one network and a credential, unless it says otherwise.
-struct Gate {
-    const char* what;
-    std::string action;
-    std::string line;
-    std::string scenario = air({fetched(1, "A")});
-    bool hasCredential = true;
-};
-
-Gate notDisconnected(const char* what, int interfaceState, const std::string& name) {
-    return {
-        what, R"({"do":"interfaceState","value":)" + std::to_string(interfaceState) + "}",
-        "Supplicant not in disconnected state, skip this round of network connecting. | Queried supplicant "
-        "state=" +
-            name};
-}
-
-const std::vector<Gate>& gates() {
-    static const std::vector<Gate> all = {
-        {"radio off", R"({"do":"radio","software":"off"})", "Radio turned off, wait it be turned on."},
-        {"hardware radio off is none of its business", R"({"do":"radio","hardware":"off"})", kNoNetwork,
-         air({})},
-        notDisconnected("not ready", 0, "InvalidState"),
-        notDisconnected("connected", 1, "Connected"),
-        notDisconnected("ad hoc", 2, "InvalidState"),
-        notDisconnected("disconnecting", 3, "Disconnecting"),
-        notDisconnected("associating", 5, "Associating"),
-        notDisconnected("discovering", 6, "Scanning"),
-        notDisconnected("authenticating", 7, "Authenticating"),
-        {"a query that fails", R"({"do":"fail","call":"WlanQueryInterface","error":31,"times":1000})",
-         "WlanQueryInterface failed in Supplicant::queryState. | " +
-             notDisconnected("", 0, "InvalidState").line},
-        {"no network", "", kNoNetwork, "{}"},
-        {"no credential", "", kNoCredential, air({fetched(1, "A")}), false},
-        {"no credential, and a network without data", "", kNoCredential, air({network(1, "A")}), false},
-        {"no session", R"({"do":"setSession","session":"disconnected"})", kAsleep},
-    };
-    return all;
+/// When all this has happened, a round begins every ten seconds and this gate holds it.
+void holds(const std::string& gate, const std::vector<std::string>& deeds,
+           const std::string& scenario = air({kNetwork})) {
+    EXPECT_STORY(scenario, [&](Story& story) {
+        settle(story);
+        story.play(deeds);
+        story.advance(40s);
+        story.expect("rounds", roundsIn(story, 30s), round(gate) + round(gate) + round(gate));
+    }) << gate;
 }
 
 TEST(ConnectingThread, TellsInEachRoundWhichGateHeldIt) {
-    for (const Gate& gate : gates()) {
-        const Ending ending = runStory(1, gate.scenario, [&](World& world) {
-            if (gate.hasCredential) addCredential(world);
-            settle(world);
-            if (!gate.action.empty()) world.perform(gate.action);
-            world.advance(40s);
-            return roundsIn(world, 10s);
-        });
-        EXPECT_TRUE(ending.isOrderly) << gate.what << ending.errors;
-        // A round that sleeps is not over when ten seconds are.
-        if (gate.line == kAsleep)
-            EXPECT_TRUE(ending.text.ends_with(kAsleep)) << ending.text;
-        else
-            EXPECT_EQ(ending.text, round(kTimeOut, gate.line)) << gate.what;
-    }
+    holds("Radio turned off, wait it be turned on.", {kCredential, kRadioOff});
+    holds(kNoNetwork, {}, "{}");
+    holds(kNoNetwork, {kCredential, doing("radio", R"("hardware":"off")")}, air({}));
+    holds(kNoCredential, {});
+    holds(kNoCredential, {}, air({network(1, "A")}));
+    holds("Connection already started, wait for connection operation completed event signaled.",
+          {kFitting, doing("interfaceState", R"("value":4)")}, air({kNetwork}, R"("connectMs":100000)"));
 }
 
-TEST(ConnectingThread, WithTheFunctionOffNoRoundAsksTheAdapterAnything) {
-    const Ending ending = runStory(2, air({network(1, "A")}), [](World& world) {
-        settle(world);
-        world.hotspot().send("SET_HOTSPOT_AUTO_CONNECT", "false");
-        world.advance(0ms);
-        world.perform(R"({"do":"radio","software":"off"})");
-        world.advance(40s);
-        world.perform(R"({"do":"clearCalls"})");
-        std::string rounds = roundsIn(world, 30s);
-        return rounds + std::to_string(world.perform(R"({"query":"calls","all":true})").size());
-    });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    const std::string off = round(kTimeOut, "HS20 functionality not enabled, wait for user turning it on.");
-    EXPECT_EQ(ending.text, off + off + off + "0");
+TEST(ConnectingThread, GoesOnOnlyWithASupplicantThatIsDisconnected) {
+    const std::string skips =
+        "Supplicant not in disconnected state, skip this round of network connecting. | ";
+    const std::string state = "Queried supplicant state=";
+    holds("WlanQueryInterface failed in Supplicant::queryState. | " + skips + state + "InvalidState",
+          {kCredential, failing("WlanQueryInterface", 31, R"("times":1000)")});
+    const std::pair<int, const char*> states[] = {
+        {0, "InvalidState"}, {1, "Connected"}, {2, "InvalidState"},  {3, "Disconnecting"},
+        {5, "Associating"},  {6, "Scanning"},  {7, "Authenticating"}};
+    for (const auto& [number, name] : states)
+        holds(skips + state + name,
+              {kCredential, doing("interfaceState", R"("value":)" + std::to_string(number))});
 }
 
-TEST(ConnectingThread, RunsARoundEveryTenSecondsWhenNothingHappens) {
-    const Ending ending = runStory(3, "{}", [](World& world) {
-        settle(world);
-        return roundsIn(world, 60s);
-    });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    std::string expected;
-    for (int i = 0; i < 6; ++i)
-        expected += round(kTimeOut, kNoNetwork);
-    EXPECT_EQ(ending.text, expected);
+STORY(ConnectingThread, WithTheFunctionOffNoRoundAsksTheAdapterAnything, air({network(1, "A")})) {
+    settle(story);
+    story.play({kHs20Off, kRadioOff, passing(40s)});
+    const std::string off = round("HS20 functionality not enabled, wait for user turning it on.");
+    story.expect("rounds", roundsIn(story, 30s), off + off + off);
+    story.expect("calls", story.perform(R"({"query":"calls","all":true})").size(), 0U);
 }
 
-TEST(ConnectingThread, AnUpdateWakesItTwiceOnceForTheListAndOnceForTheData) {
-    const Ending ending = runStory(4, air({fetched(1, "A")}), [](World& world) {
-        settle(world);
-        const std::size_t before = world.logSize();
-        world.perform(kReport);
-        world.advance(0ms);
-        const std::string lines = messagesSince(world, before);
-        return count(lines, kListChanged) + count(lines, kAnqpReady) + count(lines, kNoCredential) +
-               (lines.find(kListChanged) < lines.find(kAnqpReady) ? "in order" : "out of order");
-    });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text, "1 1 2 in order");
+STORY(ConnectingThread, AnUpdateWakesItTwiceOnceForTheListAndOnceForTheData, air({kNetwork})) {
+    settle(story);
+    story.play({kReport, passing(0ms)});
+    story.expectLog(kListChanged, kAnqpReady);
+    for (const auto& [line, times] : {std::pair(kListChanged, 1), {kAnqpReady, 1}, {kNoCredential, 2}})
+        story.expect(line, count(story.messages(), line), times);
 }
 
 // All of them are signalled while the thread sleeps after a radio event, which has the last place.
-TEST(ConnectingThread, TakesTheEventsThatWaitInTheirOrder) {
-    for (std::uint64_t seed = 100; seed < 130; ++seed) {
-        const Ending ending = runStory(seed, air({fetched(1, "A")}), [](World& world) {
-            settle(world);
-            world.perform(R"({"do":"radio","software":"off"})");
-            world.advance(1s);
-            const std::size_t before = world.logSize();
-            world.perform(R"({"do":"radio","software":"on"})");
-            addCredential(world);
-            world.perform(kReport);
-            world.hotspot().send("SET_HOTSPOT_AUTO_CONNECT", "false");
-            world.advance(0ms);
-            world.advance(9s);
-            std::string wakes;
-            const std::string lines = messagesSince(world, before);
-            std::istringstream stream(lines);
-            for (std::string line; std::getline(stream, line);)
-                if (line.find(" signaled.") != std::string::npos)
-                    wakes += line.substr(0, line.find(' ')) + " ";
-            return wakes;
+STORY(ConnectingThread, TakesTheEventsThatWaitInTheirOrder, {.seed = 100, .seeds = 30}, air({kNetwork})) {
+    settle(story);
+    story.play({kRadioOff, passing(1s)});
+    story.forget();
+    story.play({kRadioOn, kCredential, kReport, kHs20Off, passing(9s)});
+    std::string wakes;
+    std::istringstream stream(story.messages());
+    for (std::string line; std::getline(stream, line);)
+        if (line.find(" signaled.") != std::string::npos) wakes += line.substr(0, line.find(' ')) + " ";
+    story.expect("wakes", wakes, "Enable/disable HS20 Credential ANQP Supplicant Radio ");
+}
+
+STORY(ConnectingThread, SleepsTenSecondsAfterARadioEventBeforeItsGates, "{}") {
+    settle(story);
+    story.perform(kRadioOff);
+    story.expect("before ten seconds", roundsIn(story, 9999ms), "");
+    story.advance(1ms);
+    story.expectLog("Radio turned off, wait it be turned on.");
+}
+
+STORY(ConnectingThread, AsksForMissingDataFirstAndWaitsForTheEndOfTheQuery,
+      air({kMute, network(2, "B", ttls())}, R"("anqpMs":3000)")) {
+    story.play({kCredential});
+    settle(story);
+    story.advance(20s);
+    const std::string told = roundsIn(story, 13s);
+    story.expectLog(
+        "Not all HS20 network ANQP info fetched, we will query the ANQP info first before "
+        "auto connecting.",
+        "SIGMA: Enter Supplicant::queryHs20NetworkAnqpInfo.",
+        "Supplicant::queryHs20NetworkAnqpInfo completed.", "ANQP querying finished.");
+    story.expect("one network without data stops them all", count(told, "connectNetwork"), 0);
+}
+
+STORY(ConnectingThread, AQueryThatWasRefusedIsAskedAgainInTheNextRound, air({kMute})) {
+    settle(story);
+    story.play({failing("WlanIhvControl", 31, R"("match":"anqpQuery","times":2)"), kCredential});
+    story.expectLog("WlanIhvControl call failed in sendIhvCmd with result code=31");
+    story.expect("waits", count(story.messages(), kQuerying), 0);
+}
+
+STORY(ConnectingThread, AnEndOfTheQueryThatBringsNoListLeavesTheQueryRunning,
+      air({kMute}, R"("anqpMs":3000)")) {
+    settle(story);
+    story.play({failing("WlanIhvControl", 31, R"("match":"bssList")"), kCredential, passing(5s)});
+    story.expect("rounds", roundsIn(story, 20s), round(kQuerying) + round(kQuerying));
+    story.play({doing("completeAnqpQuery"), passing(0ms)});
+    story.expectLog("ANQP querying finished.");
+}
+
+STORY(ConnectingThread, ARoundInADisconnectedSessionLastsFiveSecondsMore, air({kNetwork})) {
+    story.play({kCredential, kAway});
+    settle(story);
+    story.advance(40s);
+    const std::string told = roundsIn(story, 60s);
+    story.expect("rounds",
+                 count(told, kTimeOut + " | Current session is not active, sleep for a while and continue."),
+                 4);
+    story.expect("attempts", count(told, "connectNetwork"), 0);
+}
+
+STORY(ConnectingThread, WithEveryGateOpenItFindsNothingToDoAndSaysSo, air({kNetwork})) {
+    story.play({kCredential});
+    settle(story);
+    story.advance(20s);
+    const std::string told = roundsIn(story, 10s);
+    story.expect("beginning", told.starts_with(kTimeOut), true);
+    story.expect("end", told.ends_with("connectNetwork returns with op cancelled.\n"), true);
+}
+
+STORY(ConnectingThread, ConnectsToNobodyUntilTheLastNetworkHasAnswered,
+      air({kMute, network(2, "A", ttls())}, R"("connectMs":100000)")) {
+    story.play({kFitting, passing(100s)});
+    expectStanding(story, {.requests = ""});
+    story.play({on("setNetwork", 1, R"("anqp":"ready",)" + tls("m.example")), kReport, passing(30s)});
+    expectStanding(story, {.requests = "A ttls user"});
+}
+
+void endsWhenTheAdapterGoes(const char* what, int pauseMs, const std::vector<std::string>& before) {
+    EXPECT_STORY({.seed = 200, .seeds = 20}, air({kNetwork}), [&](Story& story) {
+        const auto handles = [&] { return story.perform(R"({"query":"handles"})").asInt(); };
+        story.play({kCredential});
+        settle(story);
+        const int handlesBefore = handles();
+        story.play(before);
+        story.advance(std::chrono::milliseconds(pauseMs));
+        story.forget();
+        story.play({doing("pullAdapter"), passing(30s), doing("insertAdapter"), kRadioOn, passing(30s),
+                    doing("pullAdapter")});
+        story.expect("ends", count(story.messages(), kEnds), 2);
+        story.expect("ends in order", count(story.messages(), "Deinitialize supplicant completed."), 2);
+        story.expect("handles", handles(), handlesBefore - 1);
+    }) << what;
+}
+
+TEST(ConnectingThread, EndsWhereverItIsWhenTheAdapterGoes) {
+    endsWhenTheAdapterGoes("waiting", 0, {});
+    endsWhenTheAdapterGoes("waiting in the middle", 4000, {});
+    endsWhenTheAdapterGoes("asleep after the radio", 3000, {kRadioOff});
+    endsWhenTheAdapterGoes("asleep after the radio for no time yet", 0, {kRadioOff});
+    endsWhenTheAdapterGoes("asleep at the session gate", 2000, {kAway, kReport});
+}
+
+// The seed decides whether the sleep or the wait for its end is over first, at the same moment.
+TEST(ConnectingThread, OneThatIsLateLeavesItsLineAndEndsByItself) {
+    std::string late;
+    for (std::uint64_t seed = 300; seed < 360; ++seed) {
+        const Ending ending = runStory({.seed = seed}, air({kNetwork}), [](Story& story) {
+            story.play({kCredential});
+            settle(story);
+            story.play({kRadioOff, doing("pullAdapter"), doing("insertAdapter"), passing(60s)});
+            story.expect("ends", count(story.messages(), kEnds), 1);
+            const char* const line = "Time out when waiting for network connecting thread termination.";
+            if (count(story.messages(), line) == 1) story.tell("late");
         });
-        EXPECT_TRUE(ending.isOrderly) << "seed " << seed << ending.errors;
-        EXPECT_EQ(ending.text, "Enable/disable HS20 Credential ANQP Supplicant Radio ") << "seed " << seed;
+        EXPECT_EQ(ending.wrong, "");
+        late += ending.told;
     }
+    EXPECT_NE(late, "") << "no seed was late";
 }
 
-TEST(ConnectingThread, SleepsTenSecondsAfterARadioEventBeforeItsGates) {
-    const Ending ending = runStory(5, "{}", [](World& world) {
-        settle(world);
-        world.perform(R"({"do":"radio","software":"off"})");
-        const std::size_t before = world.logSize();
-        world.advance(9999ms);
-        std::string text = roundsSince(world, before) + "---";
-        world.advance(1ms);
-        return text + roundsSince(world, before).substr(text.size() - 3);
-    });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_TRUE(ending.text.starts_with("---Radio turned off, wait it be turned on.\n")) << ending.text;
-}
-
-TEST(ConnectingThread, AsksForMissingDataFirstAndWaitsForTheEndOfTheQuery) {
-    const Ending ending =
-        runStory(6, air({network(1, "A", R"("anqp":"never")"), fetched(2, "B")}, R"("anqpMs":3000)"),
-                 [](World& world) {
-                     addCredential(world);
-                     settle(world);
-                     world.advance(20s);
-                     world.perform(R"({"do":"clearCalls"})");
-                     const std::string text = roundsIn(world, 13s);
-                     return text + std::to_string(moduleRequests(world, 3));
-                 });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    const std::string asks =
-        "Not all HS20 network ANQP info fetched, we will query the ANQP info first before auto connecting. | "
-        "SIGMA: Enter Supplicant::queryHs20NetworkAnqpInfo. | Supplicant::queryHs20NetworkAnqpInfo "
-        "completed.";
-    EXPECT_NE(ending.text.find(asks), std::string::npos) << ending.text;
-    EXPECT_NE(ending.text.find("ANQP querying finished."), std::string::npos) << ending.text;
-    EXPECT_EQ(ending.text.find("connectNetwork"), std::string::npos)
-        << "one network without data stops them all";
-}
-
-TEST(ConnectingThread, AQueryThatWasRefusedIsAskedAgainInTheNextRound) {
-    const Ending ending = runStory(7, air({network(1, "A", R"("anqp":"never")")}), [](World& world) {
-        settle(world);
-        world.perform(R"({"do":"fail","call":"WlanIhvControl","error":31,"match":"anqpQuery","times":2})");
-        addCredential(world);
-        return messagesSince(world, 0);
-    });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_NE(ending.text.find("WlanIhvControl call failed in sendIhvCmd with result code=31\n"),
-              std::string::npos);
-    EXPECT_EQ(ending.text.find("We are querying the HS20 network ANQP info, wait."), std::string::npos);
-}
-
-TEST(ConnectingThread, AnEndOfTheQueryThatBringsNoListLeavesTheQueryRunning) {
-    const Ending ending =
-        runStory(8, air({network(1, "A", R"("anqp":"never")")}, R"("anqpMs":3000)"), [](World& world) {
-            settle(world);
-            world.perform(R"({"do":"fail","call":"WlanIhvControl","error":31,"match":"bssList","times":1})");
-            addCredential(world);
-            world.advance(5s);
-            const std::string held = roundsIn(world, 20s);
-            world.perform(R"({"do":"completeAnqpQuery"})");
-            return held + messagesSince(world, 0);
-        });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    const std::string waits = round(kTimeOut, "We are querying the HS20 network ANQP info, wait.");
-    EXPECT_TRUE(ending.text.starts_with(waits + waits)) << ending.text.substr(0, 400);
-    EXPECT_NE(ending.text.find("ANQP querying finished."), std::string::npos);
-}
-
-TEST(ConnectingThread, ARoundInADisconnectedSessionLastsFiveSecondsMore) {
-    const Ending ending =
-        runStory(9, air({fetched(1, "A")}, R"("session":"disconnected")"), [](World& world) {
-            addCredential(world);
-            settle(world);
-            world.advance(40s);
-            const std::string rounds = roundsIn(world, 60s);
-            return count(rounds, kAsleep) + count(rounds, "connectNetwork");
-        });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text, "4 0 ");
-}
-
-TEST(ConnectingThread, WithEveryGateOpenItFindsNothingToDoAndSaysSo) {
-    const Ending ending = runStory(10, air({fetched(1, "A")}), [](World& world) {
-        addCredential(world);
-        settle(world);
-        world.advance(20s);
-        return roundsIn(world, 10s);
-    });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_TRUE(ending.text.starts_with(kTimeOut)) << ending.text;
-    EXPECT_TRUE(ending.text.ends_with("connectNetwork returns with op cancelled.\n")) << ending.text;
-}
-
-TEST(ConnectingThread, WaitsForTheResultOfAnAttemptThatIsUnderWay) {
-    const Ending ending = runStory(20, air({fetched(1, "A")}, R"("connectMs":100000)"), [](World& world) {
-        world.hotspot().send("ADD_CREDENTIAL", autoConnectData());
-        settle(world);
-        world.perform(R"({"do":"interfaceState","value":4})");
-        world.advance(20s);
-        return roundsIn(world, 10s);
-    });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text,
-              round(kTimeOut,
-                    "Connection already started, wait for connection operation completed event signaled."));
-}
-
-int connectRequests(World& world) {
-    int requests = 0;
-    for (const Json::Value& call : world.perform(R"({"query":"calls"})"))
-        if (call["call"].asString() == "WlanConnect") ++requests;
-    return requests;
-}
-
-TEST(ConnectingThread, ConnectsToNobodyUntilTheLastNetworkHasAnswered) {
-    const Ending ending =
-        runStory(21, air({network(1, "Mute", R"("anqp":"never")"), fetched(2, "A")}, R"("connectMs":100000)"),
-                 [](World& world) {
-                     world.hotspot().send("ADD_CREDENTIAL", autoConnectData());
-                     world.advance(100s);
-                     std::string requests = std::to_string(connectRequests(world));
-                     world.perform(on("setNetwork", 1, R"("anqp":"ready",)" + realms("m.example", "13")));
-                     world.perform(kReport);
-                     world.advance(30s);
-                     return requests + " " + std::to_string(connectRequests(world));
-                 });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text, "0 1");
+STORY(ConnectingThread, AServiceThatStopsWhileItSleepsStopsInOrder, {.seed = 400, .seeds = 20},
+      air({kNetwork})) {
+    settle(story);
+    story.perform(kRadioOff);
 }
 
 }  // namespace

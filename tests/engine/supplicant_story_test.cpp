@@ -4,182 +4,151 @@
 
 #include "connection/Supplicant.h"
 #include "connection/SupplicantMgr.h"
-#include "engine/StoreStory.h"
+#include "engine/world/ConnectStory.h"
 
 namespace vexa::test {
 namespace {
 
 using namespace std::chrono_literals;
 
-int handles(World& world) {
-    return world.perform(R"({"query":"handles"})").asInt();
+constexpr GUID kFirst = {0x6B1E8A4C, 0x5D2F, 0x4E0B, {0x9C, 0x37, 0x1F, 0x5D, 0x00, 0x00, 0x00, 0x01}};
+constexpr GUID kSecond = {0x6B1E8A4C, 0x5D2F, 0x4E0B, {0x9C, 0x37, 0x1F, 0x5D, 0x00, 0x00, 0x00, 0x02}};
+
+std::shared_ptr<Supplicant> supplicantOf(const GUID& guid) {
+    return SupplicantMgr::instance().findSupplicantByGuid(guid);
 }
 
-const GUID kFirst = {0x6B1E8A4C, 0x5D2F, 0x4E0B, {0x9C, 0x37, 0x1F, 0x5D, 0x00, 0x00, 0x00, 0x01}};
-const GUID kSecond = {0x6B1E8A4C, 0x5D2F, 0x4E0B, {0x9C, 0x37, 0x1F, 0x5D, 0x00, 0x00, 0x00, 0x02}};
-
-std::string stateOf(const GUID& guid) {
-    const auto supplicant = SupplicantMgr::instance().findSupplicantByGuid(guid);
-    return !supplicant ? "none" : supplicant->isInitialized() ? "initialised" : "not initialised";
+void expectState(Story& story, const std::string& wanted, const GUID& guid = kFirst) {
+    const auto supplicant = supplicantOf(guid);
+    story.expect("supplicant",
+                 !supplicant                   ? "none"
+                 : supplicant->isInitialized() ? "initialised"
+                                               : "not initialised",
+                 wanted);
 }
 
-TEST(SupplicantStory, ComesAndGoesWithTheAdapterAndLeavesNoHandle) {
-    const Ending ending = runStory(1, "{}", [](World& world) {
-        std::string told = stateOf(kFirst);
-        const int before = handles(world);
-        for (int round = 0; round < 3; ++round) {
-            world.perform(R"({"do":"pullAdapter"})");
-            told += ", " + stateOf(kFirst) + " " + std::to_string(handles(world) - before);
-            world.perform(R"({"do":"insertAdapter"})");
-            told += ", " + stateOf(kFirst) + " " + std::to_string(handles(world) - before);
-        }
-        return told;
-    });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text,
-              "initialised, none -1, initialised 0, none -1, initialised 0, none -1, initialised 0");
+int handles(Story& story) {
+    return story.perform(R"({"query":"handles"})").asInt();
 }
 
-TEST(SupplicantStory, AnAdapterIsKnownHoweverItsIdentifierIsWritten) {
-    const char* const scenario = R"({"adapters":[{"guid":"{6b1e8a4c-5d2f-4e0b-9c37-1f5d00000001}"}]})";
-    const Ending ending = runStory(7, scenario, [](World&) { return stateOf(kFirst); });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text, "initialised");
-}
-
-TEST(SupplicantStory, ASecondArrivalResetsIt) {
-    const Ending ending = runStory(1, "{}", [](World& world) {
-        const auto before = SupplicantMgr::instance().findSupplicantByGuid(kFirst);
-        const int open = handles(world);
-        world.perform(R"({"do":"roam"})");
-        before->m_bRoaming = true;
-        world.perform(R"({"do":"insertAdapter"})");
-        std::string told =
-            before == SupplicantMgr::instance().findSupplicantByGuid(kFirst) ? "kept " : "new ";
-        told += before->m_bRoaming ? "roaming " : "reset ";
-        told += std::to_string(handles(world) - open) + " ";
-        return told + count(world.log(), "Supplicant with GUID already exists, skip adding.") +
-               count(world.log(), "Going to reset the existed supplicant...");
-    });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text, "kept reset 0 1 1 ");
-}
-
-TEST(SupplicantStory, ARemovalWhileAnotherAdapterIsThereRemovesNothing) {
-    const Ending ending = runStory(1, R"({"adapters":[{},{}]})", [](World& world) {
-        world.perform(R"({"do":"pullAdapter","adapter":1})");
-        std::string told = stateOf(kFirst) + " " + count(world.log(), "\tInterface card still inserted");
-        world.perform(R"({"do":"pullAdapter","adapter":0})");
-        told += stateOf(kFirst) + " ";
-        world.perform(R"({"do":"notify","source":8,"code":14})");
-        return told + count(world.log(), "\tNo supplicant, do nothing.");
-    });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text, "initialised 1 none 1 ");
-}
-
-TEST(SupplicantStory, ASecondAdapterTakesOverWhenItArrives) {
-    const Ending ending = runStory(1, R"({"adapters":[{},{"inserted":false}]})", [](World& world) {
-        world.perform(R"({"do":"pullAdapter","adapter":0})");
-        world.perform(R"({"do":"insertAdapter","adapter":1})");
-        return stateOf(kFirst) + ", " + stateOf(kSecond) + ", " +
-               list(world, "ADD_CREDENTIAL", ttlsData("a.example"));
-    });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text, "none, initialised, CARD_PLUG_OUT CARD_PLUG_IN 1 a.example\n");
-}
-
-// What goes wrong while the adapter comes back, how the object stands afterwards, and how many handles are
-// open compared with before.
-TEST(SupplicantStory, AnInitThatFailsIsTriedOnceMoreAndLeaksNothing) {
-    struct Case {
-        const char* fault;
-        const char* outcome;
-    };
-    const Case cases[] = {
-        {R"({"do":"fail","call":"GetAdaptersAddresses","error":8,"times":1})", "initialised 0 1 1"},
-        {R"({"do":"fail","call":"GetAdaptersAddresses","error":8,"times":2})", "not initialised -1 2 2"},
-        {R"({"do":"fail","call":"GetAdaptersAddresses","error":111,"times":2})", "initialised 0 0 0"},
-        {R"({"do":"fail","call":"GetAdaptersAddresses","error":111,"times":3})", "initialised 0 1 1"},
-        {R"({"do":"fail","call":"GetAdaptersAddresses","error":111,"times":5})", "initialised 0 1 1"},
-        {R"({"do":"fail","call":"GetAdaptersAddresses","error":111,"times":6})", "not initialised -1 2 2"},
-        {R"({"do":"fail","call":"WlanQueryInterface","error":6,"times":2})", "initialised 0 0 0"},
-    };
-    for (const Case& c : cases) {
-        const Ending ending = runStory(1, "{}", [&](World& world) {
-            const int before = handles(world);
-            world.perform(R"({"do":"pullAdapter"})");
-            world.perform(c.fault);
-            world.perform(R"({"do":"insertAdapter"})");
-            const std::string log = world.log();
-            const std::string told = stateOf(kFirst) + " " + std::to_string(handles(world) - before) + " " +
-                                     count(log, "Call to GetAdaptersAddresses failed with error: ") +
-                                     count(log, "ERROR: Initiailize supplicant failed.");
-            return told.substr(0, told.size() - 1);
-        });
-        EXPECT_TRUE(ending.isOrderly) << ending.errors;
-        EXPECT_EQ(ending.text, c.outcome) << c.fault;
+STORY(SupplicantStory, ComesAndGoesWithTheAdapterAndLeavesNoHandle, "{}") {
+    expectState(story, "initialised");
+    const int before = handles(story);
+    for (int round = 0; round < 3; ++round) {
+        story.act("pullAdapter");
+        expectState(story, "none");
+        story.expect("handles", handles(story), before - 1);
+        story.act("insertAdapter");
+        expectState(story, "initialised");
+        story.expect("handles", handles(story), before);
     }
 }
 
-TEST(SupplicantStory, AnUnlistedAdapterGivesOneThatIsNotInitialisedButServesItsCommands) {
-    const Ending ending = runStory(1, R"({"adapters":[{"listed":false}]})", [](World& world) {
-        const std::string told = stateOf(kFirst) + " " + list(world, "ADD_CREDENTIAL", ttlsData("a.example"));
-        return told + count(world.log(), "!!!Cannot query interface mac address.");
-    });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text, "not initialised 1 a.example\n2 ");
+STORY(SupplicantStory, AnAdapterIsKnownHoweverItsIdentifierIsWritten,
+      R"({"adapters":[{"guid":"{6b1e8a4c-5d2f-4e0b-9c37-1f5d00000001}"}]})") {
+    expectState(story, "initialised");
 }
 
-TEST(SupplicantStory, LookupsKeepTheirObjectAlive) {
-    const Ending ending = runStory(1, "{}", [](World& world) {
-        const auto kept = SupplicantMgr::instance().findSupplicantByGuid(kFirst);
-        world.perform(R"({"do":"pullAdapter"})");
-        std::string told = stateOf(kFirst) + (kept->isInitialized() ? " alive " : " at rest ");
-        kept->setState(SupplicantState::Initialized);
-        kept->m_hCredentialChangedEvent.set();
-        return told + std::to_string(SupplicantMgr::instance().removeSupplicant(kept.get())) +
-               std::to_string(SupplicantMgr::instance().removeSupplicant(nullptr));
-    });
-    EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text, "none at rest 24");
+STORY(SupplicantStory, ASecondArrivalResetsIt, "{}") {
+    const auto supplicant = supplicantOf(kFirst);
+    const int before = handles(story);
+    supplicant->m_bRoaming = true;
+    story.act("insertAdapter");
+    story.expect("the same object", supplicant == supplicantOf(kFirst), true);
+    story.expect("roaming", supplicant->m_bRoaming.load(), false);
+    story.expect("handles", handles(story), before);
+    story.expectLog("Supplicant with GUID already exists, skip adding.",
+                    "Going to reset the existed supplicant...");
+}
+
+STORY(SupplicantStory, ARemovalWhileAnotherAdapterIsThereRemovesNothing, R"({"adapters":[{},{}]})") {
+    story.act("pullAdapter", R"("adapter":1)");
+    expectState(story, "initialised");
+    story.expectLog("\tInterface card still inserted, don't remove supplicant.");
+    story.act("pullAdapter", R"("adapter":0)");
+    expectState(story, "none");
+    story.act("notify", R"("source":8,"code":14)");
+    story.expectLog("\tNo supplicant, do nothing.");
+}
+
+STORY(SupplicantStory, ASecondAdapterTakesOverWhenItArrives, R"({"adapters":[{},{"inserted":false}]})") {
+    story.play({doing("pullAdapter", R"("adapter":0)"), doing("insertAdapter", R"("adapter":1)")});
+    expectState(story, "none");
+    expectState(story, "initialised", kSecond);
+    story.expect("heard", list(story, "ADD_CREDENTIAL", ttlsData("a.example")),
+                 "CARD_PLUG_OUT CARD_PLUG_IN 1 a.example");
+}
+
+// What goes wrong so many times while the adapter comes back, and what the log has of it.
+void failsToInit(const char* call, int error, int times, const char* state, int moreHandles,
+                 int linesOfEach) {
+    EXPECT_STORY(
+        "{}",
+        [&](Story& story) {
+            const int before = handles(story);
+            story.play({doing("pullAdapter"), failing(call, error, R"("times":)" + std::to_string(times)),
+                        doing("insertAdapter")});
+            expectState(story, state);
+            story.expect("handles", handles(story), before + moreHandles);
+            for (const char* const line : {"Call to GetAdaptersAddresses failed with error: ",
+                                           "ERROR: Initiailize supplicant failed."})
+                story.expect(line, count(story.messages(), line), linesOfEach);
+        })
+        << call << " " << error << " " << times;
+}
+
+TEST(SupplicantStory, AnInitThatFailsIsTriedOnceMoreAndLeaksNothing) {
+    failsToInit("GetAdaptersAddresses", 8, 1, "initialised", 0, 1);
+    failsToInit("GetAdaptersAddresses", 8, 2, "not initialised", -1, 2);
+    failsToInit("GetAdaptersAddresses", 111, 2, "initialised", 0, 0);
+    failsToInit("GetAdaptersAddresses", 111, 3, "initialised", 0, 1);
+    failsToInit("GetAdaptersAddresses", 111, 5, "initialised", 0, 1);
+    failsToInit("GetAdaptersAddresses", 111, 6, "not initialised", -1, 2);
+    failsToInit("WlanQueryInterface", 6, 2, "initialised", 0, 0);
+}
+
+STORY(SupplicantStory, AnUnlistedAdapterGivesOneThatIsNotInitialisedButServesItsCommands,
+      R"({"adapters":[{"listed":false}]})") {
+    expectState(story, "not initialised");
+    story.expect("list", list(story, "ADD_CREDENTIAL", ttlsData("a.example")), "1 a.example");
+    story.expect("lines", count(story.messages(), "!!!Cannot query interface mac address."), 2);
+}
+
+STORY(SupplicantStory, LookupsKeepTheirObjectAlive, "{}") {
+    const auto kept = supplicantOf(kFirst);
+    story.act("pullAdapter");
+    expectState(story, "none");
+    story.expect("the one that is kept", kept->isInitialized(), false);
+    kept->setState(SupplicantState::Initialized);
+    kept->m_hCredentialChangedEvent.set();
+    story.expect("removing it again", SupplicantMgr::instance().removeSupplicant(kept.get()), 2);
+    story.expect("removing none", SupplicantMgr::instance().removeSupplicant(nullptr), 4);
 }
 
 // The adapter comes and goes between and within the commands. Whatever the order of threads, what the client
 // saw last is what the file holds.
 TEST(SupplicantStory, AnAdapterPulledInTheMiddleOfACommandHarmsNothing) {
-    for (std::uint64_t seed = 1; seed <= 25; ++seed) {
-        const Ending ending = runStory(seed, "{}", [seed](World& world) {
+    for (std::uint64_t seed = 1; seed <= 25; ++seed)
+        EXPECT_STORY({.seed = seed}, "{}", [seed](Story& story) {
             std::mt19937_64 random(seed);
             for (int step = 0; step < 20; ++step) {
-                const std::string id = std::to_string(random() % 8);
-                switch (random() % 4) {
-                    case 0:
-                        world.hotspot().send("DELETE_CREDENTIAL", R"({"Id":)" + id + "}");
-                        break;
-                    case 1:
-                        world.hotspot().send("SET_POSITION_CREDENTIAL", R"({"Order":0,"Id":)" + id + "}");
-                        break;
-                    case 2:
-                        world.hotspot().send("READ_CREDENTIAL_FROM_FILE");
-                        break;
-                    default:
-                        world.hotspot().send("ADD_CREDENTIAL", ttlsData("realm" + std::to_string(step)));
-                }
-                if (random() % 3 == 0) world.perform(R"({"do":"pullAdapter"})");
-                if (random() % 3 == 0) world.perform(R"({"do":"insertAdapter"})");
+                const std::string id = R"("Id":)" + std::to_string(random() % 8) + "}";
+                const std::pair<const char*, std::string> commands[] = {
+                    {"DELETE_CREDENTIAL", "{" + id},
+                    {"SET_POSITION_CREDENTIAL", R"({"Order":0,)" + id},
+                    {"READ_CREDENTIAL_FROM_FILE", ""},
+                    {"ADD_CREDENTIAL", ttlsData("realm" + std::to_string(step))}};
+                const auto& [command, data] = commands[random() % 4];
+                story.hotspot().send(command, data);
+                if (random() % 3 == 0) story.act("pullAdapter");
+                if (random() % 3 == 0) story.act("insertAdapter");
             }
-            world.perform(R"({"do":"insertAdapter"})");
-            world.advance(0ms);
-            world.hotspot().events();
-            const std::string seen = list(world, "GET_ALL_CREDENTIAL_LIST");
-            world.hotspot().send("READ_CREDENTIAL_FROM_FILE");
-            const std::string stored = list(world, "GET_ALL_CREDENTIAL_LIST");
-            return seen == stored ? "same" : seen + stored;
+            story.play({doing("insertAdapter"), passing(0ms)});
+            story.hotspot().events();
+            const std::string seen = list(story);
+            story.hotspot().send("READ_CREDENTIAL_FROM_FILE");
+            story.expect("list as the file has it", list(story), seen);
         });
-        ASSERT_TRUE(ending.isOrderly) << "seed " << seed << "\n" << ending.errors;
-        ASSERT_EQ(ending.text, "same") << "seed " << seed;
-    }
 }
 
 }  // namespace

@@ -6,7 +6,7 @@
 #include <string>
 #include <vector>
 
-#include "engine/World.h"
+#include "engine/world/World.h"
 
 namespace vexa::test {
 
@@ -37,9 +37,7 @@ private:
         bool isReported = true;
     };
 
-    bool chance(unsigned oneIn) { return m_random() % oneIn == 0; }
     std::string changeOfTheAir();
-    std::string action();
     void sendCommands();
     bool hear();
     bool waitForAnswers();
@@ -54,5 +52,10 @@ private:
 
 /// A whole storm of this many steps, with a check now and then. Gives what is wrong.
 std::string storm(World& world, std::uint64_t seed, int steps, Storm::Pass pass = nullptr);
+
+/// The same in which credentials may connect by themselves. Behind each part of it all that stands in the way
+/// of a connection is undone, a network that lets in a credential of its own is shown, and the engine is left
+/// alone: it has to be connected within a minute.
+std::string stormOfConnections(World& world, std::uint64_t seed, int steps);
 
 }  // namespace vexa::test

@@ -1,15 +1,13 @@
 // Storms on the seeded scheduler, as many as one likes: a process of its own for each, and the seeds that
 // failed.
 
-#include <charconv>
 #include <cstdint>
 #include <cstdio>
+#include <cstdlib>
 #include <string>
-#include <string_view>
 
-#include "engine/StormSteps.h"
-#include "engine/Story.h"
-#include "engine/connect_calm.h"
+#include "engine/storm/StormSteps.h"
+#include "engine/world/RunStory.h"
 
 namespace {
 
@@ -22,39 +20,35 @@ struct Options {
     std::uint64_t steps = 48;
 };
 
-bool readNumber(std::string_view text, std::uint64_t& number) {
-    const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
-    return error == std::errc() && end == text.data() + text.size() && !text.empty();
-}
-
 bool readOptions(int count, char** arguments, Options& options) {
     for (int i = 1; i < count; ++i) {
-        const std::string_view name = arguments[i];
+        const std::string name = arguments[i];
         std::uint64_t* const number = name == "--seeds"   ? &options.seeds
                                       : name == "--from"  ? &options.from
                                       : name == "--steps" ? &options.steps
                                                           : nullptr;
-        if (name == "--connections")
+        if (name == "--connections") {
             options.connections = true;
-        else if (number == nullptr || ++i == count || !readNumber(arguments[i], *number))
-            return false;
+            continue;
+        }
+        if (number == nullptr || ++i == count) return false;
+        char* end = nullptr;
+        *number = std::strtoull(arguments[i], &end, 10);
+        if (end == arguments[i] || *end != '\0') return false;
     }
     return true;
 }
 
-std::string happens(World& world, std::uint64_t seed, const Options& options) {
-    const int steps = static_cast<int>(options.steps);
-    return options.connections ? stormOfConnections(world, seed, steps) : storm(world, seed, steps);
-}
-
 bool isCalm(std::uint64_t seed, const Options& options) {
-    const Ending ending =
-        runStory(seed, Storm::scenario(1), [&](World& world) { return happens(world, seed, options); });
-    if (ending.isOrderly && ending.text.empty()) return true;
-    std::printf("seed %llu: %s%s\n", static_cast<unsigned long long>(seed), ending.text.c_str(),
-                ending.errors.c_str());
+    const Ending ending = runStory({.seed = seed}, Storm::scenario(1), [&](Story& story) {
+        const int steps = static_cast<int>(options.steps);
+        story.expect("storm",
+                     options.connections ? stormOfConnections(story, seed, steps) : storm(story, seed, steps),
+                     "");
+    });
+    std::fputs(ending.wrong.c_str(), stdout);
     std::fflush(stdout);
-    return false;
+    return ending.wrong.empty();
 }
 
 }  // namespace
@@ -68,7 +62,6 @@ int main(int count, char** arguments) {
     std::uint64_t failed = 0;
     for (std::uint64_t i = 0; i < options.seeds; ++i)
         if (!isCalm(options.from + i, options)) ++failed;
-    std::printf("%llu storms, %llu failed\n", static_cast<unsigned long long>(options.seeds),
-                static_cast<unsigned long long>(failed));
+    std::printf("%ju storms, %ju failed\n", std::uintmax_t{options.seeds}, std::uintmax_t{failed});
     return failed == 0 ? 0 : 1;
 }
