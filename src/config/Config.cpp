@@ -87,6 +87,16 @@ std::int32_t Config::readNumber(const char* xpath) {
     return leadingInteger(m_xmlDoc.getText(xpath, Node()).value_or(L""));
 }
 
+std::wstring Config::textOf(Node node, const char* child, const wchar_t* missing) {
+    return m_xmlDoc.getText(child, node).value_or(missing);
+}
+
+// An empty number counts as a missing one.
+std::int32_t Config::numberOf(Node node, const char* child) {
+    const std::wstring text = textOf(node, child, L"");
+    return text.empty() ? -1 : leadingInteger(text);
+}
+
 int Config::readGlobalSettings() {
     m_dumpFilePath = m_xmlDoc.getText("/*/global/dump_file_path", Node()).value_or(L"");
     if (m_dumpFilePath.empty()) m_dumpFilePath = kDefaultDumpName;

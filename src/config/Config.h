@@ -51,6 +51,8 @@ public:
 private:
     using Node = XmlDocument::Node;
 
+    static constexpr const wchar_t* kInvalid = L"Invalid";  // what a missing element reads as
+
     int createDefaultFile(const std::wstring& path) REQUIRES(g_hs20Lock);
     int openDocument() REQUIRES(g_hs20Lock);
     void saveDocument() REQUIRES(g_hs20Lock);
@@ -58,6 +60,8 @@ private:
     int readGlobalSettings() REQUIRES(g_hs20Lock);
     bool readFlag(const char* xpath, bool missing) REQUIRES(g_hs20Lock);
     std::int32_t readNumber(const char* xpath) REQUIRES(g_hs20Lock);
+    std::wstring textOf(Node node, const char* child, const wchar_t* missing) REQUIRES(g_hs20Lock);
+    std::int32_t numberOf(Node node, const char* child) REQUIRES(g_hs20Lock);
     void deriveDumpFilePath() REQUIRES(g_hs20Lock);
     void readAutoConnectFromRegistry();
 
@@ -71,7 +75,6 @@ private:
         REQUIRES(g_hs20Lock);
     int writeCredential(const Credential& credential, Node section) REQUIRES(g_hs20Lock);
     int writeReferences(Node list) REQUIRES(g_hs20Lock);
-    std::wstring textOf(Node node, const char* child, const wchar_t* missing) REQUIRES(g_hs20Lock);
 
     std::wstring m_userName GUARDED_BY(g_hs20Lock);
     CredentialTable m_credentials GUARDED_BY(g_hs20Lock);
