@@ -3,7 +3,6 @@
 #include <cassert>
 
 #include "base/DiagnosticLog.h"
-#include "base/WlanMemory.h"
 #include "config/Config.h"
 #include "config/ResultCodes.h"
 #include "connection/SupplicantMgr.h"
@@ -14,30 +13,6 @@ namespace vexa {
 namespace {
 
 using platform::LockGuard;
-
-constexpr std::array<const char*, 14> kStateNames = {
-    "InvalidState", "Initialized",       "Connecting",        "Connected",      "Disconnecting",
-    "Disconnected", "InterfaceDisabled", "Scanning",          "Authenticating", "Associating",
-    "Associated",   "Disassociating",    "Auth4WayHandshake", "GroupHandshake"};
-
-SupplicantState stateOf(WLAN_INTERFACE_STATE state) {
-    switch (state) {
-        case wlan_interface_state_connected:
-            return SupplicantState::Connected;
-        case wlan_interface_state_disconnecting:
-            return SupplicantState::Disconnecting;
-        case wlan_interface_state_disconnected:
-            return SupplicantState::Disconnected;
-        case wlan_interface_state_associating:
-            return SupplicantState::Associating;
-        case wlan_interface_state_discovering:
-            return SupplicantState::Scanning;
-        case wlan_interface_state_authenticating:
-            return SupplicantState::Authenticating;
-        default:
-            return SupplicantState::InvalidState;
-    }
-}
 
 // What only the WLAN service can make true.
 bool isClaim(SupplicantState state) {
@@ -54,18 +29,13 @@ const char* onOrOff(bool on) {
 
 }  // namespace
 
-const char* nameOf(SupplicantState state) {
-    return kStateNames[static_cast<std::size_t>(state)];
-}
-
 Supplicant::Supplicant(const GUID& interfaceGuid, SupplicantMgr* mgr)
-    : m_interfaceGuid(interfaceGuid), m_pMgr(mgr), m_lastHs20ToggleTime(getTimeValue()) {
+    : m_pMgr(mgr), m_lastHs20ToggleTime(getTimeValue()), m_wlan(interfaceGuid) {
     m_lastHs20ToggleTime.seconds -= kLongBeforeStart;
 }
 
 Supplicant::~Supplicant() {
     m_interworkingMgr.stopIfInited();
-    closeWlanHandle();
 }
 
 int Supplicant::init() {
@@ -75,7 +45,7 @@ int Supplicant::init() {
         Log(6, "ERROR: Initiailize supplicant failed.");
         deinit();
         m_interworkingMgr.stop();
-        closeWlanHandle();
+        m_wlan.close();
         return kSuccess;
     }
     m_bInitialized = true;
@@ -87,7 +57,7 @@ int Supplicant::init() {
 const char* Supplicant::initSteps() {
     logInterfaceGuid();
     if (queryMacAddress() != kSuccess) return "ERROR: Query MAC address failed.";
-    if (!openWlanHandle()) return "ERROR: Open wlan handle failed.";
+    if (!m_wlan.open()) return "ERROR: Open wlan handle failed.";
     if (m_interworkingMgr.init() != kSuccess) return "ERROR: Failed to initi NetworkinMgr.";
     if (getHs20BssListFromIHV() != kSuccess)
         Log(6, "ERROR: Get HS20 network list failed in supplicant initialization.");
@@ -101,35 +71,15 @@ const char* Supplicant::initSteps() {
 
 // A connection that exists already is recorded as though it began now.
 void Supplicant::recordConnectionAtStart() {
-    DOT11_SSID ssid{};
-    MacAddress bssid{};
-    if (queryCurrentConnection(ssid, bssid, false) != kSuccess) return;
+    const auto connection = m_wlan.queryCurrentConnection(false);
+    if (!connection) return;
     const LockGuard lock(g_hs20Lock);
-    m_history.addConnection(ssid, bssid, m_networkList);
+    m_history.addConnection(connection->ssid, connection->bssid, m_networkList);
 }
 
 void Supplicant::logInterfaceGuid() const {
     if (m_pMgr == nullptr) Log(6, "ERROR: No Config.");
-    Log(2, "Interface GUID: %s", guidToString(m_interfaceGuid).c_str());
-}
-
-bool Supplicant::openWlanHandle() {
-    HANDLE handle = nullptr;
-    DWORD negotiated = 0;
-    if (WlanOpenHandle(kWlanClientVersion, nullptr, &negotiated, &handle) != ERROR_SUCCESS) {
-        Log(3, "WlanOpenHandle failed in supplicant initialization.");
-        return false;
-    }
-    if (handle == nullptr || handle == INVALID_HANDLE_VALUE) {
-        Log(3, "Invalid WLAN handle value.");
-        return false;
-    }
-    m_hWlan = handle;
-    return true;
-}
-
-void Supplicant::closeWlanHandle() {
-    if (const HANDLE handle = m_hWlan.exchange(nullptr)) WlanCloseHandle(handle, nullptr);
+    Log(2, "Interface GUID: %s", guidToString(m_wlan.guid()).c_str());
 }
 
 void Supplicant::deinit() {
@@ -141,7 +91,7 @@ void Supplicant::deinit() {
         const LockGuard lock(g_hs20Lock);
         m_retryHelper.clear();
     }
-    closeWlanHandle();
+    m_wlan.close();
     m_bInitialized = false;
     Log(3, "Deinitialize supplicant completed.");
 }
@@ -173,25 +123,11 @@ int Supplicant::setState(SupplicantState state) {
     return kSuccess;
 }
 
-SupplicantState Supplicant::queryState() const {
-    const auto state = queryInterface<WLAN_INTERFACE_STATE>(
-        m_hWlan, m_interfaceGuid, wlan_intf_opcode_interface_state, sizeof(WLAN_INTERFACE_STATE));
-    if (state) return stateOf(*state);
-    Log(3, "WlanQueryInterface failed in Supplicant::queryState.");
-    return SupplicantState::InvalidState;
-}
-
 void Supplicant::setRadioState(bool on) {
     if (m_bRadioOn == on) return;
     Log(3, "Radio state changed from %s == > %s", onOrOff(m_bRadioOn), onOrOff(on));
     m_bRadioOn = on;
     m_hRadioStateChangedEvent.set();
-}
-
-bool Supplicant::isRadioOn() const {
-    const auto radio = queryInterface<WLAN_RADIO_STATE>(m_hWlan, m_interfaceGuid,
-                                                        wlan_intf_opcode_radio_state, kMinimumRadioState);
-    return !radio || radio->PhyRadioState[0].dot11SoftwareRadioState != dot11_radio_state_off;
 }
 
 bool Supplicant::isHs20Enabled() const {

@@ -17,6 +17,8 @@
 #include "connection/InterworkingMgr.h"
 #include "connection/NetworkProfileMgr.h"
 #include "connection/NetworkRetryHelper.h"
+#include "connection/SupplicantState.h"
+#include "connection/WlanInterface.h"
 #include "hotspot/Hs20NetworkList.h"
 #include "platform/Event.h"
 #include "platform/WlanApi.h"
@@ -24,25 +26,6 @@
 namespace vexa {
 
 class SupplicantMgr;
-
-enum class SupplicantState : std::int32_t {
-    InvalidState,
-    Initialized,
-    Connecting,
-    Connected,
-    Disconnecting,
-    Disconnected,
-    InterfaceDisabled,
-    Scanning,
-    Authenticating,
-    Associating,
-    Associated,
-    Disassociating,
-    Auth4WayHandshake,
-    GroupHandshake,
-};
-
-const char* nameOf(SupplicantState state);
 
 /// All that belongs to one adapter. Made and ended by SupplicantMgr; notification and command threads come
 /// here with a reference that keeps the object alive, also beyond deinit(): its events and its handle stay
@@ -61,15 +44,16 @@ public:
     /// Back to a clean start when the adapter comes back, without losing the object.
     void reset() EXCLUDES(g_hs20Lock);
     bool isInitialized() const { return m_bInitialized; }
+    const GUID& interfaceGuid() const { return m_wlan.guid(); }
 
     /// The cached state. Claims about the WLAN service are only taken over once it agrees. Always 0.
     int setState(SupplicantState state);
     /// The live state. InvalidState if it can't be told.
-    SupplicantState queryState() const;
+    SupplicantState queryState() const { return m_wlan.queryState(); }
 
     /// The cached radio state, and the live one; true also if that can't be told.
     void setRadioState(bool on);
-    bool isRadioOn() const;
+    bool isRadioOn() const { return m_wlan.isRadioOn(); }
 
     /// Whether the user has the hotspot function switched on.
     bool isHs20Enabled() const;
@@ -79,9 +63,8 @@ public:
     /// Whether the adapter has a DNS server. Always 0; no access if it can't be told.
     int queryInternetAccess(bool& hasAccess) const;
 
-    /// The WLAN service's current connection; kFailure if there is none.
-    int queryCurrentConnection(DOT11_SSID& ssid, MacAddress& bssid, bool includeConnecting) const;
-    /// Its network in the list; null if there is none. Good while the lock is held.
+    /// The network of the WLAN service's current connection; null if there is none in the list. Good while
+    /// the lock is held.
     Hs20Network* getConnectedBss(bool includeConnecting) const REQUIRES(g_hs20Lock);
 
     /// Takes over a report of the networks in range, fetches what ANQP has found out about each, and tells
@@ -91,7 +74,7 @@ public:
     void sendNetworkList() REQUIRES(g_hs20Lock);
 
     /// Asks the WLAN service to end its connection.
-    DWORD requestDisconnect() const;
+    DWORD requestDisconnect() const { return m_wlan.disconnect(); }
 
     /// Requests to the hotspot module: start the ANQP queries of all networks, read the networks in range,
     /// read what is known of one. kSuccess or kFailure.
@@ -129,7 +112,6 @@ public:
     int deleteCredential(std::int32_t id) REQUIRES(g_hs20Lock);
     int updateCredential(const CredentialInput& input) REQUIRES(g_hs20Lock);
 
-    const GUID m_interfaceGuid;
     SupplicantMgr* const m_pMgr;  // not owned; outlives all supplicants
 
     platform::Event m_hSupplicantStateChangedEvent{platform::Reset::Auto, "supplicant state changed"};
@@ -186,20 +168,17 @@ private:
     DWORD requestConnection(std::string_view ssid, const NetworkProfile* profile) REQUIRES(g_hs20Lock);
     const char* reasonNotToBlock() const REQUIRES(g_hs20Lock);
 
-    DWORD callIhv(std::vector<std::byte> request, std::vector<std::byte>* reply) const;
     int sendIhvCmd();
     void tellClient(const std::function<void(const ClientEvents&)>& tell) REQUIRES(g_hs20Lock);
     const char* initSteps();
     void recordConnectionAtStart();
     void logInterfaceGuid() const;
-    bool openWlanHandle();
-    void closeWlanHandle();
 
     std::atomic<bool> m_bInitialized{false};
     std::atomic<bool> m_bRadioOn{false};
     std::array<std::uint8_t, 6> m_macAddress{};
     std::atomic<std::uint32_t> m_ifIndex{0};
-    std::atomic<HANDLE> m_hWlan{nullptr};
+    WlanInterface m_wlan;
     SupplicantState m_state GUARDED_BY(g_hs20Lock) = SupplicantState::InvalidState;
 
     // What tells this program's connections from the operating system's, and the client's from

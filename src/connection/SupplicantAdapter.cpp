@@ -27,7 +27,7 @@ auto queryWithGrowingBuffer(const char* name, Query query) {
 }  // namespace
 
 int Supplicant::queryMacAddress() {
-    const std::string guidText = guidToString(m_interfaceGuid);
+    const std::string guidText = guidToString(m_wlan.guid());
     const auto list = queryWithGrowingBuffer("GetAdaptersAddresses", platform::getAdaptersAddresses);
     if (list.error != 0) return kFailure;
     const auto found = std::find_if(list.adapters.begin(), list.adapters.end(), [&](const auto& adapter) {

@@ -34,6 +34,11 @@ int Supplicant::updateHs20NetworkList(const std::vector<Hs20BssRecord>& records)
     return kSuccess;
 }
 
+Hs20Network* Supplicant::getConnectedBss(bool includeConnecting) const {
+    const auto connection = m_wlan.queryCurrentConnection(includeConnecting);
+    return connection ? m_networkList.findBySsid(bytesOf(connection->ssid)) : nullptr;
+}
+
 void Supplicant::sendNetworkList() {
     tellClient([this](const ClientEvents& events) { events.sendNetworkList(*this); });
 }

@@ -129,7 +129,7 @@ int SupplicantMgr::removeSupplicantIfInterfaceRemoved() {
 std::shared_ptr<Supplicant> SupplicantMgr::findSupplicantByGuid(const GUID& guid) {
     const LockGuard lock(m_listMutex);
     const auto found = std::find_if(m_supplicants.begin(), m_supplicants.end(), [&](const auto& supplicant) {
-        return areGuidsEqual(supplicant->m_interfaceGuid, guid);
+        return areGuidsEqual(supplicant->interfaceGuid(), guid);
     });
     return found == m_supplicants.end() ? nullptr : *found;
 }

@@ -12,19 +12,8 @@ constexpr std::size_t kRealmLengthSize = 4;
 
 }  // namespace
 
-DWORD Supplicant::callIhv(std::vector<std::byte> request, std::vector<std::byte>* reply) const {
-    DWORD returned = 0;
-    if (reply != nullptr) reply->assign(kIhvReplySize, std::byte{0});
-    const DWORD result = WlanIhvControl(m_hWlan, &m_interfaceGuid, wlan_ihv_control_type_service,
-                                        static_cast<DWORD>(request.size()), request.data(),
-                                        reply == nullptr ? 0 : static_cast<DWORD>(reply->size()),
-                                        reply == nullptr ? nullptr : reply->data(), &returned);
-    if (reply != nullptr) reply->resize(std::min<std::size_t>(returned, reply->size()));
-    return result;
-}
-
 int Supplicant::sendIhvCmd() {
-    const DWORD result = callIhv(ihvRequest(IhvRequest::QueryAnqp), nullptr);
+    const DWORD result = m_wlan.tellModule(ihvRequest(IhvRequest::QueryAnqp));
     if (result == ERROR_SUCCESS) return kSuccess;
     Log(3, "WlanIhvControl call failed in sendIhvCmd with result code=%d", static_cast<int>(result));
     return kFailure;
@@ -34,7 +23,7 @@ int Supplicant::getHs20BssListFromIHV() {
     const LockGuard lock(g_hs20Lock);
     Log(3, "Get HS20 BSS list from IHV.");
     std::vector<std::byte> reply;
-    const DWORD result = callIhv(ihvRequest(IhvRequest::GetBssList), &reply);
+    const DWORD result = m_wlan.askModule(ihvRequest(IhvRequest::GetBssList), reply);
     if (result != ERROR_SUCCESS) {
         Log(3, "WlanIhvControl failed with error code=%d", static_cast<int>(result));
         return kFailure;
@@ -55,7 +44,7 @@ int Supplicant::fetchBssAnqpInfo(Hs20Network* network) {
     Log(3, "Fetching BSS with ssid=%s and mac address=%s  ANQP info from HS20 IHV...",
         network->ssidText().c_str(), toText(network->m_macAddress).c_str());
     std::vector<std::byte> reply;
-    if (callIhv(ihvRequest(IhvRequest::GetAnqpInfo, network->record()), &reply) != ERROR_SUCCESS) {
+    if (m_wlan.askModule(ihvRequest(IhvRequest::GetAnqpInfo, network->record()), reply) != ERROR_SUCCESS) {
         Log(3, "WlanIhvControl call failed.");
         return kFailure;
     }

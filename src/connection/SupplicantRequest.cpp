@@ -1,43 +1,18 @@
-#include <algorithm>
-#include <iterator>
 #include <string_view>
 
 #include "base/DiagnosticLog.h"
-#include "base/WlanText.h"
 #include "config/Config.h"
 #include "config/ResultCodes.h"
 #include "connection/Supplicant.h"
 #include "connection/SupplicantMgr.h"
 #include "hotspot/CredentialMatching.h"
-#include "text/TextConversion.h"
 
 namespace vexa {
 
-namespace {
-
-DOT11_SSID ssidField(std::string_view bytes) {
-    DOT11_SSID ssid{};
-    ssid.uSSIDLength = static_cast<ULONG>(std::min(bytes.size(), kMaxSsidLength));
-    std::transform(bytes.begin(), bytes.begin() + static_cast<std::ptrdiff_t>(ssid.uSSIDLength),
-                   std::begin(ssid.ucSSID), [](char byte) { return static_cast<UCHAR>(byte); });
-    return ssid;
-}
-
-}  // namespace
-
 // Null: the operating system chooses the profile.
 DWORD Supplicant::requestConnection(std::string_view ssid, const NetworkProfile* profile) {
-    const std::basic_string<WCHAR> text =
-        profile == nullptr ? std::basic_string<WCHAR>() : toWlanText(profile->m_profileXml);
-    DOT11_SSID field = ssidField(ssid);
-    WLAN_CONNECTION_PARAMETERS parameters{};
-    parameters.wlanConnectionMode =
-        profile == nullptr ? wlan_connection_mode_discovery_secure : wlan_connection_mode_temporary_profile;
-    parameters.strProfile = profile == nullptr ? nullptr : text.c_str();
-    parameters.pDot11Ssid = profile == nullptr ? &field : nullptr;
-    parameters.dot11BssType = dot11_BSS_type_infrastructure;
-    parameters.dwFlags = WLAN_CONNECTION_HIDDEN_NETWORK;
-    const DWORD result = WlanConnect(m_hWlan, &m_interfaceGuid, &parameters, nullptr);
+    const DWORD result =
+        profile == nullptr ? m_wlan.connectBySsid(ssid) : m_wlan.connectByProfile(profile->m_profileXml);
     if (result != ERROR_SUCCESS) return result;
     m_connectingSsid = ssid;
     m_bConnectionStarted = true;

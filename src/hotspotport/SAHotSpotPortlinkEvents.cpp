@@ -35,7 +35,7 @@ Json::Value asJson(const Credential& credential) {
 }  // namespace
 
 void SAHotSpotPortlink::SendRadioState() {
-    const bool isOn = isSoftwareRadioOn(m_hClientHandle, m_interfaceGuid.get());
+    const bool isOn = isSoftwareRadioOn(m_hClientHandle.get(), m_interfaceGuid.get());
     SendData(toStyledText(Json::Value(isOn)), "GET_RADIO");
 }
 
