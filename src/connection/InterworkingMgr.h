@@ -15,6 +15,7 @@ struct Credential;
 struct NetworkProfile;
 class Hs20Network;
 class Supplicant;
+struct EngineState;
 
 /// A network and the credential to join it with; both null if there is none.
 struct NetworkChoice {
@@ -27,12 +28,13 @@ struct NetworkChoice {
 /// with its line in the log, and at its end one attempt to connect.
 class InterworkingMgr {
 public:
-    explicit InterworkingMgr(Supplicant* supplicant) : m_pSupplicant(supplicant) {}
+    InterworkingMgr(Supplicant& supplicant, EngineState& engine)
+        : m_supplicant(supplicant), m_engine(engine) {}
     ~InterworkingMgr();
     InterworkingMgr(const InterworkingMgr&) = delete;
     InterworkingMgr& operator=(const InterworkingMgr&) = delete;
 
-    /// Starts the thread. 0; 5 without a Supplicant, 1 if the thread can't be created.
+    /// Starts the thread. 0; 1 if it can't be created.
     int init();
 
     /// Ends the thread, within 10 s. REQUIRES: the network list lock not held.
@@ -63,7 +65,8 @@ private:
     NetworkProfile* reusableProfile(const NetworkChoice& choice, const std::wstring& name)
         REQUIRES(g_hs20Lock);
 
-    Supplicant* const m_pSupplicant;
+    Supplicant& m_supplicant;
+    EngineState& m_engine;
     std::atomic<bool> m_bInited{false};
     std::atomic<bool> m_bTerminate{false};
     std::atomic<bool> m_isThreadLate{false};

@@ -3,7 +3,6 @@
 #include <cassert>
 
 #include "base/DiagnosticLog.h"
-#include "config/Config.h"
 #include "config/ResultCodes.h"
 #include "connection/SupplicantMgr.h"
 #include "platform/Guid.h"
@@ -29,8 +28,8 @@ const char* onOrOff(bool on) {
 
 }  // namespace
 
-Supplicant::Supplicant(const GUID& interfaceGuid, SupplicantMgr* mgr)
-    : m_pMgr(mgr), m_lastHs20ToggleTime(getTimeValue()), m_wlan(interfaceGuid) {
+Supplicant::Supplicant(const GUID& interfaceGuid, SupplicantMgr& mgr)
+    : m_mgr(mgr), m_engine(mgr.config()), m_wlan(interfaceGuid), m_lastHs20ToggleTime(getTimeValue()) {
     m_lastHs20ToggleTime.seconds -= kLongBeforeStart;
 }
 
@@ -55,8 +54,8 @@ int Supplicant::init() {
 
 // The line of the step that failed; null if none did.
 const char* Supplicant::initSteps() {
-    logInterfaceGuid();
-    if (queryMacAddress() != kSuccess) return "ERROR: Query MAC address failed.";
+    Log(2, "Interface GUID: %s", guidToString(m_wlan.guid()).c_str());
+    if (!m_ip.find(m_wlan.guid())) return "ERROR: Query MAC address failed.";
     if (!m_wlan.open()) return "ERROR: Open wlan handle failed.";
     if (m_interworkingMgr.init() != kSuccess) return "ERROR: Failed to initi NetworkinMgr.";
     if (getHs20BssListFromIHV() != kSuccess)
@@ -74,12 +73,7 @@ void Supplicant::recordConnectionAtStart() {
     const auto connection = m_wlan.queryCurrentConnection(false);
     if (!connection) return;
     const LockGuard lock(g_hs20Lock);
-    m_history.addConnection(connection->ssid, connection->bssid, m_networkList);
-}
-
-void Supplicant::logInterfaceGuid() const {
-    if (m_pMgr == nullptr) Log(6, "ERROR: No Config.");
-    Log(2, "Interface GUID: %s", guidToString(m_wlan.guid()).c_str());
+    m_history.addConnection(connection->ssid, connection->bssid, m_engine.m_networkList);
 }
 
 void Supplicant::deinit() {
@@ -89,7 +83,7 @@ void Supplicant::deinit() {
     m_interworkingMgr.stop();
     {
         const LockGuard lock(g_hs20Lock);
-        m_retryHelper.clear();
+        m_engine.m_retryHelper.clear();
     }
     m_wlan.close();
     m_bInitialized = false;
@@ -98,19 +92,19 @@ void Supplicant::deinit() {
 
 void Supplicant::reset() {
     const LockGuard lock(g_hs20Lock);
-    m_bConnectionStarted = false;
+    m_engine.m_bConnectionStarted = false;
     m_bManualConnectStarted = false;
     m_connectingSsid.clear();
     m_triedCredentialIds.clear();
     m_bManualConnectPending = false;
     m_pendingManualSsid.clear();
-    m_bQueryingAnqp = false;
+    m_engine.m_bQueryingAnqp = false;
     m_bRoaming = false;
     m_bConnectionStartedByOs = false;
     m_bHs20Connected = false;
-    m_blockedNetworks.clear();
-    m_profileMgr.clear();
-    m_retryHelper.resetAllNumRetries();
+    m_engine.m_blockedNetworks.clear();
+    m_engine.m_profileMgr.clear();
+    m_engine.m_retryHelper.resetAllNumRetries();
 }
 
 int Supplicant::setState(SupplicantState state) {
@@ -119,7 +113,7 @@ int Supplicant::setState(SupplicantState state) {
     if (const SupplicantState live = queryState(); isClaim(state) && live != state) return kSuccess;
     Log(3, "Supplicant state changed from %s to %s", nameOf(m_state), nameOf(state));
     m_state = state;
-    m_hSupplicantStateChangedEvent.set();
+    m_engine.m_hSupplicantStateChangedEvent.set();
     return kSuccess;
 }
 
@@ -127,52 +121,28 @@ void Supplicant::setRadioState(bool on) {
     if (m_bRadioOn == on) return;
     Log(3, "Radio state changed from %s == > %s", onOrOff(m_bRadioOn), onOrOff(on));
     m_bRadioOn = on;
-    m_hRadioStateChangedEvent.set();
+    m_engine.m_hRadioStateChangedEvent.set();
 }
 
 bool Supplicant::isHs20Enabled() const {
-    return m_pMgr == nullptr || m_pMgr->config().m_bHotSpotAutoConnect;
+    return m_engine.m_config.m_bHotSpotAutoConnect;
+}
+
+void Supplicant::setHs20Enabled(bool enable) {
+    if (isHs20Enabled() == enable) return;
+    m_lastHs20ToggleTime = getTimeValue();
+    m_engine.m_config.m_bHotSpotAutoConnect = enable;
+    m_engine.m_retryHelper.resetAllNumRetries();
+    m_engine.m_hEnableHs20Event.set();
+    sendNetworkList();
+    if (enable) return;
+    Log(3,
+        "STA is in connected state when user turns of HS20,trying to disconnect from any connected HS20 network.");
+    if (m_bHs20Connected) disconnectedBSS(Leave::Hs20);
 }
 
 void Supplicant::tellClient(const std::function<void(const ClientEvents&)>& tell) {
-    if (m_pMgr != nullptr && m_pMgr->clientEvents().isComplete()) tell(m_pMgr->clientEvents());
-}
-
-int Supplicant::getCredential(std::int32_t id, Credential*& credential) {
-    if (m_pMgr == nullptr) return kFailure;
-    if (id < 1) return kInvalidArgument;
-    credential = m_pMgr->config().credentials().findCredentialById(id);
-    return kSuccess;
-}
-
-int Supplicant::deleteCredential(std::int32_t id) {
-    Log(3, "Deleting the credential with id=%d", id);
-    if (m_pMgr == nullptr) return kFailure;
-    Config& config = m_pMgr->config();
-    if (!config.credentials().deleteCredential(id)) return kFailure;
-    config.saveConfig();
-    m_retryHelper.removeAllCredNumRetryEntries(id);
-    m_profileMgr.deleteProfilesOfCredential(id);
-    m_hCredentialChangedEvent.set();
-    return kSuccess;
-}
-
-int Supplicant::updateCredential(const CredentialInput& input) {
-    Log(3, "Updating the credential with id=%d", input.id);
-    Credential* credential = nullptr;
-    if (getCredential(input.id, credential) != kSuccess || credential == nullptr) {
-        Log(6, "ERROR: Cannot find credential.");
-        return kFailure;
-    }
-    Config& config = m_pMgr->config();
-    if (!credential->m_bAutoConnect && input.autoConnect)
-        m_blockedNetworks.onCredentialAutoConnectChanged(input.id, config.credentials(), m_networkList);
-    if (config.credentials().updateCredential(input) != kSuccess) return kFailure;
-    config.saveConfig();
-    m_retryHelper.resetNumRetries(input.id);
-    m_profileMgr.deleteProfilesOfCredential(input.id);
-    m_hCredentialChangedEvent.set();
-    return kSuccess;
+    if (m_mgr.clientEvents().isComplete()) tell(m_mgr.clientEvents());
 }
 
 }  // namespace vexa

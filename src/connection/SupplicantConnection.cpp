@@ -3,7 +3,6 @@
 
 #include "base/DiagnosticLog.h"
 #include "base/WlanText.h"
-#include "config/Config.h"
 #include "config/ResultCodes.h"
 #include "connection/Supplicant.h"
 #include "connection/SupplicantMgr.h"
@@ -60,7 +59,7 @@ int Supplicant::onConnectionStart(const WLAN_CONNECTION_NOTIFICATION_DATA* data)
     const std::wstring name = profileNameOf(*data);
     if (isOwnConnection(*data)) {
         LogWide(3, L"Connection start event: connection initiated by HS20, profile name=%s", name.c_str());
-        if (!m_bConnectionStarted)
+        if (!m_engine.m_bConnectionStarted)
             Log(6,
                 "ERROR: m_bConnectionStarted should be set to false after HS20 initiated a new connection.");
         if (m_bManualConnectStarted) Log(3, "Manual connection started.");
@@ -68,7 +67,7 @@ int Supplicant::onConnectionStart(const WLAN_CONNECTION_NOTIFICATION_DATA* data)
         LogWide(3, L"Connection start event: connection not initiated by HS20, profile name=%s",
                 name.c_str());
         m_bConnectionStartedByOs = true;
-        m_blockedNetworks.unblockRecentNetworks();
+        m_engine.m_blockedNetworks.unblockRecentNetworks();
     }
     m_bHs20Connected = false;
     return kSuccess;
@@ -96,11 +95,11 @@ int Supplicant::onOwnResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::
     const std::wstring name = profileNameOf(data);
     LogWide(3, L"Connection result initiated by HS20, clearing the cache, profile name=%s.", name.c_str());
     m_connectingSsid.clear();
-    m_bConnectionStarted = false;
+    m_engine.m_bConnectionStarted = false;
     if (m_bManualConnectPending) return carryOutPendingRequest();
-    m_hConnectionCompletedEvent.set();
+    m_engine.m_hConnectionCompletedEvent.set();
     NetworkProfile* profile = nullptr;
-    if (m_profileMgr.findProfileByName(name, profile) != kSuccess) {
+    if (m_engine.m_profileMgr.findProfileByName(name, profile) != kSuccess) {
         Log(6, "ERROR: Cannot get profile in profile manager.");
         return kFailure;
     }
@@ -125,9 +124,9 @@ int Supplicant::onSuccess(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const N
     m_bHs20Connected = true;
     setState(SupplicantState::Connected);
     clearNumRetriesOnConnSuccess(profile.m_name, ssid);
-    const Hs20Network* const network = m_networkList.findBySsid(ssid);
+    const Hs20Network* const network = m_engine.m_networkList.findBySsid(ssid);
     if (network == nullptr) return kFailure;
-    if (m_history.addConnection(data.dot11Ssid, network->m_macAddress, m_networkList) != kSuccess)
+    if (m_history.addConnection(data.dot11Ssid, network->m_macAddress, m_engine.m_networkList) != kSuccess)
         Log(6, "ERROR: Create connection history failed.");
     eapMethod = static_cast<std::uint32_t>(profile.m_eapMethod);
     return endAttempt(data, ConnectionResult::kSucceeded);
@@ -135,10 +134,10 @@ int Supplicant::onSuccess(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const N
 
 void Supplicant::clearNumRetriesOnConnSuccess(const std::wstring& profileName, std::string_view ssid) {
     Log(3, ">>>>Clear cred num retries on conn success: profileName=%s", narrowFromWide(profileName).c_str());
-    if (m_networkList.findBySsid(ssid) == nullptr || m_pMgr == nullptr) return;
+    if (m_engine.m_networkList.findBySsid(ssid) == nullptr) return;
     NetworkProfile* profile = nullptr;
-    if (m_profileMgr.findProfileByName(profileName, profile) == kSuccess && profile->m_credId >= 1)
-        m_retryHelper.setNumRetries(profile->m_credId, ssid, 0);
+    if (m_engine.m_profileMgr.findProfileByName(profileName, profile) == kSuccess && profile->m_credId >= 1)
+        m_engine.m_retryHelper.setNumRetries(profile->m_credId, ssid, 0);
 }
 
 int Supplicant::onFailure(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const NetworkProfile& profile) {
@@ -179,7 +178,7 @@ int Supplicant::tryNextCredential(const WLAN_CONNECTION_NOTIFICATION_DATA& data)
 int Supplicant::tryMachineMode(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const NetworkProfile& failed) {
     Log(3,
         "Connection using EAP-TLS with authMode=machineOrUser failed,trying to use EAP-TLS with authMode=machine.");
-    const Hs20Network* const network = m_networkList.findBySsid(bytesOf(data.dot11Ssid));
+    const Hs20Network* const network = m_engine.m_networkList.findBySsid(bytesOf(data.dot11Ssid));
     if (network == nullptr) {
         Log(6, "ERROR: Cannot get the BSS when connection failed.");
         return kFailure;
@@ -188,15 +187,15 @@ int Supplicant::tryMachineMode(const WLAN_CONNECTION_NOTIFICATION_DATA& data, co
         Log(6, "ERROR: Invalid credential id.");
         return kFailure;
     }
-    Credential* credential = nullptr;
-    if (getCredential(failed.m_credId, credential) != kSuccess || credential == nullptr) {
+    const Credential* const credential = findCredential(failed.m_credId);
+    if (credential == nullptr) {
         Log(6, "ERROR: Cannot get credential.");
         return kFailure;
     }
-    m_profileMgr.deleteProfile(failed.m_id);
+    m_engine.m_profileMgr.deleteProfile(failed.m_id);
     NetworkProfile* profile = nullptr;
-    if (m_profileMgr.addProfileFromCredential(*credential, *network, true, m_pMgr->config().homeRealm(),
-                                              profile) != kSuccess) {
+    if (m_engine.m_profileMgr.addProfileFromCredential(*credential, *network, true,
+                                                       m_engine.m_config.homeRealm(), profile) != kSuccess) {
         Log(6, "ERROR: Cannot add network profile.");
         return kFailure;
     }
@@ -258,16 +257,24 @@ int Supplicant::onDisconnected(const WLAN_CONNECTION_NOTIFICATION_DATA* data) {
     {
         const LockGuard lock(g_hs20Lock);
         setState(SupplicantState::Disconnected);
-        tellClient(
-            [&](const ClientEvents& events) { isRealmUpdatePending = events.takePendingRealmUpdate(); });
+        isRealmUpdatePending = m_mgr.takePendingRealmUpdate();
     }
     if (isRealmUpdatePending) queryHs20NetworkAnqpInfo();
     const LockGuard lock(g_hs20Lock);
     if (!isRealmUpdatePending) sendNetworkList();
-    if (m_history.updateDisconnection(data->dot11Ssid, m_networkList) != kSuccess)
+    if (m_history.updateDisconnection(data->dot11Ssid, m_engine.m_networkList) != kSuccess)
         Log(6, "ERROR: Update connection history failed.");
     m_bHs20Connected = false;
     return kSuccess;
+}
+
+void Supplicant::onRoamingStart() {
+    m_bRoaming = true;
+}
+
+void Supplicant::onRoamingEnd() {
+    if (!m_bRoaming.exchange(false))
+        Log(3, "Received wlan roaming ended event while not received wlan roaming not started event.");
 }
 
 // A radio change wipes the slate, in both directions.
@@ -284,9 +291,9 @@ int Supplicant::onRadioStateChanged(const WLAN_PHY_RADIO_STATE* data) {
     if (!isOn) m_connectingSsid.clear();
     Log(3, "Supplicant state=%s when radio state changed.", nameOf(m_state));
     setState(SupplicantState::Disconnected);
-    m_bConnectionStarted = false;
-    m_retryHelper.resetAllNumRetries();
-    m_blockedNetworks.clear();
+    m_engine.m_bConnectionStarted = false;
+    m_engine.m_retryHelper.resetAllNumRetries();
+    m_engine.m_blockedNetworks.clear();
     m_triedCredentialIds.clear();
     sendNetworkList();
     return kSuccess;

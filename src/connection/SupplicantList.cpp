@@ -1,10 +1,8 @@
 #include <algorithm>
 
 #include "base/DiagnosticLog.h"
-#include "config/Config.h"
 #include "config/ResultCodes.h"
 #include "connection/Supplicant.h"
-#include "connection/SupplicantMgr.h"
 
 namespace vexa {
 
@@ -19,16 +17,16 @@ constexpr std::size_t kLeastAnqpPayload = 44;
 int Supplicant::updateHs20NetworkList(const std::vector<Hs20BssRecord>& records) {
     if (records.empty()) return kInvalidArgument;
     const LockGuard lock(g_hs20Lock);
-    const std::vector<MacAddress> oldMacs = m_networkList.macAddresses();
-    const Hs20NetworkList::Networks gone = m_networkList.replace(records);
-    for (Hs20Network* network : m_networkList.copyPointers())
+    const std::vector<MacAddress> oldMacs = m_engine.m_networkList.macAddresses();
+    const Hs20NetworkList::Networks gone = m_engine.m_networkList.replace(records);
+    for (Hs20Network* network : m_engine.m_networkList.copyPointers())
         if (fetchBssAnqpInfo(network) != kSuccess) Log(3, "Fetch ANQP info failed.");
-    m_networkList.processDuplicatedHs20Networks(oldMacs);
+    m_engine.m_networkList.processDuplicatedHs20Networks(oldMacs);
     Log(3, "\tSet events m_hHs20NetworkChangedEvent and m_hAnqpInfoReadyEvent.");
-    m_hHs20NetworkChangedEvent.set();
-    m_hAnqpInfoReadyEvent.set();
-    m_retryHelper.eraseUnavailableNetworks(m_networkList);
-    if (m_networkList.size() > oldMacs.size() && isHs20Enabled())
+    m_engine.m_hHs20NetworkChangedEvent.set();
+    m_engine.m_hAnqpInfoReadyEvent.set();
+    m_engine.m_retryHelper.eraseUnavailableNetworks(m_engine.m_networkList);
+    if (m_engine.m_networkList.size() > oldMacs.size() && isHs20Enabled())
         tellClient([](const ClientEvents& events) { events.sendDetectedHotspot(); });
     sendNetworkList();
     return kSuccess;
@@ -36,7 +34,7 @@ int Supplicant::updateHs20NetworkList(const std::vector<Hs20BssRecord>& records)
 
 Hs20Network* Supplicant::getConnectedBss(bool includeConnecting) const {
     const auto connection = m_wlan.queryCurrentConnection(includeConnecting);
-    return connection ? m_networkList.findBySsid(bytesOf(connection->ssid)) : nullptr;
+    return connection ? m_engine.m_networkList.findBySsid(bytesOf(connection->ssid)) : nullptr;
 }
 
 void Supplicant::sendNetworkList() {
@@ -45,7 +43,7 @@ void Supplicant::sendNetworkList() {
 
 bool Supplicant::hasUnfetchedAnqpInfo() const {
     const LockGuard lock(g_hs20Lock);
-    const auto networks = m_networkList.copyPointers();
+    const auto networks = m_engine.m_networkList.copyPointers();
     return std::any_of(networks.begin(), networks.end(),
                        [](const Hs20Network* network) { return !network->hasRealmData(); });
 }
@@ -63,7 +61,7 @@ int Supplicant::onAnqpInfoChanged(Bytes payload) {
     if (payload.size() < kLeastAnqpPayload) return kFailure;
     const Hs20BssRecord record = parseBssRecord(payload);
     if (record.isHs20 != 1) return kSuccess;
-    Hs20Network* const network = m_networkList.findByMac(record.macAddress);
+    Hs20Network* const network = m_engine.m_networkList.findByMac(record.macAddress);
     if (network == nullptr) return kFailure;
     return fetchBssAnqpInfo(network) == kSuccess ? kSuccess : kFailure;
 }
@@ -76,9 +74,9 @@ void Supplicant::onAnqpQueryCompleted() {
         Log(6, "Error: getHs20BssListFromIHV failed in hs20Associate.");
         return;
     }
-    if (!m_bQueryingAnqp) return;
+    if (!m_engine.m_bQueryingAnqp) return;
     Log(3, "ANQP querying finished.");
-    m_bQueryingAnqp = false;
+    m_engine.m_bQueryingAnqp = false;
 }
 
 }  // namespace vexa

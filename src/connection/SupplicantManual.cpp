@@ -1,10 +1,8 @@
 #include <algorithm>
 
 #include "base/DiagnosticLog.h"
-#include "config/Config.h"
 #include "config/ResultCodes.h"
 #include "connection/Supplicant.h"
-#include "connection/SupplicantMgr.h"
 #include "hotspot/CredentialMatching.h"
 #include "text/TextConversion.h"
 
@@ -20,7 +18,7 @@ int Supplicant::connectBss(std::string_view ssid) {
     const LockGuard lock(g_hs20Lock);
     Log(3, "###Manually connect to a BSS started.###");
     if (ssid.empty()) return kInvalidArgument;
-    if (!m_bConnectionStarted) return connectBssNow(std::string(ssid));
+    if (!m_engine.m_bConnectionStarted) return connectBssNow(std::string(ssid));
     Log(3,
         "\tConnection has already been started, maybe by auto connecting thread, we will wait until the auto connecting completed, either succeed or fail.");
     m_bManualConnectPending = true;
@@ -30,9 +28,9 @@ int Supplicant::connectBss(std::string_view ssid) {
 
 int Supplicant::connectBssNow(const std::string& ssid) {
     Log(3, "###We are actually going to connect to HS20 network now.###");
-    Hs20Network* const network = m_networkList.findBySsid(ssid);
+    Hs20Network* const network = m_engine.m_networkList.findBySsid(ssid);
     if (network == nullptr) return kFailure;
-    m_blockedNetworks.unblockNetwork(network->ssid());
+    m_engine.m_blockedNetworks.unblockNetwork(network->ssid());
     Log(3, "Unblocked network with ssid=%s and mac address=%s due to user has manually connected to it.",
         network->ssidText().c_str(), toText(network->m_macAddress).c_str());
     if (!network->m_bHs20) return connectPlainly(ssid);
@@ -69,13 +67,12 @@ int Supplicant::tryConnectHs20BssUsingNextCredential(std::string_view ssid, int&
     Log(3, "Try to connect to HS20 network using next credential.");
     connResult = 0;
     if (ssid.empty()) return kFailure;
-    const Hs20Network* const network = m_networkList.findBySsid(ssid);
+    const Hs20Network* const network = m_engine.m_networkList.findBySsid(ssid);
     if (network == nullptr) return kNetworkGone;
     if (!network->m_bHs20) {
         Log(6, "ERROR: we are expecting a HS20 network.");
         return kFailure;
     }
-    if (m_pMgr == nullptr) return kFailure;
     const Credential* const credential = nextUntried(*network);
     if (credential == nullptr) {
         connResult = kConnectNothingLeft;
@@ -90,7 +87,7 @@ int Supplicant::tryConnectHs20BssUsingNextCredential(std::string_view ssid, int&
 }
 
 const Credential* Supplicant::nextUntried(const Hs20Network& network) {
-    const auto found = CredentialMatcher(m_pMgr->config().credentials()).findCredentialsForNetwork(network);
+    const auto found = CredentialMatcher(m_engine.m_config.credentials()).findCredentialsForNetwork(network);
     for (const Credential* credential : found) {
         if (std::find(m_triedCredentialIds.begin(), m_triedCredentialIds.end(), credential->m_id) ==
             m_triedCredentialIds.end())
@@ -102,37 +99,14 @@ const Credential* Supplicant::nextUntried(const Hs20Network& network) {
 
 int Supplicant::connectFreshly(const Hs20Network& network, const Credential& credential) {
     NetworkProfile* profile = nullptr;
-    if (m_profileMgr.findProfileByName(wideFromNarrow(network.ssid()), profile) == kSuccess) {
+    if (m_engine.m_profileMgr.findProfileByName(wideFromNarrow(network.ssid()), profile) == kSuccess) {
         if (profile->m_id < 1) return kFailure;
-        m_profileMgr.deleteProfile(profile->m_id);
+        m_engine.m_profileMgr.deleteProfile(profile->m_id);
     }
-    if (m_profileMgr.addProfileFromCredential(credential, network, false, m_pMgr->config().homeRealm(),
-                                              profile) != kSuccess)
+    if (m_engine.m_profileMgr.addProfileFromCredential(credential, network, false,
+                                                       m_engine.m_config.homeRealm(), profile) != kSuccess)
         return kFailure;
     return connectToNetwork(&network, profile);
-}
-
-// The block comes first: when the disconnection is reported, the network is on the list already.
-int Supplicant::disconnectedBSS(bool blockNetwork, bool requireHs20) {
-    const LockGuard lock(g_hs20Lock);
-    Log(3, "Disconnecting from connecting/connected BSS...");
-    const Hs20Network* const network = getConnectedBss(true);
-    if (network == nullptr && requireHs20) {
-        Log(6,
-            "ERROR: We are requested to disconnect from a HS20 network,but we cannot found a connected HS20 network.");
-        return kFailure;
-    }
-    Log(3, network != nullptr ? "Manually disconnect from a HS20 network."
-                              : "Manually disconnect from a non-HS20 network.");
-    if (blockNetwork && network != nullptr) {
-        m_blockedNetworks.blockNetwork(network->ssid(), true);
-        Log(3,
-            "The network with ssid=%s and mac address=%s has been blocked due to user manually disconnect from this network.",
-            network->ssidText().c_str(), toText(network->m_macAddress).c_str());
-    }
-    const bool isRequested = requestDisconnect() == ERROR_SUCCESS;
-    m_bUserDisconnecting = true;
-    return isRequested ? kSuccess : kFailure;
 }
 
 }  // namespace vexa

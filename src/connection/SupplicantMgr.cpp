@@ -79,7 +79,7 @@ int SupplicantMgr::reloadData() {
 // Null if memory runs out.
 std::shared_ptr<Supplicant> SupplicantMgr::makeSupplicant(const GUID& guid) {
     try {
-        return std::make_shared<Supplicant>(guid, this);
+        return std::make_shared<Supplicant>(guid, *this);
     } catch (const std::bad_alloc&) {
         return nullptr;
     }

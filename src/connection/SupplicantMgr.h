@@ -52,6 +52,11 @@ public:
 
     Config& config() { return m_config; }
 
+    /// A realm update that waits for a disconnection, also beyond the end of the Supplicant that it was asked
+    /// of. Told once.
+    void awaitRealmUpdate() { m_bRealmUpdatePending = true; }
+    bool takePendingRealmUpdate() { return m_bRealmUpdatePending.exchange(false); }
+
     const ClientEvents& clientEvents() const REQUIRES(g_hs20Lock) { return m_clientEvents; }
     void setClientEvents(ClientEvents events) REQUIRES(g_hs20Lock) { m_clientEvents = std::move(events); }
 
@@ -66,6 +71,7 @@ private:
     Config m_config;
     ClientEvents m_clientEvents GUARDED_BY(g_hs20Lock);
     std::atomic<bool> m_bInitialized{false};
+    std::atomic<bool> m_bRealmUpdatePending{false};
     platform::Mutex m_changes{"changes of supplicants"};
     platform::Mutex m_listMutex{"the list of supplicants"};
     std::vector<std::shared_ptr<Supplicant>> m_supplicants GUARDED_BY(m_listMutex);

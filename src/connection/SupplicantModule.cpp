@@ -71,9 +71,9 @@ int Supplicant::fetchBssAnqpInfo(Hs20Network* network) {
 
 int Supplicant::queryHs20NetworkAnqpInfo() {
     Log(3, "SIGMA: Enter Supplicant::queryHs20NetworkAnqpInfo.");
-    m_bQueryingAnqp = true;
+    m_engine.m_bQueryingAnqp = true;
     if (sendIhvCmd() != kSuccess) {
-        m_bQueryingAnqp = false;
+        m_engine.m_bQueryingAnqp = false;
         return kFailure;
     }
     Log(3, "Supplicant::queryHs20NetworkAnqpInfo completed.");

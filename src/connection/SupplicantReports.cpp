@@ -1,10 +1,8 @@
 #include <array>
 
 #include "base/DiagnosticLog.h"
-#include "config/Config.h"
 #include "config/ResultCodes.h"
 #include "connection/Supplicant.h"
-#include "connection/SupplicantMgr.h"
 #include "platform/Session.h"
 
 namespace vexa {
@@ -49,8 +47,8 @@ int Supplicant::onSessionChanged(Bytes payload) {
     Log(3, "\tEventType=%d, sessionId=%d", static_cast<int>(eventType),
         static_cast<int>(numberAt(payload, 4)));
     Log(3, "%s", sessionText(eventType));
-    m_retryHelper.resetAllNumRetries();
-    m_blockedNetworks.unblockRecentNetworks();
+    m_engine.m_retryHelper.resetAllNumRetries();
+    m_engine.m_blockedNetworks.unblockRecentNetworks();
     return kSuccess;
 }
 
@@ -101,7 +99,7 @@ int Supplicant::onUserDisconnected(Bytes payload) {
             record.ssid.c_str(), static_cast<int>(elapsed));
         return kSuccess;
     }
-    m_blockedNetworks.blockNetwork(record.ssid, false);
+    m_engine.m_blockedNetworks.blockNetwork(record.ssid, false);
     return kSuccess;
 }
 

@@ -24,7 +24,6 @@ SAHotSpotPortlink::SAHotSpotPortlink() {
         [this] { SendDetectedHotspot(); },
         [this](const ConnectionResult& result) { SendConnectionResult(result); },
         [this] { SendInternetAccess(); },
-        [this] { return m_bRealmUpdatePending.exchange(false); },
     });
 }
 

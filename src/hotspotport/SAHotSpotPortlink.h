@@ -67,13 +67,9 @@ public:
     std::atomic<IpcHandle> m_hIpc{0};
     /// The adapter as the last successful check found it: the key of its Supplicant.
     SharedGuid m_interfaceGuid;
-    /// A realm update waits for the disconnection.
-    std::atomic<bool> m_bRealmUpdatePending{false};
 
 private:
     WlanHandle m_hClientHandle;
-
-    void switchHotspot(Supplicant& supplicant, bool enable) REQUIRES(g_hs20Lock);
 };
 
 /// The Supplicant of the server's adapter, kept alive by the result; null if there is none.

@@ -66,14 +66,11 @@ void onLinkChange(const Event& event) {
 }
 
 void onRoamingStart(const Event& event) {
-    if (const auto supplicant = supplicantOf(event)) supplicant->m_bRoaming = true;
+    if (const auto supplicant = supplicantOf(event)) supplicant->onRoamingStart();
 }
 
 void onRoamingEnd(const Event& event) {
-    const auto supplicant = supplicantOf(event);
-    if (!supplicant) return;
-    if (!supplicant->m_bRoaming.exchange(false))
-        Log(3, "Received wlan roaming ended event while not received wlan roaming not started event.");
+    if (const auto supplicant = supplicantOf(event)) supplicant->onRoamingEnd();
 }
 
 template <class Data>

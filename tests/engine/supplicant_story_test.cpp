@@ -52,17 +52,18 @@ TEST(SupplicantStory, ASecondArrivalResetsIt) {
         const auto before = SupplicantMgr::instance().findSupplicantByGuid(kFirst);
         const int open = handles(world);
         world.perform(R"({"do":"roam"})");
-        before->m_bRoaming = true;
+        before->onRoamingStart();
         world.perform(R"({"do":"insertAdapter"})");
         std::string told =
             before == SupplicantMgr::instance().findSupplicantByGuid(kFirst) ? "kept " : "new ";
-        told += before->m_bRoaming ? "roaming " : "reset ";
+        before->onRoamingEnd();
+        told += count(world.log(), "Received wlan roaming ended event while not received");
         told += std::to_string(handles(world) - open) + " ";
         return told + count(world.log(), "Supplicant with GUID already exists, skip adding.") +
                count(world.log(), "Going to reset the existed supplicant...");
     });
     EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text, "kept reset 0 1 1 ");
+    EXPECT_EQ(ending.text, "kept 1 0 1 1 ");
 }
 
 TEST(SupplicantStory, ARemovalWhileAnotherAdapterIsThereRemovesNothing) {
@@ -136,8 +137,8 @@ TEST(SupplicantStory, LookupsKeepTheirObjectAlive) {
         const auto kept = SupplicantMgr::instance().findSupplicantByGuid(kFirst);
         world.perform(R"({"do":"pullAdapter"})");
         std::string told = stateOf(kFirst) + (kept->isInitialized() ? " alive " : " at rest ");
-        kept->setState(SupplicantState::Initialized);
-        kept->m_hCredentialChangedEvent.set();
+        const WLAN_PHY_RADIO_STATE off{0, dot11_radio_state_off, dot11_radio_state_off};
+        kept->onRadioStateChanged(&off);
         return told + std::to_string(SupplicantMgr::instance().removeSupplicant(kept.get())) +
                std::to_string(SupplicantMgr::instance().removeSupplicant(nullptr));
     });
