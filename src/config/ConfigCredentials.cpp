@@ -50,7 +50,7 @@ const wchar_t* textOfAccess(std::int32_t accessType) {
 
 }  // namespace
 
-int Config::readCredentials() {
+ResultCode Config::readCredentials() {
     Log(2, "Reading all credentials...");
     m_credentials.clear();
     if (m_userName.empty()) return kFailure;
@@ -108,9 +108,9 @@ void Config::repairNextCredId() {
     m_nextCredId = highest == std::numeric_limits<std::int32_t>::max() ? highest : highest + 1;
 }
 
-int Config::saveCredentials() {
+ResultCode Config::saveCredentials() {
     const ScopeGuard release([this]() NO_THREAD_SAFETY_ANALYSIS { m_xmlDoc.release(); });
-    if (const int result = openDocument(); result != kSuccess) return result;
+    if (const ResultCode result = openDocument(); result != kSuccess) return result;
     Node section;
     std::vector<Node> nodes;
     if (m_xmlDoc.selectSingleNode("/*/credentials", Node(), section) != kSuccess ||
@@ -139,10 +139,10 @@ bool Config::mustRemove(Node node, const std::unordered_map<std::int32_t, Creden
     return present.contains(id) || accessFromText(access) != CRED_ACCESS_PER_USER || creator == m_userName;
 }
 
-int Config::writeCredential(const Credential& credential, Node section) {
+ResultCode Config::writeCredential(const Credential& credential, Node section) {
     Node node;
     if (m_xmlDoc.setChild("credential", L"", section, true, &node) != kSuccess) return kFailure;
-    int result = kSuccess;
+    ResultCode result = kSuccess;
     const auto write = [&](const char* tag, const std::wstring& text) NO_THREAD_SAFETY_ANALYSIS {
         if (m_xmlDoc.setChild(tag, text, node, true) != kSuccess) result = kFailure;
     };

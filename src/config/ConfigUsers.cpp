@@ -8,14 +8,12 @@
 
 namespace vexa {
 
-int Config::readUsers(bool* configChanged) {
+ResultCode Config::readUsers(bool& isChanged) {
     Log(2, "Reading all user info...");
-    if (configChanged != nullptr) *configChanged = false;
     if (m_userName.empty()) return kFailure;
     std::vector<Node> users;
     if (m_xmlDoc.selectNodes("/*/users/*", Node(), users) != kSuccess) return kFailure;
     Log(2, "Retrieved total %d user info", static_cast<int>(users.size()));
-    bool isChanged = false;
     if (const Node user = findCurrentUser(users)) {
         std::vector<Node> references;
         if (m_xmlDoc.selectNodes("credentials/*", user, references) != kSuccess) return kFailure;
@@ -24,7 +22,6 @@ int Config::readUsers(bool* configChanged) {
     }
     m_credentials.placeUnplacedCredentials();
     m_credentials.dumpCredentials();
-    if (configChanged != nullptr) *configChanged = isChanged;
     return kSuccess;
 }
 
@@ -66,10 +63,11 @@ bool Config::applyReferences(const std::vector<Node>& references) {
            });
 }
 
-int Config::saveUsers() {
+ResultCode Config::saveUsers() {
     if (m_userName.empty()) return kFailure;
     const ScopeGuard release([this]() NO_THREAD_SAFETY_ANALYSIS { m_xmlDoc.release(); });
-    if (m_xmlDoc.create() != kSuccess || m_xmlDoc.load(m_configPath) != kSuccess) return kFailure;
+    m_xmlDoc.create();
+    if (m_xmlDoc.load(m_configPath) != kSuccess) return kFailure;
     Node section;
     std::vector<Node> users;
     if (m_xmlDoc.selectSingleNode("/*/users", Node(), section) != kSuccess || !section ||
@@ -88,7 +86,7 @@ int Config::saveUsers() {
     return kSuccess;
 }
 
-int Config::writeReferences(Node list) {
+ResultCode Config::writeReferences(Node list) {
     for (const Credential* credential : m_credentials.copyCredentialPointers()) {
         Node reference;
         if (m_xmlDoc.setChild("credential", L"", list, true, &reference) != kSuccess) return kFailure;

@@ -6,7 +6,6 @@
 
 #include "base/DiagnosticLog.h"
 #include "base/NetworkListLock.h"
-#include "config/ResultCodes.h"
 #include "connection/EngineState.h"
 #include "connection/Supplicant.h"
 #include "platform/Clock.h"
@@ -127,7 +126,7 @@ void InterworkingMgr::stopIfInited() {
     stop();
 }
 
-int InterworkingMgr::init() {
+ResultCode InterworkingMgr::init() {
     Log(2, "\tInitializing InterworkingMgr.");
     m_bTerminate = false;
     m_hTerminationEvent.reset();
@@ -195,15 +194,16 @@ bool InterworkingMgr::passesGates() {
 }
 
 void InterworkingMgr::connect() {
-    int outcome = 0;
-    if (connectNetwork(outcome) != kSuccess)
-        Log(6, "connectNetwork returns error.");
-    else if (outcome == kConnectStarted)
-        Log(3, "connectNetwork returns with op succeeded.");
-    else if (outcome == kConnectNothingLeft)
-        Log(3, "connectNetwork returns with op cancelled.");
-    else
-        Log(3, "connectNetwork returns with failure.");
+    switch (connectNetwork()) {
+        case kConnectFailed:
+            return Log(6, "connectNetwork returns error.");
+        case kConnectStarted:
+            return Log(3, "connectNetwork returns with op succeeded.");
+        case kConnectNothingLeft:
+            return Log(3, "connectNetwork returns with op cancelled.");
+        case kNetworkGone:
+            return Log(3, "connectNetwork returns with failure.");
+    }
 }
 
 }  // namespace vexa

@@ -5,7 +5,7 @@
 #include <vector>
 
 #include "base/NetworkListLock.h"
-
+#include "config/ResultCodes.h"
 #include "platform/Event.h"
 #include "platform/Thread.h"
 
@@ -34,8 +34,8 @@ public:
     InterworkingMgr(const InterworkingMgr&) = delete;
     InterworkingMgr& operator=(const InterworkingMgr&) = delete;
 
-    /// Starts the thread. 0; 1 if it can't be created.
-    int init();
+    /// Starts the thread. kFailure if it can't be created.
+    ResultCode init();
 
     /// Ends the thread, within 10 s. REQUIRES: the network list lock not held.
     void stop();
@@ -54,10 +54,8 @@ private:
     bool passesGates();
     void connect();
 
-    /// One attempt: chooses, finds or builds the profile, and asks for the connection. `result` is
-    /// kConnectStarted, kConnectNothingLeft, or 0 with the failure that is given.
-    int connectNetwork(int& result) EXCLUDES(g_hs20Lock);
-    int leaveToRunningAttempt(int& result) REQUIRES(g_hs20Lock);
+    /// One attempt: chooses, finds or builds the profile, and asks for the connection.
+    ConnectOutcome connectNetwork() EXCLUDES(g_hs20Lock);
     NetworkChoice findBestMatchBssAndCredential() REQUIRES(g_hs20Lock);
     Credential* selectCredential(const Hs20Network& network, const std::vector<Credential*>& found)
         REQUIRES(g_hs20Lock);

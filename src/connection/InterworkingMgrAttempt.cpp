@@ -1,7 +1,6 @@
 #include <string>
 
 #include "base/DiagnosticLog.h"
-#include "config/ResultCodes.h"
 #include "connection/EngineState.h"
 #include "connection/InterworkingMgr.h"
 #include "connection/Supplicant.h"
@@ -124,42 +123,36 @@ NetworkProfile* InterworkingMgr::profileFor(const NetworkChoice& choice, const s
     return profile;
 }
 
-// The gates are passed without the lock: the next step of an attempt may have begun since. Its profile and
-// its count are not to be touched.
-int InterworkingMgr::leaveToRunningAttempt(int& result) {
-    Log(3, "###Connection already started, skip connecting again.###");
-    result = kConnectStarted;
-    return kSuccess;
-}
-
-int InterworkingMgr::connectNetwork(int& result) {
+ConnectOutcome InterworkingMgr::connectNetwork() {
     const LockGuard lock(g_hs20Lock);
-    result = 0;
     Log(3, "\n>>>> Enter connectNetwork");
-    if (m_engine.m_bConnectionStarted) return leaveToRunningAttempt(result);
+    // The gates are passed without the lock: the next step of an attempt may have begun since. Its profile
+    // and its count are not to be touched.
+    if (m_engine.m_bConnectionStarted) {
+        Log(3, "###Connection already started, skip connecting again.###");
+        return kConnectStarted;
+    }
     Log(3, "\n\tIterate over all BSS list to find if any matches with any stored credential.");
     Log(3, "Enter findBestMatchBssAndCredential...");
     const NetworkChoice choice = findBestMatchBssAndCredential();
     if (choice.network == nullptr) {
         Log(3, "No matching network was found based on configured credentials.");
-        result = kConnectNothingLeft;
-        return kSuccess;
+        return kConnectNothingLeft;
     }
     Log(3, "!!!Found a credential with id=%d for network with ssid=%s", choice.credential->m_id,
         choice.network->ssidText().c_str());
     const std::wstring name = wideFromNarrow(choice.network->ssid());
-    NetworkProfile* const profile = profileFor(choice, name);
-    if (profile == nullptr) return kFailure;
+    const NetworkProfile* const profile = profileFor(choice, name);
+    if (profile == nullptr) return kConnectFailed;
     if (m_engine.m_config.isAutoConnect()) {
         LogWide(3, L"Going to connect to network with ssid=%s", name.c_str());
         m_engine.m_retryHelper.increaseNumRetries(choice.credential->m_id, choice.network->ssid());
-        if (m_supplicant.connectToNetwork(choice.network, profile) != kSuccess) {
+        if (m_supplicant.connectToNetwork(*choice.network, *profile) != kSuccess) {
             Log(6, "ERROR: Connect to network failed.");
-            return kFailure;
+            return kConnectFailed;
         }
     }
-    result = kConnectStarted;
-    return kSuccess;
+    return kConnectStarted;
 }
 
 }  // namespace vexa

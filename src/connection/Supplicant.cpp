@@ -3,7 +3,6 @@
 #include <cassert>
 
 #include "base/DiagnosticLog.h"
-#include "config/ResultCodes.h"
 #include "connection/SupplicantMgr.h"
 #include "platform/Guid.h"
 
@@ -37,7 +36,7 @@ Supplicant::~Supplicant() {
     m_interworkingMgr.stopIfInited();
 }
 
-int Supplicant::init() {
+void Supplicant::init() {
     Log(2, "Initializing supplicant...");
     if (const char* const error = initSteps()) {
         Log(6, "%s", error);
@@ -45,11 +44,10 @@ int Supplicant::init() {
         deinit();
         m_interworkingMgr.stop();
         m_wlan.close();
-        return kSuccess;
+        return;
     }
     m_bInitialized = true;
     Log(3, "Initialize supplicant succeeded.");
-    return kSuccess;
 }
 
 // The line of the step that failed; null if none did.
@@ -107,14 +105,13 @@ void Supplicant::reset() {
     m_engine.m_retryHelper.resetAllNumRetries();
 }
 
-int Supplicant::setState(SupplicantState state) {
+void Supplicant::setState(SupplicantState state) {
     const LockGuard lock(g_hs20Lock);
-    if (m_state == state) return kSuccess;
-    if (const SupplicantState live = queryState(); isClaim(state) && live != state) return kSuccess;
+    if (m_state == state) return;
+    if (const SupplicantState live = queryState(); isClaim(state) && live != state) return;
     Log(3, "Supplicant state changed from %s to %s", nameOf(m_state), nameOf(state));
     m_state = state;
     m_engine.m_hSupplicantStateChangedEvent.set();
-    return kSuccess;
 }
 
 void Supplicant::setRadioState(bool on) {

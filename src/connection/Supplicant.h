@@ -11,6 +11,7 @@
 #include "base/NetworkListLock.h"
 #include "base/TimeValue.h"
 #include "config/Credential.h"
+#include "config/ResultCodes.h"
 #include "connection/ClientEvents.h"
 #include "connection/ConnectionHistory.h"
 #include "connection/EngineState.h"
@@ -33,8 +34,8 @@ public:
     Supplicant(const Supplicant&) = delete;
     Supplicant& operator=(const Supplicant&) = delete;
 
-    /// Always 0; the outcome is in isInitialized(). A failure releases what was made before it.
-    int init() EXCLUDES(g_hs20Lock);
+    /// The outcome is in isInitialized(). A failure releases what was made before it.
+    void init() EXCLUDES(g_hs20Lock);
     /// REQUIRES: the network list lock not held.
     void deinit() EXCLUDES(g_hs20Lock);
     /// Back to a clean start when the adapter comes back, without losing the object.
@@ -62,24 +63,25 @@ public:
 
     bool hasUnfetchedAnqpInfo() const;
     /// Starts the ANQP queries of all networks. kSuccess or kFailure.
-    int queryHs20NetworkAnqpInfo();
-    /// Asks for a connection; also kSuccess where none is needed. kInvalidArgument for null.
-    int connectToNetwork(const Hs20Network* network, const NetworkProfile* profile) REQUIRES(g_hs20Lock);
+    ResultCode queryHs20NetworkAnqpInfo();
+    /// Asks for a connection; also kSuccess where none is needed.
+    ResultCode connectToNetwork(const Hs20Network& network, const NetworkProfile& profile)
+        REQUIRES(g_hs20Lock);
 
     // Messages of the hotspot module.
 
-    int onNetworkListChanged(Bytes payload);
-    int onAnqpInfoChanged(Bytes payload);
+    ResultCode onNetworkListChanged(Bytes payload);
+    ResultCode onAnqpInfoChanged(Bytes payload);
     void onAnqpQueryCompleted();
-    int onUserDisconnected(Bytes payload);
-    int onSessionChanged(Bytes payload);
+    ResultCode onUserDisconnected(Bytes payload);
+    ResultCode onSessionChanged(Bytes payload);
 
     // Notifications of the WLAN service. Null data changes nothing but what every call does.
 
-    int onConnectionStart(const WLAN_CONNECTION_NOTIFICATION_DATA* data);
-    int onConnectionComplete(const WLAN_CONNECTION_NOTIFICATION_DATA* data);
-    int onDisconnected(const WLAN_CONNECTION_NOTIFICATION_DATA* data);
-    int onRadioStateChanged(const WLAN_PHY_RADIO_STATE* data);
+    ResultCode onConnectionStart(const WLAN_CONNECTION_NOTIFICATION_DATA* data);
+    ResultCode onConnectionComplete(const WLAN_CONNECTION_NOTIFICATION_DATA* data);
+    ResultCode onDisconnected(const WLAN_CONNECTION_NOTIFICATION_DATA* data);
+    ResultCode onRadioStateChanged(const WLAN_PHY_RADIO_STATE* data);
     void onRoamingStart();
     void onRoamingEnd();
 
@@ -87,7 +89,7 @@ public:
 
     /// At once, or when the running attempt has ended. kSuccess if the connection was started or postponed;
     /// kFailure; kInvalidArgument without an SSID.
-    int connectBss(std::string_view ssid);
+    ResultCode connectBss(std::string_view ssid);
     /// Leaves the network if it is the one that is connected or connecting; auto-connect then stays away from
     /// it.
     void disconnectBss(std::string_view ssid);
@@ -101,8 +103,8 @@ public:
     /// Change the stored credentials, save, and wake the connecting thread where it may find more to do. A
     /// refused change changes nothing.
     void addCredential(const CredentialInput& input);
-    int deleteCredential(std::int32_t id);
-    int updateCredential(const CredentialInput& input);
+    ResultCode deleteCredential(std::int32_t id);
+    ResultCode updateCredential(const CredentialInput& input);
     /// `position` counts from 1.
     void setCredentialPosition(std::int32_t id, std::int32_t position);
 
@@ -113,47 +115,49 @@ private:
     const char* initSteps();
     void recordConnectionAtStart();
 
-    /// The cached state. Claims about the WLAN service are only taken over once it agrees. Always 0.
-    int setState(SupplicantState state);
+    /// The cached state. Claims about the WLAN service are only taken over once it agrees.
+    void setState(SupplicantState state);
     void setRadioState(bool on);
     void tellClient(const std::function<void(const ClientEvents&)>& tell) REQUIRES(g_hs20Lock);
     void sendNetworkList() REQUIRES(g_hs20Lock);
 
     /// Takes over a report of the networks in range, fetches what ANQP has found out about each, and tells
     /// the client. kInvalidArgument without records.
-    int updateHs20NetworkList(const std::vector<Hs20BssRecord>& records);
+    ResultCode updateHs20NetworkList(const std::vector<Hs20BssRecord>& records);
 
     /// Requests to the hotspot module. kSuccess or kFailure.
-    int sendIhvCmd();
-    int getHs20BssListFromIHV();
-    int fetchBssAnqpInfo(Hs20Network* network) REQUIRES(g_hs20Lock);
+    ResultCode sendIhvCmd();
+    ResultCode getHs20BssListFromIHV();
+    ResultCode fetchBssAnqpInfo(Hs20Network& network) REQUIRES(g_hs20Lock);
 
     bool isOwnConnection(const WLAN_CONNECTION_NOTIFICATION_DATA& data) const REQUIRES(g_hs20Lock);
-    int onOwnResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::uint32_t& eapMethod)
+    ResultCode onOwnResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::uint32_t& eapMethod)
         REQUIRES(g_hs20Lock);
-    int onForeignResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data) REQUIRES(g_hs20Lock);
-    int carryOutPendingRequest() REQUIRES(g_hs20Lock);
-    int onSuccess(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const NetworkProfile& profile,
-                  std::uint32_t& eapMethod) REQUIRES(g_hs20Lock);
-    int onFailure(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const NetworkProfile& profile)
+    ResultCode onForeignResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data) REQUIRES(g_hs20Lock);
+    ResultCode carryOutPendingRequest() REQUIRES(g_hs20Lock);
+    ResultCode onSuccess(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const NetworkProfile& profile,
+                         std::uint32_t& eapMethod) REQUIRES(g_hs20Lock);
+    ResultCode onFailure(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const NetworkProfile& profile)
         REQUIRES(g_hs20Lock);
-    int tryMachineMode(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const NetworkProfile& failed)
+    ResultCode tryMachineMode(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const NetworkProfile& failed)
         REQUIRES(g_hs20Lock);
-    int tryNextCredential(const WLAN_CONNECTION_NOTIFICATION_DATA& data) REQUIRES(g_hs20Lock);
-    int endAttempt(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::uint32_t outcome) REQUIRES(g_hs20Lock);
-    int report(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::uint32_t outcome) REQUIRES(g_hs20Lock);
+    ResultCode tryNextCredential(const WLAN_CONNECTION_NOTIFICATION_DATA& data) REQUIRES(g_hs20Lock);
+    ResultCode endAttempt(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::uint32_t outcome)
+        REQUIRES(g_hs20Lock);
+    ResultCode report(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::uint32_t outcome)
+        REQUIRES(g_hs20Lock);
     void clearNumRetriesOnConnSuccess(const std::wstring& profileName, std::string_view ssid)
         REQUIRES(g_hs20Lock);
 
-    int connectBssNow(const std::string& ssid) REQUIRES(g_hs20Lock);
-    int connectPlainly(const std::string& ssid) REQUIRES(g_hs20Lock);
-    int tryConnectHs20BssUsingNextCredential(std::string_view ssid, int& connResult) REQUIRES(g_hs20Lock);
+    ResultCode connectBssNow(const std::string& ssid) REQUIRES(g_hs20Lock);
+    ResultCode connectPlainly(const std::string& ssid) REQUIRES(g_hs20Lock);
+    ConnectOutcome tryConnectHs20BssUsingNextCredential(std::string_view ssid) REQUIRES(g_hs20Lock);
     const Credential* nextUntried(const Hs20Network& network) REQUIRES(g_hs20Lock);
-    int connectFreshly(const Hs20Network& network, const Credential& credential) REQUIRES(g_hs20Lock);
+    ResultCode connectFreshly(const Hs20Network& network, const Credential& credential) REQUIRES(g_hs20Lock);
     DWORD requestConnection(std::string_view ssid, const NetworkProfile* profile) REQUIRES(g_hs20Lock);
 
     /// kFailure: what is connected may not be left, or the request failed.
-    int disconnectedBSS(Leave what) REQUIRES(g_hs20Lock);
+    ResultCode disconnectedBSS(Leave what) REQUIRES(g_hs20Lock);
     const char* reasonNotToBlock() const REQUIRES(g_hs20Lock);
     /// Null if there is none.
     Credential* findCredential(std::int32_t id) REQUIRES(g_hs20Lock);

@@ -3,7 +3,6 @@
 
 #include "base/DiagnosticLog.h"
 #include "base/WlanText.h"
-#include "config/ResultCodes.h"
 #include "connection/Supplicant.h"
 #include "connection/SupplicantMgr.h"
 #include "platform/Registry.h"
@@ -53,7 +52,7 @@ bool Supplicant::isOwnConnection(const WLAN_CONNECTION_NOTIFICATION_DATA& data) 
     return !m_connectingSsid.empty() && field.starts_with(m_connectingSsid);
 }
 
-int Supplicant::onConnectionStart(const WLAN_CONNECTION_NOTIFICATION_DATA* data) {
+ResultCode Supplicant::onConnectionStart(const WLAN_CONNECTION_NOTIFICATION_DATA* data) {
     if (data == nullptr) return kInvalidArgument;
     const LockGuard lock(g_hs20Lock);
     const std::wstring name = profileNameOf(*data);
@@ -73,7 +72,7 @@ int Supplicant::onConnectionStart(const WLAN_CONNECTION_NOTIFICATION_DATA* data)
     return kSuccess;
 }
 
-int Supplicant::onConnectionComplete(const WLAN_CONNECTION_NOTIFICATION_DATA* data) {
+ResultCode Supplicant::onConnectionComplete(const WLAN_CONNECTION_NOTIFICATION_DATA* data) {
     const LockGuard lock(g_hs20Lock);
     std::uint32_t eapMethod = 0;
     const ScopeGuard atEnd([&] {
@@ -91,7 +90,7 @@ int Supplicant::onConnectionComplete(const WLAN_CONNECTION_NOTIFICATION_DATA* da
     return isOwnConnection(*data) ? onOwnResult(*data, eapMethod) : onForeignResult(*data);
 }
 
-int Supplicant::onOwnResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::uint32_t& eapMethod) {
+ResultCode Supplicant::onOwnResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::uint32_t& eapMethod) {
     const std::wstring name = profileNameOf(data);
     LogWide(3, L"Connection result initiated by HS20, clearing the cache, profile name=%s.", name.c_str());
     m_connectingSsid.clear();
@@ -107,7 +106,7 @@ int Supplicant::onOwnResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::
 }
 
 // The finished attempt leaves no trace; what the client hears comes from the new one.
-int Supplicant::carryOutPendingRequest() {
+ResultCode Supplicant::carryOutPendingRequest() {
     Log(3, "###User manual connecting request pending, we are going to connect now.###");
     if (m_pendingManualSsid.empty()) return kFailure;
     const bool isStarted = connectBssNow(m_pendingManualSsid) == kSuccess;
@@ -117,8 +116,8 @@ int Supplicant::carryOutPendingRequest() {
     return kSuccess;
 }
 
-int Supplicant::onSuccess(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const NetworkProfile& profile,
-                          std::uint32_t& eapMethod) {
+ResultCode Supplicant::onSuccess(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const NetworkProfile& profile,
+                                 std::uint32_t& eapMethod) {
     LogWide(3, L"Connection succeeded! profile name=%s", profile.m_name.c_str());
     const std::string_view ssid = bytesOf(data.dot11Ssid);
     m_bHs20Connected = true;
@@ -140,7 +139,8 @@ void Supplicant::clearNumRetriesOnConnSuccess(const std::wstring& profileName, s
         m_engine.m_retryHelper.setNumRetries(profile->m_credId, ssid, 0);
 }
 
-int Supplicant::onFailure(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const NetworkProfile& profile) {
+ResultCode Supplicant::onFailure(const WLAN_CONNECTION_NOTIFICATION_DATA& data,
+                                 const NetworkProfile& profile) {
     LogWide(3, L"Connection failed! profile name=%s", profile.m_name.c_str());
     setState(SupplicantState::Disconnected);
     if (m_bUserDisconnecting) return endAttempt(data, ConnectionResult::kFailed);
@@ -149,33 +149,9 @@ int Supplicant::onFailure(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const N
     return report(data, ConnectionResult::kFailed);
 }
 
-int Supplicant::tryNextCredential(const WLAN_CONNECTION_NOTIFICATION_DATA& data) {
-    Log(3, "Manual connection failed, we will try to use next credential.");
-    int connResult = 0;
-    const int result = tryConnectHs20BssUsingNextCredential(bytesOf(data.dot11Ssid), connResult);
-    Log(3, "connResult=%d after invoking tryConnectHs20BssUsingNextCredential.", connResult);
-    if (result == kFailure) {
-        Log(6, "ERROR: Try to connect to HS20 network using next credential failed.");
-        return kFailure;
-    }
-    if (result == kSuccess && connResult == kConnectStarted) {
-        LogWide(3, L"Successfully initiated connection to HS20 network=%s using next credential.",
-                wideFromNarrow(bytesOf(data.dot11Ssid)).c_str());
-        return kSuccess;
-    }
-    if (result == kNetworkGone)
-        Log(3, "WARNING: The network we were connecting is no longer available, a naughty network!");
-    else if (result != kSuccess)
-        Log(6, "Unexpected error code.");
-    else if (connResult == kConnectNothingLeft)
-        Log(3, "We have tried all credentials, connection failed.");
-    else
-        Log(6, "ERROR: Invalid ret code.");
-    return endAttempt(data, ConnectionResult::kFailed);
-}
-
 // Once per attempt: the new profile is one for the machine, and its failure goes on with the next credential.
-int Supplicant::tryMachineMode(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const NetworkProfile& failed) {
+ResultCode Supplicant::tryMachineMode(const WLAN_CONNECTION_NOTIFICATION_DATA& data,
+                                      const NetworkProfile& failed) {
     Log(3,
         "Connection using EAP-TLS with authMode=machineOrUser failed,trying to use EAP-TLS with authMode=machine.");
     const Hs20Network* const network = m_engine.m_networkList.findBySsid(bytesOf(data.dot11Ssid));
@@ -199,14 +175,14 @@ int Supplicant::tryMachineMode(const WLAN_CONNECTION_NOTIFICATION_DATA& data, co
         Log(6, "ERROR: Cannot add network profile.");
         return kFailure;
     }
-    if (connectToNetwork(network, profile) != kSuccess) {
+    if (connectToNetwork(*network, *profile) != kSuccess) {
         Log(6, "ERROR: Connect to network failed.");
         return kFailure;
     }
     return kSuccess;
 }
 
-int Supplicant::endAttempt(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::uint32_t outcome) {
+ResultCode Supplicant::endAttempt(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::uint32_t outcome) {
     if (m_bManualConnectStarted) {
         m_bManualConnectStarted = false;
         m_triedCredentialIds.clear();
@@ -214,7 +190,7 @@ int Supplicant::endAttempt(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::u
     return report(data, outcome);
 }
 
-int Supplicant::report(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::uint32_t outcome) {
+ResultCode Supplicant::report(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::uint32_t outcome) {
     ConnectionResult result;
     result.m_result = outcome;
     result.m_profileName = profileNameOf(data);
@@ -228,7 +204,7 @@ int Supplicant::report(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::uint3
 }
 
 // The client hears of a success, whatever the reason: the connection was none of this program's.
-int Supplicant::onForeignResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data) {
+ResultCode Supplicant::onForeignResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data) {
     const bool isSuccess = data.wlanReasonCode == 0;
     LogWide(3, L"Connection result not initiated by HS20, profile name=%s, result=%s",
             profileNameOf(data).c_str(), isSuccess ? L"Success" : L"Failure");
@@ -245,7 +221,7 @@ int Supplicant::onForeignResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data) {
     return kSuccess;
 }
 
-int Supplicant::onDisconnected(const WLAN_CONNECTION_NOTIFICATION_DATA* data) {
+ResultCode Supplicant::onDisconnected(const WLAN_CONNECTION_NOTIFICATION_DATA* data) {
     const ScopeGuard atEnd([this] {
         m_bUserDisconnecting = false;
         writeEapMethodToRegistry(0);
@@ -278,7 +254,7 @@ void Supplicant::onRoamingEnd() {
 }
 
 // A radio change wipes the slate, in both directions.
-int Supplicant::onRadioStateChanged(const WLAN_PHY_RADIO_STATE* data) {
+ResultCode Supplicant::onRadioStateChanged(const WLAN_PHY_RADIO_STATE* data) {
     if (data == nullptr) return kInvalidArgument;
     const LockGuard lock(g_hs20Lock);
     const bool isOn = data->dot11SoftwareRadioState == dot11_radio_state_on;

@@ -1,5 +1,4 @@
 #include "base/DiagnosticLog.h"
-#include "config/ResultCodes.h"
 #include "connection/Supplicant.h"
 
 namespace vexa {
@@ -19,7 +18,8 @@ void Supplicant::addCredential(const CredentialInput& input) {
     Log(3, "Adding a new credential...");
     Config& config = m_engine.m_config;
     std::int32_t id = -1;
-    const int result = config.credentials().addCredential(input, config.nextCredId(), config.userName(), id);
+    const ResultCode result =
+        config.credentials().addCredential(input, config.nextCredId(), config.userName(), id);
     if (result != kSuccess || id <= 0) return;
     config.advanceNextCredId();
     config.saveConfig();
@@ -27,7 +27,7 @@ void Supplicant::addCredential(const CredentialInput& input) {
     m_engine.m_hCredentialChangedEvent.set();
 }
 
-int Supplicant::deleteCredential(std::int32_t id) {
+ResultCode Supplicant::deleteCredential(std::int32_t id) {
     const LockGuard lock(g_hs20Lock);
     Log(3, "Deleting the credential with id=%d", id);
     Config& config = m_engine.m_config;
@@ -39,7 +39,7 @@ int Supplicant::deleteCredential(std::int32_t id) {
     return kSuccess;
 }
 
-int Supplicant::updateCredential(const CredentialInput& input) {
+ResultCode Supplicant::updateCredential(const CredentialInput& input) {
     const LockGuard lock(g_hs20Lock);
     Log(3, "Updating the credential with id=%d", input.id);
     const Credential* const credential = findCredential(input.id);

@@ -1,7 +1,6 @@
 #include <algorithm>
 
 #include "base/DiagnosticLog.h"
-#include "config/ResultCodes.h"
 #include "connection/Supplicant.h"
 
 namespace vexa {
@@ -14,13 +13,13 @@ constexpr std::size_t kLeastAnqpPayload = 44;
 
 }  // namespace
 
-int Supplicant::updateHs20NetworkList(const std::vector<Hs20BssRecord>& records) {
+ResultCode Supplicant::updateHs20NetworkList(const std::vector<Hs20BssRecord>& records) {
     if (records.empty()) return kInvalidArgument;
     const LockGuard lock(g_hs20Lock);
     const std::vector<MacAddress> oldMacs = m_engine.m_networkList.macAddresses();
     const Hs20NetworkList::Networks gone = m_engine.m_networkList.replace(records);
     for (Hs20Network* network : m_engine.m_networkList.copyPointers())
-        if (fetchBssAnqpInfo(network) != kSuccess) Log(3, "Fetch ANQP info failed.");
+        if (fetchBssAnqpInfo(*network) != kSuccess) Log(3, "Fetch ANQP info failed.");
     m_engine.m_networkList.processDuplicatedHs20Networks(oldMacs);
     Log(3, "\tSet events m_hHs20NetworkChangedEvent and m_hAnqpInfoReadyEvent.");
     m_engine.m_hHs20NetworkChangedEvent.set();
@@ -48,14 +47,14 @@ bool Supplicant::hasUnfetchedAnqpInfo() const {
                        [](const Hs20Network* network) { return !network->hasRealmData(); });
 }
 
-int Supplicant::onNetworkListChanged(Bytes payload) {
+ResultCode Supplicant::onNetworkListChanged(Bytes payload) {
     Log(3, "IHV reports HS20 network list changed.");
     if (updateHs20NetworkList(parseBssRecords(payload)) == kSuccess) return kSuccess;
     Log(6, "ERROR: Update HS20 network list failed.");
     return kFailure;
 }
 
-int Supplicant::onAnqpInfoChanged(Bytes payload) {
+ResultCode Supplicant::onAnqpInfoChanged(Bytes payload) {
     const LockGuard lock(g_hs20Lock);
     Log(3, "IHV reports HS20 BSS ANQP info changed.");
     if (payload.size() < kLeastAnqpPayload) return kFailure;
@@ -63,7 +62,7 @@ int Supplicant::onAnqpInfoChanged(Bytes payload) {
     if (record.isHs20 != 1) return kSuccess;
     Hs20Network* const network = m_engine.m_networkList.findByMac(record.macAddress);
     if (network == nullptr) return kFailure;
-    return fetchBssAnqpInfo(network) == kSuccess ? kSuccess : kFailure;
+    return fetchBssAnqpInfo(*network);
 }
 
 // After a failed fetch the query counts as running: the connecting thread must not connect on what it knew

@@ -1,7 +1,7 @@
 #include <algorithm>
+#include <optional>
 
 #include "base/DiagnosticLog.h"
-#include "config/ResultCodes.h"
 #include "connection/Supplicant.h"
 #include "hotspot/CredentialMatching.h"
 #include "text/TextConversion.h"
@@ -12,9 +12,45 @@ namespace {
 
 using platform::LockGuard;
 
+/// The lines of the log by which a walk through the credentials tells its first step from the later ones.
+struct StepLines {
+    const char* failed;
+    const char* nothingLeft;
+};
+
+constexpr StepLines kFirstStep = {"Try to connect to HS20 network failed.",
+                                  "No credential found for this HS20 network, turn to use normal routine"};
+constexpr StepLines kLaterStep = {
+    "ERROR: Try to connect to HS20 network using next credential failed.",
+    "We have tried all credentials, connection failed.",
+};
+
+// Nothing: no connection follows from the credentials.
+std::optional<ResultCode> resultOf(ConnectOutcome outcome, const StepLines& lines) {
+    switch (outcome) {
+        case kConnectStarted:
+            return kSuccess;
+        case kConnectFailed:
+            Log(6, "%s", lines.failed);
+            return kFailure;
+        case kNetworkGone:
+            Log(3, "WARNING: The network we were connecting is no longer available, a naughty network!");
+            return std::nullopt;
+        case kConnectNothingLeft:
+            Log(3, "%s", lines.nothingLeft);
+            return std::nullopt;
+    }
+    return std::nullopt;
+}
+
+// In the log a network that has gone counts as a failure.
+int numberInLog(ConnectOutcome outcome) {
+    return static_cast<int>(outcome == kNetworkGone ? kConnectFailed : outcome);
+}
+
 }  // namespace
 
-int Supplicant::connectBss(std::string_view ssid) {
+ResultCode Supplicant::connectBss(std::string_view ssid) {
     const LockGuard lock(g_hs20Lock);
     Log(3, "###Manually connect to a BSS started.###");
     if (ssid.empty()) return kInvalidArgument;
@@ -26,7 +62,7 @@ int Supplicant::connectBss(std::string_view ssid) {
     return kSuccess;
 }
 
-int Supplicant::connectBssNow(const std::string& ssid) {
+ResultCode Supplicant::connectBssNow(const std::string& ssid) {
     Log(3, "###We are actually going to connect to HS20 network now.###");
     Hs20Network* const network = m_engine.m_networkList.findBySsid(ssid);
     if (network == nullptr) return kFailure;
@@ -40,50 +76,43 @@ int Supplicant::connectBssNow(const std::string& ssid) {
         return kSuccess;
     }
     m_triedCredentialIds.clear();
-    int connResult = 0;
-    const int result = tryConnectHs20BssUsingNextCredential(ssid, connResult);
-    if (result == kFailure) {
-        Log(6, "Try to connect to HS20 network failed.");
-        return kFailure;
-    }
-    if (result == kSuccess && connResult == kConnectStarted) return kSuccess;
-    if (result == kNetworkGone)
-        Log(3, "WARNING: The network we were connecting is no longer available, a naughty network!");
-    else if (result != kSuccess)
-        Log(6, "Unexpected error code.");
-    else if (connResult == kConnectNothingLeft)
-        Log(3, "No credential found for this HS20 network, turn to use normal routine");
-    else
-        Log(6, "ERROR: invalid ret code.");
-    return connectPlainly(ssid);
+    const auto result = resultOf(tryConnectHs20BssUsingNextCredential(ssid), kFirstStep);
+    return result ? *result : connectPlainly(ssid);
 }
 
 // The operating system chooses the profile; the connection counts as own all the same.
-int Supplicant::connectPlainly(const std::string& ssid) {
+ResultCode Supplicant::connectPlainly(const std::string& ssid) {
     return requestConnection(ssid, nullptr) == ERROR_SUCCESS ? kSuccess : kFailure;
 }
 
-int Supplicant::tryConnectHs20BssUsingNextCredential(std::string_view ssid, int& connResult) {
+ConnectOutcome Supplicant::tryConnectHs20BssUsingNextCredential(std::string_view ssid) {
     Log(3, "Try to connect to HS20 network using next credential.");
-    connResult = 0;
-    if (ssid.empty()) return kFailure;
+    if (ssid.empty()) return kConnectFailed;
     const Hs20Network* const network = m_engine.m_networkList.findBySsid(ssid);
     if (network == nullptr) return kNetworkGone;
     if (!network->m_bHs20) {
         Log(6, "ERROR: we are expecting a HS20 network.");
-        return kFailure;
+        return kConnectFailed;
     }
     const Credential* const credential = nextUntried(*network);
-    if (credential == nullptr) {
-        connResult = kConnectNothingLeft;
-        return kSuccess;
-    }
+    if (credential == nullptr) return kConnectNothingLeft;
     Log(3, "Selecting credential with id=%d", credential->m_id);
     m_triedCredentialIds.push_back(credential->m_id);
-    if (connectFreshly(*network, *credential) != kSuccess) return kFailure;
+    if (connectFreshly(*network, *credential) != kSuccess) return kConnectFailed;
     m_bManualConnectStarted = true;
-    connResult = kConnectStarted;
-    return kSuccess;
+    return kConnectStarted;
+}
+
+ResultCode Supplicant::tryNextCredential(const WLAN_CONNECTION_NOTIFICATION_DATA& data) {
+    Log(3, "Manual connection failed, we will try to use next credential.");
+    const std::string_view ssid = bytesOf(data.dot11Ssid);
+    const ConnectOutcome outcome = tryConnectHs20BssUsingNextCredential(ssid);
+    Log(3, "connResult=%d after invoking tryConnectHs20BssUsingNextCredential.", numberInLog(outcome));
+    if (outcome == kConnectStarted)
+        LogWide(3, L"Successfully initiated connection to HS20 network=%s using next credential.",
+                wideFromNarrow(ssid).c_str());
+    const auto result = resultOf(outcome, kLaterStep);
+    return result ? *result : endAttempt(data, ConnectionResult::kFailed);
 }
 
 const Credential* Supplicant::nextUntried(const Hs20Network& network) {
@@ -97,7 +126,7 @@ const Credential* Supplicant::nextUntried(const Hs20Network& network) {
     return nullptr;
 }
 
-int Supplicant::connectFreshly(const Hs20Network& network, const Credential& credential) {
+ResultCode Supplicant::connectFreshly(const Hs20Network& network, const Credential& credential) {
     NetworkProfile* profile = nullptr;
     if (m_engine.m_profileMgr.findProfileByName(wideFromNarrow(network.ssid()), profile) == kSuccess) {
         if (profile->m_id < 1) return kFailure;
@@ -106,7 +135,7 @@ int Supplicant::connectFreshly(const Hs20Network& network, const Credential& cre
     if (m_engine.m_profileMgr.addProfileFromCredential(credential, network, false,
                                                        m_engine.m_config.homeRealm(), profile) != kSuccess)
         return kFailure;
-    return connectToNetwork(&network, profile);
+    return connectToNetwork(network, *profile);
 }
 
 }  // namespace vexa

@@ -1,5 +1,4 @@
 #include "base/DiagnosticLog.h"
-#include "config/ResultCodes.h"
 #include "connection/Supplicant.h"
 
 namespace vexa {
@@ -12,14 +11,14 @@ constexpr std::size_t kRealmLengthSize = 4;
 
 }  // namespace
 
-int Supplicant::sendIhvCmd() {
+ResultCode Supplicant::sendIhvCmd() {
     const DWORD result = m_wlan.tellModule(ihvRequest(IhvRequest::QueryAnqp));
     if (result == ERROR_SUCCESS) return kSuccess;
     Log(3, "WlanIhvControl call failed in sendIhvCmd with result code=%d", static_cast<int>(result));
     return kFailure;
 }
 
-int Supplicant::getHs20BssListFromIHV() {
+ResultCode Supplicant::getHs20BssListFromIHV() {
     const LockGuard lock(g_hs20Lock);
     Log(3, "Get HS20 BSS list from IHV.");
     std::vector<std::byte> reply;
@@ -39,12 +38,11 @@ int Supplicant::getHs20BssListFromIHV() {
     return kFailure;
 }
 
-int Supplicant::fetchBssAnqpInfo(Hs20Network* network) {
-    if (network == nullptr) return kInvalidArgument;
+ResultCode Supplicant::fetchBssAnqpInfo(Hs20Network& network) {
     Log(3, "Fetching BSS with ssid=%s and mac address=%s  ANQP info from HS20 IHV...",
-        network->ssidText().c_str(), toText(network->m_macAddress).c_str());
+        network.ssidText().c_str(), toText(network.m_macAddress).c_str());
     std::vector<std::byte> reply;
-    if (m_wlan.askModule(ihvRequest(IhvRequest::GetAnqpInfo, network->record()), reply) != ERROR_SUCCESS) {
+    if (m_wlan.askModule(ihvRequest(IhvRequest::GetAnqpInfo, network.record()), reply) != ERROR_SUCCESS) {
         Log(3, "WlanIhvControl call failed.");
         return kFailure;
     }
@@ -64,12 +62,12 @@ int Supplicant::fetchBssAnqpInfo(Hs20Network* network) {
         return kSuccess;
     }
     const Bytes realms = Bytes(reply).subspan(kRealmLengthSize, realmLength);
-    network->m_anqpNaiRealm.assign(realms.begin(), realms.end());
-    network->parseRealmList();
+    network.m_anqpNaiRealm.assign(realms.begin(), realms.end());
+    network.parseRealmList();
     return kSuccess;
 }
 
-int Supplicant::queryHs20NetworkAnqpInfo() {
+ResultCode Supplicant::queryHs20NetworkAnqpInfo() {
     Log(3, "SIGMA: Enter Supplicant::queryHs20NetworkAnqpInfo.");
     m_engine.m_bQueryingAnqp = true;
     if (sendIhvCmd() != kSuccess) {

@@ -1,7 +1,6 @@
 #include <array>
 
 #include "base/DiagnosticLog.h"
-#include "config/ResultCodes.h"
 #include "connection/Supplicant.h"
 #include "platform/Session.h"
 
@@ -39,7 +38,7 @@ const char* sessionText(std::uint32_t eventType) {
 }  // namespace
 
 // Whatever the change: retries begin anew, and what was blocked by the way is open again.
-int Supplicant::onSessionChanged(Bytes payload) {
+ResultCode Supplicant::onSessionChanged(Bytes payload) {
     const LockGuard lock(g_hs20Lock);
     Log(3, "### [Session] IHV reports session changed. ###");
     if (payload.size() < kSessionPayload) return kFailure;
@@ -71,7 +70,7 @@ const char* Supplicant::reasonNotToBlock() const {
     return nullptr;
 }
 
-int Supplicant::onUserDisconnected(Bytes payload) {
+ResultCode Supplicant::onUserDisconnected(Bytes payload) {
     const LockGuard lock(g_hs20Lock);
     Log(3, "### IHV reports HS20 network has been disconnected manually by user. ###");
     Log(3, "\tQueried supplicant state=%s", nameOf(queryState()));

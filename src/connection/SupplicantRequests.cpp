@@ -2,7 +2,6 @@
 #include <string_view>
 
 #include "base/DiagnosticLog.h"
-#include "config/ResultCodes.h"
 #include "connection/Supplicant.h"
 #include "connection/SupplicantMgr.h"
 #include "hotspot/CredentialMatching.h"
@@ -26,13 +25,12 @@ DWORD Supplicant::requestConnection(std::string_view ssid, const NetworkProfile*
 }
 
 // The notifications of the connection may come at once; they wait for the lock.
-int Supplicant::connectToNetwork(const Hs20Network* network, const NetworkProfile* profile) {
-    if (network == nullptr || profile == nullptr) return kInvalidArgument;
-    LogWide(3, L"\nConnect to network %s", profile->m_name.c_str());
+ResultCode Supplicant::connectToNetwork(const Hs20Network& network, const NetworkProfile& profile) {
+    LogWide(3, L"\nConnect to network %s", profile.m_name.c_str());
     if (m_state == SupplicantState::Connected) {
         const Hs20Network* const connected = getConnectedBss(false);
         if (connected == nullptr) Log(3, "Supplicant connected to a legacy network.");
-        if (connected == network) {
+        if (connected == &network) {
             Log(3,
                 "Already in connected state while requesting to connect to the same network, skip connecting again.");
             return kSuccess;
@@ -42,12 +40,11 @@ int Supplicant::connectToNetwork(const Hs20Network* network, const NetworkProfil
         Log(3, "###Connection already started, skip connecting again.###");
         return kSuccess;
     }
-    if (findRoamingConsortiumCredential(m_engine.m_config.credentials(), *network) != nullptr)
-        return kSuccess;
-    Log(2, "Network profile for ssid=%s", network->ssidText().c_str());
-    Log(2, "\tInterworking: Connect with %s", toText(network->m_macAddress).c_str());
-    if (network->m_ssidLength == 0) return kFailure;
-    const DWORD result = requestConnection(network->ssid(), profile);
+    if (findRoamingConsortiumCredential(m_engine.m_config.credentials(), network) != nullptr) return kSuccess;
+    Log(2, "Network profile for ssid=%s", network.ssidText().c_str());
+    Log(2, "\tInterworking: Connect with %s", toText(network.m_macAddress).c_str());
+    if (network.m_ssidLength == 0) return kFailure;
+    const DWORD result = requestConnection(network.ssid(), &profile);
     if (result == ERROR_SUCCESS) return kSuccess;
     Log(2, "WlanConnect call failed with error code=%d.", static_cast<int>(result));
     return kFailure;
@@ -75,7 +72,7 @@ void Supplicant::updateNetworkRealm() {
 }
 
 // The block comes first: when the disconnection is reported, the network is on the list already.
-int Supplicant::disconnectedBSS(Leave what) {
+ResultCode Supplicant::disconnectedBSS(Leave what) {
     Log(3, "Disconnecting from connecting/connected BSS...");
     const Hs20Network* const network = getConnectedBss(true);
     if (network == nullptr && what != Leave::Any) {

@@ -139,11 +139,10 @@ TEST(SupplicantStory, LookupsKeepTheirObjectAlive) {
         std::string told = stateOf(kFirst) + (kept->isInitialized() ? " alive " : " at rest ");
         const WLAN_PHY_RADIO_STATE off{0, dot11_radio_state_off, dot11_radio_state_off};
         kept->onRadioStateChanged(&off);
-        return told + std::to_string(SupplicantMgr::instance().removeSupplicant(kept.get())) +
-               std::to_string(SupplicantMgr::instance().removeSupplicant(nullptr));
+        return told + std::to_string(static_cast<int>(SupplicantMgr::instance().removeSupplicant(*kept)));
     });
     EXPECT_TRUE(ending.isOrderly) << ending.errors;
-    EXPECT_EQ(ending.text, "none at rest 24");
+    EXPECT_EQ(ending.text, "none at rest 2");
 }
 
 // The adapter comes and goes between and within the commands. Whatever the order of threads, what the client

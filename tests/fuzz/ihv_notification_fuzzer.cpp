@@ -17,7 +17,7 @@ void notify(AirService& service, Block block) {
     notification.InterfaceGuid = service.supplicant().interfaceGuid();
     notification.dwDataSize = static_cast<DWORD>(block.size());
     notification.pData = block.data();
-    require(onHs20IhvNotification(&notification), "a message for a supplicant is taken");
+    require(onHs20IhvNotification(notification), "a message for a supplicant is taken");
     service.checkList();
 }
 

@@ -39,8 +39,8 @@ std::string StoreMachine::listing() {
     return text;
 }
 
-int open(Config& config, bool* isChanged) {
-    const int result = config.initPaths();
+ResultCode open(Config& config, bool* isChanged) {
+    const ResultCode result = config.initPaths();
     return result != kSuccess ? result : config.readConfig(isChanged);
 }
 

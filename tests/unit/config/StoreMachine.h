@@ -32,8 +32,8 @@ private:
     simulation::TestMachine m_machine;
 };
 
-/// Finds the paths and reads the file. The result of what failed, or 0.
-int open(Config& config, bool* isChanged = nullptr) REQUIRES(g_hs20Lock);
+/// Finds the paths and reads the file. The result of what failed, or kSuccess.
+ResultCode open(Config& config, bool* isChanged = nullptr) REQUIRES(g_hs20Lock);
 
 /// The table as text: "3:1 1:2" for id 3 in place 1 and id 1 in place 2.
 std::string places(Config& config) REQUIRES(g_hs20Lock);

@@ -54,7 +54,7 @@ struct Pair {
     void add(const CredentialInput& input) REQUIRES(g_hs20Lock) {
         std::int32_t id = 0;
         const std::int32_t expectedId = model.nextId();
-        const int result =
+        const ResultCode result =
             config.credentials().addCredential(input, config.nextCredId(), config.userName(), id);
         EXPECT_EQ(result == kSuccess, model.add(input));
         EXPECT_EQ(id, result == kSuccess ? expectedId : -1);
@@ -168,7 +168,7 @@ TEST(CredentialTable, RefusesWhatCannotBeAdded) {
         CredentialInput input;
         std::int32_t nextId;
         const wchar_t* user;
-        int result;
+        ResultCode result;
     };
     CredentialInput untyped = ttlsInput(L"r");
     untyped.type = 0;

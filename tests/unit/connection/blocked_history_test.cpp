@@ -93,7 +93,7 @@ TEST_F(Memory, ANewCredentialOpensWhatItFits) {
 TEST_F(Memory, ANewCredentialOpensNothingWhereItCanNot) {
     struct Case {
         std::int32_t id;
-        int result;
+        ResultCode result;
         const char* line;
     };
     inRange({"cafe"});

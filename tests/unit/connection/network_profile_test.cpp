@@ -126,7 +126,7 @@ protected:
     }
 
     NetworkProfileMgr m_profiles;
-    int m_result = -1;
+    ResultCode m_result = kNotFound;
 };
 
 TEST_F(Profiles, HaveTheirTextToTheLastCharacter) {
