@@ -168,7 +168,8 @@ void save(benchmark::State& state) {
     Store::instance().fill(Size);
     const LockGuard lock(vexa::g_hs20Lock);
     for (auto _ : state)
-        if (SupplicantMgr::instance().config().saveConfig() != 0) state.SkipWithError("the save failed");
+        if (SupplicantMgr::instance().config().saveConfig() != vexa::kSuccess)
+            state.SkipWithError("the save failed");
     countRate(state);
 }
 

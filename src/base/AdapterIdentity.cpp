@@ -5,6 +5,7 @@
 #include <string>
 #include <string_view>
 
+#include "base/WlanHandle.h"
 #include "base/WlanMemory.h"
 #include "contract/Registry.h"
 #include "platform/Guid.h"
@@ -56,14 +57,10 @@ bool isAdapterPresent(HANDLE hWlan, GUID& interfaceGuid) {
 }
 
 std::optional<GUID> presentAdapter() {
-    HANDLE handle = nullptr;
-    DWORD negotiated = 0;
-    if (WlanOpenHandle(kWlanClientVersion, nullptr, &negotiated, &handle) != ERROR_SUCCESS)
-        return std::nullopt;
+    WlanHandle handle;
+    if (handle.open() != ERROR_SUCCESS) return std::nullopt;
     GUID guid{};
-    const bool isPresent = isAdapterPresent(handle, guid);
-    WlanCloseHandle(handle, nullptr);
-    return isPresent ? std::optional(guid) : std::nullopt;
+    return isAdapterPresent(handle.get(), guid) ? std::optional(guid) : std::nullopt;
 }
 
 bool isVendorInterface(const GUID& guid) {

@@ -7,9 +7,6 @@
 
 namespace vexa {
 
-/// What this system speaks to the WLAN service.
-inline constexpr DWORD kWlanClientVersion = 2;
-
 struct WlanMemoryDeleter {
     void operator()(void* memory) const { WlanFreeMemory(memory); }
 };

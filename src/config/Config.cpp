@@ -39,7 +39,7 @@ std::wstring path(const std::wstring& folder, const char* name) {
 
 }  // namespace
 
-int Config::initPaths() {
+ResultCode Config::initPaths() {
     const auto user = platform::accountName();
     if (!user) return kFailure;
     m_userName = *user;
@@ -57,14 +57,14 @@ int Config::initPaths() {
 }
 
 // A file that is there and could not be opened is left alone.
-int Config::createDefaultFile(const std::wstring& path) {
+ResultCode Config::createDefaultFile(const std::wstring& path) {
     if (!platform::createFolder(path.substr(0, path.rfind(L'\\')))) return kFailure;
     return saveSafely(path, contract::kDefaultDocument, platform::Existing::Keep) ? kSuccess : kFailure;
 }
 
-int Config::openDocument() {
+ResultCode Config::openDocument() {
     if (!platform::canOpenFile(m_configPath)) return kNotFound;
-    if (m_xmlDoc.create() != kSuccess) return kFailure;
+    m_xmlDoc.create();
     return m_xmlDoc.load(m_configPath) == kSuccess ? kSuccess : kFailure;
 }
 
@@ -72,12 +72,14 @@ void Config::saveDocument() {
     if (m_xmlDoc.save(m_configPath) != kSuccess) m_bSaveFailed = true;
 }
 
-int Config::readConfig(bool* configChanged) {
+ResultCode Config::readConfig(bool* configChanged) {
     if (configChanged != nullptr) *configChanged = false;
     const ScopeGuard release([this]() NO_THREAD_SAFETY_ANALYSIS { m_xmlDoc.release(); });
-    if (const int result = openDocument(); result != kSuccess) return result;
+    if (const ResultCode result = openDocument(); result != kSuccess) return result;
     readGlobalSettings();
-    if (readCredentials() != kSuccess || readUsers(configChanged) != kSuccess) return kFailure;
+    bool isChanged = false;
+    if (readCredentials() != kSuccess || readUsers(isChanged) != kSuccess) return kFailure;
+    if (configChanged != nullptr) *configChanged = isChanged;
     return kSuccess;
 }
 
@@ -90,7 +92,17 @@ std::int32_t Config::readNumber(const char* xpath) {
     return leadingInteger(m_xmlDoc.getText(xpath, Node()).value_or(L""));
 }
 
-int Config::readGlobalSettings() {
+std::wstring Config::textOf(Node node, const char* child, const wchar_t* missing) {
+    return m_xmlDoc.getText(child, node).value_or(missing);
+}
+
+// An empty number counts as a missing one.
+std::int32_t Config::numberOf(Node node, const char* child) {
+    const std::wstring text = textOf(node, child, L"");
+    return text.empty() ? -1 : leadingInteger(text);
+}
+
+void Config::readGlobalSettings() {
     m_dumpFilePath = m_xmlDoc.getText("/*/global/dump_file_path", Node()).value_or(L"");
     if (m_dumpFilePath.empty()) m_dumpFilePath = kDefaultDumpName;
     m_bCreateNewDumpFile = readFlag("/*/global/create_new_dump_file", false);
@@ -102,7 +114,6 @@ int Config::readGlobalSettings() {
     m_homeRealm = m_xmlDoc.getText("/*/global/homerealm", Node()).value_or(L"");
     m_nextCredId = readNumber("/*/global/nextcredid");
     readAutoConnectFromRegistry();
-    return kSuccess;
 }
 
 // Whoever may edit the file must not choose which file this process appends to.
@@ -137,7 +148,7 @@ void Config::readAutoConnectFromRegistry() {
 }
 
 // However many of the three are lost, as with a full disk, one line tells of it.
-int Config::saveConfig() {
+ResultCode Config::saveConfig() {
     m_bSaveFailed = false;
     const bool isDone =
         saveNextCredId() == kSuccess && saveCredentials() == kSuccess && saveUsers() == kSuccess;
@@ -146,9 +157,9 @@ int Config::saveConfig() {
 }
 
 // A file that has lost the element gets it back: otherwise nothing could be saved any more.
-int Config::saveNextCredId() {
+ResultCode Config::saveNextCredId() {
     const ScopeGuard release([this]() NO_THREAD_SAFETY_ANALYSIS { m_xmlDoc.release(); });
-    if (const int result = openDocument(); result != kSuccess) return result;
+    if (const ResultCode result = openDocument(); result != kSuccess) return result;
     const std::wstring number = std::to_wstring(m_nextCredId);
     Node node;
     m_xmlDoc.selectSingleNode("/*/global/nextcredid", Node(), node);

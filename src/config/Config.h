@@ -20,18 +20,18 @@ namespace vexa {
 class Config {
 public:
     /// Finds out who the user is, creates the folders, and the default file where there is none.
-    int initPaths() REQUIRES(g_hs20Lock);
+    ResultCode initPaths() REQUIRES(g_hs20Lock);
 
     /// Reads all. `configChanged`: the user's list no longer agrees with the credentials, and the caller has
     /// to save.
-    int readConfig(bool* configChanged) REQUIRES(g_hs20Lock);
+    ResultCode readConfig(bool* configChanged) REQUIRES(g_hs20Lock);
 
     /// The three saves below, up to the first that fails. That the file could not be written is no failure of
     /// theirs: memory and file then differ until the next save that succeeds.
-    int saveConfig() REQUIRES(g_hs20Lock);
-    int saveNextCredId() REQUIRES(g_hs20Lock);
-    int saveCredentials() REQUIRES(g_hs20Lock);
-    int saveUsers() REQUIRES(g_hs20Lock);
+    ResultCode saveConfig() REQUIRES(g_hs20Lock);
+    ResultCode saveNextCredId() REQUIRES(g_hs20Lock);
+    ResultCode saveCredentials() REQUIRES(g_hs20Lock);
+    ResultCode saveUsers() REQUIRES(g_hs20Lock);
 
     CredentialTable& credentials() REQUIRES(g_hs20Lock) { return m_credentials; }
     const std::wstring& userName() const REQUIRES(g_hs20Lock) { return m_userName; }
@@ -51,27 +51,30 @@ public:
 private:
     using Node = XmlDocument::Node;
 
-    int createDefaultFile(const std::wstring& path) REQUIRES(g_hs20Lock);
-    int openDocument() REQUIRES(g_hs20Lock);
+    static constexpr const wchar_t* kInvalid = L"Invalid";  // what a missing element reads as
+
+    ResultCode createDefaultFile(const std::wstring& path) REQUIRES(g_hs20Lock);
+    ResultCode openDocument() REQUIRES(g_hs20Lock);
     void saveDocument() REQUIRES(g_hs20Lock);
 
-    int readGlobalSettings() REQUIRES(g_hs20Lock);
+    void readGlobalSettings() REQUIRES(g_hs20Lock);
     bool readFlag(const char* xpath, bool missing) REQUIRES(g_hs20Lock);
     std::int32_t readNumber(const char* xpath) REQUIRES(g_hs20Lock);
+    std::wstring textOf(Node node, const char* child, const wchar_t* missing) REQUIRES(g_hs20Lock);
+    std::int32_t numberOf(Node node, const char* child) REQUIRES(g_hs20Lock);
     void deriveDumpFilePath() REQUIRES(g_hs20Lock);
     void readAutoConnectFromRegistry();
 
-    int readCredentials() REQUIRES(g_hs20Lock);
+    ResultCode readCredentials() REQUIRES(g_hs20Lock);
     void readCredential(Node node) REQUIRES(g_hs20Lock);
     void repairNextCredId() REQUIRES(g_hs20Lock);
-    int readUsers(bool* configChanged) REQUIRES(g_hs20Lock);
+    ResultCode readUsers(bool& isChanged) REQUIRES(g_hs20Lock);
     Node findCurrentUser(const std::vector<Node>& users) REQUIRES(g_hs20Lock);
     bool applyReferences(const std::vector<Node>& references) REQUIRES(g_hs20Lock);
     bool mustRemove(Node node, const std::unordered_map<std::int32_t, Credential*>& present)
         REQUIRES(g_hs20Lock);
-    int writeCredential(const Credential& credential, Node section) REQUIRES(g_hs20Lock);
-    int writeReferences(Node list) REQUIRES(g_hs20Lock);
-    std::wstring textOf(Node node, const char* child, const wchar_t* missing) REQUIRES(g_hs20Lock);
+    ResultCode writeCredential(const Credential& credential, Node section) REQUIRES(g_hs20Lock);
+    ResultCode writeReferences(Node list) REQUIRES(g_hs20Lock);
 
     std::wstring m_userName GUARDED_BY(g_hs20Lock);
     CredentialTable m_credentials GUARDED_BY(g_hs20Lock);

@@ -6,7 +6,6 @@
 #include <utility>
 
 #include "base/DiagnosticLog.h"
-#include "config/ResultCodes.h"
 #include "text/TextConversion.h"
 
 namespace vexa {
@@ -62,8 +61,8 @@ bool CredentialTable::isDuplicate(const CredentialInput& input, const std::wstri
 }
 
 // An id at the limit could not be followed by another.
-int CredentialTable::addCredential(const CredentialInput& input, std::int32_t nextId,
-                                   const std::wstring& userName, std::int32_t& outId) {
+ResultCode CredentialTable::addCredential(const CredentialInput& input, std::int32_t nextId,
+                                          const std::wstring& userName, std::int32_t& outId) {
     outId = -1;
     if (input.type == 0) return kInvalidArgument;
     const std::wstring& name = input.credName.empty() ? input.realm : input.credName;
@@ -107,7 +106,7 @@ void CredentialTable::makeRoomAtTop() {
     if (shiftPlacedDown()) sortByPriority();
 }
 
-int CredentialTable::updateCredential(const CredentialInput& input) {
+ResultCode CredentialTable::updateCredential(const CredentialInput& input) {
     if (input.id < 1) return kInvalidArgument;
     Credential* const credential = findCredentialById(input.id);
     if (credential == nullptr) return kFailure;
@@ -174,15 +173,15 @@ void CredentialTable::moveTowardsEnd(const Credential& moved, std::int32_t targe
     }
 }
 
-int CredentialTable::findCredentialByName(const std::wstring& name, Credential*& out) const {
+ResultCode CredentialTable::findCredentialByName(const std::wstring& name, Credential*& out) const {
     const auto found = std::find_if(m_list.begin(), m_list.end(),
                                     [&](const auto& credential) { return credential->m_credName == name; });
     out = found == m_list.end() ? nullptr : found->get();
     return out == nullptr ? kNotFound : kSuccess;
 }
 
-int CredentialTable::findCredentialByTypeAndRealm(std::int32_t type, const std::wstring& realm,
-                                                  Credential*& out) const {
+ResultCode CredentialTable::findCredentialByTypeAndRealm(std::int32_t type, const std::wstring& realm,
+                                                         Credential*& out) const {
     const auto found = std::find_if(m_list.begin(), m_list.end(), [&](const auto& credential) {
         return credential->m_type == type && credential->m_realm == realm;
     });

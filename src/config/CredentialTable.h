@@ -8,6 +8,7 @@
 
 #include "base/NetworkListLock.h"
 #include "config/Credential.h"
+#include "config/ResultCodes.h"
 
 namespace vexa {
 
@@ -17,11 +18,11 @@ class CredentialTable {
 public:
     /// Goes to the top. `nextId` becomes its id; the caller advances it and saves. `outId` is -1 unless it
     /// succeeds.
-    int addCredential(const CredentialInput& input, std::int32_t nextId, const std::wstring& userName,
-                      std::int32_t& outId) REQUIRES(g_hs20Lock);
+    ResultCode addCredential(const CredentialInput& input, std::int32_t nextId, const std::wstring& userName,
+                             std::int32_t& outId) REQUIRES(g_hs20Lock);
 
     /// Changes texts and auto-connect, but neither type, id, place, creator nor access.
-    int updateCredential(const CredentialInput& input) REQUIRES(g_hs20Lock);
+    ResultCode updateCredential(const CredentialInput& input) REQUIRES(g_hs20Lock);
 
     /// False only for an id below 1; one that isn't there changes nothing.
     bool deleteCredential(std::int32_t id) REQUIRES(g_hs20Lock);
@@ -30,9 +31,9 @@ public:
     bool setCredentialPosition(std::int32_t id, std::int32_t position) REQUIRES(g_hs20Lock);
 
     /// `out` is null where the result is kNotFound.
-    int findCredentialByName(const std::wstring& name, Credential*& out) const REQUIRES(g_hs20Lock);
-    int findCredentialByTypeAndRealm(std::int32_t type, const std::wstring& realm, Credential*& out) const
-        REQUIRES(g_hs20Lock);
+    ResultCode findCredentialByName(const std::wstring& name, Credential*& out) const REQUIRES(g_hs20Lock);
+    ResultCode findCredentialByTypeAndRealm(std::int32_t type, const std::wstring& realm,
+                                            Credential*& out) const REQUIRES(g_hs20Lock);
     Credential* findCredentialById(std::int32_t id) const REQUIRES(g_hs20Lock);
 
     /// In order. Valid until the next delete or read.

@@ -2,20 +2,24 @@
 
 namespace vexa {
 
-// What the operations of the store and the engine give.
+/// What the operations of the store and the engine give.
+enum class ResultCode {
+    kSuccess = 0,
+    kFailure = 1,
+    kNotFound = 2,  // also: a file that can't be opened
+    kOutOfMemory = 3,
+    kInvalidArgument = 4,
+    kNoDocument = 7,
+};
+using enum ResultCode;
 
-inline constexpr int kSuccess = 0;
-inline constexpr int kFailure = 1;
-inline constexpr int kNotFound = 2;  // also: a file that can't be opened
-inline constexpr int kOutOfMemory = 3;
-inline constexpr int kInvalidArgument = 4;
-inline constexpr int kNoOwner = 5;
-inline constexpr int kNoDocument = 7;
-inline constexpr int kNetworkGone = 9;
-
-// Outcomes of an attempt to connect that are no failures.
-
-inline constexpr int kConnectStarted = 1;
-inline constexpr int kConnectNothingLeft = 2;
+/// How far an attempt to connect came.
+enum class ConnectOutcome {
+    kConnectFailed = 0,
+    kConnectStarted = 1,
+    kConnectNothingLeft = 2,  // no network to join, or no credential to join it with
+    kNetworkGone = 9,
+};
+using enum ConnectOutcome;
 
 }  // namespace vexa

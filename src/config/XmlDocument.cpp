@@ -4,7 +4,6 @@
 #include <string_view>
 #include <utility>
 
-#include "config/ResultCodes.h"
 #include "config/SafeSave.h"
 #include "platform/Files.h"
 #include "text/TextConversion.h"
@@ -102,12 +101,11 @@ struct StringWriter : pugi::xml_writer {
 
 }  // namespace
 
-int XmlDocument::create() {
+void XmlDocument::create() {
     if (!m_document) m_document.emplace();
-    return kSuccess;
 }
 
-int XmlDocument::load(const std::wstring& path) {
+ResultCode XmlDocument::load(const std::wstring& path) {
     if (!m_document) return kNoDocument;
     const auto content = platform::readFile(path);
     if (!content) return kFailure;
@@ -119,7 +117,7 @@ int XmlDocument::load(const std::wstring& path) {
     return result ? kSuccess : kFailure;
 }
 
-int XmlDocument::save(const std::wstring& path) const {
+ResultCode XmlDocument::save(const std::wstring& path) const {
     if (!m_document) return kNoDocument;
     const Node first = m_document->first_child();
     if (first.type() == pugi::node_declaration && first.attribute("encoding"))
@@ -134,7 +132,7 @@ XmlDocument::Node XmlDocument::root() const {
     return m_document ? Node(*m_document) : Node();
 }
 
-int XmlDocument::selectNodes(const char* xpath, Node parent, std::vector<Node>& list) const {
+ResultCode XmlDocument::selectNodes(const char* xpath, Node parent, std::vector<Node>& list) const {
     if (!m_document) return kFailure;
     list.clear();
     for (const pugi::xpath_node& found : (parent ? parent : root()).select_nodes(xpath))
@@ -142,7 +140,7 @@ int XmlDocument::selectNodes(const char* xpath, Node parent, std::vector<Node>& 
     return kSuccess;
 }
 
-int XmlDocument::selectSingleNode(const char* xpath, Node parent, Node& node) const {
+ResultCode XmlDocument::selectSingleNode(const char* xpath, Node parent, Node& node) const {
     if (!m_document) return kFailure;
     const bool isChildName = parent && std::strpbrk(xpath, "/*") == nullptr;
     node = isChildName ? childElement(parent, xpath) : (parent ? parent : root()).select_node(xpath).node();
@@ -157,7 +155,7 @@ std::optional<std::wstring> XmlDocument::getText(const char* xpath, Node parent)
     return wideFromUtf8(collector.text);
 }
 
-int XmlDocument::setText(Node node, const std::wstring& text) {
+ResultCode XmlDocument::setText(Node node, const std::wstring& text) {
     if (!canStandInXml(text)) return kFailure;
     while (const Node child = node.last_child())
         remove(child);
@@ -178,8 +176,8 @@ void XmlDocument::remove(Node node) {
     }
 }
 
-int XmlDocument::setChild(const char* tag, const std::wstring& text, Node parent, bool forceNew,
-                          Node* created) {
+ResultCode XmlDocument::setChild(const char* tag, const std::wstring& text, Node parent, bool forceNew,
+                                 Node* created) {
     if (created != nullptr) *created = Node();
     if (!m_document) return kFailure;
     Node existing;

@@ -6,6 +6,8 @@
 #include <string>
 #include <vector>
 
+#include "config/ResultCodes.h"
+
 namespace vexa {
 
 /// One XML file in memory, for the length of an operation. Results: kSuccess, kFailure, kNoDocument.
@@ -14,29 +16,29 @@ public:
     /// An element, or null. Valid while the document lives.
     using Node = pugi::xml_node;
 
-    int create();
+    void create();
 
     /// kFailure: the file can't be read, or is no well-formed XML 1.0 in an encoding that we know: UTF-8,
     /// UTF-16 with its mark, ISO-8859-1, US-ASCII.
-    int load(const std::wstring& path);
+    ResultCode load(const std::wstring& path);
 
     /// Replaces the file, safely: a failure leaves the old one whole. UTF-8, beginning with EF BB BF.
-    int save(const std::wstring& path) const;
+    ResultCode save(const std::wstring& path) const;
 
     /// Relative to `parent`, or to the document if that is null.
-    int selectNodes(const char* xpath, Node parent, std::vector<Node>& list) const;
-    int selectSingleNode(const char* xpath, Node parent, Node& node) const;
+    ResultCode selectNodes(const char* xpath, Node parent, std::vector<Node>& list) const;
+    ResultCode selectSingleNode(const char* xpath, Node parent, Node& node) const;
 
     /// All text below the first node that is found, blanks included; nothing if none is found.
     std::optional<std::wstring> getText(const char* xpath, Node parent) const;
 
     /// Sets the text of the child `tag` of `parent`, or of the root element if that is null; creates it, and
     /// gives it to `created`, if there is none or if `forceNew`. kFailure also for text that XML can't hold.
-    int setChild(const char* tag, const std::wstring& text, Node parent, bool forceNew,
-                 Node* created = nullptr);
+    ResultCode setChild(const char* tag, const std::wstring& text, Node parent, bool forceNew,
+                        Node* created = nullptr);
 
     /// In place of all that the node holds. kFailure, and no change: the text holds what XML can't.
-    static int setText(Node node, const std::wstring& text);
+    static ResultCode setText(Node node, const std::wstring& text);
 
     /// Takes a node and all below it out of the document.
     static void remove(Node node);

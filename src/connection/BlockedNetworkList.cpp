@@ -4,7 +4,6 @@
 
 #include "base/DiagnosticLog.h"
 #include "config/CredentialTable.h"
-#include "config/ResultCodes.h"
 #include "hotspot/CredentialMatching.h"
 
 namespace vexa {
@@ -19,10 +18,10 @@ Credential* credentialOf(std::int32_t credId, const CredentialTable& credentials
     return credential;
 }
 
-bool fits(const Credential* credential, const Hs20Network& network, const CredentialMatcher& matcher)
+bool fits(const Credential& credential, const Hs20Network& network, const CredentialMatcher& matcher)
     REQUIRES(g_hs20Lock) {
     const auto found = matcher.findCredentialsForNetwork(network);
-    return std::find(found.begin(), found.end(), credential) != found.end();
+    return std::find(found.begin(), found.end(), &credential) != found.end();
 }
 
 // Whole milliseconds as an unsigned number, so that a time in the future counts as very long ago.
@@ -63,8 +62,8 @@ bool BlockedNetworkList::unblockNetwork(std::string_view ssid) {
     return true;
 }
 
-int BlockedNetworkList::onCredentialAdded(std::int32_t credId, const CredentialTable& credentials,
-                                          const Hs20NetworkList& networks) {
+ResultCode BlockedNetworkList::onCredentialAdded(std::int32_t credId, const CredentialTable& credentials,
+                                                 const Hs20NetworkList& networks) {
     Log(3, "Newly added credential with id=%d.", credId);
     if (credId < 0) return kInvalidArgument;
     const Credential* const credential = credentialOf(credId, credentials);
@@ -77,7 +76,7 @@ int BlockedNetworkList::onCredentialAdded(std::int32_t credId, const CredentialT
     for (auto blocked = m_networks.begin(); blocked != m_networks.end();) {
         const Hs20Network* const network = networks.findBySsid(blocked->ssid);
         if (network == nullptr) Log(6, "ERROR: Invalid BSS.");
-        if (network != nullptr && fits(credential, *network, matcher))
+        if (network != nullptr && fits(*credential, *network, matcher))
             blocked = m_networks.erase(blocked);
         else
             ++blocked;
@@ -85,16 +84,16 @@ int BlockedNetworkList::onCredentialAdded(std::int32_t credId, const CredentialT
     return kSuccess;
 }
 
-int BlockedNetworkList::onCredentialAutoConnectChanged(std::int32_t credId,
-                                                       const CredentialTable& credentials,
-                                                       const Hs20NetworkList& networks) {
+ResultCode BlockedNetworkList::onCredentialAutoConnectChanged(std::int32_t credId,
+                                                              const CredentialTable& credentials,
+                                                              const Hs20NetworkList& networks) {
     Log(3, "Credential with id=%d has auto connect property changed.", credId);
     if (credId < 0) return kInvalidArgument;
     const Credential* const credential = credentialOf(credId, credentials);
     if (credential == nullptr) return kFailure;
     const CredentialMatcher matcher(credentials);
     for (const Hs20Network* network : networks.copyPointers()) {
-        if (!isBlocked(*network) || !fits(credential, *network, matcher)) continue;
+        if (!isBlocked(*network) || !fits(*credential, *network, matcher)) continue;
         Log(3,
             "Unblock network with ssid=%s and mac address=%s due to corresponding credential changed from 'manual connect' to 'auto connect'",
             network->ssidText().c_str(), toText(network->m_macAddress).c_str());

@@ -7,6 +7,7 @@
 
 #include "base/NetworkListLock.h"
 #include "base/TimeValue.h"
+#include "config/ResultCodes.h"
 #include "hotspot/Hs20NetworkList.h"
 
 namespace vexa {
@@ -26,10 +27,10 @@ public:
 
     /// A credential can open the networks that it fits: a new one, and one that may now be used for
     /// auto-connect. kSuccess, kFailure, or kInvalidArgument for a negative id.
-    int onCredentialAdded(std::int32_t credId, const CredentialTable& credentials,
-                          const Hs20NetworkList& networks) REQUIRES(g_hs20Lock);
-    int onCredentialAutoConnectChanged(std::int32_t credId, const CredentialTable& credentials,
-                                       const Hs20NetworkList& networks) REQUIRES(g_hs20Lock);
+    ResultCode onCredentialAdded(std::int32_t credId, const CredentialTable& credentials,
+                                 const Hs20NetworkList& networks) REQUIRES(g_hs20Lock);
+    ResultCode onCredentialAutoConnectChanged(std::int32_t credId, const CredentialTable& credentials,
+                                              const Hs20NetworkList& networks) REQUIRES(g_hs20Lock);
 
     /// Opens what was blocked a moment ago, and not by the client: it was no act of the user.
     void unblockRecentNetworks() REQUIRES(g_hs20Lock);

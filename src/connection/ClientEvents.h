@@ -27,9 +27,6 @@ struct ClientEvents {
     std::function<void(const ConnectionResult& result)> sendConnectionResult;
     std::function<void()> sendInternetAccess;
 
-    /// Whether the client waits for a realm update; it is told once.
-    std::function<bool()> takePendingRealmUpdate;
-
     bool isComplete() const { return sendNetworkList != nullptr; }
 };
 

@@ -4,7 +4,6 @@
 #include <string>
 
 #include "base/DiagnosticLog.h"
-#include "config/ResultCodes.h"
 #include "hotspot/Hs20NetworkList.h"
 
 namespace vexa {
@@ -22,8 +21,8 @@ void close(ConnectionRecord& record) {
 
 }  // namespace
 
-int ConnectionHistory::addConnection(const DOT11_SSID& ssid, const MacAddress& mac,
-                                     const Hs20NetworkList& networks) {
+ResultCode ConnectionHistory::addConnection(const DOT11_SSID& ssid, const MacAddress& mac,
+                                            const Hs20NetworkList& networks) {
     if (networks.findBySsid(bytesOf(ssid)) == nullptr) {
         Log(3, "Not a HS20 network, don't adding history.");
         return kSuccess;
@@ -46,7 +45,7 @@ int ConnectionHistory::addConnection(const DOT11_SSID& ssid, const MacAddress& m
     return kSuccess;
 }
 
-int ConnectionHistory::updateDisconnection(const DOT11_SSID& ssid, const Hs20NetworkList& networks) {
+ResultCode ConnectionHistory::updateDisconnection(const DOT11_SSID& ssid, const Hs20NetworkList& networks) {
     if (networks.findBySsid(bytesOf(ssid)) == nullptr) {
         Log(3, "Not a HS20 network, don't update history.");
         return kSuccess;

@@ -4,6 +4,7 @@
 
 #include "base/NetworkListLock.h"
 #include "base/TimeValue.h"
+#include "config/ResultCodes.h"
 #include "hotspot/IhvMessages.h"
 #include "platform/WlanApi.h"
 
@@ -26,10 +27,11 @@ struct ConnectionRecord {
 class ConnectionHistory {
 public:
     /// kSuccess, also for a network that isn't in the list and leaves no record.
-    int addConnection(const DOT11_SSID& ssid, const MacAddress& mac, const Hs20NetworkList& networks)
+    ResultCode addConnection(const DOT11_SSID& ssid, const MacAddress& mac, const Hs20NetworkList& networks)
         REQUIRES(g_hs20Lock);
     /// kFailure: the last record belongs to another SSID, or to one with other bytes behind its end.
-    int updateDisconnection(const DOT11_SSID& ssid, const Hs20NetworkList& networks) REQUIRES(g_hs20Lock);
+    ResultCode updateDisconnection(const DOT11_SSID& ssid, const Hs20NetworkList& networks)
+        REQUIRES(g_hs20Lock);
 
     /// The newest record; null if there is none.
     const ConnectionRecord* last() const REQUIRES(g_hs20Lock);

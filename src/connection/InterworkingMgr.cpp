@@ -6,10 +6,8 @@
 
 #include "base/DiagnosticLog.h"
 #include "base/NetworkListLock.h"
-#include "config/Config.h"
-#include "config/ResultCodes.h"
+#include "connection/EngineState.h"
 #include "connection/Supplicant.h"
-#include "connection/SupplicantMgr.h"
 #include "platform/Clock.h"
 #include "platform/Session.h"
 
@@ -27,65 +25,71 @@ constexpr auto kStopLimit = 10000ms;
 
 /// What the connecting thread waits for, in order of priority.
 struct Wake {
-    platform::Event Supplicant::*event;  // null: the thread's own
+    platform::Event EngineState::*event;  // null: the thread's own
     const char* line;
     platform::Duration pause;
 };
 
 constexpr std::array<Wake, 8> kWakes = {{
     {nullptr, "Termination event signaled.", 0ms},
-    {&Supplicant::m_hEnableHs20Event, "Enable/disable HS20 event signaled.", 0ms},
-    {&Supplicant::m_hHs20NetworkChangedEvent, "HS20 network list changed event signaled.", 0ms},
-    {&Supplicant::m_hCredentialChangedEvent, "Credential changed event signaled.", 0ms},
-    {&Supplicant::m_hAnqpInfoReadyEvent, "ANQP info ready event signaled.", 0ms},
-    {&Supplicant::m_hConnectionCompletedEvent, "Connection operation completed event signaled.", 0ms},
-    {&Supplicant::m_hSupplicantStateChangedEvent, "Supplicant state changed event signaled.", 0ms},
-    {&Supplicant::m_hRadioStateChangedEvent, "Radio state changed event signaled.", kRadioPause},
+    {&EngineState::m_hEnableHs20Event, "Enable/disable HS20 event signaled.", 0ms},
+    {&EngineState::m_hHs20NetworkChangedEvent, "HS20 network list changed event signaled.", 0ms},
+    {&EngineState::m_hCredentialChangedEvent, "Credential changed event signaled.", 0ms},
+    {&EngineState::m_hAnqpInfoReadyEvent, "ANQP info ready event signaled.", 0ms},
+    {&EngineState::m_hConnectionCompletedEvent, "Connection operation completed event signaled.", 0ms},
+    {&EngineState::m_hSupplicantStateChangedEvent, "Supplicant state changed event signaled.", 0ms},
+    {&EngineState::m_hRadioStateChangedEvent, "Radio state changed event signaled.", kRadioPause},
 }};
 
-bool isHs20Off(Supplicant& supplicant) {
-    return !supplicant.isHs20Enabled();
+/// What the gates look at.
+struct Parts {
+    Supplicant& supplicant;
+    EngineState& engine;
+};
+
+bool isHs20Off(const Parts& parts) {
+    return !parts.supplicant.isHs20Enabled();
 }
 
-bool isRadioOff(Supplicant& supplicant) {
-    return !supplicant.isRadioOn();
+bool isRadioOff(const Parts& parts) {
+    return !parts.supplicant.isRadioOn();
 }
 
-bool isBusy(Supplicant& supplicant) {
-    const SupplicantState state = supplicant.queryState();
+bool isBusy(const Parts& parts) {
+    const SupplicantState state = parts.supplicant.queryState();
     if (state == SupplicantState::Disconnected) return false;
     Log(3, "Supplicant not in disconnected state, skip this round of network connecting.");
     Log(3, "Queried supplicant state=%s", nameOf(state));
     return true;
 }
 
-bool isConnecting(Supplicant& supplicant) {
-    return supplicant.m_bConnectionStarted;
+bool isConnecting(const Parts& parts) {
+    return parts.engine.m_bConnectionStarted;
 }
 
-bool hasNoNetwork(Supplicant& supplicant) {
+bool hasNoNetwork(const Parts& parts) {
     const LockGuard lock(g_hs20Lock);
-    return supplicant.m_networkList.size() == 0;
+    return parts.engine.m_networkList.size() == 0;
 }
 
-bool hasNoCredential(Supplicant& supplicant) {
+bool hasNoCredential(const Parts& parts) {
     const LockGuard lock(g_hs20Lock);
-    return supplicant.m_pMgr->config().credentials().size() == 0;
+    return parts.engine.m_config.credentials().size() == 0;
 }
 
-bool isQueryingAnqp(Supplicant& supplicant) {
-    return supplicant.m_bQueryingAnqp;
+bool isQueryingAnqp(const Parts& parts) {
+    return parts.engine.m_bQueryingAnqp;
 }
 
-bool lacksAnqpInfo(Supplicant& supplicant) {
-    if (!supplicant.hasUnfetchedAnqpInfo()) return false;
+bool lacksAnqpInfo(const Parts& parts) {
+    if (!parts.supplicant.hasUnfetchedAnqpInfo()) return false;
     Log(3,
         "Not all HS20 network ANQP info fetched, we will query the ANQP info first before auto connecting.");
-    supplicant.queryHs20NetworkAnqpInfo();
+    parts.supplicant.queryHs20NetworkAnqpInfo();
     return true;
 }
 
-bool isSessionAway(Supplicant& /*supplicant*/) {
+bool isSessionAway(const Parts& /*parts*/) {
     if (platform::isSessionActive()) return false;
     Log(3, "Current session is not active, sleep for a while and continue.");
     platform::sleepFor(kSessionPause);
@@ -94,7 +98,7 @@ bool isSessionAway(Supplicant& /*supplicant*/) {
 
 /// Ends the round if it holds. A gate with more to say than one line says it itself.
 struct Gate {
-    bool (*holds)(Supplicant& supplicant);
+    bool (*holds)(const Parts& parts);
     const char* line;
 };
 
@@ -122,12 +126,8 @@ void InterworkingMgr::stopIfInited() {
     stop();
 }
 
-int InterworkingMgr::init() {
+ResultCode InterworkingMgr::init() {
     Log(2, "\tInitializing InterworkingMgr.");
-    if (m_pSupplicant == nullptr) {
-        Log(6, "\tInvalid supplicant.");
-        return kNoOwner;
-    }
     m_bTerminate = false;
     m_hTerminationEvent.reset();
     Log(2, "\t\tCreating InterworkingMgr working thread.");
@@ -156,7 +156,6 @@ void InterworkingMgr::stop() {
 }
 
 void InterworkingMgr::runNetworkingLoop() {
-    if (m_pSupplicant->m_pMgr == nullptr) return;
     while (!m_bTerminate) {
         Log(3, "\n\n#####Start new round of network connecting...#####");
         if (waitForWork() == 0) break;
@@ -169,7 +168,7 @@ void InterworkingMgr::runNetworkingLoop() {
 int InterworkingMgr::waitForWork() {
     std::array<platform::Event*, kWakes.size()> events{};
     for (std::size_t i = 0; i < kWakes.size(); ++i)
-        events[i] = kWakes[i].event == nullptr ? &m_hTerminationEvent : &(m_pSupplicant->*kWakes[i].event);
+        events[i] = kWakes[i].event == nullptr ? &m_hTerminationEvent : &(m_engine.*kWakes[i].event);
     const int woken = waitForAny(events, kRoundLimit);
     if (woken == platform::kTimedOut) {
         Log(3, "Timeout happens in the network connecting thread.");
@@ -187,7 +186,7 @@ void InterworkingMgr::runRound() {
 
 bool InterworkingMgr::passesGates() {
     for (const Gate& gate : kGates) {
-        if (!gate.holds(*m_pSupplicant)) continue;
+        if (!gate.holds({m_supplicant, m_engine})) continue;
         if (gate.line != nullptr) Log(3, "%s", gate.line);
         return false;
     }
@@ -195,15 +194,16 @@ bool InterworkingMgr::passesGates() {
 }
 
 void InterworkingMgr::connect() {
-    int outcome = 0;
-    if (connectNetwork(outcome) != kSuccess)
-        Log(6, "connectNetwork returns error.");
-    else if (outcome == kConnectStarted)
-        Log(3, "connectNetwork returns with op succeeded.");
-    else if (outcome == kConnectNothingLeft)
-        Log(3, "connectNetwork returns with op cancelled.");
-    else
-        Log(3, "connectNetwork returns with failure.");
+    switch (connectNetwork()) {
+        case kConnectFailed:
+            return Log(6, "connectNetwork returns error.");
+        case kConnectStarted:
+            return Log(3, "connectNetwork returns with op succeeded.");
+        case kConnectNothingLeft:
+            return Log(3, "connectNetwork returns with op cancelled.");
+        case kNetworkGone:
+            return Log(3, "connectNetwork returns with failure.");
+    }
 }
 
 }  // namespace vexa

@@ -5,7 +5,7 @@
 #include <vector>
 
 #include "base/NetworkListLock.h"
-
+#include "config/ResultCodes.h"
 #include "platform/Event.h"
 #include "platform/Thread.h"
 
@@ -15,6 +15,7 @@ struct Credential;
 struct NetworkProfile;
 class Hs20Network;
 class Supplicant;
+struct EngineState;
 
 /// A network and the credential to join it with; both null if there is none.
 struct NetworkChoice {
@@ -27,13 +28,14 @@ struct NetworkChoice {
 /// with its line in the log, and at its end one attempt to connect.
 class InterworkingMgr {
 public:
-    explicit InterworkingMgr(Supplicant* supplicant) : m_pSupplicant(supplicant) {}
+    InterworkingMgr(Supplicant& supplicant, EngineState& engine)
+        : m_supplicant(supplicant), m_engine(engine) {}
     ~InterworkingMgr();
     InterworkingMgr(const InterworkingMgr&) = delete;
     InterworkingMgr& operator=(const InterworkingMgr&) = delete;
 
-    /// Starts the thread. 0; 5 without a Supplicant, 1 if the thread can't be created.
-    int init();
+    /// Starts the thread. kFailure if it can't be created.
+    ResultCode init();
 
     /// Ends the thread, within 10 s. REQUIRES: the network list lock not held.
     void stop();
@@ -52,10 +54,8 @@ private:
     bool passesGates();
     void connect();
 
-    /// One attempt: chooses, finds or builds the profile, and asks for the connection. `result` is
-    /// kConnectStarted, kConnectNothingLeft, or 0 with the failure that is given.
-    int connectNetwork(int& result) EXCLUDES(g_hs20Lock);
-    int leaveToRunningAttempt(int& result) REQUIRES(g_hs20Lock);
+    /// One attempt: chooses, finds or builds the profile, and asks for the connection.
+    ConnectOutcome connectNetwork() EXCLUDES(g_hs20Lock);
     NetworkChoice findBestMatchBssAndCredential() REQUIRES(g_hs20Lock);
     Credential* selectCredential(const Hs20Network& network, const std::vector<Credential*>& found)
         REQUIRES(g_hs20Lock);
@@ -63,7 +63,8 @@ private:
     NetworkProfile* reusableProfile(const NetworkChoice& choice, const std::wstring& name)
         REQUIRES(g_hs20Lock);
 
-    Supplicant* const m_pSupplicant;
+    Supplicant& m_supplicant;
+    EngineState& m_engine;
     std::atomic<bool> m_bInited{false};
     std::atomic<bool> m_bTerminate{false};
     std::atomic<bool> m_isThreadLate{false};

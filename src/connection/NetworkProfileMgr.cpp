@@ -4,7 +4,6 @@
 #include <utility>
 
 #include "base/DiagnosticLog.h"
-#include "config/ResultCodes.h"
 #include "connection/ProfileTemplates.h"
 #include "text/TextConversion.h"
 
@@ -32,16 +31,16 @@ NetworkProfile build(const Credential& credential, const std::wstring& ssid, std
 
 }  // namespace
 
-int NetworkProfileMgr::findProfileByName(const std::wstring& name, NetworkProfile*& profile) const {
+ResultCode NetworkProfileMgr::findProfileByName(const std::wstring& name, NetworkProfile*& profile) const {
     const auto found = std::find_if(m_profiles.begin(), m_profiles.end(),
                                     [&](const auto& candidate) { return candidate->m_name == name; });
     profile = found == m_profiles.end() ? nullptr : found->get();
     return profile == nullptr ? kNotFound : kSuccess;
 }
 
-int NetworkProfileMgr::addProfileFromCredential(const Credential& credential, const Hs20Network& network,
-                                                bool machineAuth, const std::wstring& domain,
-                                                NetworkProfile*& profile) {
+ResultCode NetworkProfileMgr::addProfileFromCredential(const Credential& credential,
+                                                       const Hs20Network& network, bool machineAuth,
+                                                       const std::wstring& domain, NetworkProfile*& profile) {
     profile = nullptr;
     if (credential.m_id <= 0) {
         Log(6, "ERROR: Invalid credential id=%d", credential.m_id);
@@ -52,7 +51,7 @@ int NetworkProfileMgr::addProfileFromCredential(const Credential& credential, co
         return kFailure;
     }
     const std::wstring ssid = wideFromNarrow(network.ssid());
-    int result = kFailure;
+    ResultCode result = kFailure;
     if (credential.m_eapMethod == kEapMethodTtls)
         result = addEapTtlsProfile(credential, ssid, domain, profile);
     else if (credential.m_eapMethod == kEapMethodTls)
@@ -64,8 +63,8 @@ int NetworkProfileMgr::addProfileFromCredential(const Credential& credential, co
     return kFailure;
 }
 
-int NetworkProfileMgr::addEapTlsProfile(const Credential& credential, const std::wstring& ssid,
-                                        bool machineAuth, NetworkProfile*& profile) {
+ResultCode NetworkProfileMgr::addEapTlsProfile(const Credential& credential, const std::wstring& ssid,
+                                               bool machineAuth, NetworkProfile*& profile) {
     Log(2, "Adding a new EAP-TLS network profile with auth mode=%s...",
         machineAuth ? "machine" : "machineOrUser");
     const std::wstring eapText =
@@ -77,8 +76,8 @@ int NetworkProfileMgr::addEapTlsProfile(const Credential& credential, const std:
     return kSuccess;
 }
 
-int NetworkProfileMgr::addEapTtlsProfile(const Credential& credential, const std::wstring& ssid,
-                                         const std::wstring& domain, NetworkProfile*& profile) {
+ResultCode NetworkProfileMgr::addEapTtlsProfile(const Credential& credential, const std::wstring& ssid,
+                                                const std::wstring& domain, NetworkProfile*& profile) {
     Log(2, "Adding a new EAP-TTLS network profile...");
     LogWide(3, L"\tUsername=%s, password=%s", credential.m_username.c_str(), credential.m_password.c_str());
     if (credential.m_username.empty()) return kInvalidArgument;
@@ -114,7 +113,7 @@ bool NetworkProfileMgr::deleteProfile(std::int32_t id) {
     return true;
 }
 
-int NetworkProfileMgr::deleteProfilesOfCredential(std::int32_t credId) {
+ResultCode NetworkProfileMgr::deleteProfilesOfCredential(std::int32_t credId) {
     if (credId < 1) {
         Log(6, "ERROR: Invalid credential id=%d", credId);
         return kInvalidArgument;

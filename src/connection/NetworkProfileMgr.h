@@ -7,6 +7,7 @@
 
 #include "base/NetworkListLock.h"
 #include "config/Credential.h"
+#include "config/ResultCodes.h"
 #include "hotspot/Hs20Network.h"
 
 namespace vexa {
@@ -27,26 +28,28 @@ struct NetworkProfile {
 class NetworkProfileMgr {
 public:
     /// kSuccess, or kNotFound with `profile` null.
-    int findProfileByName(const std::wstring& name, NetworkProfile*& profile) const REQUIRES(g_hs20Lock);
+    ResultCode findProfileByName(const std::wstring& name, NetworkProfile*& profile) const
+        REQUIRES(g_hs20Lock);
 
     /// Builds a profile and adds it. `domain` is what an EAP-TTLS profile carries as such. kFailure, with
     /// `profile` null, for a credential or a network that gives none. The list keeps the profile.
-    int addProfileFromCredential(const Credential& credential, const Hs20Network& network, bool machineAuth,
-                                 const std::wstring& domain, NetworkProfile*& profile) REQUIRES(g_hs20Lock);
+    ResultCode addProfileFromCredential(const Credential& credential, const Hs20Network& network,
+                                        bool machineAuth, const std::wstring& domain,
+                                        NetworkProfile*& profile) REQUIRES(g_hs20Lock);
 
     /// False for an id below 1; one that isn't there changes nothing.
     bool deleteProfile(std::int32_t id) REQUIRES(g_hs20Lock);
 
     /// kSuccess, or kInvalidArgument for an id below 1.
-    int deleteProfilesOfCredential(std::int32_t credId) REQUIRES(g_hs20Lock);
+    ResultCode deleteProfilesOfCredential(std::int32_t credId) REQUIRES(g_hs20Lock);
 
     void clear() REQUIRES(g_hs20Lock) { m_profiles.clear(); }
 
 private:
-    int addEapTlsProfile(const Credential& credential, const std::wstring& ssid, bool machineAuth,
-                         NetworkProfile*& profile) REQUIRES(g_hs20Lock);
-    int addEapTtlsProfile(const Credential& credential, const std::wstring& ssid, const std::wstring& domain,
-                          NetworkProfile*& profile) REQUIRES(g_hs20Lock);
+    ResultCode addEapTlsProfile(const Credential& credential, const std::wstring& ssid, bool machineAuth,
+                                NetworkProfile*& profile) REQUIRES(g_hs20Lock);
+    ResultCode addEapTtlsProfile(const Credential& credential, const std::wstring& ssid,
+                                 const std::wstring& domain, NetworkProfile*& profile) REQUIRES(g_hs20Lock);
     NetworkProfile* add(NetworkProfile profile) REQUIRES(g_hs20Lock);
     void sortByPriority() REQUIRES(g_hs20Lock);
 

@@ -3,9 +3,6 @@
 #include <cassert>
 
 #include "base/DiagnosticLog.h"
-#include "base/WlanMemory.h"
-#include "config/Config.h"
-#include "config/ResultCodes.h"
 #include "connection/SupplicantMgr.h"
 #include "platform/Guid.h"
 
@@ -14,30 +11,6 @@ namespace vexa {
 namespace {
 
 using platform::LockGuard;
-
-constexpr std::array<const char*, 14> kStateNames = {
-    "InvalidState", "Initialized",       "Connecting",        "Connected",      "Disconnecting",
-    "Disconnected", "InterfaceDisabled", "Scanning",          "Authenticating", "Associating",
-    "Associated",   "Disassociating",    "Auth4WayHandshake", "GroupHandshake"};
-
-SupplicantState stateOf(WLAN_INTERFACE_STATE state) {
-    switch (state) {
-        case wlan_interface_state_connected:
-            return SupplicantState::Connected;
-        case wlan_interface_state_disconnecting:
-            return SupplicantState::Disconnecting;
-        case wlan_interface_state_disconnected:
-            return SupplicantState::Disconnected;
-        case wlan_interface_state_associating:
-            return SupplicantState::Associating;
-        case wlan_interface_state_discovering:
-            return SupplicantState::Scanning;
-        case wlan_interface_state_authenticating:
-            return SupplicantState::Authenticating;
-        default:
-            return SupplicantState::InvalidState;
-    }
-}
 
 // What only the WLAN service can make true.
 bool isClaim(SupplicantState state) {
@@ -54,40 +27,34 @@ const char* onOrOff(bool on) {
 
 }  // namespace
 
-const char* nameOf(SupplicantState state) {
-    return kStateNames[static_cast<std::size_t>(state)];
-}
-
-Supplicant::Supplicant(const GUID& interfaceGuid, SupplicantMgr* mgr)
-    : m_interfaceGuid(interfaceGuid), m_pMgr(mgr), m_lastHs20ToggleTime(getTimeValue()) {
+Supplicant::Supplicant(const GUID& interfaceGuid, SupplicantMgr& mgr)
+    : m_mgr(mgr), m_engine(mgr.config()), m_wlan(interfaceGuid), m_lastHs20ToggleTime(getTimeValue()) {
     m_lastHs20ToggleTime.seconds -= kLongBeforeStart;
 }
 
 Supplicant::~Supplicant() {
     m_interworkingMgr.stopIfInited();
-    closeWlanHandle();
 }
 
-int Supplicant::init() {
+void Supplicant::init() {
     Log(2, "Initializing supplicant...");
     if (const char* const error = initSteps()) {
         Log(6, "%s", error);
         Log(6, "ERROR: Initiailize supplicant failed.");
         deinit();
         m_interworkingMgr.stop();
-        closeWlanHandle();
-        return kSuccess;
+        m_wlan.close();
+        return;
     }
     m_bInitialized = true;
     Log(3, "Initialize supplicant succeeded.");
-    return kSuccess;
 }
 
 // The line of the step that failed; null if none did.
 const char* Supplicant::initSteps() {
-    logInterfaceGuid();
-    if (queryMacAddress() != kSuccess) return "ERROR: Query MAC address failed.";
-    if (!openWlanHandle()) return "ERROR: Open wlan handle failed.";
+    Log(2, "Interface GUID: %s", guidToString(m_wlan.guid()).c_str());
+    if (!m_ip.find(m_wlan.guid())) return "ERROR: Query MAC address failed.";
+    if (!m_wlan.open()) return "ERROR: Open wlan handle failed.";
     if (m_interworkingMgr.init() != kSuccess) return "ERROR: Failed to initi NetworkinMgr.";
     if (getHs20BssListFromIHV() != kSuccess)
         Log(6, "ERROR: Get HS20 network list failed in supplicant initialization.");
@@ -101,35 +68,10 @@ const char* Supplicant::initSteps() {
 
 // A connection that exists already is recorded as though it began now.
 void Supplicant::recordConnectionAtStart() {
-    DOT11_SSID ssid{};
-    MacAddress bssid{};
-    if (queryCurrentConnection(ssid, bssid, false) != kSuccess) return;
+    const auto connection = m_wlan.queryCurrentConnection(false);
+    if (!connection) return;
     const LockGuard lock(g_hs20Lock);
-    m_history.addConnection(ssid, bssid, m_networkList);
-}
-
-void Supplicant::logInterfaceGuid() const {
-    if (m_pMgr == nullptr) Log(6, "ERROR: No Config.");
-    Log(2, "Interface GUID: %s", guidToString(m_interfaceGuid).c_str());
-}
-
-bool Supplicant::openWlanHandle() {
-    HANDLE handle = nullptr;
-    DWORD negotiated = 0;
-    if (WlanOpenHandle(kWlanClientVersion, nullptr, &negotiated, &handle) != ERROR_SUCCESS) {
-        Log(3, "WlanOpenHandle failed in supplicant initialization.");
-        return false;
-    }
-    if (handle == nullptr || handle == INVALID_HANDLE_VALUE) {
-        Log(3, "Invalid WLAN handle value.");
-        return false;
-    }
-    m_hWlan = handle;
-    return true;
-}
-
-void Supplicant::closeWlanHandle() {
-    if (const HANDLE handle = m_hWlan.exchange(nullptr)) WlanCloseHandle(handle, nullptr);
+    m_history.addConnection(connection->ssid, connection->bssid, m_engine.m_networkList);
 }
 
 void Supplicant::deinit() {
@@ -139,104 +81,65 @@ void Supplicant::deinit() {
     m_interworkingMgr.stop();
     {
         const LockGuard lock(g_hs20Lock);
-        m_retryHelper.clear();
+        m_engine.m_retryHelper.clear();
     }
-    closeWlanHandle();
+    m_wlan.close();
     m_bInitialized = false;
     Log(3, "Deinitialize supplicant completed.");
 }
 
 void Supplicant::reset() {
     const LockGuard lock(g_hs20Lock);
-    m_bConnectionStarted = false;
+    m_engine.m_bConnectionStarted = false;
     m_bManualConnectStarted = false;
     m_connectingSsid.clear();
     m_triedCredentialIds.clear();
     m_bManualConnectPending = false;
     m_pendingManualSsid.clear();
-    m_bQueryingAnqp = false;
+    m_engine.m_bQueryingAnqp = false;
     m_bRoaming = false;
     m_bConnectionStartedByOs = false;
     m_bHs20Connected = false;
-    m_blockedNetworks.clear();
-    m_profileMgr.clear();
-    m_retryHelper.resetAllNumRetries();
+    m_engine.m_blockedNetworks.clear();
+    m_engine.m_profileMgr.clear();
+    m_engine.m_retryHelper.resetAllNumRetries();
 }
 
-int Supplicant::setState(SupplicantState state) {
+void Supplicant::setState(SupplicantState state) {
     const LockGuard lock(g_hs20Lock);
-    if (m_state == state) return kSuccess;
-    if (const SupplicantState live = queryState(); isClaim(state) && live != state) return kSuccess;
+    if (m_state == state) return;
+    if (const SupplicantState live = queryState(); isClaim(state) && live != state) return;
     Log(3, "Supplicant state changed from %s to %s", nameOf(m_state), nameOf(state));
     m_state = state;
-    m_hSupplicantStateChangedEvent.set();
-    return kSuccess;
-}
-
-SupplicantState Supplicant::queryState() const {
-    const auto state = queryInterface<WLAN_INTERFACE_STATE>(
-        m_hWlan, m_interfaceGuid, wlan_intf_opcode_interface_state, sizeof(WLAN_INTERFACE_STATE));
-    if (state) return stateOf(*state);
-    Log(3, "WlanQueryInterface failed in Supplicant::queryState.");
-    return SupplicantState::InvalidState;
+    m_engine.m_hSupplicantStateChangedEvent.set();
 }
 
 void Supplicant::setRadioState(bool on) {
     if (m_bRadioOn == on) return;
     Log(3, "Radio state changed from %s == > %s", onOrOff(m_bRadioOn), onOrOff(on));
     m_bRadioOn = on;
-    m_hRadioStateChangedEvent.set();
-}
-
-bool Supplicant::isRadioOn() const {
-    const auto radio = queryInterface<WLAN_RADIO_STATE>(m_hWlan, m_interfaceGuid,
-                                                        wlan_intf_opcode_radio_state, kMinimumRadioState);
-    return !radio || radio->PhyRadioState[0].dot11SoftwareRadioState != dot11_radio_state_off;
+    m_engine.m_hRadioStateChangedEvent.set();
 }
 
 bool Supplicant::isHs20Enabled() const {
-    return m_pMgr == nullptr || m_pMgr->config().m_bHotSpotAutoConnect;
+    return m_engine.m_config.m_bHotSpotAutoConnect;
+}
+
+void Supplicant::setHs20Enabled(bool enable) {
+    if (isHs20Enabled() == enable) return;
+    m_lastHs20ToggleTime = getTimeValue();
+    m_engine.m_config.m_bHotSpotAutoConnect = enable;
+    m_engine.m_retryHelper.resetAllNumRetries();
+    m_engine.m_hEnableHs20Event.set();
+    sendNetworkList();
+    if (enable) return;
+    Log(3,
+        "STA is in connected state when user turns of HS20,trying to disconnect from any connected HS20 network.");
+    if (m_bHs20Connected) disconnectedBSS(Leave::Hs20);
 }
 
 void Supplicant::tellClient(const std::function<void(const ClientEvents&)>& tell) {
-    if (m_pMgr != nullptr && m_pMgr->clientEvents().isComplete()) tell(m_pMgr->clientEvents());
-}
-
-int Supplicant::getCredential(std::int32_t id, Credential*& credential) {
-    if (m_pMgr == nullptr) return kFailure;
-    if (id < 1) return kInvalidArgument;
-    credential = m_pMgr->config().credentials().findCredentialById(id);
-    return kSuccess;
-}
-
-int Supplicant::deleteCredential(std::int32_t id) {
-    Log(3, "Deleting the credential with id=%d", id);
-    if (m_pMgr == nullptr) return kFailure;
-    Config& config = m_pMgr->config();
-    if (!config.credentials().deleteCredential(id)) return kFailure;
-    config.saveConfig();
-    m_retryHelper.removeAllCredNumRetryEntries(id);
-    m_profileMgr.deleteProfilesOfCredential(id);
-    m_hCredentialChangedEvent.set();
-    return kSuccess;
-}
-
-int Supplicant::updateCredential(const CredentialInput& input) {
-    Log(3, "Updating the credential with id=%d", input.id);
-    Credential* credential = nullptr;
-    if (getCredential(input.id, credential) != kSuccess || credential == nullptr) {
-        Log(6, "ERROR: Cannot find credential.");
-        return kFailure;
-    }
-    Config& config = m_pMgr->config();
-    if (!credential->m_bAutoConnect && input.autoConnect)
-        m_blockedNetworks.onCredentialAutoConnectChanged(input.id, config.credentials(), m_networkList);
-    if (config.credentials().updateCredential(input) != kSuccess) return kFailure;
-    config.saveConfig();
-    m_retryHelper.resetNumRetries(input.id);
-    m_profileMgr.deleteProfilesOfCredential(input.id);
-    m_hCredentialChangedEvent.set();
-    return kSuccess;
+    if (m_mgr.clientEvents().isComplete()) tell(m_mgr.clientEvents());
 }
 
 }  // namespace vexa

@@ -30,7 +30,7 @@ SupplicantMgr& SupplicantMgr::instance() {
     return manager.get();
 }
 
-int SupplicantMgr::init() {
+ResultCode SupplicantMgr::init() {
     platform::outputDebugString(L"[HS20]Start to initialize SupplicantMgr.\n");
     {
         const LockGuard lock(g_hs20Lock);
@@ -61,7 +61,7 @@ void SupplicantMgr::deinit() {
     m_bInitialized = false;
 }
 
-int SupplicantMgr::reloadData() {
+ResultCode SupplicantMgr::reloadData() {
     const LockGuard lock(g_hs20Lock);
     bool isChanged = false;
     if (m_config.readConfig(&isChanged) != kSuccess) return kFailure;
@@ -79,13 +79,13 @@ int SupplicantMgr::reloadData() {
 // Null if memory runs out.
 std::shared_ptr<Supplicant> SupplicantMgr::makeSupplicant(const GUID& guid) {
     try {
-        return std::make_shared<Supplicant>(guid, this);
+        return std::make_shared<Supplicant>(guid, *this);
     } catch (const std::bad_alloc&) {
         return nullptr;
     }
 }
 
-int SupplicantMgr::addSupplicantIfInterfaceExists() {
+ResultCode SupplicantMgr::addSupplicantIfInterfaceExists() {
     const LockGuard changes(m_changes);
     Log(4, "Enter addSupplicantIfInterfaceExists...");
     const auto guid = presentAdapter();
@@ -108,7 +108,7 @@ int SupplicantMgr::addSupplicantIfInterfaceExists() {
     return kSuccess;
 }
 
-int SupplicantMgr::removeSupplicantIfInterfaceRemoved() {
+ResultCode SupplicantMgr::removeSupplicantIfInterfaceRemoved() {
     const LockGuard changes(m_changes);
     Log(4, "Enter removeSupplicantIfInterfaceRemoved...");
     if (presentAdapter()) {
@@ -122,14 +122,14 @@ int SupplicantMgr::removeSupplicantIfInterfaceRemoved() {
     }
     supplicant->deinit();
     Log(4, "Start to remove HS20 supplicant.");
-    removeSupplicant(supplicant.get());
+    removeSupplicant(*supplicant);
     return kSuccess;
 }
 
 std::shared_ptr<Supplicant> SupplicantMgr::findSupplicantByGuid(const GUID& guid) {
     const LockGuard lock(m_listMutex);
     const auto found = std::find_if(m_supplicants.begin(), m_supplicants.end(), [&](const auto& supplicant) {
-        return areGuidsEqual(supplicant->m_interfaceGuid, guid);
+        return areGuidsEqual(supplicant->interfaceGuid(), guid);
     });
     return found == m_supplicants.end() ? nullptr : *found;
 }
@@ -140,12 +140,11 @@ std::shared_ptr<Supplicant> SupplicantMgr::findSupplicantToNotify(const GUID& gu
 }
 
 // Nothing is destroyed under the lock of the list.
-int SupplicantMgr::removeSupplicant(const Supplicant* supplicant) {
-    if (supplicant == nullptr) return kInvalidArgument;
+ResultCode SupplicantMgr::removeSupplicant(const Supplicant& supplicant) {
     std::shared_ptr<Supplicant> removed;
     const LockGuard lock(m_listMutex);
     const auto found = std::find_if(m_supplicants.begin(), m_supplicants.end(),
-                                    [&](const auto& candidate) { return candidate.get() == supplicant; });
+                                    [&](const auto& candidate) { return candidate.get() == &supplicant; });
     if (found == m_supplicants.end()) return kNotFound;
     removed = std::move(*found);
     m_supplicants.erase(found);

@@ -3,7 +3,6 @@
 #include <cstdlib>
 
 #include "base/DiagnosticLog.h"
-#include "base/WlanMemory.h"
 #include "channel/Envelope.h"
 #include "connection/SupplicantMgr.h"
 #include "text/NeverDestroyed.h"
@@ -17,10 +16,7 @@ SAHotSpotPortlink& SAHotSpotPortlink::instance() {
 }
 
 SAHotSpotPortlink::SAHotSpotPortlink() {
-    DWORD negotiated = 0;
-    HANDLE handle = nullptr;
-    WlanOpenHandle(kWlanClientVersion, nullptr, &negotiated, &handle);
-    m_hClientHandle = handle;
+    m_hClientHandle.open();
 
     const platform::LockGuard lock(g_hs20Lock);
     SupplicantMgr::instance().setClientEvents({
@@ -28,17 +24,16 @@ SAHotSpotPortlink::SAHotSpotPortlink() {
         [this] { SendDetectedHotspot(); },
         [this](const ConnectionResult& result) { SendConnectionResult(result); },
         [this] { SendInternetAccess(); },
-        [this] { return m_bRealmUpdatePending.exchange(false); },
     });
 }
 
 void SAHotSpotPortlink::close() {
-    if (const HANDLE handle = m_hClientHandle.exchange(nullptr)) WlanCloseHandle(handle, nullptr);
+    m_hClientHandle.close();
     if (const IpcHandle ipc = m_hIpc.exchange(0)) IpcClose(ipc);
 }
 
 void SAHotSpotPortlink::updateCardState() {
-    m_bCardIn = m_interfaceGuid.refresh(m_hClientHandle);
+    m_bCardIn = m_interfaceGuid.refresh(m_hClientHandle.get());
 }
 
 bool SAHotSpotPortlink::SendData(const std::string& data, const std::string& eventId) {

@@ -9,6 +9,7 @@
 
 #include "base/AdapterIdentity.h"
 #include "base/NetworkListLock.h"
+#include "base/WlanHandle.h"
 #include "channel/Ipc.h"
 #include "connection/ClientEvents.h"
 #include "platform/WlanApi.h"
@@ -64,14 +65,11 @@ public:
 
     std::atomic<bool> m_bCardIn{false};
     std::atomic<IpcHandle> m_hIpc{0};
-    std::atomic<HANDLE> m_hClientHandle{nullptr};
     /// The adapter as the last successful check found it: the key of its Supplicant.
     SharedGuid m_interfaceGuid;
-    /// A realm update waits for the disconnection.
-    std::atomic<bool> m_bRealmUpdatePending{false};
 
 private:
-    void switchHotspot(Supplicant& supplicant, bool enable) REQUIRES(g_hs20Lock);
+    WlanHandle m_hClientHandle;
 };
 
 /// The Supplicant of the server's adapter, kept alive by the result; null if there is none.

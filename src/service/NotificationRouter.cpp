@@ -66,14 +66,11 @@ void onLinkChange(const Event& event) {
 }
 
 void onRoamingStart(const Event& event) {
-    if (const auto supplicant = supplicantOf(event)) supplicant->m_bRoaming = true;
+    if (const auto supplicant = supplicantOf(event)) supplicant->onRoamingStart();
 }
 
 void onRoamingEnd(const Event& event) {
-    const auto supplicant = supplicantOf(event);
-    if (!supplicant) return;
-    if (!supplicant->m_bRoaming.exchange(false))
-        Log(3, "Received wlan roaming ended event while not received wlan roaming not started event.");
+    if (const auto supplicant = supplicantOf(event)) supplicant->onRoamingEnd();
 }
 
 template <class Data>
@@ -99,7 +96,7 @@ void onRadioChange(const Event& event) {
 /// What the handlers read of a connection's data ends with the reason.
 constexpr std::size_t kLeastConnectionData = offsetof(WLAN_CONNECTION_NOTIFICATION_DATA, dwFlags);
 
-template <int (Supplicant::*Handle)(const WLAN_CONNECTION_NOTIFICATION_DATA*)>
+template <ResultCode (Supplicant::*Handle)(const WLAN_CONNECTION_NOTIFICATION_DATA*)>
 void onConnection(const Event& event) {
     const auto supplicant = supplicantOf(event);
     if (!supplicant) return;
@@ -166,7 +163,7 @@ void dispatchIhv(const Event& event) {
     const Bytes message(static_cast<const std::byte*>(notification.pData), notification.dwDataSize);
     switch (readLittleEndian<std::uint32_t>(message, 0)) {
         case HS20_MODULE_SIGNATURE:
-            onHs20IhvNotification(&notification);
+            onHs20IhvNotification(notification);
             return;
         case kSpectralSignature:
             event.spectral.HandleFullScanIndication(message);
@@ -195,13 +192,12 @@ void WINAPI onWlanNotification(PWLAN_NOTIFICATION_DATA pNotifData, PVOID pServer
 }
 
 // Without a Supplicant no message of the hotspot module has any effect.
-bool onHs20IhvNotification(const WLAN_NOTIFICATION_DATA* pNotifData) {
-    if (pNotifData == nullptr) return false;
+bool onHs20IhvNotification(const WLAN_NOTIFICATION_DATA& notification) {
     SAHotSpotPortlink& hotspot = SAHotSpotPortlink::instance();
     const auto supplicant = SupplicantMgr::instance().findSupplicantToNotify(hotspot.m_interfaceGuid.get());
-    if (!supplicant || pNotifData->pData == nullptr) return false;
+    if (!supplicant || notification.pData == nullptr) return false;
     const IhvMessage message =
-        parseIhvMessage({static_cast<const std::byte*>(pNotifData->pData), pNotifData->dwDataSize});
+        parseIhvMessage({static_cast<const std::byte*>(notification.pData), notification.dwDataSize});
     switch (message.subtype) {
         case IhvNotification::StateChanged:
             hotspot.SendSupplicantState(message.block);

@@ -11,6 +11,6 @@ void WINAPI onWlanNotification(PWLAN_NOTIFICATION_DATA pNotifData, PVOID pServer
 
 /// One message of the adapter's hotspot module, of 16 bytes at least. False if there is no Supplicant or no
 /// data.
-bool onHs20IhvNotification(const WLAN_NOTIFICATION_DATA* pNotifData);
+bool onHs20IhvNotification(const WLAN_NOTIFICATION_DATA& notification);
 
 }  // namespace vexa

@@ -35,7 +35,7 @@ void removePresentSupplicant(SupplicantMgr& manager) {
     const auto supplicant = guid ? manager.findSupplicantByGuid(*guid) : nullptr;
     if (!supplicant) return;
     supplicant->deinit();
-    manager.removeSupplicant(supplicant.get());
+    manager.removeSupplicant(*supplicant);
 }
 
 }  // namespace
@@ -46,7 +46,7 @@ int runService(const std::wstring* commandLine) {
     if (instanceMutex->existedBefore()) return kExitNormal;
 
     SupplicantMgr& manager = SupplicantMgr::instance();
-    if (manager.init() != 0) {
+    if (manager.init() != kSuccess) {
         Log(4, "Initialize SupplicantMgr failed.");
         return kExitFailed;
     }

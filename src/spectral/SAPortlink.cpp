@@ -22,13 +22,6 @@ using namespace std::chrono_literals;
 constexpr auto kScanWatchdog = 10000ms;
 constexpr std::uint16_t kSocketVersion = 0x0202;
 
-HANDLE openWlanHandle(DWORD& result) {
-    HANDLE handle = nullptr;
-    DWORD negotiated = 0;
-    result = WlanOpenHandle(kWlanClientVersion, nullptr, &negotiated, &handle);
-    return handle;
-}
-
 struct Command {
     std::string_view id;
     void (*act)(SAPortlink& server);
@@ -49,35 +42,27 @@ constexpr std::array<Command, 4> kCommands = {{
 }  // namespace
 
 SAPortlink::SAPortlink(WLAN_NOTIFICATION_CALLBACK onNotification) {
-    DWORD result = ERROR_SUCCESS;
-    m_hWlan = openWlanHandle(result);
-    if (result != ERROR_SUCCESS && m_hWlan != nullptr) {
-        WlanCloseHandle(m_hWlan, nullptr);
-        m_hWlan = nullptr;
-    }
+    m_hWlan.open();
     m_scanTimer = std::make_unique<platform::PeriodicTimer>("spectral timer", kScanWatchdog,
                                                             [this] { ScanTimerRoutine(); });
-    m_hClientHandle = openWlanHandle(result);
-    if (result != ERROR_SUCCESS) outputDebugString(L"WlanOpenHandle!=ERROR_SUCCESS");
-    if (m_hClientHandle == nullptr || m_hClientHandle == INVALID_HANDLE_VALUE)
+    if (m_hClientHandle.open() != ERROR_SUCCESS) outputDebugString(L"WlanOpenHandle!=ERROR_SUCCESS");
+    if (m_hClientHandle.get() == nullptr)
         outputDebugString(L"NULL == m_hClientHandle || INVALID_HANDLE_VALUE == m_hClientHandle");
     updateCardState();
     if (!platform::startSocketLibrary(kSocketVersion)) outputDebugString(L"Error at WSAStartup()\n");
-    if (m_hWlan != nullptr)
-        WlanRegisterNotification(m_hWlan, WLAN_NOTIFICATION_SOURCE_ALL, FALSE, onNotification, this, nullptr,
-                                 nullptr);
+    if (m_hWlan.get() != nullptr)
+        WlanRegisterNotification(m_hWlan.get(), WLAN_NOTIFICATION_SOURCE_ALL, FALSE, onNotification, this,
+                                 nullptr, nullptr);
 }
 
 SAPortlink::~SAPortlink() {
     assert(!m_cs.isHeldByThisThread() && !g_hs20Lock.isHeldByThisThread());
     if (const IpcHandle ipc = m_hIpc.exchange(0)) IpcClose(ipc);
     platform::stopSocketLibrary();
-    if (m_hWlan != nullptr)
-        WlanRegisterNotification(m_hWlan, WLAN_NOTIFICATION_SOURCE_NONE, FALSE, nullptr, nullptr, nullptr,
-                                 nullptr);
+    if (m_hWlan.get() != nullptr)
+        WlanRegisterNotification(m_hWlan.get(), WLAN_NOTIFICATION_SOURCE_NONE, FALSE, nullptr, nullptr,
+                                 nullptr, nullptr);
     m_scanTimer.reset();
-    if (m_hWlan != nullptr) WlanCloseHandle(m_hWlan, nullptr);
-    if (m_hClientHandle != nullptr) WlanCloseHandle(m_hClientHandle, nullptr);
 }
 
 void SAPortlink::OnIpcMessage(const char* bytes, std::uint32_t length, void* context) {
@@ -104,8 +89,8 @@ std::vector<std::uint8_t> SAPortlink::HandleCommand(int code) {
 }
 
 std::uint8_t SAPortlink::QueryCurrentChannel() {
-    const auto channel =
-        queryInterface<ULONG>(m_hWlan, m_interfaceGuid.get(), wlan_intf_opcode_channel_number, sizeof(ULONG));
+    const auto channel = queryInterface<ULONG>(m_hWlan.get(), m_interfaceGuid.get(),
+                                               wlan_intf_opcode_channel_number, sizeof(ULONG));
     return channel ? static_cast<std::uint8_t>(*channel & 0xFF) : std::uint8_t{0};
 }
 

@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "base/AdapterIdentity.h"
+#include "base/WlanHandle.h"
 #include "channel/Ipc.h"
 #include "platform/Mutex.h"
 #include "platform/PeriodicTimer.h"
@@ -63,7 +64,7 @@ public:
     void SendChannelList() EXCLUDES(m_cs);
 
     /// Asks anew whether the adapter is present; keeps the last GUID if it is not.
-    void updateCardState() { m_bCardIn = m_interfaceGuid.refresh(m_hClientHandle); }
+    void updateCardState() { m_bCardIn = m_interfaceGuid.refresh(m_hClientHandle.get()); }
 
     std::atomic<IpcHandle> m_hIpc{0};
     std::atomic<bool> m_bCardIn{false};
@@ -90,8 +91,8 @@ private:
     std::vector<int> m_noise GUARDED_BY(m_cs);
     std::vector<int> m_congestion GUARDED_BY(m_cs);
 
-    HANDLE m_hWlan = nullptr;          // notifications, requests, queries
-    HANDLE m_hClientHandle = nullptr;  // presence checks
+    WlanHandle m_hClientHandle;  // presence checks
+    WlanHandle m_hWlan;          // notifications, requests, queries
     std::atomic<bool> m_bScanning{false};
     std::unique_ptr<platform::PeriodicTimer> m_scanTimer;
 };

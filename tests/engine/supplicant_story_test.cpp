@@ -52,13 +52,14 @@ STORY(SupplicantStory, AnAdapterIsKnownHoweverItsIdentifierIsWritten,
 STORY(SupplicantStory, ASecondArrivalResetsIt, "{}") {
     const auto supplicant = supplicantOf(kFirst);
     const int before = handles(story);
-    supplicant->m_bRoaming = true;
+    supplicant->onRoamingStart();
     story.act("insertAdapter");
     story.expect("the same object", supplicant == supplicantOf(kFirst), true);
-    story.expect("roaming", supplicant->m_bRoaming.load(), false);
+    supplicant->onRoamingEnd();
     story.expect("handles", handles(story), before);
     story.expectLog("Supplicant with GUID already exists, skip adding.",
-                    "Going to reset the existed supplicant...");
+                    "Going to reset the existed supplicant...",
+                    "Received wlan roaming ended event while not received");
 }
 
 STORY(SupplicantStory, ARemovalWhileAnotherAdapterIsThereRemovesNothing, R"({"adapters":[{},{}]})") {
@@ -119,10 +120,9 @@ STORY(SupplicantStory, LookupsKeepTheirObjectAlive, "{}") {
     story.act("pullAdapter");
     expectState(story, "none");
     story.expect("the one that is kept", kept->isInitialized(), false);
-    kept->setState(SupplicantState::Initialized);
-    kept->m_hCredentialChangedEvent.set();
-    story.expect("removing it again", SupplicantMgr::instance().removeSupplicant(kept.get()), 2);
-    story.expect("removing none", SupplicantMgr::instance().removeSupplicant(nullptr), 4);
+    const WLAN_PHY_RADIO_STATE off{0, dot11_radio_state_off, dot11_radio_state_off};
+    kept->onRadioStateChanged(&off);
+    story.expect("removing it again", SupplicantMgr::instance().removeSupplicant(*kept) == kNotFound, true);
 }
 
 // The adapter comes and goes between and within the commands. Whatever the order of threads, what the client

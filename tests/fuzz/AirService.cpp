@@ -42,7 +42,7 @@ void AirService::answerNext(const char* request, Bytes bytes) {
 void AirService::checkList() {
     const LockGuard lock(g_hs20Lock);
     std::set<std::string> names;
-    for (const Hs20Network* network : m_supplicant->m_networkList.copyPointers()) {
+    for (const Hs20Network* network : m_supplicant->networks().copyPointers()) {
         require(names.emplace(network->ssid()).second, "one network for each name");
         require(network->m_ssidLength <= kMaxSsidLength, "a name has 32 bytes at most");
         for (const RealmInfo& realm : network->m_realms)

@@ -14,10 +14,10 @@ void notify(AirService& service, Block block) {
     writeLittleEndian(std::span(block), 0, HS20_MODULE_SIGNATURE);
     WLAN_NOTIFICATION_DATA notification{};
     notification.NotificationSource = WLAN_NOTIFICATION_SOURCE_IHV;
-    notification.InterfaceGuid = service.supplicant().m_interfaceGuid;
+    notification.InterfaceGuid = service.supplicant().interfaceGuid();
     notification.dwDataSize = static_cast<DWORD>(block.size());
     notification.pData = block.data();
-    require(onHs20IhvNotification(&notification), "a message for a supplicant is taken");
+    require(onHs20IhvNotification(notification), "a message for a supplicant is taken");
     service.checkList();
 }
 

@@ -59,8 +59,8 @@ void StoreMachine::add(const std::wstring& realm) {
     m_config.advanceNextCredId();
 }
 
-int open(Config& config, bool* isChanged) {
-    const int result = config.initPaths();
+ResultCode open(Config& config, bool* isChanged) {
+    const ResultCode result = config.initPaths();
     return result != kSuccess ? result : config.readConfig(isChanged);
 }
 

@@ -43,8 +43,8 @@ private:
     Config m_config;
 };
 
-/// Finds the paths and reads the file. The result of what failed, or 0.
-int open(Config& config, bool* isChanged = nullptr);
+/// Finds the paths and reads the file. The result of what failed, or kSuccess.
+ResultCode open(Config& config, bool* isChanged = nullptr);
 
 /// The table as text: "3:1 1:2" for id 3 in place 1 and id 1 in place 2.
 std::string places(const CredentialTable& table);

@@ -43,7 +43,7 @@ TEST(CredentialTable, RefusesWhatCannotBeAdded) {
     struct Case {
         const char* why;
         CredentialInput input;
-        int result;
+        ResultCode result;
         std::int32_t nextId = 9;
         const wchar_t* user = L"c";
     };

@@ -14,14 +14,14 @@ using namespace std::string_literals;
 /// One file of the store, as a document.
 class XmlFile : public testing::Test {
 protected:
-    int load(std::string_view content) {
+    ResultCode load(std::string_view content) {
         m_machine.write("x.xml", content);
         m_document.release();
         m_document.create();
         return m_document.load(path());
     }
 
-    int save() { return m_document.save(path()); }
+    ResultCode save() { return m_document.save(path()); }
     std::string saved() { return m_machine.read("x.xml"); }
 
     void saveAndLoad() {

@@ -78,7 +78,7 @@ TEST_F(EngineMemory, ACredentialThatIsNewOrMayConnectNowOpensWhatItFits) {
     struct Case {
         Change change;
         std::int32_t id;
-        int result;
+        ResultCode result;
         const char* blocked;
         const char* line;
     };

@@ -78,7 +78,7 @@ protected:
                         bool isForMachine = false, const std::wstring& domain = L"") {
         const Hs20Network network(Hs20BssRecord{{1, 2, 3, 4, 5, 6}, ssid, 1, 2, 1});
         NetworkProfile* added = nullptr;
-        const int result =
+        const ResultCode result =
             m_profiles.addProfileFromCredential(credential, network, isForMachine, domain, added);
         EXPECT_EQ(result, added == nullptr ? kFailure : kSuccess);
         return added;

@@ -1,5 +1,4 @@
 #include "base/DiagnosticLog.h"
-#include "config/ResultCodes.h"
 #include "connection/Supplicant.h"
 
 namespace vexa {
@@ -12,29 +11,18 @@ constexpr std::size_t kRealmLengthSize = 4;
 
 }  // namespace
 
-DWORD Supplicant::callIhv(std::vector<std::byte> request, std::vector<std::byte>* reply) const {
-    DWORD returned = 0;
-    if (reply != nullptr) reply->assign(kIhvReplySize, std::byte{0});
-    const DWORD result = WlanIhvControl(m_hWlan, &m_interfaceGuid, wlan_ihv_control_type_service,
-                                        static_cast<DWORD>(request.size()), request.data(),
-                                        reply == nullptr ? 0 : static_cast<DWORD>(reply->size()),
-                                        reply == nullptr ? nullptr : reply->data(), &returned);
-    if (reply != nullptr) reply->resize(std::min<std::size_t>(returned, reply->size()));
-    return result;
-}
-
-int Supplicant::sendIhvCmd() {
-    const DWORD result = callIhv(ihvRequest(IhvRequest::QueryAnqp), nullptr);
+ResultCode Supplicant::sendIhvCmd() {
+    const DWORD result = m_wlan.tellModule(ihvRequest(IhvRequest::QueryAnqp));
     if (result == ERROR_SUCCESS) return kSuccess;
     Log(3, "WlanIhvControl call failed in sendIhvCmd with result code=%d", static_cast<int>(result));
     return kFailure;
 }
 
-int Supplicant::getHs20BssListFromIHV() {
+ResultCode Supplicant::getHs20BssListFromIHV() {
     const LockGuard lock(g_hs20Lock);
     Log(3, "Get HS20 BSS list from IHV.");
     std::vector<std::byte> reply;
-    const DWORD result = callIhv(ihvRequest(IhvRequest::GetBssList), &reply);
+    const DWORD result = m_wlan.askModule(ihvRequest(IhvRequest::GetBssList), reply);
     if (result != ERROR_SUCCESS) {
         Log(3, "WlanIhvControl failed with error code=%d", static_cast<int>(result));
         return kFailure;
@@ -50,12 +38,11 @@ int Supplicant::getHs20BssListFromIHV() {
     return kFailure;
 }
 
-int Supplicant::fetchBssAnqpInfo(Hs20Network* network) {
-    if (network == nullptr) return kInvalidArgument;
+ResultCode Supplicant::fetchBssAnqpInfo(Hs20Network& network) {
     Log(3, "Fetching BSS with ssid=%s and mac address=%s  ANQP info from HS20 IHV...",
-        network->ssidText().c_str(), toText(network->m_macAddress).c_str());
+        network.ssidText().c_str(), toText(network.m_macAddress).c_str());
     std::vector<std::byte> reply;
-    if (callIhv(ihvRequest(IhvRequest::GetAnqpInfo, network->record()), &reply) != ERROR_SUCCESS) {
+    if (m_wlan.askModule(ihvRequest(IhvRequest::GetAnqpInfo, network.record()), reply) != ERROR_SUCCESS) {
         Log(3, "WlanIhvControl call failed.");
         return kFailure;
     }
@@ -75,16 +62,16 @@ int Supplicant::fetchBssAnqpInfo(Hs20Network* network) {
         return kSuccess;
     }
     const Bytes realms = Bytes(reply).subspan(kRealmLengthSize, realmLength);
-    network->m_anqpNaiRealm.assign(realms.begin(), realms.end());
-    network->parseRealmList();
+    network.m_anqpNaiRealm.assign(realms.begin(), realms.end());
+    network.parseRealmList();
     return kSuccess;
 }
 
-int Supplicant::queryHs20NetworkAnqpInfo() {
+ResultCode Supplicant::queryHs20NetworkAnqpInfo() {
     Log(3, "SIGMA: Enter Supplicant::queryHs20NetworkAnqpInfo.");
-    m_bQueryingAnqp = true;
+    m_engine.m_bQueryingAnqp = true;
     if (sendIhvCmd() != kSuccess) {
-        m_bQueryingAnqp = false;
+        m_engine.m_bQueryingAnqp = false;
         return kFailure;
     }
     Log(3, "Supplicant::queryHs20NetworkAnqpInfo completed.");

@@ -2,7 +2,6 @@
 #include "base/NetworkListLock.h"
 #include "channel/JsonText.h"
 #include "connection/Supplicant.h"
-#include "connection/SupplicantMgr.h"
 #include "hotspotport/SAHotSpotPortlink.h"
 
 namespace vexa {
@@ -16,9 +15,7 @@ constexpr int kAccessOffered = 2;
 
 int internetAccessCode(const Supplicant& supplicant, const Hs20Network& network, bool isConnected) {
     if (!isConnected) return network.m_internetAccess != 0 ? kAccessOffered : kNoWarning;
-    bool hasAccess = false;
-    supplicant.queryInternetAccess(hasAccess);
-    return hasAccess ? kNoWarning : kConnectedWithoutAccess;
+    return supplicant.hasInternetAccess() ? kNoWarning : kConnectedWithoutAccess;
 }
 
 Json::Value realmsAsJson(const Hs20Network& network) {
@@ -61,7 +58,7 @@ void SAHotSpotPortlink::SendNetworkList(Supplicant* supplicant) {
     if (!listed) return;
     Json::Value networks;
     if (supplicant->isRadioOnCached() && isEnabled)
-        for (const Hs20Network* network : listed->m_networkList.copyPointers())
+        for (const Hs20Network* network : listed->networks().copyPointers())
             networks.append(networkAsJson(*supplicant, *network, network == connected));
     const std::string text = toStyledText(networks);
     Log(0, "GET_ALL_NETWORK_LIST=%s", text.c_str());

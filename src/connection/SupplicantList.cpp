@@ -1,10 +1,7 @@
 #include <algorithm>
 
 #include "base/DiagnosticLog.h"
-#include "config/Config.h"
-#include "config/ResultCodes.h"
 #include "connection/Supplicant.h"
-#include "connection/SupplicantMgr.h"
 
 namespace vexa {
 
@@ -16,22 +13,27 @@ constexpr std::size_t kLeastAnqpPayload = 44;
 
 }  // namespace
 
-int Supplicant::updateHs20NetworkList(const std::vector<Hs20BssRecord>& records) {
+ResultCode Supplicant::updateHs20NetworkList(const std::vector<Hs20BssRecord>& records) {
     if (records.empty()) return kInvalidArgument;
     const LockGuard lock(g_hs20Lock);
-    const std::vector<MacAddress> oldMacs = m_networkList.macAddresses();
-    const Hs20NetworkList::Networks gone = m_networkList.replace(records);
-    for (Hs20Network* network : m_networkList.copyPointers())
-        if (fetchBssAnqpInfo(network) != kSuccess) Log(3, "Fetch ANQP info failed.");
-    m_networkList.processDuplicatedHs20Networks(oldMacs);
+    const std::vector<MacAddress> oldMacs = m_engine.m_networkList.macAddresses();
+    const Hs20NetworkList::Networks gone = m_engine.m_networkList.replace(records);
+    for (Hs20Network* network : m_engine.m_networkList.copyPointers())
+        if (fetchBssAnqpInfo(*network) != kSuccess) Log(3, "Fetch ANQP info failed.");
+    m_engine.m_networkList.processDuplicatedHs20Networks(oldMacs);
     Log(3, "\tSet events m_hHs20NetworkChangedEvent and m_hAnqpInfoReadyEvent.");
-    m_hHs20NetworkChangedEvent.set();
-    m_hAnqpInfoReadyEvent.set();
-    m_retryHelper.eraseUnavailableNetworks(m_networkList);
-    if (m_networkList.size() > oldMacs.size() && isHs20Enabled())
+    m_engine.m_hHs20NetworkChangedEvent.set();
+    m_engine.m_hAnqpInfoReadyEvent.set();
+    m_engine.m_retryHelper.eraseUnavailableNetworks(m_engine.m_networkList);
+    if (m_engine.m_networkList.size() > oldMacs.size() && isHs20Enabled())
         tellClient([](const ClientEvents& events) { events.sendDetectedHotspot(); });
     sendNetworkList();
     return kSuccess;
+}
+
+Hs20Network* Supplicant::getConnectedBss(bool includeConnecting) const {
+    const auto connection = m_wlan.queryCurrentConnection(includeConnecting);
+    return connection ? m_engine.m_networkList.findBySsid(bytesOf(connection->ssid)) : nullptr;
 }
 
 void Supplicant::sendNetworkList() {
@@ -40,27 +42,27 @@ void Supplicant::sendNetworkList() {
 
 bool Supplicant::hasUnfetchedAnqpInfo() const {
     const LockGuard lock(g_hs20Lock);
-    const auto networks = m_networkList.copyPointers();
+    const auto networks = m_engine.m_networkList.copyPointers();
     return std::any_of(networks.begin(), networks.end(),
                        [](const Hs20Network* network) { return !network->hasRealmData(); });
 }
 
-int Supplicant::onNetworkListChanged(Bytes payload) {
+ResultCode Supplicant::onNetworkListChanged(Bytes payload) {
     Log(3, "IHV reports HS20 network list changed.");
     if (updateHs20NetworkList(parseBssRecords(payload)) == kSuccess) return kSuccess;
     Log(6, "ERROR: Update HS20 network list failed.");
     return kFailure;
 }
 
-int Supplicant::onAnqpInfoChanged(Bytes payload) {
+ResultCode Supplicant::onAnqpInfoChanged(Bytes payload) {
     const LockGuard lock(g_hs20Lock);
     Log(3, "IHV reports HS20 BSS ANQP info changed.");
     if (payload.size() < kLeastAnqpPayload) return kFailure;
     const Hs20BssRecord record = parseBssRecord(payload);
     if (record.isHs20 != 1) return kSuccess;
-    Hs20Network* const network = m_networkList.findByMac(record.macAddress);
+    Hs20Network* const network = m_engine.m_networkList.findByMac(record.macAddress);
     if (network == nullptr) return kFailure;
-    return fetchBssAnqpInfo(network) == kSuccess ? kSuccess : kFailure;
+    return fetchBssAnqpInfo(*network);
 }
 
 // After a failed fetch the query counts as running: the connecting thread must not connect on what it knew
@@ -71,9 +73,9 @@ void Supplicant::onAnqpQueryCompleted() {
         Log(6, "Error: getHs20BssListFromIHV failed in hs20Associate.");
         return;
     }
-    if (!m_bQueryingAnqp) return;
+    if (!m_engine.m_bQueryingAnqp) return;
     Log(3, "ANQP querying finished.");
-    m_bQueryingAnqp = false;
+    m_engine.m_bQueryingAnqp = false;
 }
 
 }  // namespace vexa

@@ -4,7 +4,6 @@
 
 #include "base/DiagnosticLog.h"
 #include "channel/JsonText.h"
-#include "connection/Supplicant.h"
 #include "connection/SupplicantMgr.h"
 #include "hotspotport/CredentialCommands.h"
 #include "hotspotport/SAHotSpotPortlink.h"
@@ -39,8 +38,7 @@ bool changeCredentials(Server& server, const Json::Value& data) {
 }
 
 bool reload(Server& server, const Json::Value& /*data*/) {
-    const auto supplicant = hotspotSupplicant(server);
-    if (supplicant && supplicant->m_pMgr != nullptr) supplicant->m_pMgr->reloadData();
+    if (hotspotSupplicant(server)) SupplicantMgr::instance().reloadData();
     return true;
 }
 

@@ -3,8 +3,6 @@
 
 #include "base/DiagnosticLog.h"
 #include "base/WlanText.h"
-#include "config/Config.h"
-#include "config/ResultCodes.h"
 #include "connection/Supplicant.h"
 #include "connection/SupplicantMgr.h"
 #include "platform/Registry.h"
@@ -54,13 +52,13 @@ bool Supplicant::isOwnConnection(const WLAN_CONNECTION_NOTIFICATION_DATA& data) 
     return !m_connectingSsid.empty() && field.starts_with(m_connectingSsid);
 }
 
-int Supplicant::onConnectionStart(const WLAN_CONNECTION_NOTIFICATION_DATA* data) {
+ResultCode Supplicant::onConnectionStart(const WLAN_CONNECTION_NOTIFICATION_DATA* data) {
     if (data == nullptr) return kInvalidArgument;
     const LockGuard lock(g_hs20Lock);
     const std::wstring name = profileNameOf(*data);
     if (isOwnConnection(*data)) {
         LogWide(3, L"Connection start event: connection initiated by HS20, profile name=%s", name.c_str());
-        if (!m_bConnectionStarted)
+        if (!m_engine.m_bConnectionStarted)
             Log(6,
                 "ERROR: m_bConnectionStarted should be set to false after HS20 initiated a new connection.");
         if (m_bManualConnectStarted) Log(3, "Manual connection started.");
@@ -68,13 +66,13 @@ int Supplicant::onConnectionStart(const WLAN_CONNECTION_NOTIFICATION_DATA* data)
         LogWide(3, L"Connection start event: connection not initiated by HS20, profile name=%s",
                 name.c_str());
         m_bConnectionStartedByOs = true;
-        m_blockedNetworks.unblockRecentNetworks();
+        m_engine.m_blockedNetworks.unblockRecentNetworks();
     }
     m_bHs20Connected = false;
     return kSuccess;
 }
 
-int Supplicant::onConnectionComplete(const WLAN_CONNECTION_NOTIFICATION_DATA* data) {
+ResultCode Supplicant::onConnectionComplete(const WLAN_CONNECTION_NOTIFICATION_DATA* data) {
     const LockGuard lock(g_hs20Lock);
     std::uint32_t eapMethod = 0;
     const ScopeGuard atEnd([&] {
@@ -92,15 +90,15 @@ int Supplicant::onConnectionComplete(const WLAN_CONNECTION_NOTIFICATION_DATA* da
     return isOwnConnection(*data) ? onOwnResult(*data, eapMethod) : onForeignResult(*data);
 }
 
-int Supplicant::onOwnResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::uint32_t& eapMethod) {
+ResultCode Supplicant::onOwnResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::uint32_t& eapMethod) {
     const std::wstring name = profileNameOf(data);
     LogWide(3, L"Connection result initiated by HS20, clearing the cache, profile name=%s.", name.c_str());
     m_connectingSsid.clear();
-    m_bConnectionStarted = false;
+    m_engine.m_bConnectionStarted = false;
     if (m_bManualConnectPending) return carryOutPendingRequest();
-    m_hConnectionCompletedEvent.set();
+    m_engine.m_hConnectionCompletedEvent.set();
     NetworkProfile* profile = nullptr;
-    if (m_profileMgr.findProfileByName(name, profile) != kSuccess) {
+    if (m_engine.m_profileMgr.findProfileByName(name, profile) != kSuccess) {
         Log(6, "ERROR: Cannot get profile in profile manager.");
         return kFailure;
     }
@@ -108,7 +106,7 @@ int Supplicant::onOwnResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::
 }
 
 // The finished attempt leaves no trace; what the client hears comes from the new one.
-int Supplicant::carryOutPendingRequest() {
+ResultCode Supplicant::carryOutPendingRequest() {
     Log(3, "###User manual connecting request pending, we are going to connect now.###");
     if (m_pendingManualSsid.empty()) return kFailure;
     const bool isStarted = connectBssNow(m_pendingManualSsid) == kSuccess;
@@ -118,16 +116,16 @@ int Supplicant::carryOutPendingRequest() {
     return kSuccess;
 }
 
-int Supplicant::onSuccess(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const NetworkProfile& profile,
-                          std::uint32_t& eapMethod) {
+ResultCode Supplicant::onSuccess(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const NetworkProfile& profile,
+                                 std::uint32_t& eapMethod) {
     LogWide(3, L"Connection succeeded! profile name=%s", profile.m_name.c_str());
     const std::string_view ssid = bytesOf(data.dot11Ssid);
     m_bHs20Connected = true;
     setState(SupplicantState::Connected);
     clearNumRetriesOnConnSuccess(profile.m_name, ssid);
-    const Hs20Network* const network = m_networkList.findBySsid(ssid);
+    const Hs20Network* const network = m_engine.m_networkList.findBySsid(ssid);
     if (network == nullptr) return kFailure;
-    if (m_history.addConnection(data.dot11Ssid, network->m_macAddress, m_networkList) != kSuccess)
+    if (m_history.addConnection(data.dot11Ssid, network->m_macAddress, m_engine.m_networkList) != kSuccess)
         Log(6, "ERROR: Create connection history failed.");
     eapMethod = static_cast<std::uint32_t>(profile.m_eapMethod);
     return endAttempt(data, ConnectionResult::kSucceeded);
@@ -135,13 +133,14 @@ int Supplicant::onSuccess(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const N
 
 void Supplicant::clearNumRetriesOnConnSuccess(const std::wstring& profileName, std::string_view ssid) {
     Log(3, ">>>>Clear cred num retries on conn success: profileName=%s", narrowFromWide(profileName).c_str());
-    if (m_networkList.findBySsid(ssid) == nullptr || m_pMgr == nullptr) return;
+    if (m_engine.m_networkList.findBySsid(ssid) == nullptr) return;
     NetworkProfile* profile = nullptr;
-    if (m_profileMgr.findProfileByName(profileName, profile) == kSuccess && profile->m_credId >= 1)
-        m_retryHelper.setNumRetries(profile->m_credId, ssid, 0);
+    if (m_engine.m_profileMgr.findProfileByName(profileName, profile) == kSuccess && profile->m_credId >= 1)
+        m_engine.m_retryHelper.setNumRetries(profile->m_credId, ssid, 0);
 }
 
-int Supplicant::onFailure(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const NetworkProfile& profile) {
+ResultCode Supplicant::onFailure(const WLAN_CONNECTION_NOTIFICATION_DATA& data,
+                                 const NetworkProfile& profile) {
     LogWide(3, L"Connection failed! profile name=%s", profile.m_name.c_str());
     setState(SupplicantState::Disconnected);
     if (m_bUserDisconnecting) return endAttempt(data, ConnectionResult::kFailed);
@@ -150,36 +149,12 @@ int Supplicant::onFailure(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const N
     return report(data, ConnectionResult::kFailed);
 }
 
-int Supplicant::tryNextCredential(const WLAN_CONNECTION_NOTIFICATION_DATA& data) {
-    Log(3, "Manual connection failed, we will try to use next credential.");
-    int connResult = 0;
-    const int result = tryConnectHs20BssUsingNextCredential(bytesOf(data.dot11Ssid), connResult);
-    Log(3, "connResult=%d after invoking tryConnectHs20BssUsingNextCredential.", connResult);
-    if (result == kFailure) {
-        Log(6, "ERROR: Try to connect to HS20 network using next credential failed.");
-        return kFailure;
-    }
-    if (result == kSuccess && connResult == kConnectStarted) {
-        LogWide(3, L"Successfully initiated connection to HS20 network=%s using next credential.",
-                wideFromNarrow(bytesOf(data.dot11Ssid)).c_str());
-        return kSuccess;
-    }
-    if (result == kNetworkGone)
-        Log(3, "WARNING: The network we were connecting is no longer available, a naughty network!");
-    else if (result != kSuccess)
-        Log(6, "Unexpected error code.");
-    else if (connResult == kConnectNothingLeft)
-        Log(3, "We have tried all credentials, connection failed.");
-    else
-        Log(6, "ERROR: Invalid ret code.");
-    return endAttempt(data, ConnectionResult::kFailed);
-}
-
 // Once per attempt: the new profile is one for the machine, and its failure goes on with the next credential.
-int Supplicant::tryMachineMode(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const NetworkProfile& failed) {
+ResultCode Supplicant::tryMachineMode(const WLAN_CONNECTION_NOTIFICATION_DATA& data,
+                                      const NetworkProfile& failed) {
     Log(3,
         "Connection using EAP-TLS with authMode=machineOrUser failed,trying to use EAP-TLS with authMode=machine.");
-    const Hs20Network* const network = m_networkList.findBySsid(bytesOf(data.dot11Ssid));
+    const Hs20Network* const network = m_engine.m_networkList.findBySsid(bytesOf(data.dot11Ssid));
     if (network == nullptr) {
         Log(6, "ERROR: Cannot get the BSS when connection failed.");
         return kFailure;
@@ -188,26 +163,26 @@ int Supplicant::tryMachineMode(const WLAN_CONNECTION_NOTIFICATION_DATA& data, co
         Log(6, "ERROR: Invalid credential id.");
         return kFailure;
     }
-    Credential* credential = nullptr;
-    if (getCredential(failed.m_credId, credential) != kSuccess || credential == nullptr) {
+    const Credential* const credential = findCredential(failed.m_credId);
+    if (credential == nullptr) {
         Log(6, "ERROR: Cannot get credential.");
         return kFailure;
     }
-    m_profileMgr.deleteProfile(failed.m_id);
+    m_engine.m_profileMgr.deleteProfile(failed.m_id);
     NetworkProfile* profile = nullptr;
-    if (m_profileMgr.addProfileFromCredential(*credential, *network, true, m_pMgr->config().homeRealm(),
-                                              profile) != kSuccess) {
+    if (m_engine.m_profileMgr.addProfileFromCredential(*credential, *network, true,
+                                                       m_engine.m_config.homeRealm(), profile) != kSuccess) {
         Log(6, "ERROR: Cannot add network profile.");
         return kFailure;
     }
-    if (connectToNetwork(network, profile) != kSuccess) {
+    if (connectToNetwork(*network, *profile) != kSuccess) {
         Log(6, "ERROR: Connect to network failed.");
         return kFailure;
     }
     return kSuccess;
 }
 
-int Supplicant::endAttempt(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::uint32_t outcome) {
+ResultCode Supplicant::endAttempt(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::uint32_t outcome) {
     if (m_bManualConnectStarted) {
         m_bManualConnectStarted = false;
         m_triedCredentialIds.clear();
@@ -215,7 +190,7 @@ int Supplicant::endAttempt(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::u
     return report(data, outcome);
 }
 
-int Supplicant::report(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::uint32_t outcome) {
+ResultCode Supplicant::report(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::uint32_t outcome) {
     ConnectionResult result;
     result.m_result = outcome;
     result.m_profileName = profileNameOf(data);
@@ -229,7 +204,7 @@ int Supplicant::report(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::uint3
 }
 
 // The client hears of a success, whatever the reason: the connection was none of this program's.
-int Supplicant::onForeignResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data) {
+ResultCode Supplicant::onForeignResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data) {
     const bool isSuccess = data.wlanReasonCode == 0;
     LogWide(3, L"Connection result not initiated by HS20, profile name=%s, result=%s",
             profileNameOf(data).c_str(), isSuccess ? L"Success" : L"Failure");
@@ -246,7 +221,7 @@ int Supplicant::onForeignResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data) {
     return kSuccess;
 }
 
-int Supplicant::onDisconnected(const WLAN_CONNECTION_NOTIFICATION_DATA* data) {
+ResultCode Supplicant::onDisconnected(const WLAN_CONNECTION_NOTIFICATION_DATA* data) {
     const ScopeGuard atEnd([this] {
         m_bUserDisconnecting = false;
         writeEapMethodToRegistry(0);
@@ -258,20 +233,28 @@ int Supplicant::onDisconnected(const WLAN_CONNECTION_NOTIFICATION_DATA* data) {
     {
         const LockGuard lock(g_hs20Lock);
         setState(SupplicantState::Disconnected);
-        tellClient(
-            [&](const ClientEvents& events) { isRealmUpdatePending = events.takePendingRealmUpdate(); });
+        isRealmUpdatePending = m_mgr.takePendingRealmUpdate();
     }
     if (isRealmUpdatePending) queryHs20NetworkAnqpInfo();
     const LockGuard lock(g_hs20Lock);
     if (!isRealmUpdatePending) sendNetworkList();
-    if (m_history.updateDisconnection(data->dot11Ssid, m_networkList) != kSuccess)
+    if (m_history.updateDisconnection(data->dot11Ssid, m_engine.m_networkList) != kSuccess)
         Log(6, "ERROR: Update connection history failed.");
     m_bHs20Connected = false;
     return kSuccess;
 }
 
+void Supplicant::onRoamingStart() {
+    m_bRoaming = true;
+}
+
+void Supplicant::onRoamingEnd() {
+    if (!m_bRoaming.exchange(false))
+        Log(3, "Received wlan roaming ended event while not received wlan roaming not started event.");
+}
+
 // A radio change wipes the slate, in both directions.
-int Supplicant::onRadioStateChanged(const WLAN_PHY_RADIO_STATE* data) {
+ResultCode Supplicant::onRadioStateChanged(const WLAN_PHY_RADIO_STATE* data) {
     if (data == nullptr) return kInvalidArgument;
     const LockGuard lock(g_hs20Lock);
     const bool isOn = data->dot11SoftwareRadioState == dot11_radio_state_on;
@@ -284,9 +267,9 @@ int Supplicant::onRadioStateChanged(const WLAN_PHY_RADIO_STATE* data) {
     if (!isOn) m_connectingSsid.clear();
     Log(3, "Supplicant state=%s when radio state changed.", nameOf(m_state));
     setState(SupplicantState::Disconnected);
-    m_bConnectionStarted = false;
-    m_retryHelper.resetAllNumRetries();
-    m_blockedNetworks.clear();
+    m_engine.m_bConnectionStarted = false;
+    m_engine.m_retryHelper.resetAllNumRetries();
+    m_engine.m_blockedNetworks.clear();
     m_triedCredentialIds.clear();
     sendNetworkList();
     return kSuccess;

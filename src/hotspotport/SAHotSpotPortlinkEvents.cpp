@@ -3,9 +3,7 @@
 #include "base/StandardOutput.h"
 #include "base/WlanMemory.h"
 #include "channel/JsonText.h"
-#include "config/Config.h"
 #include "connection/Supplicant.h"
-#include "connection/SupplicantMgr.h"
 #include "hotspotport/SAHotSpotPortlink.h"
 #include "text/TextConversion.h"
 
@@ -35,7 +33,7 @@ Json::Value asJson(const Credential& credential) {
 }  // namespace
 
 void SAHotSpotPortlink::SendRadioState() {
-    const bool isOn = isSoftwareRadioOn(m_hClientHandle, m_interfaceGuid.get());
+    const bool isOn = isSoftwareRadioOn(m_hClientHandle.get(), m_interfaceGuid.get());
     SendData(toStyledText(Json::Value(isOn)), "GET_RADIO");
 }
 
@@ -46,10 +44,10 @@ void SAHotSpotPortlink::SendCardState() {
 void SAHotSpotPortlink::SendCredentialList() {
     Log(3, "Send all credentials to vexa.");
     const auto supplicant = hotspotSupplicant(*this);
-    if (!supplicant || supplicant->m_pMgr == nullptr) return;
+    if (!supplicant) return;
     const platform::LockGuard lock(g_hs20Lock);
     Json::Value credentials;
-    for (const Credential* credential : supplicant->m_pMgr->config().credentials().copyCredentialPointers())
+    for (const Credential* credential : supplicant->credentials().copyCredentialPointers())
         credentials.append(asJson(*credential));
     SendData(toStyledText(credentials), "GET_ALL_CREDENTIAL_LIST");
 }
@@ -59,8 +57,7 @@ void SAHotSpotPortlink::SendInternetAccess() {
     Log(3, "Send connection status to vexa");
     const auto supplicant = hotspotSupplicant(*this);
     if (!supplicant) return;
-    bool hasAccess = false;
-    if (supplicant->getConnectedBss(false) != nullptr) supplicant->queryInternetAccess(hasAccess);
+    const bool hasAccess = supplicant->getConnectedBss(false) != nullptr && supplicant->hasInternetAccess();
     SendData(toStyledText(Json::Value(hasAccess)), "GET_IS_INTERNET_ACCESS");
 }
 

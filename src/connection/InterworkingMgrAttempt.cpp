@@ -1,11 +1,9 @@
 #include <string>
 
 #include "base/DiagnosticLog.h"
-#include "config/Config.h"
-#include "config/ResultCodes.h"
+#include "connection/EngineState.h"
 #include "connection/InterworkingMgr.h"
 #include "connection/Supplicant.h"
-#include "connection/SupplicantMgr.h"
 #include "hotspot/CredentialMatching.h"
 #include "text/TextConversion.h"
 
@@ -38,7 +36,7 @@ Credential* InterworkingMgr::selectCredential(const Hs20Network& network,
                                               const std::vector<Credential*>& found) {
     Log(3, "\n\tFound %d credentials", static_cast<int>(found.size()));
     Log(3, "\tChecking found credentials...");
-    const CredentialTable& credentials = m_pSupplicant->m_pMgr->config().credentials();
+    const CredentialTable& credentials = m_engine.m_config.credentials();
     for (Credential* credential : found) {
         Log(3, "\tChecking credential with id=%d name=%s, realm=%s, priority=%d", credential->m_id,
             narrow(credential->m_credName).c_str(), narrow(credential->m_realm).c_str(),
@@ -47,7 +45,7 @@ Credential* InterworkingMgr::selectCredential(const Hs20Network& network,
             Log(3, "Credential is not configured as auto-connect, skipping...");
             continue;
         }
-        if (!m_pSupplicant->m_retryHelper.isRetryAllowed(credentials, credential->m_id, network.ssid())) {
+        if (!m_engine.m_retryHelper.isRetryAllowed(credentials, credential->m_id, network.ssid())) {
             Log(3, "\tRetry number exceeds maximum retry limit, skip this credential id=%d, ssid=%s",
                 credential->m_id, network.ssidText().c_str());
             continue;
@@ -62,15 +60,15 @@ Credential* InterworkingMgr::selectCredential(const Hs20Network& network,
 // A network of the user's own provider ends the search; among all others the credential's priority decides,
 // and the earlier network on a tie.
 NetworkChoice InterworkingMgr::findBestMatchBssAndCredential() {
-    const CredentialTable& credentials = m_pSupplicant->m_pMgr->config().credentials();
+    const CredentialTable& credentials = m_engine.m_config.credentials();
     const CredentialMatcher matcher(credentials);
     NetworkChoice best;
     int index = 0;
-    for (Hs20Network* network : m_pSupplicant->m_networkList.copyPointers()) {
+    for (Hs20Network* network : m_engine.m_networkList.copyPointers()) {
         ++index;
         if (network->m_ssidLength == 0) continue;
         const std::string ssid = network->ssidText();
-        if (m_pSupplicant->m_blockedNetworks.isBlocked(*network)) {
+        if (m_engine.m_blockedNetworks.isBlocked(*network)) {
             Log(3, "This network has been disconnected by user, skip auto connecting to ssid=%s",
                 ssid.c_str());
             continue;
@@ -100,15 +98,15 @@ NetworkChoice InterworkingMgr::findBestMatchBssAndCredential() {
 // count.
 NetworkProfile* InterworkingMgr::reusableProfile(const NetworkChoice& choice, const std::wstring& name) {
     NetworkProfile* profile = nullptr;
-    if (m_pSupplicant->m_profileMgr.findProfileByName(name, profile) != kSuccess) return nullptr;
+    if (m_engine.m_profileMgr.findProfileByName(name, profile) != kSuccess) return nullptr;
     LogWide(3, L"Profile exists for ssid=%s", name.c_str());
     if (profile->m_eapMethod == choice.credential->m_eapMethod && !profile->m_bMachineAuth) {
         Log(3, "\tEAP method matches, don't create new profile.");
         return profile;
     }
     Log(3, "\tEAP method doesn't matches, create new profile.");
-    m_pSupplicant->m_retryHelper.removeNumRetryEntries(choice.credential->m_id, choice.network->ssid());
-    m_pSupplicant->m_profileMgr.deleteProfile(profile->m_id);
+    m_engine.m_retryHelper.removeNumRetryEntries(choice.credential->m_id, choice.network->ssid());
+    m_engine.m_profileMgr.deleteProfile(profile->m_id);
     return nullptr;
 }
 
@@ -116,53 +114,45 @@ NetworkProfile* InterworkingMgr::profileFor(const NetworkChoice& choice, const s
     if (NetworkProfile* const existing = reusableProfile(choice, name)) return existing;
     Log(2, "!!!Creating a new network profile");
     NetworkProfile* profile = nullptr;
-    if (m_pSupplicant->m_profileMgr.addProfileFromCredential(*choice.credential, *choice.network, false,
-                                                             m_pSupplicant->m_pMgr->config().homeRealm(),
-                                                             profile) != kSuccess) {
+    if (m_engine.m_profileMgr.addProfileFromCredential(*choice.credential, *choice.network, false,
+                                                       m_engine.m_config.homeRealm(), profile) != kSuccess) {
         Log(6, "ERROR: Cannot add network profile.");
         return nullptr;
     }
-    m_pSupplicant->m_retryHelper.setNumRetries(choice.credential->m_id, choice.network->ssid(), 0);
+    m_engine.m_retryHelper.setNumRetries(choice.credential->m_id, choice.network->ssid(), 0);
     return profile;
 }
 
-// The gates are passed without the lock: the next step of an attempt may have begun since. Its profile and
-// its count are not to be touched.
-int InterworkingMgr::leaveToRunningAttempt(int& result) {
-    Log(3, "###Connection already started, skip connecting again.###");
-    result = kConnectStarted;
-    return kSuccess;
-}
-
-int InterworkingMgr::connectNetwork(int& result) {
+ConnectOutcome InterworkingMgr::connectNetwork() {
     const LockGuard lock(g_hs20Lock);
-    result = 0;
     Log(3, "\n>>>> Enter connectNetwork");
-    if (m_pSupplicant->m_pMgr == nullptr) return kFailure;
-    if (m_pSupplicant->m_bConnectionStarted) return leaveToRunningAttempt(result);
+    // The gates are passed without the lock: the next step of an attempt may have begun since. Its profile
+    // and its count are not to be touched.
+    if (m_engine.m_bConnectionStarted) {
+        Log(3, "###Connection already started, skip connecting again.###");
+        return kConnectStarted;
+    }
     Log(3, "\n\tIterate over all BSS list to find if any matches with any stored credential.");
     Log(3, "Enter findBestMatchBssAndCredential...");
     const NetworkChoice choice = findBestMatchBssAndCredential();
     if (choice.network == nullptr) {
         Log(3, "No matching network was found based on configured credentials.");
-        result = kConnectNothingLeft;
-        return kSuccess;
+        return kConnectNothingLeft;
     }
     Log(3, "!!!Found a credential with id=%d for network with ssid=%s", choice.credential->m_id,
         choice.network->ssidText().c_str());
     const std::wstring name = wideFromNarrow(choice.network->ssid());
-    NetworkProfile* const profile = profileFor(choice, name);
-    if (profile == nullptr) return kFailure;
-    if (m_pSupplicant->m_pMgr->config().isAutoConnect()) {
+    const NetworkProfile* const profile = profileFor(choice, name);
+    if (profile == nullptr) return kConnectFailed;
+    if (m_engine.m_config.isAutoConnect()) {
         LogWide(3, L"Going to connect to network with ssid=%s", name.c_str());
-        m_pSupplicant->m_retryHelper.increaseNumRetries(choice.credential->m_id, choice.network->ssid());
-        if (m_pSupplicant->connectToNetwork(choice.network, profile) != kSuccess) {
+        m_engine.m_retryHelper.increaseNumRetries(choice.credential->m_id, choice.network->ssid());
+        if (m_supplicant.connectToNetwork(*choice.network, *profile) != kSuccess) {
             Log(6, "ERROR: Connect to network failed.");
-            return kFailure;
+            return kConnectFailed;
         }
     }
-    result = kConnectStarted;
-    return kSuccess;
+    return kConnectStarted;
 }
 
 }  // namespace vexa

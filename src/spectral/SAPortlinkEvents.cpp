@@ -11,7 +11,7 @@ std::string SAPortlink::BuildEventText(const std::string& eventId) {
 }
 
 void SAPortlink::SendRadioState() {
-    Send(BuildEventText(isSoftwareRadioOn(m_hWlan, m_interfaceGuid.get()) ? "RADIO_ON" : "RADIO_OFF"));
+    Send(BuildEventText(isSoftwareRadioOn(m_hWlan.get(), m_interfaceGuid.get()) ? "RADIO_ON" : "RADIO_OFF"));
 }
 
 void SAPortlink::SendCurrentChannel() {

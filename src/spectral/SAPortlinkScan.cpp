@@ -16,8 +16,8 @@ DWORD SAPortlink::SendSpectralControl(bool enable) {
     auto request = scanControlRequest(enable);
     const GUID guid = m_interfaceGuid.get();
     DWORD returned = 0;
-    return WlanIhvControl(m_hWlan, &guid, wlan_ihv_control_type_driver, static_cast<DWORD>(request.size()),
-                          request.data(), 0, nullptr, &returned);
+    return WlanIhvControl(m_hWlan.get(), &guid, wlan_ihv_control_type_driver,
+                          static_cast<DWORD>(request.size()), request.data(), 0, nullptr, &returned);
 }
 
 DWORD SAPortlink::OnStartFullScan() {

@@ -16,14 +16,14 @@ using platform::LockGuard;
 void SAPortlink::QueryChannelList() {
     const LockGuard lock(m_cs);
     updateCardState();
-    if (!m_bCardIn || m_hClientHandle == nullptr) return;
+    if (!m_bCardIn || m_hClientHandle.get() == nullptr) return;
 
     std::vector<std::byte> buffer = channelListRequest();
     const auto size = static_cast<DWORD>(buffer.size());
     const GUID guid = m_interfaceGuid.get();
     DWORD returned = 0;
-    if (WlanIhvControl(m_hWlan, &guid, wlan_ihv_control_type_driver, size, buffer.data(), size, buffer.data(),
-                       &returned) != ERROR_SUCCESS)
+    if (WlanIhvControl(m_hWlan.get(), &guid, wlan_ihv_control_type_driver, size, buffer.data(), size,
+                       buffer.data(), &returned) != ERROR_SUCCESS)
         return;
 
     buffer.resize(std::min<std::size_t>(returned, buffer.size()));

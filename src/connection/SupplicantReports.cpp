@@ -1,10 +1,7 @@
 #include <array>
 
 #include "base/DiagnosticLog.h"
-#include "config/Config.h"
-#include "config/ResultCodes.h"
 #include "connection/Supplicant.h"
-#include "connection/SupplicantMgr.h"
 #include "platform/Session.h"
 
 namespace vexa {
@@ -41,7 +38,7 @@ const char* sessionText(std::uint32_t eventType) {
 }  // namespace
 
 // Whatever the change: retries begin anew, and what was blocked by the way is open again.
-int Supplicant::onSessionChanged(Bytes payload) {
+ResultCode Supplicant::onSessionChanged(Bytes payload) {
     const LockGuard lock(g_hs20Lock);
     Log(3, "### [Session] IHV reports session changed. ###");
     if (payload.size() < kSessionPayload) return kFailure;
@@ -49,8 +46,8 @@ int Supplicant::onSessionChanged(Bytes payload) {
     Log(3, "\tEventType=%d, sessionId=%d", static_cast<int>(eventType),
         static_cast<int>(numberAt(payload, 4)));
     Log(3, "%s", sessionText(eventType));
-    m_retryHelper.resetAllNumRetries();
-    m_blockedNetworks.unblockRecentNetworks();
+    m_engine.m_retryHelper.resetAllNumRetries();
+    m_engine.m_blockedNetworks.unblockRecentNetworks();
     return kSuccess;
 }
 
@@ -73,7 +70,7 @@ const char* Supplicant::reasonNotToBlock() const {
     return nullptr;
 }
 
-int Supplicant::onUserDisconnected(Bytes payload) {
+ResultCode Supplicant::onUserDisconnected(Bytes payload) {
     const LockGuard lock(g_hs20Lock);
     Log(3, "### IHV reports HS20 network has been disconnected manually by user. ###");
     Log(3, "\tQueried supplicant state=%s", nameOf(queryState()));
@@ -101,7 +98,7 @@ int Supplicant::onUserDisconnected(Bytes payload) {
             record.ssid.c_str(), static_cast<int>(elapsed));
         return kSuccess;
     }
-    m_blockedNetworks.blockNetwork(record.ssid, false);
+    m_engine.m_blockedNetworks.blockNetwork(record.ssid, false);
     return kSuccess;
 }
 

@@ -1,9 +1,9 @@
+#include "base/IpInterface.h"
+
 #include <algorithm>
-#include <string_view>
+#include <string>
 
 #include "base/DiagnosticLog.h"
-#include "config/ResultCodes.h"
-#include "connection/Supplicant.h"
 #include "platform/Guid.h"
 #include "platform/NetworkAdapters.h"
 
@@ -26,33 +26,32 @@ auto queryWithGrowingBuffer(const char* name, Query query) {
 
 }  // namespace
 
-int Supplicant::queryMacAddress() {
-    const std::string guidText = guidToString(m_interfaceGuid);
+bool IpInterface::find(const GUID& guid) {
+    const std::string guidText = guidToString(guid);
     const auto list = queryWithGrowingBuffer("GetAdaptersAddresses", platform::getAdaptersAddresses);
-    if (list.error != 0) return kFailure;
+    if (list.error != 0) return false;
     const auto found = std::find_if(list.adapters.begin(), list.adapters.end(), [&](const auto& adapter) {
         return adapter.interfaceType == platform::kInterfaceTypeIeee80211 &&
                guidText.starts_with(adapter.name);
     });
     if (found == list.adapters.end()) {
         Log(2, "!!!Cannot query interface mac address.");
-        return kNotFound;
+        return false;
     }
     std::copy_n(found->physicalAddress.begin(), std::min(found->physicalAddress.size(), m_macAddress.size()),
                 m_macAddress.begin());
-    m_ifIndex = found->interfaceIndex;
+    m_index = found->interfaceIndex;
     const auto& mac = m_macAddress;
     Log(2, "!!!Query interface mac address succeeded, mac address %02x:%02x:%02x:%02x:%02x:%02x", mac[0],
         mac[1], mac[2], mac[3], mac[4], mac[5]);
-    return kSuccess;
+    return true;
 }
 
-int Supplicant::queryInternetAccess(bool& hasAccess) const {
+bool IpInterface::hasInternetAccess() const {
     const auto info = queryWithGrowingBuffer("GetPerAdapterInfo", [this](std::uint32_t size) {
-        return platform::getPerAdapterInfo(m_ifIndex, size);
+        return platform::getPerAdapterInfo(m_index, size);
     });
-    hasAccess = info.error == 0 && !info.firstDnsServer.empty();
-    return kSuccess;
+    return info.error == 0 && !info.firstDnsServer.empty();
 }
 
 }  // namespace vexa

@@ -1,0 +1,99 @@
+#include <algorithm>
+#include <string>
+#include <unordered_set>
+
+#include "base/DiagnosticLog.h"
+#include "config/Config.h"
+#include "text/ScopeGuard.h"
+
+namespace vexa {
+
+ResultCode Config::readUsers(bool& isChanged) {
+    Log(2, "Reading all user info...");
+    if (m_userName.empty()) return kFailure;
+    std::vector<Node> users;
+    if (m_xmlDoc.selectNodes("/*/users/*", Node(), users) != kSuccess) return kFailure;
+    Log(2, "Retrieved total %d user info", static_cast<int>(users.size()));
+    if (const Node user = findCurrentUser(users)) {
+        std::vector<Node> references;
+        if (m_xmlDoc.selectNodes("credentials/*", user, references) != kSuccess) return kFailure;
+        Log(2, "\t\tcredential count=%d", static_cast<int>(references.size()));
+        isChanged = applyReferences(references);
+    }
+    m_credentials.placeUnplacedCredentials();
+    m_credentials.dumpCredentials();
+    return kSuccess;
+}
+
+Config::Node Config::findCurrentUser(const std::vector<Node>& users) {
+    int index = 0;
+    for (const Node user : users) {
+        Log(2, "\tReading user info with index=%d...", ++index);
+        if (textOf(user, "username", kInvalid) == m_userName) return user;
+    }
+    return {};
+}
+
+// The user's places, one by one. True if others have deleted credentials that he lists, or added some that he
+// doesn't.
+bool Config::applyReferences(const std::vector<Node>& references) {
+    const auto present = m_credentials.credentialsById();
+    std::unordered_set<std::int32_t> listed;
+    bool isChanged = false;
+    for (const Node reference : references) {
+        const std::int32_t id = numberOf(reference, "id");
+        if (id <= 0) continue;
+        listed.insert(id);
+        const std::int32_t priority = numberOf(reference, "priority");
+        if (priority < 0) continue;
+        const auto found = present.find(id);
+        if (found != present.end()) {
+            found->second->m_priority = priority;
+            Log(2, "\t\t\tid=%d, priority=%d", id, priority);
+        } else {
+            Log(3,
+                "All-user credential deleted by others,we should delete this credential for current user, cred id=%d",
+                id);
+            isChanged = true;
+        }
+    }
+    const auto all = m_credentials.copyCredentialPointers();
+    return isChanged || std::any_of(all.begin(), all.end(), [&](const Credential* credential) {
+               return !listed.contains(credential->m_id);
+           });
+}
+
+ResultCode Config::saveUsers() {
+    if (m_userName.empty()) return kFailure;
+    const ScopeGuard release([this]() NO_THREAD_SAFETY_ANALYSIS { m_xmlDoc.release(); });
+    m_xmlDoc.create();
+    if (m_xmlDoc.load(m_configPath) != kSuccess) return kFailure;
+    Node section;
+    std::vector<Node> users;
+    if (m_xmlDoc.selectSingleNode("/*/users", Node(), section) != kSuccess || !section ||
+        m_xmlDoc.selectNodes("/*/users/*", Node(), users) != kSuccess)
+        return kFailure;
+    for (const Node user : users)
+        if (textOf(user, "username", kInvalid) == m_userName) XmlDocument::remove(user);
+    Node user;
+    Node list;
+    if (m_xmlDoc.setChild("user", L"", section, true, &user) != kSuccess ||
+        m_xmlDoc.setChild("username", m_userName, user, true) != kSuccess ||
+        m_xmlDoc.setChild("credentials", L"", user, true, &list) != kSuccess ||
+        writeReferences(list) != kSuccess)
+        return kFailure;
+    saveDocument();
+    return kSuccess;
+}
+
+ResultCode Config::writeReferences(Node list) {
+    for (const Credential* credential : m_credentials.copyCredentialPointers()) {
+        Node reference;
+        if (m_xmlDoc.setChild("credential", L"", list, true, &reference) != kSuccess) return kFailure;
+        m_xmlDoc.setChild("id", std::to_wstring(credential->m_id), reference, true);
+        m_xmlDoc.setChild("priority", std::to_wstring(credential->m_priority), reference, true);
+    }
+    return kSuccess;
+}
+
+}  // namespace vexa

@@ -1,0 +1,38 @@
+#include "base/DiagnosticLog.h"
+#include "base/NetworkListLock.h"
+#include "channel/JsonText.h"
+#include "config/ResultCodes.h"
+#include "connection/Supplicant.h"
+#include "hotspotport/SAHotSpotPortlink.h"
+
+namespace vexa {
+
+void SAHotSpotPortlink::setHotSpotAutoConnect(bool enable) {
+    const platform::LockGuard lock(g_hs20Lock);
+    Log(3, "Set enable/disable HS20, param=%s", enable ? "true" : "false");
+    const auto supplicant = hotspotSupplicant(*this);
+    if (supplicant) supplicant->setHs20Enabled(enable);
+    SendData(toStyledText(Json::Value(enable)), "SET_HOTSPOT_AUTO_CONNECT");
+}
+
+void SAHotSpotPortlink::updateNetworkRealm() {
+    Log(3, "UI requested to update HS20 network realm.");
+    const auto supplicant = hotspotSupplicant(*this);
+    if (m_bCardIn && supplicant) supplicant->updateNetworkRealm();
+}
+
+// An SSID has 32 bytes at most; a longer name is refused like one that can't be joined.
+void SAHotSpotPortlink::connectNetworkByName(const std::string& name) {
+    const auto supplicant = hotspotSupplicant(*this);
+    if (name.empty() || !supplicant) return;
+    if (name.size() <= kMaxSsidLength && supplicant->connectBss(name) == kSuccess) return;
+    Log(6, "connectBss failed.");
+    SendConnectionResult(ConnectionResult{});
+}
+
+void SAHotSpotPortlink::disconnectNetworkByName(const std::string& name) {
+    const auto supplicant = hotspotSupplicant(*this);
+    if (!name.empty() && supplicant) supplicant->disconnectBss(name);
+}
+
+}  // namespace vexa
