@@ -39,7 +39,7 @@ std::string StoreMachine::listing() {
     return text;
 }
 
-int StoreMachine::openWith(std::string_view content, bool* isChanged) {
+ResultCode StoreMachine::openWith(std::string_view content, bool* isChanged) {
     write("config.xml", content);
     return open(m_config, isChanged);
 }

@@ -32,7 +32,7 @@ public:
     std::string listing();
 
     /// Writes the file, and reads it as a service that starts. What failed, or 0.
-    int openWith(std::string_view content, bool* isChanged = nullptr);
+    ResultCode openWith(std::string_view content, bool* isChanged = nullptr);
 
     /// Stores a credential for this realm.
     void add(const std::wstring& realm);
