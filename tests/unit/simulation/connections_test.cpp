@@ -1,5 +1,9 @@
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <random>
+#include <regex>
+
 #include "Station.h"
 #include "platform/Event.h"
 
@@ -166,6 +170,58 @@ TEST(Connections, TheServerLetsInWhatItAccepts) {
         ASSERT_EQ(station.connect(profile), ERROR_SUCCESS) << accepts;
         station.machine.advance(200);
         EXPECT_EQ(station.told(), kBegun + (isLetIn ? joined("11") : refused("00050007"))) << accepts;
+    }
+}
+
+/// A letter for each notification of an attempt's or a connection's course.
+std::string letterOf(const std::string& line) {
+    const std::string code = line.substr(0, line.find(' '));
+    if (code == "8/9") return "b";   // it begins
+    if (code == "8/14") return "p";  // the adapter is pulled
+    if (code == "8/20") return "d";  // disconnecting
+    if (code == "8/21") return "e";  // it ends
+    if (code != "8/10") return "";
+    return std::count(line.begin(), line.end(), ' ') == 3 ? "c" : "j";  // cancelled, or joined
+}
+
+// Requests may be refused: the radio is off, or the adapter gone.
+void doSomething(Station& station, std::size_t choice) {
+    static const std::string kActions[] = {kHideCafe,
+                                           "{'do': 'show', 'bssid': '02:00:00:00:00:01'}",
+                                           kRadioOff,
+                                           "{'do': 'radio', 'software': 'on'}",
+                                           "{'do': 'pullAdapter'}",
+                                           "{'do': 'insertAdapter'}",
+                                           "{'do': 'osConnect', 'ssid': 'Cafe'}",
+                                           "{'do': 'osConnect', 'ssid': 'Own', 'succeeds': false}",
+                                           "{'do': 'dropConnection'}",
+                                           "{'do': 'set', 'connectMs': 50}"};
+    if (choice < std::size(kActions)) return station.act(kActions[choice]);
+    if (choice == 10) station.connect(ttlsProfile("Cafe", "43616665"));
+    if (choice == 11) station.connect(tlsProfile("Cafe", "43616665", "ca", "machine"));
+    if (choice == 12) station.discover("Own");
+    if (choice == 13) station.disconnect();
+}
+
+TEST(Connections, WhateverHappensEachAttemptHasOneEndAndEachConnectionToo) {
+    const std::regex inOrder("(p|bce?|bjd?e)*(bj?)?");
+    for (std::uint32_t seed = 0; seed < 60; ++seed) {
+        std::mt19937 random(seed);
+        Station station(kScenario);
+        std::string course;
+        for (int step = 0; step < 80; ++step) {
+            // Often several requests before anything has been told.
+            do {
+                doSomething(station, random() % 14);
+            } while (random() % 3 == 0);
+            station.machine.advance(static_cast<int>(random() % 3 * 60));
+            for (const std::string& line : station.told())
+                course += letterOf(line);
+            const std::string state = station.state();
+            ASSERT_EQ(state == "connected", course.ends_with('j')) << "seed " << seed << " " << course;
+            ASSERT_EQ(state == "associating", course.ends_with('b')) << "seed " << seed << " " << course;
+        }
+        EXPECT_TRUE(std::regex_match(course, inOrder)) << "seed " << seed << " " << course;
     }
 }
 

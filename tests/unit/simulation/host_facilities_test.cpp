@@ -1,8 +1,13 @@
 #include <gtest/gtest.h>
 #include <stdlib.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <algorithm>
 
 #include "TestMachine.h"
 #include "platform/DebugOutput.h"
+#include "platform/NamedMutex.h"
 #include "platform/posix/MachineFolder.h"
 #include "platform/posix/OwnerFiles.h"
 #include "platform/posix/ProcNetTcp.h"
@@ -10,8 +15,10 @@
 namespace vexa::simulation {
 namespace {
 
+using platform::NamedMutex;
 using posix::readFile;
 using posix::replaceFile;
+using Owner = NamedMutex::Owner;
 
 TEST(DebugOutput, DropsOneLineEndAndIsUtf8) {
     TestMachine machine;
@@ -60,6 +67,39 @@ TEST(MachineFolder, IsWhatTheEnvironmentSays) {
     ::setenv("VEXA_MACHINE", "/m", 1);
     EXPECT_EQ(posix::machineFolder(), "/m");
     ::unsetenv("VEXA_MACHINE");
+}
+
+TEST(NamedMutex, IsCreatedByOneOfManyProcessesThatStartAtOnceAndEndsWithThem) {
+    constexpr int kProcesses = 8;
+    const TemporaryFolder folder;
+    ::setenv("VEXA_MACHINE", folder.path().c_str(), 1);
+    int words[2];
+    int end[2];
+    ASSERT_EQ(::pipe(words), 0);
+    ASSERT_EQ(::pipe(end), 0);
+    for (int i = 0; i < kProcesses; ++i) {
+        if (::fork() != 0) continue;
+        const NamedMutex mutex("name", Owner::Yes);
+        char word = mutex.existedBefore() ? 'e' : 'c';
+        ::close(end[1]);
+        const bool isTold = ::write(words[1], &word, 1) == 1;
+        ::_exit(isTold && ::read(end[0], &word, 1) == 0 ? 0 : 1);  // its parent lets it go
+    }
+    std::string found(kProcesses, '?');
+    for (char& word : found)
+        EXPECT_EQ(::read(words[0], &word, 1), 1);
+    EXPECT_EQ(std::count(found.begin(), found.end(), 'c'), 1) << found;
+    EXPECT_FALSE(NamedMutex("name", Owner::Yes).isOwned());
+    for (const int descriptor : {words[0], words[1], end[0], end[1]})
+        ::close(descriptor);
+    while (::wait(nullptr) > 0) {
+    }
+    EXPECT_TRUE(NamedMutex("name", Owner::Yes).isOwned());
+    ::setenv("VEXA_MACHINE", "/dev/null/machine", 1);
+    NamedMutex nowhere("name", Owner::Yes);
+    EXPECT_FALSE(nowhere.isValid());
+    nowhere.wait();
+    EXPECT_FALSE(nowhere.isOwned());
 }
 
 }  // namespace
