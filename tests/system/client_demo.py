@@ -58,8 +58,9 @@ class InPipe(DemoStory):
         return self.running("demo", *arguments, environment=self.environment)
 
     def test_json_lines(self):
-        demo = self.demo("--seconds", "3", "--json")
-        self.assertEqual(demo.wait(), 0)
+        demo = self.demo("--seconds", "600", "--json")
+        demo.wait_line("congestion_value")
+        self.assertEqual(demo.stop(signal.SIGINT), 0)
         stored, *events, summary = map(json.loads, demo.lines)
         self.assertIsInstance(summary["joined"], list)
         self.assertEqual([entry["name"] for entry in stored["credentials"]], STORED)
@@ -132,10 +133,12 @@ class InTerminal(DemoStory):
         terminal.read_until(pattern)
         return terminal
 
-    def assert_good_end(self, terminal):
-        self.assertEqual(terminal.finish(), 0)
-        self.assertEqual(terminal.settings(), terminal.before)
+    def assert_end(self, terminal, code=0):
+        self.assertEqual((terminal.finish(), terminal.settings()), (code, terminal.before))
         self.assertEqual(terminal.screen.count(ENTERED), terminal.screen.count(LEFT))
+
+    def assert_good_end(self, terminal):
+        self.assert_end(terminal)
         self.assert_summary(terminal.last_line())
         self.assert_nothing_is_left()
 
@@ -161,13 +164,15 @@ class InTerminal(DemoStory):
         self.assertLess(max(map(len, last[:-1])), 80)
 
     def test_it_ends_by_itself(self):
-        self.assert_good_end(self.demo(b"", ["demo", "--seconds", "2"]))
+        terminal = self.demo(b"", ["demo", "--seconds", "2"])
+        self.assert_end(terminal)
+        self.assertTrue(terminal.last_line().startswith("Seen: "), "even if it has seen nothing yet")
+        self.assert_nothing_is_left()
 
     def test_the_terminal_is_as_before_when_the_service_dies(self):
         terminal = self.demo()
         os.kill(child_of(terminal.process.pid), signal.SIGKILL)
-        self.assertEqual((terminal.finish(), terminal.settings()), (1, terminal.before))
-        self.assertEqual(terminal.screen.count(ENTERED), terminal.screen.count(LEFT))
+        self.assert_end(terminal, 1)
 
     def test_what_a_terminal_cannot_show_is_left_out(self):
         for variable, shown, key, left_out in (
