@@ -2,12 +2,11 @@
 
 #include <algorithm>
 #include <chrono>
-#include <compare>
 #include <optional>
 
 namespace vexa::client {
 
-/// The moment up to which something is waited for; of two the smaller one is earlier.
+/// The moment up to which something is waited for; of two the smaller one is the earlier one.
 class Deadline {
 public:
     using Clock = std::chrono::steady_clock;
@@ -24,7 +23,7 @@ public:
         return std::max(rest, std::chrono::milliseconds(0));
     }
 
-    auto operator<=>(const Deadline&) const = default;
+    friend bool operator<(const Deadline& a, const Deadline& b) { return a.m_at < b.m_at; }
 
 private:
     explicit Deadline(Clock::time_point at) : m_at(at) {}
