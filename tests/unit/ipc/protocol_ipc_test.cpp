@@ -13,6 +13,7 @@
 #include <future>
 #include <optional>
 #include <string>
+#include <thread>
 #include <vector>
 
 #include "protocol/Ipc.h"
@@ -244,6 +245,10 @@ TEST(Ipc, SendersOnManyThreadsAndClientsThatComeAndGoDoNoHarm) {
     }
     for (auto& sender : senders)
         sender.get();
+    const auto end = std::chrono::steady_clock::now() + kPatience;
+    while (echo.server.ipc->sendToAll("anybody?") && std::chrono::steady_clock::now() < end)
+        std::this_thread::yield();
+    EXPECT_FALSE(echo.server.ipc->sendToAll("anybody?")) << "all have gone";
 }
 
 }  // namespace
