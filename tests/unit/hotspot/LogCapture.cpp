@@ -31,16 +31,12 @@ std::vector<std::string> LogCapture::lines() {
     std::ostringstream content;
     content << std::ifstream(m_folder / "log", std::ios::binary).rdbuf();
     fs::remove(m_folder / "log");
-    const std::string text = content.str();
-    static const std::regex kNumber(R"(\[\d+\] (\d\d/\d\d \d\d:\d\d:\d\d  )?)");
+    static const std::regex kNumber(R"(\n?\[\d+\] (\d\d/\d\d \d\d:\d\d:\d\d  )?)");
+    std::istringstream marked(std::regex_replace(content.str() + "[0] ", kNumber, std::string(1, '\0')));
     std::vector<std::string> lines;
-    for (std::sregex_iterator head(text.begin(), text.end(), kNumber), end; head != end;) {
-        const auto from = (*head)[0].second;
-        ++head;
-        std::string line(from, head == end ? text.end() : (*head)[0].first);
-        if (!line.empty() && line.back() == '\n') line.pop_back();
-        lines.push_back(std::move(line));
-    }
+    for (std::string line; std::getline(marked, line, '\0');)
+        lines.push_back(line);
+    if (!lines.empty()) lines.erase(lines.begin());
     return lines;
 }
 

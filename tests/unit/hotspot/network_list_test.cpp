@@ -20,13 +20,6 @@ std::string shown(const Hs20NetworkList& list) {
     return text;
 }
 
-std::string realmsOf(const Hs20Network* network) {
-    std::string text;
-    for (const RealmInfo& realm : network->m_realms)
-        text += (text.empty() ? "" : ", ") + realm.m_realm + (realm.m_eapType == 2 ? " TTLS" : " TLS");
-    return text;
-}
-
 TEST(NetworkList, AKnownBssKeepsItsNameAndItsRealmsAndTakesOverTheRest) {
     Hs20NetworkList list;
     list.replace({bss(1, "before", 0)});
@@ -42,7 +35,7 @@ TEST(NetworkList, AKnownBssKeepsItsNameAndItsRealmsAndTakesOverTheRest) {
     EXPECT_TRUE(known->m_bHs20);
     EXPECT_EQ(known->m_networkType, 99U);
     EXPECT_EQ(known->m_internetAccess, 98U);
-    EXPECT_EQ(realmsOf(known), "r TLS");
+    EXPECT_EQ(known->m_realms, (std::vector<RealmInfo>{{1, "r"}}));
     EXPECT_EQ(log.text(),
               "There already exists a network with ssid=after, updating network info....\n"
               "The HS20 attribute has been changed for this network.\n");
@@ -82,32 +75,6 @@ TEST(NetworkList, OfOneNameTheFirstKnownNetworkStaysOrElseTheFirst) {
         list.processDuplicatedHs20Networks(oldMacs);
         EXPECT_EQ(shown(list), c.left);
     }
-}
-
-TEST(NetworkList, TheOneThatStaysHasTheRealmsOfThemAllInOrder) {
-    Hs20NetworkList list;
-    list.replace({bss(1, "x"), bss(2, "x"), bss(3, "x"), bss(4, "alone")});
-    const auto networks = list.copyPointers();
-    networks[0]->m_realms = {{1, "A"}};
-    networks[1]->m_realms = {{1, "A"}, {2, "B"}, {2, "A"}};
-    networks[2]->m_realms = {{1, "C"}, {1, "a"}};
-    networks[3]->m_realms = {{1, "A"}, {1, "A"}};
-    list.processDuplicatedHs20Networks({bss(2, "").macAddress});
-    EXPECT_EQ(shown(list), "x/2 alone/4");
-    EXPECT_EQ(realmsOf(list.copyPointers()[0]), "A TLS, B TTLS, A TTLS, C TLS, a TLS");
-    EXPECT_EQ(realmsOf(list.copyPointers()[1]), "A TLS, A TLS");
-}
-
-TEST(NetworkList, GroupsAreToldByTheBytesOfTheirNames) {
-    Hs20NetworkList list;
-    list.replace({bss(1, "\xff"), bss(2, "b"), bss(3, "\xff"), bss(4, "B"), bss(5, "b"), bss(6, "B")});
-    LogCapture log;
-    list.processDuplicatedHs20Networks({});
-    std::string order;
-    for (const std::string& line : log.lines())
-        if (line.starts_with("Found duplicate")) order += line.substr(line.find('=') + 1) + " ";
-    EXPECT_EQ(order, "B b \xff ");
-    EXPECT_EQ(shown(list), "\xff/1 b/2 B/4");
 }
 
 }  // namespace

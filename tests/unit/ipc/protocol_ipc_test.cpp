@@ -10,10 +10,10 @@
 #include <boost/beast/core/flat_buffer.hpp>
 #include <boost/beast/websocket.hpp>
 #include <chrono>
-#include <functional>
 #include <future>
 #include <optional>
 #include <string>
+#include <thread>
 #include <vector>
 
 #include "channel/Ipc.h"
@@ -82,34 +82,49 @@ private:
     std::shared_future<void> m_future{m_promise.get_future().share()};
 };
 
-/// A server that gives its handler itself.
 struct Server {
-    using Handler = std::function<void(IpcWebSocketServer&, ClientId, std::string_view)>;
+    explicit Server(const IpcWebSocketServer::Handler& handler)
+        : port(freePort()), ipc(IpcWebSocketServer::create(port, handler)) {}
 
-    explicit Server(const Handler& handler = [](auto&&...) {}) {
-        ipc = IpcWebSocketServer::create(
-            port, [=, self = self.get_future().share()](ClientId client, auto message) {
-                handler(*self.get(), client, message);
-            });
-        self.set_value(ipc.get());
-    }
-
-    std::promise<IpcWebSocketServer*> self;
-    std::int32_t port = freePort();
+    std::int32_t port;
     std::shared_ptr<IpcWebSocketServer> ipc;
+};
+
+/// Answers every message with itself.
+struct EchoServer {
+    EchoServer() { ipc.set_value(server.ipc.get()); }
+
+    std::promise<IpcWebSocketServer*> ipc;
+    Server server{[future = ipc.get_future().share()](ClientId client, std::string_view message) {
+        future.get()->sendTo(client, std::string(message));
+    }};
+    std::int32_t port = server.port;
 };
 
 std::string numbered(int number) {
     return "message " + std::to_string(number);
 }
 
+TEST(Ipc, AMessageGoesToAllClientsAndAnAnswerToItsOwn) {
+    EchoServer echo;
+    TestClient first(echo.port);
+    TestClient second(echo.port);
+    first.send("for me");
+    EXPECT_EQ(first.receive(), "for me");
+    EXPECT_TRUE(echo.server.ipc->sendToAll("for all"));
+    EXPECT_EQ(first.receive(), "for all");
+    EXPECT_EQ(second.receive(), "for all");
+}
+
 TEST(Ipc, ASlowHandlerHoldsUpNeitherWhatItSentNorOthers) {
     Gate gate;
-    const Server server([&](IpcWebSocketServer& ipc, ClientId client, std::string_view) {
-        ipc.sendTo(client, "before");
-        ipc.sendToAll("also before");
+    std::promise<IpcWebSocketServer*> ipc;
+    Server server([&gate, future = ipc.get_future().share()](ClientId client, std::string_view) {
+        future.get()->sendTo(client, "before");
+        future.get()->sendToAll("also before");
         EXPECT_TRUE(gate.wait());
     });
+    ipc.set_value(server.ipc.get());
     TestClient asking(server.port);
     asking.send("go");
     EXPECT_EQ(asking.receive(), "before");
@@ -130,7 +145,7 @@ TEST(Ipc, AClientFarAheadOfASlowHandlerGoesOnWhenItDoes) {
     Gate gate;
     std::atomic<int> handled{0};
     std::promise<void> all;
-    const Server server([&](auto&&...) {
+    Server server([&](ClientId, std::string_view) {
         EXPECT_TRUE(gate.wait());
         if (++handled == kCount) all.set_value();
     });
@@ -143,8 +158,8 @@ TEST(Ipc, AClientFarAheadOfASlowHandlerGoesOnWhenItDoes) {
     server.ipc->stop();
 }
 
-TEST(Ipc, StopStillSendsWhatIsQueuedTellsTheClientsAndGivesThePortBack) {
-    Server server;
+TEST(Ipc, StopStillSendsWhatIsQueuedAndTellsTheClients) {
+    Server server([](ClientId, std::string_view) {});
     TestClient client(server.port);
     for (int i = 0; i < 100; ++i)
         server.ipc->sendToAll(numbered(i));
@@ -157,16 +172,13 @@ TEST(Ipc, StopStillSendsWhatIsQueuedTellsTheClientsAndGivesThePortBack) {
     server.ipc->stop();
     EXPECT_EQ(heard.get(), 100);
     EXPECT_EQ(client.closeCode(), 1001);
-    EXPECT_FALSE(server.ipc->sendToAll("too late"));
-    EXPECT_NE(IpcWebSocketServer::create(server.port, [](auto&&...) {}), nullptr)
-        << "the port is free at once";
 }
 
 TEST(Ipc, StopReturnsAfterTheLastCallOfTheHandler) {
     Gate entered;
     Gate gate;
     std::atomic<bool> hasEnded{false};
-    const Server server([&](auto&&...) {
+    Server server([&](ClientId, std::string_view) {
         entered.open();
         EXPECT_TRUE(gate.wait());
         hasEnded = true;
@@ -184,11 +196,24 @@ TEST(Ipc, StopReturnsAfterTheLastCallOfTheHandler) {
     EXPECT_TRUE(stopping.get());
 }
 
-TEST(Ipc, APortThatCannotBeHadGivesNoHandleAndAClosedHandleTakesNothing) {
+TEST(Ipc, APortThatCannotBeHadGivesNoHandle) {
     const auto ignore = [](const char*, std::uint32_t, void*) {};
-    const Server owner;
+    const Server owner([](ClientId, std::string_view) {});
     for (const std::int32_t port : {0, -1, 65536, owner.port})
         EXPECT_EQ(IpcCreateServer(1, 0, ignore, nullptr, port), 0U) << "port " << port;
+}
+
+TEST(Ipc, AServerGetsItsPortBackAtOnceAfterItHadClients) {
+    Server server([](ClientId, std::string_view) {});
+    TestClient client(server.port);
+    auto farewell = std::async(std::launch::async, [&] { return client.receive(); });
+    server.ipc->stop();
+    EXPECT_EQ(farewell.get(), std::nullopt);
+    EXPECT_NE(IpcWebSocketServer::create(server.port, [](ClientId, std::string_view) {}), nullptr);
+}
+
+TEST(Ipc, AClosedHandleTakesNothing) {
+    const auto ignore = [](const char*, std::uint32_t, void*) {};
     const std::int32_t port = freePort();
     const IpcHandle handle = IpcCreateServer(1, 0, ignore, nullptr, port);
     ASSERT_NE(handle, 0U);
@@ -203,17 +228,15 @@ TEST(Ipc, APortThatCannotBeHadGivesNoHandleAndAClosedHandleTakesNothing) {
 }
 
 TEST(Ipc, SendersOnManyThreadsAndClientsThatComeAndGoDoNoHarm) {
-    const Server server([](IpcWebSocketServer& ipc, ClientId client, std::string_view message) {
-        ipc.sendTo(client, std::string(message));
-    });
+    EchoServer echo;
     std::vector<std::future<void>> senders;
     for (int i = 0; i < 3; ++i)
         senders.push_back(std::async(std::launch::async, [&] {
             for (int j = 0; j < 5'000; ++j)
-                server.ipc->sendToAll("noise");
+                echo.server.ipc->sendToAll("noise");
         }));
     for (int i = 0; i < 40; ++i) {
-        TestClient client(server.port);
+        TestClient client(echo.port);
         client.send("mine");
         auto message = client.receive();
         while (message == "noise")
@@ -222,6 +245,10 @@ TEST(Ipc, SendersOnManyThreadsAndClientsThatComeAndGoDoNoHarm) {
     }
     for (auto& sender : senders)
         sender.get();
+    const auto end = std::chrono::steady_clock::now() + kPatience;
+    while (echo.server.ipc->sendToAll("anybody?") && std::chrono::steady_clock::now() < end)
+        std::this_thread::yield();
+    EXPECT_FALSE(echo.server.ipc->sendToAll("anybody?")) << "all have gone";
 }
 
 }  // namespace
