@@ -71,7 +71,6 @@ STORY(Log, CutsWhatDoesNotFit, "{}") {
     std::string hex;
     while (hex.size() < 6826 * 3)
         hex += " 78";
-
     expectWritten(story, "narrow", kTime + cut + "\n", [&] { Log(3, "%s", longText.c_str()); });
     expectWritten(story, "wide", kTime + cut + "\n",
                   [&] { LogWide(3, L"%s", std::wstring(30000, L'x').c_str()); });
