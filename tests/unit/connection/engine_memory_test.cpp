@@ -70,7 +70,8 @@ TEST_F(EngineMemory, ABlockIsForOneNameExactly) {
 }
 
 TEST_F(EngineMemory, ACredentialThatIsNewOrMayConnectNowOpensWhatItFits) {
-    using Change = int (BlockedNetworkList::*)(std::int32_t, const CredentialTable&, const Hs20NetworkList&);
+    using Change =
+        ResultCode (BlockedNetworkList::*)(std::int32_t, const CredentialTable&, const Hs20NetworkList&);
     const Change added = &BlockedNetworkList::onCredentialAdded;
     const Change changed = &BlockedNetworkList::onCredentialAutoConnectChanged;
     struct Case {
