@@ -33,7 +33,8 @@ class ConnectStory(NetworkStory):
         self.control.do("set", connectMs=SLOW_MS)
 
     def attempt(self):
-        self.slowly()
+        """`vexa connect` in the middle of an attempt that does not end by itself."""
+        self.control.do("set", connectMs=3600000)
         before = self.requests()
         joining = self.running("connect", "Café", "--machine", self.machine.folder)
         wait_until(lambda: self.requests() > before, f"the attempt; {joining.lines} {joining.errors}")
@@ -123,7 +124,8 @@ class NotJoining(ConnectStory):
     def test_what_ends_the_waiting(self):
         endings = {
             'vexa: "Café": the radio was turned off': lambda _: self.control.do("radio", software="off"),
-            'vexa: "Café": the adapter was taken out': lambda _: self.control.do("pullAdapter"),
+            # Told alone: that a removal ends the attempt could be told first.
+            'vexa: "Café": the adapter was taken out': lambda _: self.control.do("notify", source=8, code=14),
             "vexa: not waited for: the service goes on with it": lambda joining: joining.stop(signal.SIGINT),
             "vexa: the service has closed the connection": lambda _: self.machine.stop(),
         }
