@@ -8,12 +8,12 @@
 #include "client/hotspot/Fitting.h"
 #include "client/hotspot/HotspotQuestions.h"
 #include "client/terminal/Text.h"
+#include "contract/Ports.h"
 
 namespace vexa::client {
 
 namespace {
 
-constexpr const char* kCommand = "CONNECT_NETWORK";
 // Each credential may take some seconds, a certificate twice, behind an attempt that runs already.
 constexpr int kDefaultTimeout = 60;
 // The service tells nothing of an attempt that it leaves to the system.
@@ -41,7 +41,7 @@ public:
         if (m_network.isConnected) return sayConnected("Already connected to ");
         // What was told until now says nothing of what comes.
         m_port.waitUntilHandled();
-        tellOfNetwork(m_port, kCommand, m_options.network);
+        tellOfNetwork(m_port, contract::kConnectNetwork, m_options.network);
         if (m_options.noWait) return sayAsked();
         JoinJudge judge(m_options.network);
         const Outcome outcome = awaitOutcome(m_port, judge, limit());

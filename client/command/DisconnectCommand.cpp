@@ -7,12 +7,12 @@
 #include "client/hotspot/ConnectionWait.h"
 #include "client/hotspot/HotspotQuestions.h"
 #include "client/terminal/Text.h"
+#include "contract/Ports.h"
 
 namespace vexa::client {
 
 namespace {
 
-constexpr const char* kCommand = "DISCONNECT_NETWORK";
 constexpr int kDefaultTimeout = 10;
 // An attempt that is under way ends at once, or there was none.
 constexpr std::chrono::seconds kAttemptLimit{3};
@@ -45,7 +45,7 @@ int runDisconnect(ConnectionOptions& options) {
     const bool isConnected = connected != nullptr && connected->name == options.network;
     // What was told until now says nothing of what comes.
     port.waitUntilHandled();
-    tellOfNetwork(port, kCommand, options.network);
+    tellOfNetwork(port, contract::kDisconnectNetwork, options.network);
     const std::string name = inQuotes(options.network);
     if (options.noWait) {
         port.waitUntilHandled();

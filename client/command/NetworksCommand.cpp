@@ -9,6 +9,7 @@
 #include "client/hotspot/Network.h"
 #include "client/port/HotspotPort.h"
 #include "client/terminal/TerminalKeys.h"
+#include "contract/Ports.h"
 
 namespace vexa::client {
 
@@ -37,8 +38,8 @@ void explain(HotspotPort& port, const HotspotOptions& options) {
 // An adapter that comes is asked for its list; all later lists come by themselves.
 void watch(HotspotPort& port, NetworkList shown, bool json) {
     while (const auto event = port.next(Deadline::never())) {
-        if (event->id == kCardIn) port.tell(kNetworkList);
-        if (event->id != kNetworkList) continue;
+        if (event->id == contract::kCardPlugIn) port.tell(contract::kGetAllNetworkList);
+        if (event->id != contract::kGetAllNetworkList) continue;
         NetworkList list = networkList(payloadOf(*event));
         if (list == shown) continue;
         shown = std::move(list);

@@ -7,12 +7,11 @@
 #include "client/hotspot/HotspotQuestions.h"
 #include "client/machine/MachineRegistry.h"
 #include "client/port/HotspotPort.h"
+#include "contract/Ports.h"
 
 namespace vexa::client {
 
 namespace {
-
-constexpr const char* kSwitch = "SET_HOTSPOT_AUTO_CONNECT";
 
 void say(const HotspotOptions& options, const char* member, const Json::Value& value, const char* sentence) {
     Json::Value object(Json::objectValue);
@@ -33,7 +32,8 @@ int runSwitch(const HotspotOptions& options, bool isOn) {
     const auto isOurs = [isOn](const Json::Value& payload) {
         return payload.isBool() && payload.asBool() == isOn;
     };
-    const auto answer = port.ask(kSwitch, isOn ? "true" : "false", kSwitch, isOurs);
+    const auto answer = port.ask(contract::kSetHotspotAutoConnect, isOn ? "true" : "false",
+                                 contract::kSetHotspotAutoConnect, isOurs);
     if (!answer.isAccepted) throw ClientError("the service did not turn the switch");
     const auto machine = options.port.machine();
     if (machine && !writeHotspotSwitch(*machine, isOn))
@@ -47,7 +47,7 @@ int runRefresh(const HotspotOptions& options) {
     Signals signals;
     HotspotPort port(options.port.find(), signals, options.limit());
     requireAdapter(port);
-    port.tell("UPDATE_NETWORK_REALM");
+    port.tell(contract::kUpdateNetworkRealm);
     port.waitUntilHandled();
     say(options, "refreshing", true, "The realms of the networks are being asked for again.");
     return kExitOk;

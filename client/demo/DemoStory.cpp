@@ -11,6 +11,7 @@
 #include "client/port/EventLines.h"
 #include "client/port/JsonLine.h"
 #include "client/terminal/Text.h"
+#include "contract/Ports.h"
 
 namespace vexa::client {
 
@@ -30,8 +31,8 @@ struct Step {
     const char* sentence;
 };
 constexpr std::array kSteps{
-    Step{"Gate 12", "DISCONNECT_NETWORK", "Gate 12", "the traveller leaves \"Gate 12\""},
-    Step{"Departures", "CONNECT_NETWORK", "Gate 12", "the traveller asks for \"Gate 12\""}};
+    Step{"Gate 12", contract::kDisconnectNetwork, "Gate 12", "the traveller leaves \"Gate 12\""},
+    Step{"Departures", contract::kConnectNetwork, "Gate 12", "the traveller asks for \"Gate 12\""}};
 
 /// What of the log tells reasons.
 constexpr std::array kReasons{"authMode=machineOrUser failed", "has been disconnected by user",
@@ -46,7 +47,7 @@ constexpr int kFewestStoryRows = 4;
 
 /// What the other sentences tell as well.
 bool isAside(const Event& event) {
-    return event.id == "DETECTED_HOTSPOT" || event.id == "GET_IS_INTERNET_ACCESS";
+    return event.id == contract::kDetectedHotspot || event.id == contract::kGetIsInternetAccess;
 }
 
 bool isReason(const std::string& line) {

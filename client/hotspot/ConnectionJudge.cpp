@@ -1,4 +1,5 @@
 #include "client/hotspot/ConnectionJudge.h"
+#include "contract/Ports.h"
 
 #include <algorithm>
 #include <utility>
@@ -34,15 +35,15 @@ std::vector<const char*> ConnectionJudge::takeQuestions() {
 // comes behind a result knows what kind of result it was.
 Outcome ConnectionJudge::apply(const Event& event, Time now) {
     const Json::Value payload = payloadOf(event);
-    if (event.id == kCardOut) return Outcome::AdapterOut;
+    if (event.id == contract::kCardPlugOut) return Outcome::AdapterOut;
     if (m_checkpoints.take(event) && !m_checkpoints.isPassed()) check();
-    if (event.id == "GET_RADIO" && payload == Json::Value(false)) return Outcome::RadioOff;
-    if (event.id == "CONNECT_DISCONNECT") {
+    if (event.id == contract::kGetRadio && payload == Json::Value(false)) return Outcome::RadioOff;
+    if (event.id == contract::kConnectDisconnect) {
         m_results.push_back({payload == Json::Value(1), m_checkpoints.isPassed(), false});
-        if (wantsLists()) m_questions.push_back(kNetworkList);
-    } else if (event.id == "GET_IS_INTERNET_ACCESS" && !m_results.empty()) {
+        if (wantsLists()) m_questions.push_back(contract::kGetAllNetworkList);
+    } else if (event.id == contract::kGetIsInternetAccess && !m_results.empty()) {
         m_results.back().isReport = true;
-    } else if (event.id == kNetworkList) {
+    } else if (event.id == contract::kGetAllNetworkList) {
         return judge(networkList(payload), std::exchange(m_results, {}), now);
     }
     return Outcome::Open;

@@ -5,6 +5,7 @@
 
 #include "client/hotspot/HotspotQuestions.h"
 #include "client/terminal/Text.h"
+#include "contract/Ports.h"
 
 namespace vexa::client {
 
@@ -45,7 +46,7 @@ Outcome awaitOutcome(HotspotPort& port, ConnectionJudge& judge, milliseconds lim
         }
         if (end.isOver()) return Outcome::Open;
         if (!nextLook.isOver()) continue;
-        if (judge.wantsLists()) port.tell(kNetworkList);
+        if (judge.wantsLists()) port.tell(contract::kGetAllNetworkList);
         nextLook = Deadline::in(kBetweenLooks);
     }
 } catch (const StoppedByUser&) {

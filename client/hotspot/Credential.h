@@ -37,7 +37,6 @@ struct Credential {
 using CredentialList = std::vector<Credential>;
 
 /// The command that asks for the list, and the event that tells it.
-inline constexpr const char* kCredentialList = "GET_ALL_CREDENTIAL_LIST";
 
 /// The list out of the payload of its event, in the order of priority; entries that are none are left out.
 CredentialList credentialList(const Json::Value& payload);

@@ -7,6 +7,7 @@
 #include "client/hotspot/CredentialText.h"
 #include "client/port/JsonLine.h"
 #include "client/terminal/Text.h"
+#include "contract/Ports.h"
 
 namespace vexa::client {
 
@@ -62,34 +63,35 @@ std::string reasonAgainst(const CredentialList& list, const Credential& wanted) 
 }  // namespace
 
 const CredentialList& CredentialStore::read() {
-    const auto answer = m_port.question(kCredentialList, acceptsAny);
+    const auto answer = m_port.question(contract::kGetAllCredentialList, acceptsAny);
     if (!answer.payload) throw ClientError(kNoList);
     return m_list = credentialList(*answer.payload);
 }
 
 // A list that another client has asked for may be older than the file, so that only the last one will do.
 const CredentialList& CredentialStore::reload() {
-    m_port.tell("READ_CREDENTIAL_FROM_FILE");
-    const auto answer =
-        m_port.ask(kCredentialList, std::nullopt, kCredentialList, [](const Json::Value&) { return false; });
+    m_port.tell(contract::kReadCredentialFromFile);
+    const auto answer = m_port.ask(contract::kGetAllCredentialList, std::nullopt,
+                                   contract::kGetAllCredentialList, [](const Json::Value&) { return false; });
     if (!answer.payload) throw ClientError(kNoList);
     return m_list = credentialList(*answer.payload);
 }
 
 const Credential& CredentialStore::add(const Credential& wanted) {
     const CredentialList before = m_list;
-    const bool isMade = change("ADD_CREDENTIAL", credentialData(wanted), [&](const CredentialList& after) {
-        return findAdded(before, after, wanted) != nullptr;
-    });
+    const bool isMade =
+        change(contract::kAddCredential, credentialData(wanted),
+               [&](const CredentialList& after) { return findAdded(before, after, wanted) != nullptr; });
     if (!isMade) throw ClientError("not stored: " + reasonAgainst(m_list, wanted));
     return *findAdded(before, m_list, wanted);
 }
 
 void CredentialStore::edit(const Credential& wanted) {
-    const bool isMade = change("EDIT_CREDENTIAL", credentialData(wanted), [&](const CredentialList& after) {
-        const Credential* now = findById(after, wanted.id);
-        return now != nullptr && *now == wanted;
-    });
+    const bool isMade =
+        change(contract::kEditCredential, credentialData(wanted), [&](const CredentialList& after) {
+            const Credential* now = findById(after, wanted.id);
+            return now != nullptr && *now == wanted;
+        });
     if (isMade) return;
     if (findById(m_list, wanted.id) == nullptr)
         throw ClientError("not changed: there is no credential " + std::to_string(wanted.id) + " any more");
@@ -97,17 +99,17 @@ void CredentialStore::edit(const Credential& wanted) {
 }
 
 void CredentialStore::erase(int id) {
-    const bool isMade = change("DELETE_CREDENTIAL", idData(id),
+    const bool isMade = change(contract::kDeleteCredential, idData(id),
                                [id](const CredentialList& after) { return findById(after, id) == nullptr; });
     if (!isMade) throw ClientError(std::string("not deleted: ") + kUnknownReason);
 }
 
 std::size_t CredentialStore::move(int id, std::size_t position) {
-    const bool isMade =
-        change("SET_POSITION_CREDENTIAL", positionData(id, position), [&](const CredentialList& after) {
-            return findById(after, id) != nullptr &&
-                   positionOf(after, id) == std::min(position, after.size());
-        });
+    const bool isMade = change(contract::kSetPositionCredential, positionData(id, position),
+                               [&](const CredentialList& after) {
+                                   return findById(after, id) != nullptr &&
+                                          positionOf(after, id) == std::min(position, after.size());
+                               });
     if (isMade) return positionOf(m_list, id);
     if (findById(m_list, id) == nullptr)
         throw ClientError("not moved: there is no credential " + std::to_string(id) + " any more");
@@ -116,10 +118,11 @@ std::size_t CredentialStore::move(int id, std::size_t position) {
 
 bool CredentialStore::change(const std::string& command, const std::string& data, const Shows& shows) {
     try {
-        const auto answer = m_port.ask(command, data, kCredentialList, [&](const Json::Value& payload) {
-            m_list = credentialList(payload);
-            return shows(m_list);
-        });
+        const auto answer =
+            m_port.ask(command, data, contract::kGetAllCredentialList, [&](const Json::Value& payload) {
+                m_list = credentialList(payload);
+                return shows(m_list);
+            });
         if (!answer.payload) throw ClientError(kNoList);
         return answer.isAccepted;
     } catch (const StoppedByUser& error) {

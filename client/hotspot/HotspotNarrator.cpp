@@ -10,6 +10,7 @@
 #include "client/hotspot/Fitting.h"
 #include "client/port/JsonLine.h"
 #include "client/terminal/Text.h"
+#include "contract/Ports.h"
 
 namespace vexa::client {
 
@@ -36,23 +37,25 @@ struct HotspotNarrator::Entry {
 };
 
 const HotspotNarrator::Entry* HotspotNarrator::entryOf(const std::string& event) {
-    static constexpr std::array kEntries{Entry{kNetworkList, &HotspotNarrator::tellNetworks},
-                                         Entry{kCredentialList, &HotspotNarrator::tellCredentials},
-                                         Entry{"GET_RADIO", &HotspotNarrator::tellRadio},
-                                         Entry{"SET_HOTSPOT_AUTO_CONNECT", &HotspotNarrator::tellSwitch},
-                                         Entry{kCardIn, &HotspotNarrator::tellCardIn},
-                                         Entry{kCardOut, &HotspotNarrator::tellCardOut},
-                                         Entry{"CONNECT_DISCONNECT", &HotspotNarrator::tellResult},
-                                         Entry{"GET_IS_INTERNET_ACCESS", &HotspotNarrator::tellInternet},
-                                         Entry{"DETECTED_HOTSPOT", &HotspotNarrator::tellDetected},
-                                         Entry{"SUPPLICANT_STATE_CHANGE", &HotspotNarrator::tellModuleState}};
+    static constexpr std::array kEntries{
+        Entry{contract::kGetAllNetworkList, &HotspotNarrator::tellNetworks},
+        Entry{contract::kGetAllCredentialList, &HotspotNarrator::tellCredentials},
+        Entry{contract::kGetRadio, &HotspotNarrator::tellRadio},
+        Entry{contract::kSetHotspotAutoConnect, &HotspotNarrator::tellSwitch},
+        Entry{contract::kCardPlugIn, &HotspotNarrator::tellCardIn},
+        Entry{contract::kCardPlugOut, &HotspotNarrator::tellCardOut},
+        Entry{contract::kConnectDisconnect, &HotspotNarrator::tellResult},
+        Entry{contract::kGetIsInternetAccess, &HotspotNarrator::tellInternet},
+        Entry{contract::kDetectedHotspot, &HotspotNarrator::tellDetected},
+        Entry{contract::kSupplicantStateChange, &HotspotNarrator::tellModuleState}};
     const auto found = std::find_if(kEntries.begin(), kEntries.end(),
                                     [&](const Entry& entry) { return event == entry.event; });
     return found == kEntries.end() ? nullptr : &*found;
 }
 
 std::vector<const char*> HotspotNarrator::firstQuestions() {
-    return {"GET_IS_CARD_IN", "GET_RADIO", kCredentialList, kNetworkList, "GET_IS_INTERNET_ACCESS"};
+    return {contract::kGetIsCardIn, contract::kGetRadio, contract::kGetAllCredentialList,
+            contract::kGetAllNetworkList, contract::kGetIsInternetAccess};
 }
 
 std::vector<std::string> HotspotNarrator::tell(const Event& event) {
@@ -68,7 +71,7 @@ std::vector<const char*> HotspotNarrator::takeQuestions() {
 // A success does not name its network; the list that was asked for then does. A connection of the system's
 // own is told as a success whatever came of it.
 HotspotNarrator::Sentences HotspotNarrator::tellResult(const Json::Value& payload) {
-    m_questions.push_back(kNetworkList);
+    m_questions.push_back(contract::kGetAllNetworkList);
     if (payload != Json::Value(1)) return {"an attempt to connect has failed"};
     m_isResultOpen = true;
     return {};
@@ -138,7 +141,9 @@ HotspotNarrator::Sentences HotspotNarrator::tellSwitch(const Json::Value& payloa
 // One that comes has networks and credentials to tell; all later lists come by themselves.
 HotspotNarrator::Sentences HotspotNarrator::tellCardIn(const Json::Value& /*payload*/) {
     if (m_isCardIn == true) return {};
-    if (m_isCardIn) m_questions.insert(m_questions.end(), {kCredentialList, kNetworkList});
+    if (m_isCardIn)
+        m_questions.insert(m_questions.end(),
+                           {contract::kGetAllCredentialList, contract::kGetAllNetworkList});
     return flagChange(m_isCardIn, true, "the adapter is in", "");
 }
 

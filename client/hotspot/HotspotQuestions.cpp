@@ -3,6 +3,7 @@
 #include "client/hotspot/CredentialStore.h"
 #include "client/hotspot/Fitting.h"
 #include "client/machine/MachineRegistry.h"
+#include "contract/Ports.h"
 
 namespace vexa::client {
 
@@ -17,16 +18,16 @@ std::optional<bool> askFlag(HotspotPort& port, const char* name) {
 }  // namespace
 
 std::optional<NetworkList> askNetworks(HotspotPort& port) {
-    const auto answer = port.question(kNetworkList, acceptsAny);
+    const auto answer = port.question(contract::kGetAllNetworkList, acceptsAny);
     return answer.payload ? std::optional(networkList(*answer.payload)) : std::nullopt;
 }
 
 bool askRadio(HotspotPort& port) {
-    return askFlag(port, "GET_RADIO").value_or(false);
+    return askFlag(port, contract::kGetRadio).value_or(false);
 }
 
 std::optional<bool> askInternet(HotspotPort& port) {
-    return askFlag(port, "GET_IS_INTERNET_ACCESS");
+    return askFlag(port, contract::kGetIsInternetAccess);
 }
 
 void requireRadio(HotspotPort& port) {

@@ -29,7 +29,6 @@ struct Network {
 using NetworkList = std::vector<Network>;
 
 /// The command that asks for the list, and the event that tells it.
-inline constexpr const char* kNetworkList = "GET_ALL_NETWORK_LIST";
 
 /// The list out of the payload of its event, in its order; entries that are none are left out.
 NetworkList networkList(const Json::Value& payload);

@@ -1,4 +1,5 @@
 #include "client/port/Checkpoints.h"
+#include "contract/Ports.h"
 
 namespace vexa::client {
 
@@ -10,7 +11,8 @@ constexpr int kEnough = 2;
 
 /// An adapter that comes or goes makes the same event, from another source.
 bool isAnswer(const Event& event) {
-    return event.source == "HotSpot20" && (event.id == kCardIn || event.id == kCardOut);
+    return event.source == contract::kHotspotSource &&
+           (event.id == contract::kCardPlugIn || event.id == contract::kCardPlugOut);
 }
 
 }  // namespace

@@ -1,6 +1,7 @@
 #pragma once
 
 #include "client/port/Event.h"
+#include "contract/Ports.h"
 
 namespace vexa::client {
 
@@ -10,7 +11,7 @@ namespace vexa::client {
 class Checkpoints {
 public:
     /// The question; it is answered whatever the state of the service.
-    static constexpr const char* kQuestion = "GET_IS_CARD_IN";
+    static constexpr const char* kQuestion = contract::kGetIsCardIn;
 
     /// What is still owed for earlier questions tells nothing from here on.
     void begin();

@@ -8,9 +8,6 @@
 
 namespace vexa::client {
 
-inline constexpr const char* kCardIn = "CARD_PLUG_IN";
-inline constexpr const char* kCardOut = "CARD_PLUG_OUT";
-
 /// What the service tells, taken out of its envelope. Without a payload `data` is empty.
 struct Event {
     std::string id;

@@ -1,4 +1,5 @@
 #include "client/port/HotspotPort.h"
+#include "contract/Ports.h"
 
 #include <algorithm>
 
@@ -45,7 +46,7 @@ HotspotPort::Answer HotspotPort::ask(const std::string& command, const std::opti
             if (answer.isAccepted) break;
             if (!m_checkpoints.isAsked()) checkNow();
         } else if (m_checkpoints.take(*told)) {
-            answer.cardIn = told->id == kCardIn;
+            answer.cardIn = told->id == contract::kCardPlugIn;
             if (!m_checkpoints.isPassed()) checkNow();
         }
     }
@@ -65,7 +66,7 @@ bool HotspotPort::hasAdapter() {
     sendCheck();
     const Deadline end = Deadline::in(m_limit);
     while (const auto told = next(end)) {
-        if (m_checkpoints.take(*told)) return told->id == kCardIn;
+        if (m_checkpoints.take(*told)) return told->id == contract::kCardPlugIn;
     }
     throw NoAnswer(silenceText(m_limit));
 }

@@ -1,9 +1,10 @@
 #include "client/spectrum/SpectralScan.h"
+#include "contract/Ports.h"
 
 namespace vexa::client {
 
 SpectralScan::SpectralScan(std::uint16_t port) : m_client(port) {
-    m_client.send(commandText("GET_CHANNEL_LIST"));
+    m_client.send(commandText(contract::kGetChannelList));
 }
 
 SpectralScan::~SpectralScan() {
@@ -11,12 +12,12 @@ SpectralScan::~SpectralScan() {
 }
 
 void SpectralScan::start() {
-    m_client.send(commandText("FULL_SCAN"));
+    m_client.send(commandText(contract::kFullScan));
     m_scanning = true;
 }
 
 void SpectralScan::stop() {
-    if (m_scanning) m_client.send(commandText("STOP_SCAN"));
+    if (m_scanning) m_client.send(commandText(contract::kStopScan));
     m_scanning = false;
 }
 

@@ -5,14 +5,13 @@
 
 #include "client/port/JsonLine.h"
 #include "client/terminal/Text.h"
+#include "contract/Ports.h"
 
 namespace vexa::client {
 
 namespace {
 
 using Change = SpectralView::Change;
-
-constexpr const char* kCurrentChannel = "SPECTRAL_ANALYSER_CURRENT_CHANNEL_DATA";
 
 std::string describeSample(const SpectralView::Update& update, const SpectralView& view,
                            const char* quantity) {
@@ -56,7 +55,7 @@ std::string describeEvent(const Event& event, const SpectralView::Update& update
         case Change::None:
             break;
     }
-    if (event.id == kCurrentChannel)
+    if (event.id == contract::kCurrentChannelData)
         return event.data == "0" ? "connected on no channel" : "connected on channel " + event.data;
     return event.data.empty() ? event.id : event.id + " " + event.data;
 }

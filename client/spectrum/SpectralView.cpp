@@ -5,32 +5,27 @@
 #include <algorithm>
 
 #include "client/port/JsonLine.h"
+#include "contract/Ports.h"
 
 namespace vexa::client {
 
-namespace {
-
-constexpr const char* kChannelList = "SPECTRAL_ANALYSER_CHANNEL_LIST_DATA_2G5G";
-constexpr const char* kCongestion = "SPECTRAL_ANALYSER_SAMPLE_DATA_CONGESTION";
-constexpr const char* kInterference = "SPECTRAL_ANALYSER_SAMPLE_DATA_INTERFERENCE";
-
-}  // namespace
+namespace {}  // namespace
 
 SpectralView::Update SpectralView::apply(const Event& event) {
     ++m_eventCount;
-    if (event.id == kCongestion) {
+    if (event.id == contract::kSampleDataCongestion) {
         return applySample(event.data, "congestion_value", &Values::congestion, Change::Congestion);
     }
-    if (event.id == kInterference) {
+    if (event.id == contract::kSampleDataInterference) {
         return applySample(event.data, "noise_value", &Values::interference, Change::Interference);
     }
-    if (event.id == kChannelList) return applyChannelList(event.data);
-    if (event.id == "RADIO_ON" || event.id == "RADIO_OFF") {
-        m_radioOn = event.id == "RADIO_ON";
+    if (event.id == contract::kChannelListData) return applyChannelList(event.data);
+    if (event.id == contract::kRadioOn || event.id == contract::kRadioOff) {
+        m_radioOn = event.id == contract::kRadioOn;
         return {Change::Radio};
     }
-    if (event.id == kCardIn || event.id == kCardOut) {
-        m_cardIn = event.id == kCardIn;
+    if (event.id == contract::kCardPlugIn || event.id == contract::kCardPlugOut) {
+        m_cardIn = event.id == contract::kCardPlugIn;
         return {Change::Card};
     }
     return {};

@@ -5,9 +5,6 @@
 
 namespace vexa {
 
-inline constexpr const char* kHotspotSource = "HotSpot20";
-inline constexpr const char* kSpectralSource = "SpectralAnalyser";
-
 /// The text of one event for the client, stamped with the present local time. `data` is text too, often JSON
 /// in the styled form; without it the event has no `Data`.
 std::string buildEnvelope(const std::string& eventId, const char* source,

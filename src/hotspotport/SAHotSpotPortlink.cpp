@@ -5,6 +5,7 @@
 #include "base/DiagnosticLog.h"
 #include "channel/Envelope.h"
 #include "connection/SupplicantMgr.h"
+#include "contract/Ports.h"
 #include "text/NeverDestroyed.h"
 
 namespace vexa {
@@ -37,7 +38,7 @@ void SAHotSpotPortlink::updateCardState() {
 }
 
 bool SAHotSpotPortlink::SendData(const std::string& data, const std::string& eventId) {
-    const std::string text = buildEnvelope(eventId, kHotspotSource, data);
+    const std::string text = buildEnvelope(eventId, contract::kHotspotSource, data);
     const IpcHandle ipc = m_hIpc;
     if (ipc == 0) {
         Log(6, "ERROR: IPC handle is NULL in SAHotSpotPortlink::SendData.");

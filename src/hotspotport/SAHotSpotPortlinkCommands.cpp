@@ -5,6 +5,7 @@
 #include "base/DiagnosticLog.h"
 #include "channel/JsonText.h"
 #include "connection/SupplicantMgr.h"
+#include "contract/Ports.h"
 #include "hotspotport/CredentialCommands.h"
 #include "hotspotport/SAHotSpotPortlink.h"
 
@@ -63,20 +64,20 @@ bool withNetwork(Server& server, const Json::Value& data) {
 }
 
 constexpr std::array<Command, 14> kCommands = {{
-    {"UPDATE_NETWORK_REALM", answer<&Server::updateNetworkRealm>},
-    {"GET_RADIO", answer<&Server::SendRadioState>},
-    {"SET_HOTSPOT_AUTO_CONNECT", autoConnect},
-    {"GET_IS_CARD_IN", answer<&Server::SendCardState>},
-    {"READ_CREDENTIAL_FROM_FILE", reload},
-    {"GET_ALL_CREDENTIAL_LIST", answer<&Server::SendCredentialList>, true},
-    {"ADD_CREDENTIAL", changeCredentials<addCredential>, true},
-    {"DELETE_CREDENTIAL", changeCredentials<deleteCredential>, true},
-    {"EDIT_CREDENTIAL", changeCredentials<editCredential>, true},
-    {"SET_POSITION_CREDENTIAL", changeCredentials<setCredentialPosition>, true},
-    {"CONNECT_NETWORK", withNetwork<&Server::connectNetworkByName>},
-    {"DISCONNECT_NETWORK", withNetwork<&Server::disconnectNetworkByName>},
-    {"GET_ALL_NETWORK_LIST", networkList},
-    {"GET_IS_INTERNET_ACCESS", answer<&Server::SendInternetAccess>},
+    {contract::kUpdateNetworkRealm, answer<&Server::updateNetworkRealm>},
+    {contract::kGetRadio, answer<&Server::SendRadioState>},
+    {contract::kSetHotspotAutoConnect, autoConnect},
+    {contract::kGetIsCardIn, answer<&Server::SendCardState>},
+    {contract::kReadCredentialFromFile, reload},
+    {contract::kGetAllCredentialList, answer<&Server::SendCredentialList>, true},
+    {contract::kAddCredential, changeCredentials<addCredential>, true},
+    {contract::kDeleteCredential, changeCredentials<deleteCredential>, true},
+    {contract::kEditCredential, changeCredentials<editCredential>, true},
+    {contract::kSetPositionCredential, changeCredentials<setCredentialPosition>, true},
+    {contract::kConnectNetwork, withNetwork<&Server::connectNetworkByName>},
+    {contract::kDisconnectNetwork, withNetwork<&Server::disconnectNetworkByName>},
+    {contract::kGetAllNetworkList, networkList},
+    {contract::kGetIsInternetAccess, answer<&Server::SendInternetAccess>},
 }};
 
 void logInvalidCommand(const std::string& id) {

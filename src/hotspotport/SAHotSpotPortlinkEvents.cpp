@@ -4,6 +4,7 @@
 #include "base/WlanMemory.h"
 #include "channel/JsonText.h"
 #include "connection/Supplicant.h"
+#include "contract/Ports.h"
 #include "hotspotport/SAHotSpotPortlink.h"
 #include "text/TextConversion.h"
 
@@ -34,11 +35,11 @@ Json::Value asJson(const Credential& credential) {
 
 void SAHotSpotPortlink::SendRadioState() {
     const bool isOn = isSoftwareRadioOn(m_hClientHandle.get(), m_interfaceGuid.get());
-    SendData(toStyledText(Json::Value(isOn)), "GET_RADIO");
+    SendData(toStyledText(Json::Value(isOn)), contract::kGetRadio);
 }
 
 void SAHotSpotPortlink::SendCardState() {
-    SendData("", m_bCardIn ? "CARD_PLUG_IN" : "CARD_PLUG_OUT");
+    SendData("", m_bCardIn ? contract::kCardPlugIn : contract::kCardPlugOut);
 }
 
 void SAHotSpotPortlink::SendCredentialList() {
@@ -49,7 +50,7 @@ void SAHotSpotPortlink::SendCredentialList() {
     Json::Value credentials;
     for (const Credential* credential : supplicant->credentials().copyCredentialPointers())
         credentials.append(asJson(*credential));
-    SendData(toStyledText(credentials), "GET_ALL_CREDENTIAL_LIST");
+    SendData(toStyledText(credentials), contract::kGetAllCredentialList);
 }
 
 void SAHotSpotPortlink::SendInternetAccess() {
@@ -58,18 +59,18 @@ void SAHotSpotPortlink::SendInternetAccess() {
     const auto supplicant = hotspotSupplicant(*this);
     if (!supplicant) return;
     const bool hasAccess = supplicant->getConnectedBss(false) != nullptr && supplicant->hasInternetAccess();
-    SendData(toStyledText(Json::Value(hasAccess)), "GET_IS_INTERNET_ACCESS");
+    SendData(toStyledText(Json::Value(hasAccess)), contract::kGetIsInternetAccess);
 }
 
 void SAHotSpotPortlink::SendConnectionResult(const ConnectionResult& result) {
     Log(3, "Send connection result to vexa.");
     const int outcome = result.m_result == ConnectionResult::kSucceeded ? 1 : 0;
-    SendData(toStyledText(Json::Value(outcome)), "CONNECT_DISCONNECT");
+    SendData(toStyledText(Json::Value(outcome)), contract::kConnectDisconnect);
 }
 
 void SAHotSpotPortlink::SendDetectedHotspot() {
     Log(3, "Detected HS20 networks.");
-    SendData(toStyledText(Json::Value()), "DETECTED_HOTSPOT");
+    SendData(toStyledText(Json::Value()), contract::kDetectedHotspot);
 }
 
 void SAHotSpotPortlink::SendSupplicantState(Bytes payload) {
@@ -81,7 +82,7 @@ void SAHotSpotPortlink::SendSupplicantState(Bytes payload) {
     Json::Value states;
     states["PreviousState"] = static_cast<std::int32_t>(previous);
     states["CurrentState"] = static_cast<std::int32_t>(current);
-    SendData(toStyledText(states), "SUPPLICANT_STATE_CHANGE");
+    SendData(toStyledText(states), contract::kSupplicantStateChange);
 }
 
 }  // namespace vexa

@@ -2,6 +2,7 @@
 #include "base/NetworkListLock.h"
 #include "channel/JsonText.h"
 #include "connection/Supplicant.h"
+#include "contract/Ports.h"
 #include "hotspotport/SAHotSpotPortlink.h"
 
 namespace vexa {
@@ -62,7 +63,7 @@ void SAHotSpotPortlink::SendNetworkList(Supplicant* supplicant) {
             networks.append(networkAsJson(*supplicant, *network, network == connected));
     const std::string text = toStyledText(networks);
     Log(0, "GET_ALL_NETWORK_LIST=%s", text.c_str());
-    SendData(text, "GET_ALL_NETWORK_LIST");
+    SendData(text, contract::kGetAllNetworkList);
 }
 
 }  // namespace vexa

@@ -3,6 +3,7 @@
 #include "channel/JsonText.h"
 #include "config/ResultCodes.h"
 #include "connection/Supplicant.h"
+#include "contract/Ports.h"
 #include "hotspotport/SAHotSpotPortlink.h"
 
 namespace vexa {
@@ -12,7 +13,7 @@ void SAHotSpotPortlink::setHotSpotAutoConnect(bool enable) {
     Log(3, "Set enable/disable HS20, param=%s", enable ? "true" : "false");
     const auto supplicant = hotspotSupplicant(*this);
     if (supplicant) supplicant->setHs20Enabled(enable);
-    SendData(toStyledText(Json::Value(enable)), "SET_HOTSPOT_AUTO_CONNECT");
+    SendData(toStyledText(Json::Value(enable)), contract::kSetHotspotAutoConnect);
 }
 
 void SAHotSpotPortlink::updateNetworkRealm() {

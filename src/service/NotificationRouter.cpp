@@ -11,6 +11,7 @@
 #include "base/DiagnosticLog.h"
 #include "connection/Supplicant.h"
 #include "connection/SupplicantMgr.h"
+#include "contract/Ports.h"
 #include "hotspot/IhvMessages.h"
 #include "hotspotport/SAHotSpotPortlink.h"
 #include "spectral/SAPortlink.h"
@@ -48,7 +49,7 @@ void sendToBoth(const Event& event, const std::string& text) {
 void onAdapterArrival(const Event& event) {
     event.hotspot.updateCardState();
     SupplicantMgr::instance().addSupplicantIfInterfaceExists();
-    const std::string text = SAPortlink::BuildEventText("CARD_PLUG_IN");
+    const std::string text = SAPortlink::BuildEventText(contract::kCardPlugIn);
     event.spectral.updateCardState();
     event.spectral.SendRadioState();
     sendToBoth(event, text);
@@ -56,7 +57,7 @@ void onAdapterArrival(const Event& event) {
 
 // The clients hear of it before the Supplicant goes.
 void onAdapterRemoval(const Event& event) {
-    sendToBoth(event, SAPortlink::BuildEventText("CARD_PLUG_OUT"));
+    sendToBoth(event, SAPortlink::BuildEventText(contract::kCardPlugOut));
     event.hotspot.updateCardState();
     SupplicantMgr::instance().removeSupplicantIfInterfaceRemoved();
 }
@@ -85,7 +86,7 @@ void onRadioChange(const Event& event) {
     const auto radio = dataOf<WLAN_PHY_RADIO_STATE>(event.notification);
     const bool isOn = radio && radio->dot11HardwareRadioState == dot11_radio_state_on &&
                       radio->dot11SoftwareRadioState == dot11_radio_state_on;
-    const std::string text = SAPortlink::BuildEventText(isOn ? "RADIO_ON" : "RADIO_OFF");
+    const std::string text = SAPortlink::BuildEventText(isOn ? contract::kRadioOn : contract::kRadioOff);
     if (const IpcHandle ipc = event.spectral.m_hIpc)
         IpcSend(ipc, text.data(), static_cast<std::uint32_t>(text.size()));
     event.hotspot.SendRadioState();

@@ -9,6 +9,7 @@
 #include "base/StandardOutput.h"
 #include "base/WlanMemory.h"
 #include "channel/JsonText.h"
+#include "contract/Ports.h"
 #include "platform/DebugOutput.h"
 #include "platform/SocketLibrary.h"
 
@@ -28,10 +29,10 @@ struct Command {
 };
 
 constexpr std::array<Command, 4> kCommands = {{
-    {"FULL_SCAN", [](SAPortlink& server) { server.HandleCommand(SAPortlink::kStartScan); }},
-    {"STOP_SCAN", [](SAPortlink& server) { server.HandleCommand(SAPortlink::kStopScan); }},
-    {"GET_CURRENT_CHANNEL", [](SAPortlink& server) { server.SendCurrentChannel(); }},
-    {"GET_CHANNEL_LIST",
+    {contract::kFullScan, [](SAPortlink& server) { server.HandleCommand(SAPortlink::kStartScan); }},
+    {contract::kStopScan, [](SAPortlink& server) { server.HandleCommand(SAPortlink::kStopScan); }},
+    {contract::kGetCurrentChannel, [](SAPortlink& server) { server.SendCurrentChannel(); }},
+    {contract::kGetChannelList,
      [](SAPortlink& server) {
          outputDebugString("portlink spectral begin GET_CHANNEL_LIST");
          server.SendRadioState();

@@ -2,6 +2,7 @@
 
 #include "channel/Envelope.h"
 #include "channel/JsonText.h"
+#include "contract/Ports.h"
 #include "spectral/SAPortlink.h"
 
 namespace vexa {
@@ -44,7 +45,7 @@ void SAPortlink::SendChannelList() {
             channels.append(entry);
         }
     }
-    Send(buildEnvelope("SPECTRAL_ANALYSER_CHANNEL_LIST_DATA_2G5G", kSpectralSource, toStyledText(channels)));
+    Send(buildEnvelope(contract::kChannelListData, contract::kSpectralSource, toStyledText(channels)));
 }
 
 }  // namespace vexa

@@ -2,23 +2,25 @@
 #include "base/WlanMemory.h"
 #include "channel/Envelope.h"
 #include "channel/JsonText.h"
+#include "contract/Ports.h"
 #include "spectral/SAPortlink.h"
 
 namespace vexa {
 
 std::string SAPortlink::BuildEventText(const std::string& eventId) {
-    return buildEnvelope(eventId, kSpectralSource);
+    return buildEnvelope(eventId, contract::kSpectralSource);
 }
 
 void SAPortlink::SendRadioState() {
-    Send(BuildEventText(isSoftwareRadioOn(m_hWlan.get(), m_interfaceGuid.get()) ? "RADIO_ON" : "RADIO_OFF"));
+    Send(BuildEventText(isSoftwareRadioOn(m_hWlan.get(), m_interfaceGuid.get()) ? contract::kRadioOn
+                                                                                : contract::kRadioOff));
 }
 
 void SAPortlink::SendCurrentChannel() {
     const int channel = HandleCommand(kQueryChannel)[3];
     printToStandardOutput("CurrentChannel=%d\n", channel);
     const std::string text =
-        buildEnvelope("SPECTRAL_ANALYSER_CURRENT_CHANNEL_DATA", kSpectralSource, std::to_string(channel));
+        buildEnvelope(contract::kCurrentChannelData, contract::kSpectralSource, std::to_string(channel));
     const bool isSent = IpcSend(m_hIpc, text.data(), static_cast<std::uint32_t>(text.size())) != 0;
     printToStandardOutput(isSent ? "Service send CurrentChannelData success!\n"
                                  : "Service send CurrentChannelData fail!\n");
@@ -28,7 +30,7 @@ void SAPortlink::SendSampleEvent(int order, int value, const char* eventId, cons
     Json::Value sample;
     sample["order"] = order;
     sample[valueName] = value;
-    Send(buildEnvelope(eventId, kSpectralSource, toStyledText(sample)));
+    Send(buildEnvelope(eventId, contract::kSpectralSource, toStyledText(sample)));
 }
 
 }  // namespace vexa

@@ -1,5 +1,6 @@
 #include <cstdio>
 
+#include "contract/Ports.h"
 #include "platform/DebugOutput.h"
 #include "spectral/SAPortlink.h"
 
@@ -93,13 +94,11 @@ void SAPortlink::PublishChannelValues() {
         const int order = static_cast<int>(index) + 1;
         m_congestion[index] = smoothCongestion(m_lastCongestion[index], m_congestion[index]);
         if (m_lastCongestion[index] != m_congestion[index]) {
-            SendSampleEvent(order, m_congestion[index], "SPECTRAL_ANALYSER_SAMPLE_DATA_CONGESTION",
-                            "congestion_value");
+            SendSampleEvent(order, m_congestion[index], contract::kSampleDataCongestion, "congestion_value");
             m_lastCongestion[index] = m_congestion[index];
         }
         if (m_lastNoise[index] != m_noise[index] && m_noise[index] != 0) {
-            SendSampleEvent(order, m_noise[index], "SPECTRAL_ANALYSER_SAMPLE_DATA_INTERFERENCE",
-                            "noise_value");
+            SendSampleEvent(order, m_noise[index], contract::kSampleDataInterference, "noise_value");
             m_lastNoise[index] = m_noise[index];
         }
     }

@@ -59,7 +59,7 @@ STORY(SupplicantStory, ASecondArrivalResetsIt, "{}") {
     story.expect("handles", handles(story), before);
     story.expectLog("Supplicant with GUID already exists, skip adding.",
                     "Going to reset the existed supplicant...",
-                    "Received wlan roaming ended event while not received");
+                    "Received wlan roaming ended event while not received wlan roaming not started event.");
 }
 
 STORY(SupplicantStory, ARemovalWhileAnotherAdapterIsThereRemovesNothing, R"({"adapters":[{},{}]})") {
