@@ -11,6 +11,7 @@
 #include "bench/OurServers.h"
 #include "channel/Envelope.h"
 #include "channel/JsonText.h"
+#include "contract/Ports.h"
 
 namespace {
 
@@ -33,7 +34,7 @@ private:
     static std::string answer(std::string_view message) {
         const auto id = vexa::readText(vexa::parseJsonText(message), "CommandId");
         const bool isKnown = id == "GET_IS_CARD_IN";
-        return vexa::buildEnvelope(isKnown ? "CARD_PLUG_OUT" : "", vexa::kHotspotSource, "");
+        return vexa::buildEnvelope(isKnown ? "CARD_PLUG_OUT" : "", vexa::contract::kHotspotSource, "");
     }
 };
 
@@ -70,7 +71,7 @@ void fanOut(benchmark::State& state) {
     for (int i = 0; i < kListeners; ++i)
         listeners.emplace_back(server.port());
     const std::string message =
-        vexa::buildEnvelope("SPECTRAL_ANALYSER_FULL_SCAN_COMPLETED", vexa::kSpectralSource);
+        vexa::buildEnvelope("SPECTRAL_ANALYSER_FULL_SCAN_COMPLETED", vexa::contract::kSpectralSource);
     std::vector<double> latencies;
     for (auto _ : state) {
         const auto begin = Clock::now();
