@@ -74,16 +74,23 @@ TEST(Actions, RadioChangesTheStateBeforeItsNotification) {
               R"({"radio":{"hardware":"unknown","software":"off"},"ssid":null,"state":"disconnected"})");
 }
 
-TEST(Actions, PullingMovesTheModulesToTheNextAdapterOfTheMaker) {
-    TestMachine machine(
+TEST(Actions, TheModulesAndTheConnectionAreThoseOfTheMakersFirstAdapter) {
+    Station station(
         "{'adapters': [{'hardwareId': 'pci\\\\ven_8086'}, {'hardwareId': 'USB\\\\VID_2B7E&PID_1'}, {}]}");
-    EXPECT_EQ(machine->adapters().served(), 1U);
-    machine.perform("{'do': 'pullAdapter', 'adapter': 1}");
-    EXPECT_EQ(machine->adapters().served(), 2U);
-    machine.perform("{'do': 'pullAdapter', 'adapter': 2}");
-    EXPECT_EQ(machine->adapters().served(), std::nullopt);
-    machine.perform("{'do': 'insertAdapter', 'adapter': 1}");
-    EXPECT_EQ(machine->adapters().served(), 1U);
+    const auto served = [&] { return station.machine->adapters().served(); };
+    EXPECT_EQ(served(), 1U);
+    station.act("{'do': 'pullAdapter', 'adapter': 1}");
+    EXPECT_EQ(served(), 2U);
+    station.act("{'do': 'pullAdapter', 'adapter': 2}");
+    EXPECT_EQ(served(), std::nullopt);
+    station.act("{'do': 'insertAdapter', 'adapter': 2}");
+    station.act("{'do': 'osConnect', 'ssid': 'Cafe'}");
+    station.machine.advance(200);
+    EXPECT_EQ(station.state(), "connected");
+    station.act("{'do': 'insertAdapter', 'adapter': 1}");
+    EXPECT_EQ(served(), 1U);
+    EXPECT_EQ(station.state(), "disconnected");
+    EXPECT_EQ(station.listener.codes(), "8/14 8/14 8/13 8/9 8/10 8/21 8/13");
 }
 
 TEST(Timeline, AdvanceDeliversInTheOrderInWhichThingsAreDue) {

@@ -49,18 +49,7 @@ TEST(Notifications, ComeToEveryHandlerInOrderWithExactlyTheirBytes) {
     EXPECT_TRUE(areGuidsEqual(heard[2].guid, {1, 2, 3, {4, 5, 6, 7, 8, 9, 10, 11}}));
 }
 
-TEST(Notifications, OnlyTheSourcesAskedForAreDelivered) {
-    TestMachine machine;
-    Listener listener;
-    DWORD previous = 0;
-    const auto ignore = [](PWLAN_NOTIFICATION_DATA, PVOID) { ADD_FAILURE() << "not asked for"; };
-    WlanRegisterNotification(listener.handle(), WLAN_NOTIFICATION_SOURCE_ACM, FALSE, ignore, nullptr, nullptr,
-                             &previous);
-    EXPECT_EQ(previous, WLAN_NOTIFICATION_SOURCE_ALL);
-    machine.perform("{'do': 'roam'}");
-}
-
-TEST(Notifications, PostedBeforeTheRegistrationAreDropped) {
+TEST(Notifications, AreForWhoeverIsRegisteredWhenTheyArePostedUntilTheyAreUnregistered) {
     TestMachine machine;
     SlowListener slow;
     machine->notifications().post({8, 1, {}, {}, nullptr});
@@ -68,43 +57,38 @@ TEST(Notifications, PostedBeforeTheRegistrationAreDropped) {
     machine->notifications().post({8, 2, {}, {}, nullptr});
     Listener late;
     const Ticket last = machine->notifications().post({8, 3, {}, {}, nullptr});
-    slow.leave.set();
-    machine->notifications().waitDelivered(last);
-    EXPECT_EQ(slow.codes(), "8/1 8/2 8/3");
-    EXPECT_EQ(late.codes(), "8/3");
-}
-
-TEST(Notifications, UnregisteringWaitsForARunningHandler) {
-    TestMachine machine;
-    SlowListener listener;
-    machine->notifications().post({8, 1, {}, {}, nullptr});
-    listener.entered.wait();
-    const Ticket second = machine->notifications().post({8, 2, {}, {}, nullptr});
 
     std::atomic<bool> hasLeftBefore{false};
     Event unregistering(Reset::Manual);
     platform::Thread thread;
     ASSERT_TRUE(thread.start("unregister", [&] {
         unregistering.set();
-        WlanRegisterNotification(listener.handle(), 0, FALSE, nullptr, nullptr, nullptr, nullptr);
-        hasLeftBefore = listener.hasLeft.load();
+        WlanRegisterNotification(slow.handle(), 0, FALSE, nullptr, nullptr, nullptr, nullptr);
+        hasLeftBefore = slow.hasLeft.load();
     }));
     unregistering.wait();
-    machine.advance(0);  // all threads rest: the other one waits inside the call
+    machine.advance(0);  // all threads rest: the other one waits inside the call for the running handler
     EXPECT_FALSE(hasLeftBefore);
-    listener.leave.set();
+    slow.leave.set();
     thread.join();
     EXPECT_TRUE(hasLeftBefore);
-    machine->notifications().waitDelivered(second);
-    EXPECT_EQ(listener.codes(), "8/1");
+    machine->notifications().waitDelivered(last);
+    EXPECT_EQ(slow.codes(), "8/1");
+    EXPECT_EQ(late.codes(), "8/3");
 }
 
-TEST(Notifications, AHandlerMayUnregisterItself) {
+TEST(Notifications, AHandlerMayUnregisterItselfAndHearsWhatItAskedForAlone) {
     TestMachine machine;
     Listener listener;
     listener.onNotification = [&](const WLAN_NOTIFICATION_DATA&) {
         WlanRegisterNotification(listener.handle(), 0, FALSE, nullptr, nullptr, nullptr, nullptr);
     };
+    const Listener other;
+    DWORD previous = 0;
+    const auto ignore = [](PWLAN_NOTIFICATION_DATA, PVOID) { ADD_FAILURE() << "not asked for"; };
+    WlanRegisterNotification(other.handle(), WLAN_NOTIFICATION_SOURCE_ACM, FALSE, ignore, nullptr, nullptr,
+                             &previous);
+    EXPECT_EQ(previous, WLAN_NOTIFICATION_SOURCE_ALL);
     machine.perform("{'do': 'roam'}");
     EXPECT_EQ(listener.codes(), "16/5");
 }
