@@ -14,10 +14,8 @@ const std::string kScenario =
     "{'networks': ["
     "{'bssid': '02:00:00:00:00:01', 'ssid': 'Cafe', 'channel': 11, 'accepts': [{'eapMethod': 21}]},"
     "{'bssid': '02:00:00:00:00:02', 'ssid': 'Bar', 'channel': 100, 'accepts': [{'eapMethod': 21}]},"
-    "{'bssid': '02:00:00:00:00:03', 'ssid': 'Own', 'osProfile': true},"
-    "{'bssid': '02:00:00:00:00:04', 'ssid': 'Cafe'}]}";
+    "{'bssid': '02:00:00:00:00:03', 'ssid': 'Own', 'osProfile': true}]}";
 const std::string kHideCafe = "{'do': 'hide', 'bssid': '02:00:00:00:00:01'}";
-const std::string kIdle = "disconnect";
 const std::string kRadioOff = "{'do': 'radio', 'software': 'off'}";
 
 const Texts kBegun = {"8/9 associating 0", "16/1 associating 0"};
@@ -44,11 +42,10 @@ Texts left(const std::string& reason) {
             "8/21 disconnected 0 " + reason};
 }
 
-// What was before is "joined", "trying" (half way), or an act.
-void bring(Station& station, const std::string& before) {
-    const bool isJoined = before == "joined";
-    station.act(isJoined || before == "trying" ? "connect Cafe" : before);
-    station.machine.advance(isJoined ? 200 : 100);
+void bring(Station& station, const std::string& state) {
+    if (state == "idle") return;
+    station.act(state == "pulled" ? "{'do': 'pullAdapter'}" : "connect Cafe");
+    station.machine.advance(state == "joined" ? 200 : 100);
     station.told();
 }
 
@@ -60,19 +57,17 @@ TEST(Connections, WhateverIsDoneHasItsCourse) {
         std::string act;
         Texts told;
     } cases[] = {
-        {kIdle, "connect Cafe", kBegun + joined("11")},
-        {kIdle, "connect Far", kBegun + refused("00038002")},
-        {kIdle, "discover Own", kBegun + joined("36")},
-        {kIdle, "discover Cafe", kBegun + refused("00050007")},
-        {kIdle, "{'do': 'osConnect', 'ssid': 'Cafe'}", joinedBySystem("11")},
+        {"idle", "connect Cafe", kBegun + joined("11")},
+        {"idle", "connect Far", kBegun + refused("00038002")},
+        {"idle", "discover Own", kBegun + joined("36")},
+        {"idle", "discover Cafe", kBegun + refused("00050007")},
+        {"idle", "{'do': 'osConnect', 'ssid': 'Cafe'}", joinedBySystem("11")},
         {"idle",
          "{'do': 'osConnect', 'ssid': 'Nowhere', 'succeeds': false}",
          {"8/9 associating 0", "8/10 disconnected 0 00038002"}},
-        {kHideCafe, "connect Cafe", kBegun + refused("00050007")},
-        {kRadioOff, "{'do': 'osConnect', 'ssid': 'Cafe'}", {}},
-        {kIdle, "disconnect", {}},
-        {kIdle, "{'do': 'dropConnection'}", {}},
-        {"{'do': 'pullAdapter'}", "{'do': 'insertAdapter'}", {"8/13 disconnected 0"}},
+        {"idle", "disconnect", {}},
+        {"idle", "{'do': 'dropConnection'}", {}},
+        {"pulled", "{'do': 'insertAdapter'}", {"8/13 disconnected 0"}},
         {"joined", "connect Bar", left("00038003") + kBegun + joined("100")},
         {"joined", "{'do': 'osConnect', 'ssid': 'Bar'}", left("00038003") + joinedBySystem("100")},
         {"joined", "disconnect", left("00028002")},
@@ -81,7 +76,7 @@ TEST(Connections, WhateverIsDoneHasItsCourse) {
         {"joined", kHideCafe, dropped("00028003")},
         {"joined", "{'do': 'setNetwork', 'bssid': '02:00:00:00:00:01', 'visible': false}",
          dropped("00028003")},
-        {"joined", "{'do': 'hide', 'bssid': '02:00:00:00:00:04'}", {}},
+        {"joined", "{'do': 'hide', 'bssid': '02:00:00:00:00:02'}", {}},
         {"joined", kRadioOff, Texts{"16/7 connected 11"} + lost},
         {"joined", "{'do': 'radio', 'hardware': 'off'}", Texts{"16/7 connected 11"} + lost},
         {"joined", "{'do': 'radio', 'software': 'on'}", {"16/7 connected 11"}},
@@ -91,7 +86,7 @@ TEST(Connections, WhateverIsDoneHasItsCourse) {
         {"trying", "{'do': 'osConnect', 'ssid': 'Cafe'}", cancelled + joinedBySystem("11")},
         {"trying", "disconnect", cancelled + Texts{"8/21 disconnected 0"}},
         {"trying", "{'do': 'dropConnection'}", joined("11")},
-        {"trying", kHideCafe, refused("00050007")},
+        {"trying", kHideCafe, refused("00038002")},
         {"trying", kRadioOff, Texts{"16/7 associating 0"} + cancelled},
         {"trying", "{'do': 'pullAdapter'}", cancelled + Texts{"8/14 gone"}},
     };
@@ -102,6 +97,18 @@ TEST(Connections, WhateverIsDoneHasItsCourse) {
         station.machine.advance(1000);
         EXPECT_EQ(station.told(), told) << before << " " << act;
     }
+}
+
+TEST(Connections, NothingBeginsOnWhatIsHiddenOrOff) {
+    Station station(kScenario);
+    station.act(kHideCafe);
+    station.act("connect Cafe");
+    station.machine.advance(200);
+    EXPECT_EQ(station.told(), kBegun + refused("00038002"));
+    station.act(kRadioOff);
+    station.act("{'do': 'osConnect', 'ssid': 'Bar'}");
+    station.machine.advance(1000);
+    EXPECT_EQ(station.told(), Texts{"16/7 disconnected 0"});
 }
 
 TEST(Connections, EachAttemptHasItsOwnTime) {
@@ -136,21 +143,26 @@ TEST(Connections, TheStateIsAssociatingWhenTheRequestReturns) {
 }
 
 TEST(Connections, TheServerLetsInWhatItAccepts) {
-    const std::string tls = tlsProfile("Cafe", "43616665", "ab cd", "machineOrUser");
+    const std::string machineMode = tlsProfile("Cafe", "43616665", "ab cd", "machine");
+    const std::string userMode = tlsProfile("Cafe", "43616665", "ab cd", "machineOrUser");
     const std::string ttls = ttlsProfile("Cafe", "43616665", "ann", " s&lt;cret ");
     const struct {
         std::string accepts;
         std::string profile;
         bool isLetIn;
     } cases[] = {
+        {"", ttls, false},
         {"{'eapMethod': 13}", ttls, false},
-        {"{'eapMethod': 13}, {'eapMethod': 21, 'username': 'ann', 'password': ' s<cret '}", ttls, true},
+        {"{'eapMethod': 13}, {'eapMethod': 21}", ttls, true},
+        {"{'eapMethod': 21, 'username': 'ann', 'password': ' s<cret '}", ttls, true},
         {"{'eapMethod': 21, 'username': 'Ann'}", ttls, false},
         {"{'eapMethod': 21, 'password': 's<cret'}", ttls, false},
-        {"{'eapMethod': 21, 'password': ''}", ttls, false},
-        {"{'eapMethod': 13, 'caCert': 'ab cd', 'authMode': 'machineOrUser'}", tls, true},
-        {"{'eapMethod': 13, 'caCert': 'ab'}", tls, false},
-        {"{'eapMethod': 13, 'authMode': 'machine'}", tls, false},
+        {"{'eapMethod': 21, 'username': 'ann', 'password': ''}", ttls, false},
+        {"{'eapMethod': 13, 'caCert': 'ab cd'}", userMode, true},
+        {"{'eapMethod': 13, 'caCert': 'ab'}", userMode, false},
+        {"{'eapMethod': 13, 'authMode': 'machine'}", userMode, false},
+        {"{'eapMethod': 13, 'authMode': 'machine'}", machineMode, true},
+        {"{'eapMethod': 13, 'username': 'ann'}", userMode, false},
     };
     for (const auto& [accepts, profile, isLetIn] : cases) {
         Station station(kScenario);
@@ -211,6 +223,45 @@ TEST(Connections, WhateverHappensEachAttemptHasOneEndAndEachConnectionToo) {
         }
         EXPECT_TRUE(std::regex_match(course, inOrder)) << "seed " << seed << " " << course;
     }
+}
+
+TEST(Connections, AHandlerMayConnectAgain) {
+    Station station(kScenario);
+    int times = 0;
+    station.listener.onNotification = [&](const WLAN_NOTIFICATION_DATA& data) {
+        const bool isResult = data.NotificationSource == 8 && data.NotificationCode == 10;
+        if (isResult && ++times < 3) station.act("connect Cafe");
+    };
+    station.act("connect Far");
+    station.machine.advance(200);
+    EXPECT_EQ(station.state(), "associating");
+    station.machine.advance(200);
+    EXPECT_EQ(station.listener.codes(),
+              "8/9 16/1 8/11 8/10 8/9 16/1 16/2 16/3 16/4 8/10 8/20 16/9 16/10 8/21 8/9 16/1");
+    EXPECT_EQ(times, 2);
+}
+
+TEST(Connections, TheFirstVisibleNetworkOfAnSsidIsMeant) {
+    const std::string open = "'ssid': 'Cafe', 'accepts': [{'eapMethod': 21}]}";
+    Station station("{'networks': [{'bssid': '02:00:00:00:00:01', 'visible': false, " + open +
+                    ", {'bssid': '02:00:00:00:00:02', 'channel': 1, " + open +
+                    ", {'bssid': '02:00:00:00:00:03', 'channel': 6, " + open + "]}");
+    station.act("connect Cafe");
+    station.machine.advance(200);
+    station.act("{'do': 'hide', 'bssid': '02:00:00:00:00:03'}");
+    EXPECT_EQ(station.told(), kBegun + joined("1"));
+}
+
+TEST(Connections, AnAdapterThatTakesOverTheModulesEndsTheConnectionOfTheOther) {
+    Station station(
+        "{'adapters': [{'hardwareId': null}, {'inserted': false}, {}], 'networks': [{'bssid': "
+        "'02:00:00:00:00:01', 'ssid': 'Cafe'}]}");
+    station.act("{'do': 'osConnect', 'ssid': 'Cafe', 'succeeds': true}");
+    station.machine.advance(200);
+    EXPECT_EQ(station.state(), "connected");
+    station.act("{'do': 'insertAdapter', 'adapter': 1}");
+    EXPECT_EQ(station.listener.codes(), "8/9 8/10 8/21 8/13");
+    EXPECT_EQ(station.state(), "disconnected");
 }
 
 }  // namespace
