@@ -6,6 +6,7 @@
 #include <array>
 #include <boost/asio/io_context.hpp>
 #include <boost/asio/ip/tcp.hpp>
+#include <boost/asio/read_until.hpp>
 #include <boost/asio/write.hpp>
 #include <boost/beast/core/buffers_to_string.hpp>
 #include <boost/beast/core/flat_buffer.hpp>
@@ -67,6 +68,13 @@ std::string RawClient::receiveToEnd() {
     for (error_code ec; !ec;)
         all.append(part.data(), m_connection->socket.read_some(asio::buffer(part), ec));
     return all;
+}
+
+std::string RawClient::receiveHead() {
+    std::string head;
+    error_code ec;
+    asio::read_until(m_connection->socket, asio::dynamic_buffer(head), "\r\n\r\n", ec);
+    return head;
 }
 
 void RawClient::endSending() {

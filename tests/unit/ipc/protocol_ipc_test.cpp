@@ -189,8 +189,7 @@ TEST(Ipc, OnlyALoopbackHostWithoutAnOriginGetsIn) {
         SCOPED_TRACE(entry.name);
         RawClient client(echo.port);
         client.send(entry.request);
-        client.endSending();
-        EXPECT_EQ(client.receiveToEnd().substr(0, 12), std::string("HTTP/1.1 ") + entry.status);
+        EXPECT_EQ(client.receiveHead().substr(0, 12), std::string("HTTP/1.1 ") + entry.status);
     }
 }
 
@@ -199,16 +198,16 @@ TEST(Ipc, AHandshakeThatComesByteByByteIsAsGoodAsAnother) {
     RawClient client(echo.port);
     for (const char byte : handshakeRequest("localhost"))
         ASSERT_TRUE(client.send({&byte, 1}));
-    client.endSending();
-    EXPECT_EQ(client.receiveToEnd().substr(0, 12), "HTTP/1.1 101");
+    EXPECT_EQ(client.receiveHead().substr(0, 12), "HTTP/1.1 101");
 }
 
 TEST(Ipc, AClientThatOnlyEndsItsHalfIsLetGo) {
     EchoServer echo;
     RawClient client(echo.port);
     client.send(handshakeRequest("localhost"));
+    EXPECT_NE(client.receiveHead(), "");
     client.endSending();
-    EXPECT_NE(client.receiveToEnd(), "");
+    EXPECT_EQ(client.receiveToEnd(), "");
     EXPECT_FALSE(echo.server.ipc->sendToAll("anybody?"));
 }
 
