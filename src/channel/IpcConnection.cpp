@@ -113,10 +113,9 @@ void IpcConnection::end(Duration quiet, Duration limit) {
 
 void IpcConnection::discard() {
     resetAt(std::min(m_end, Clock::now() + m_quiet));
-    m_socket.async_read_some(asio::buffer(*m_rest),
-                             [self = shared_from_this()](error_code ec, std::size_t) {
-                                 ec ? self->reset() : self->discard();
-                             });
+    m_socket.async_read_some(asio::buffer(*m_rest), [self = shared_from_this()](error_code ec, std::size_t) {
+        ec ? self->reset() : self->discard();
+    });
 }
 
 void IpcConnection::resetAfter(Duration limit) {

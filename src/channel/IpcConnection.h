@@ -15,9 +15,9 @@
 
 namespace vexa {
 
-/// One connection of a server's port, from the accept to its end: what goes out, and how it ends. It always ends
-/// with a reset, also where the process just dies: a server that says the last word in TCP has its port taken for
-/// a minute by what is left of the connection. Touched on the strand of its socket alone.
+/// One connection of a server's port, from the accept to its end: what goes out, and how it ends. It always
+/// ends with a reset, also where the process just dies: a server that says the last word in TCP has its port
+/// taken for a minute by what is left of the connection. Touched on the strand of its socket alone.
 class IpcConnection : public std::enable_shared_from_this<IpcConnection> {
 public:
     using Bytes = std::shared_ptr<const std::string>;
@@ -31,8 +31,8 @@ public:
 
     boost::asio::ip::tcp::socket& socket() { return m_socket; }
 
-    /// Puts a frame behind all others, or in front of all that have not begun to go out, where it takes the place
-    /// of one of its kind. They go out with the next write().
+    /// Puts a frame behind all others, or in front of all that have not begun to go out, where it takes the
+    /// place of one of its kind. They go out with the next write().
     void queue(Bytes frame);
     void queuePong(Bytes frame);
     /// Forgets all but what has begun to go out.
@@ -49,8 +49,8 @@ public:
     /// The bytes of all frames that have not gone out. Any thread.
     std::size_t unsent() const { return m_unsent; }
 
-    /// Reads what still comes and forgets it, until the peer ends the connection or says nothing for `quiet`, at
-    /// most for `limit`. REQUIRES: nobody else reads.
+    /// Reads what still comes and forgets it, until the peer ends the connection or says nothing for `quiet`,
+    /// at most for `limit`. REQUIRES: nobody else reads.
     void end(Duration quiet, Duration limit);
     /// Answers 403 and ends.
     void refuse(Duration quiet);

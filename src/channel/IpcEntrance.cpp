@@ -112,9 +112,8 @@ void IpcEntrance::turnAway(const Arrival& arrival) {
 }
 
 bool IpcEntrance::dropNewestRefused() {
-    const auto newest = std::find_if(m_outside.rbegin(), m_outside.rend(), [](const auto& entry) {
-        return entry.second.connection->isEnding();
-    });
+    const auto newest = std::find_if(m_outside.rbegin(), m_outside.rend(),
+                                     [](const auto& entry) { return entry.second.connection->isEnding(); });
     if (newest == m_outside.rend()) return false;
     const auto connection = newest->second.connection;
     connection->reset();

@@ -17,9 +17,9 @@
 
 namespace vexa {
 
-/// The port of a server and all its connections. Strangers are answered and sent away; of those who may get in, a
-/// session begins. However many press in, few are kept that are not in yet, the newest go first, and none of ours
-/// goes before it had time to say something. Touched on the strand alone.
+/// The port of a server and all its connections. Strangers are answered and sent away; of those who may get
+/// in, a session begins. However many press in, few are kept that are not in yet, the newest go first, and
+/// none of ours goes before it had time to say something. Touched on the strand alone.
 class IpcEntrance {
 public:
     using ClientId = IpcSession::ClientId;

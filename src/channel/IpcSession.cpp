@@ -54,9 +54,9 @@ constexpr std::size_t kMaxIdleBuffer = std::size_t{16} << 10;
 
 }  // namespace
 
-/// The socket as the WebSocket protocol sees it. What the protocol writes by itself, the answer to the handshake
-/// and control frames, joins the rest of what goes out and never waits for it; how the connection ends is not
-/// its business.
+/// The socket as the WebSocket protocol sees it. What the protocol writes by itself, the answer to the
+/// handshake and control frames, joins the rest of what goes out and never waits for it; how the connection
+/// ends is not its business.
 class IpcSession::Layer {
 public:
     using executor_type = tcp::socket::executor_type;
@@ -144,8 +144,9 @@ void IpcSession::onRequest(error_code ec) {
                                     });
 }
 
-// A web page in a browser can reach a loopback port, but it can't hide its origin. A client has to wait for the
-// answer before he says more, and still has to be there: what a process has sent and left behind has no owner.
+// A web page in a browser can reach a loopback port, but it can't hide its origin. A client has to wait for
+// the answer before he says more, and still has to be there: what a process has sent and left behind has no
+// owner.
 bool IpcSession::mayEnter() const {
     const auto& request = m_protocol->request->get();
     if (request.count(http::field::host) != 1 || !isLoopbackHost(request[http::field::host]) ||
@@ -177,9 +178,8 @@ void IpcSession::protocolWrites(std::string bytes) {
 }
 
 void IpcSession::read() {
-    m_protocol->stream.async_read(m_protocol->buffer, [self = shared_from_this()](error_code ec, std::size_t) {
-        self->onMessage(ec);
-    });
+    m_protocol->stream.async_read(
+        m_protocol->buffer, [self = shared_from_this()](error_code ec, std::size_t) { self->onMessage(ec); });
 }
 
 void IpcSession::onMessage(error_code ec) {
@@ -205,8 +205,8 @@ void IpcSession::resume() {
     if (m_isPaused.exchange(false)) read();
 }
 
-// The reader marks himself as paused before he looks at the counts, which are taken down here before the mark is
-// looked at: one of the two sees the other.
+// The reader marks himself as paused before he looks at the counts, which are taken down here before the mark
+// is looked at: one of the two sees the other.
 void IpcSession::messageHandled(std::size_t size) {
     m_unhandledMessages -= 1;
     m_unhandledBytes -= size;

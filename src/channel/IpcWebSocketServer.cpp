@@ -39,8 +39,8 @@ constexpr std::chrono::milliseconds kFarewellLimit{500};
 
 }  // namespace
 
-/// What the server and its clients share. All but the atomics, the outbox and the inbox is touched on the strand
-/// `inout` alone.
+/// What the server and its clients share. All but the atomics, the outbox and the inbox is touched on the
+/// strand `inout` alone.
 class IpcWebSocketServer::Impl final : IpcSession::Events {
 public:
     explicit Impl(Handler handler) : m_handler(std::move(handler)) {}

@@ -13,9 +13,9 @@ struct PeerPorts {
     std::uint16_t server = 0;
 };
 
-/// Of each connection, whether it is established and a process under the account of this one has the peer's end
-/// of it. False also where it can't be told. Where the system knows only all connections at once, they are
-/// looked at once for all.
+/// Of each connection, whether it is established and a process under the account of this one has the peer's
+/// end of it. False also where it can't be told. Where the system knows only all connections at once, they
+/// are looked at once for all.
 std::vector<bool> arePeersOfSameAccount(std::span<const PeerPorts> connections);
 
 inline bool isPeerOfSameAccount(std::uint16_t peerPort, std::uint16_t serverPort) {

@@ -70,7 +70,8 @@ bool readPayload(const std::array<char, 512>& answer, std::size_t size, Payload&
 
 }  // namespace
 
-SocketOwners::SocketOwners() : m_netlink(::socket(AF_NETLINK, SOCK_DGRAM | SOCK_CLOEXEC, NETLINK_SOCK_DIAG)) {}
+SocketOwners::SocketOwners()
+    : m_netlink(::socket(AF_NETLINK, SOCK_DGRAM | SOCK_CLOEXEC, NETLINK_SOCK_DIAG)) {}
 
 // The kernel has answered when it has taken the question.
 SocketOwners::Answer SocketOwners::ask(std::uint16_t localPort, std::uint16_t remotePort,

@@ -39,8 +39,8 @@ bool readTable(Storage& table) {
     return false;
 }
 
-/// The process that has the peer's end of an established connection. Rows of other states can be left over from
-/// a process that has ended, and its number can be another one's by now.
+/// The process that has the peer's end of an established connection. Rows of other states can be left over
+/// from a process that has ended, and its number can be another one's by now.
 std::optional<DWORD> ownerIn(const Storage& storage, const PeerPorts& connection) {
     const auto& table = *reinterpret_cast<const MIB_TCPTABLE_OWNER_PID*>(storage.data());
     const std::span rows(table.table, table.dwNumEntries);

@@ -6,6 +6,7 @@
 #include <array>
 #include <boost/asio/io_context.hpp>
 #include <boost/asio/ip/tcp.hpp>
+#include <boost/asio/read.hpp>
 #include <boost/asio/read_until.hpp>
 #include <boost/asio/write.hpp>
 #include <boost/beast/core/buffers_to_string.hpp>
@@ -68,6 +69,13 @@ std::string RawClient::receiveToEnd() {
     for (error_code ec; !ec;)
         all.append(part.data(), m_connection->socket.read_some(asio::buffer(part), ec));
     return all;
+}
+
+std::string RawClient::receive(std::size_t size) {
+    std::string bytes(size, '\0');
+    error_code ec;
+    bytes.resize(asio::read(m_connection->socket, asio::buffer(bytes), ec));
+    return bytes;
 }
 
 std::string RawClient::receiveHead() {

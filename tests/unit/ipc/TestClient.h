@@ -28,6 +28,8 @@ public:
     bool send(std::string_view bytes);
     /// All that comes until the other end closes; what has come so far if that takes too long.
     std::string receiveToEnd();
+    /// So many bytes; fewer if the connection ended before.
+    std::string receive(std::size_t size);
     /// The answer to a request: all to its blank line.
     std::string receiveHead();
     /// The rest of the connection as it is: nothing more is sent.
