@@ -61,7 +61,7 @@ IpcHandle IpcCreateServer(std::int32_t /*kind*/, std::int32_t /*options*/, IpcRe
 std::uint32_t IpcSend(IpcHandle handle, const void* bytes, std::uint32_t length) {
     const auto server = handleTable().find(handle);
     if (!server) return 0;
-    return server->sendToAll(std::string(static_cast<const char*>(bytes), length)) ? 1 : 0;
+    return server->sendToAll({static_cast<const char*>(bytes), length}) ? 1 : 0;
 }
 
 void IpcClose(IpcHandle handle) {

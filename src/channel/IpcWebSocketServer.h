@@ -4,7 +4,6 @@
 #include <cstdint>
 #include <functional>
 #include <memory>
-#include <string>
 #include <string_view>
 
 namespace vexa {
@@ -14,9 +13,10 @@ namespace vexa {
 /// without an `Origin`; everyone else gets HTTP 403.
 ///
 /// One thread runs the input and output of all clients and the handler, so that an answer need not wait for
-/// another thread to wake up. While a handler is slow, a second thread runs the input and output: it takes
-/// over within some 2 ms, so a slow handler holds up neither the writing of queued messages nor the reading
-/// of others.
+/// another thread to wake up. Between two messages that are handled, what is queued for sending is written.
+/// While a handler is slow, a second thread runs the input and output: it takes over within some 2 ms. So
+/// neither a slow handler nor a run of quick ones holds up the writing of queued messages or the reading of
+/// others.
 class IpcWebSocketServer {
 public:
     using ClientId = std::uint64_t;
@@ -42,11 +42,12 @@ public:
     IpcWebSocketServer& operator=(const IpcWebSocketServer&) = delete;
 
     /// Queues a message for every client. Never blocks; any thread. False if there is no client to take it. A
-    /// client with more than kMaxQueued bytes waiting is dropped with close code 1008.
-    bool sendToAll(std::string message);
+    /// client with more than kMaxQueued bytes waiting behind the message that goes out is dropped with close
+    /// code 1008.
+    bool sendToAll(std::string_view message);
 
     /// Queues a message for one client, dropped if he has left.
-    void sendTo(ClientId client, std::string message);
+    void sendTo(ClientId client, std::string_view message);
 
     /// Sends what is queued, for half a second at most, and drops all clients with close code 1001. Returns
     /// after the last call of the handler has; sends give false from now on. REQUIRES: not called by the

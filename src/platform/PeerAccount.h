@@ -1,12 +1,25 @@
 #pragma once
 
+#include <array>
 #include <cstdint>
+#include <span>
+#include <vector>
 
 namespace vexa::platform {
 
-/// Whether the process at the other end of a local TCP connection runs under the account of this one. The
-/// connection is named as the peer sees it: its own port and the port it is connected to, both on 127.0.0.1,
-/// in host byte order. False also where it can't be told.
-bool isPeerOfSameAccount(std::uint16_t peerPort, std::uint16_t serverPort);
+/// A TCP connection from a port of 127.0.0.1 to another, in host byte order.
+struct PeerPorts {
+    std::uint16_t peer = 0;
+    std::uint16_t server = 0;
+};
+
+/// Of each connection, whether it is established and a process under the account of this one has the peer's
+/// end of it. False also where it can't be told. Where the system knows only all connections at once, they
+/// are looked at once for all.
+std::vector<bool> arePeersOfSameAccount(std::span<const PeerPorts> connections);
+
+inline bool isPeerOfSameAccount(std::uint16_t peerPort, std::uint16_t serverPort) {
+    return arePeersOfSameAccount(std::array{PeerPorts{peerPort, serverPort}}).front();
+}
 
 }  // namespace vexa::platform

@@ -2,39 +2,18 @@
 
 #include <unistd.h>
 
-#include <algorithm>
-
-#include "platform/posix/ProcNetTcp.h"
+#include "platform/posix/SocketOwner.h"
 
 namespace vexa::platform {
 
-namespace {
-
-struct Table {
-    const char* path;
-    const char* loopback;
-};
-
-// The second is for a peer that reaches 127.0.0.1 through an IPv6 socket.
-constexpr Table kTables[] = {
-    {"/proc/net/tcp", "0100007F"},
-    {"/proc/net/tcp6", "0000000000000000FFFF00000100007F"},
-};
-
-}  // namespace
-
-bool isPeerOfSameAccount(std::uint16_t peerPort, std::uint16_t serverPort) {
+std::vector<bool> arePeersOfSameAccount(std::span<const PeerPorts> connections) {
     const uid_t own = geteuid();
-    for (const Table& table : kTables) {
-        std::vector<posix::TcpSocket> rows;
-        if (!posix::readProcNetTcp(table.path, rows)) continue;
-        const auto peer = std::find_if(rows.begin(), rows.end(), [&](const posix::TcpSocket& row) {
-            return row.localPort == peerPort && row.remotePort == serverPort &&
-                   row.localAddress == table.loopback && row.remoteAddress == table.loopback;
-        });
-        if (peer != rows.end()) return peer->uid == own;
-    }
-    return false;
+    posix::SocketOwners owners;
+    std::vector<bool> answers;
+    answers.reserve(connections.size());
+    for (const PeerPorts& connection : connections)
+        answers.push_back(owners.ownerOf(connection.peer, connection.server) == own);
+    return answers;
 }
 
 }  // namespace vexa::platform

@@ -39,17 +39,17 @@ bool readTable(Storage& table) {
     return false;
 }
 
-/// The process that has the end of a connection with these ports of 127.0.0.1.
-std::optional<DWORD> ownerOf(std::uint16_t localPort, std::uint16_t remotePort) {
-    Storage storage;
-    if (!readTable(storage)) return std::nullopt;
+/// The process that has the peer's end of an established connection. Rows of other states can be left over
+/// from a process that has ended, and its number can be another one's by now.
+std::optional<DWORD> ownerIn(const Storage& storage, const PeerPorts& connection) {
     const auto& table = *reinterpret_cast<const MIB_TCPTABLE_OWNER_PID*>(storage.data());
     const std::span rows(table.table, table.dwNumEntries);
     const DWORD loopback = htonl(INADDR_LOOPBACK);
     const auto found = std::find_if(rows.begin(), rows.end(), [&](const MIB_TCPROW_OWNER_PID& row) {
-        return row.dwLocalAddr == loopback && row.dwRemoteAddr == loopback &&
-               ntohs(static_cast<u_short>(row.dwLocalPort)) == localPort &&
-               ntohs(static_cast<u_short>(row.dwRemotePort)) == remotePort;
+        return row.dwState == MIB_TCP_STATE_ESTAB && row.dwLocalAddr == loopback &&
+               row.dwRemoteAddr == loopback &&
+               ntohs(static_cast<u_short>(row.dwLocalPort)) == connection.peer &&
+               ntohs(static_cast<u_short>(row.dwRemotePort)) == connection.server;
     });
     return found != rows.end() ? std::optional(found->dwOwningPid) : std::nullopt;
 }
@@ -70,16 +70,31 @@ PSID sidOf(const Storage& user) {
     return reinterpret_cast<const TOKEN_USER*>(user.data())->User.Sid;
 }
 
+// A process that has ended can still be opened as long as somebody else has it open.
+bool isRunning(HANDLE process) {
+    DWORD exitCode = 0;
+    return GetExitCodeProcess(process, &exitCode) != 0 && exitCode == STILL_ACTIVE;
+}
+
+bool isOfUser(DWORD processId, const Storage& user) {
+    const Handle process(OpenProcess(PROCESS_QUERY_LIMITED_INFORMATION, FALSE, processId));
+    if (!process || !isRunning(process.get())) return false;
+    const Storage other = userOf(process.get());
+    return !other.empty() && EqualSid(sidOf(other), sidOf(user)) != 0;
+}
+
 }  // namespace
 
-bool isPeerOfSameAccount(std::uint16_t peerPort, std::uint16_t serverPort) {
-    const auto owner = ownerOf(peerPort, serverPort);
-    if (!owner) return false;
-    const Handle process(OpenProcess(PROCESS_QUERY_LIMITED_INFORMATION, FALSE, *owner));
-    if (!process) return false;
-    const Storage peer = userOf(process.get());
+std::vector<bool> arePeersOfSameAccount(std::span<const PeerPorts> connections) {
+    std::vector<bool> answers(connections.size(), false);
     const Storage own = userOf(GetCurrentProcess());
-    return !peer.empty() && !own.empty() && EqualSid(sidOf(peer), sidOf(own)) != 0;
+    Storage table;
+    if (own.empty() || !readTable(table)) return answers;
+    for (std::size_t i = 0; i < connections.size(); ++i) {
+        const auto owner = ownerIn(table, connections[i]);
+        answers[i] = owner && isOfUser(*owner, own);
+    }
+    return answers;
 }
 
 }  // namespace vexa::platform

@@ -1,14 +1,6 @@
 #include <gtest/gtest.h>
-#include <sys/socket.h>
-#include <sys/time.h>
 
 #include <atomic>
-#include <boost/asio/io_context.hpp>
-#include <boost/asio/ip/tcp.hpp>
-#include <boost/asio/write.hpp>
-#include <boost/beast/core/buffers_to_string.hpp>
-#include <boost/beast/core/flat_buffer.hpp>
-#include <boost/beast/websocket.hpp>
 #include <chrono>
 #include <future>
 #include <optional>
@@ -18,58 +10,13 @@
 
 #include "channel/Ipc.h"
 #include "channel/IpcWebSocketServer.h"
+#include "unit/ipc/TestClient.h"
 
 namespace vexa::test {
 namespace {
 
-namespace asio = boost::asio;
-namespace beast = boost::beast;
-using asio::ip::tcp;
 using ClientId = IpcWebSocketServer::ClientId;
-
-/// No wait of a test lasts longer; one that does is a failure.
-constexpr std::chrono::seconds kPatience{20};
-
-/// A port on which nothing listens.
-std::int32_t freePort() {
-    asio::io_context io;
-    const tcp::acceptor acceptor(io, {asio::ip::address_v4::loopback(), 0});
-    return acceptor.local_endpoint().port();
-}
-
-/// A WebSocket client that blocks, for as long as kPatience.
-class TestClient {
-public:
-    explicit TestClient(std::int32_t port) {
-        tcp::socket& socket = m_stream.next_layer();
-        socket.connect({asio::ip::address_v4::loopback(), static_cast<std::uint16_t>(port)});
-        const timeval limit{kPatience.count(), 0};
-        for (const int option : {SO_RCVTIMEO, SO_SNDTIMEO})
-            setsockopt(socket.native_handle(), SOL_SOCKET, option, &limit, sizeof limit);
-        m_stream.handshake("localhost", "/");
-    }
-
-    void send(std::string_view message) {
-        boost::system::error_code gone;
-        m_stream.write(asio::buffer(message), gone);
-    }
-
-    /// The next message; nothing if the connection ended instead.
-    std::optional<std::string> receive() {
-        beast::flat_buffer buffer;
-        boost::system::error_code error;
-        m_stream.read(buffer, error);
-        if (error) return std::nullopt;
-        return beast::buffers_to_string(buffer.data());
-    }
-
-    /// The code with which the server closed; 0 if the connection just ended.
-    std::uint16_t closeCode() const { return m_stream.reason().code; }
-
-private:
-    asio::io_context m_io;
-    beast::websocket::stream<tcp::socket> m_stream{m_io};
-};
+using Clock = std::chrono::steady_clock;
 
 /// A gate that a handler waits at until the test opens it.
 class Gate {
@@ -156,6 +103,46 @@ TEST(Ipc, AClientFarAheadOfASlowHandlerGoesOnWhenItDoes) {
     gate.open();
     EXPECT_EQ(all.get_future().wait_for(kPatience), std::future_status::ready) << handled << " handled";
     server.ipc->stop();
+}
+
+TEST(Ipc, ManyMessagesInOneRushAreHandledInOrderAndNoneIsLost) {
+    constexpr int kCount = 20'000;
+    EchoServer echo;
+    TestClient client(echo.port);
+    auto sending = std::async(std::launch::async, [&] {
+        for (int i = 0; i < kCount; ++i)
+            client.send(numbered(i));
+    });
+    for (int i = 0; i < kCount; ++i)
+        ASSERT_EQ(client.receive(), numbered(i));
+    sending.get();
+}
+
+TEST(Ipc, AClientThatOnlyEndsItsHalfIsLetGo) {
+    EchoServer echo;
+    RawClient client(echo.port);
+    client.send(handshakeRequest("localhost"));
+    EXPECT_NE(client.receiveHead(), "");
+    client.endSending();
+    EXPECT_EQ(client.receiveToEnd(), "");
+    EXPECT_FALSE(echo.server.ipc->sendToAll("anybody?"));
+}
+
+TEST(Ipc, StopIsQuickWhateverTheClientsDo) {
+    Server server([](ClientId, std::string_view) {});
+    const RawClient silent(server.port);
+    RawClient half(server.port);
+    half.send("GET / HTTP/1.1\r\n");
+    const TestClient deaf(server.port);
+    std::vector<TestClient> idle;
+    for (int i = 0; i < 20; ++i)
+        idle.emplace_back(server.port);
+    for (int i = 0; i < 30; ++i)
+        server.ipc->sendToAll(std::string(100'000, 'x'));
+    const auto begin = Clock::now();
+    server.ipc->stop();
+    EXPECT_LT(Clock::now() - begin, std::chrono::seconds(5));
+    EXPECT_FALSE(server.ipc->sendToAll("too late"));
 }
 
 TEST(Ipc, StopStillSendsWhatIsQueuedAndTellsTheClients) {

@@ -1,0 +1,176 @@
+#include "channel/IpcEntrance.h"
+
+#include <algorithm>
+#include <boost/asio/post.hpp>
+#include <iterator>
+#include <type_traits>
+#include <utility>
+
+#include "channel/IpcEntry.h"
+
+namespace vexa {
+
+namespace asio = boost::asio;
+using asio::ip::tcp;
+using boost::system::error_code;
+
+namespace {
+
+constexpr std::size_t kMaxOutside = 16;
+
+// What each of ours has for his request, however many press in.
+constexpr std::chrono::milliseconds kGrace{100};
+
+// How long a stranger has to take the answer.
+constexpr std::chrono::milliseconds kRefusedQuiet{500};
+
+constexpr std::chrono::milliseconds kAcceptPause{100};
+
+// With POSIX sockets this gives a restarted server its port back while old connections linger, and no port
+// that is listened on; with Windows' it would let two servers share one.
+constexpr bool kMayReuseAddress = std::is_same_v<tcp::acceptor::native_handle_type, int>;
+
+}  // namespace
+
+IpcEntrance::IpcEntrance(const asio::any_io_executor& strand, IpcSession::Events& events,
+                         std::function<void()> isEmpty)
+    : m_strand(strand),
+      m_events(events),
+      m_isEmpty(std::move(isEmpty)),
+      m_acceptor(strand),
+      m_pause(strand) {}
+
+bool IpcEntrance::open(std::int32_t port) {
+    if (port < 1 || port > 65535) return false;
+    const tcp::endpoint endpoint(asio::ip::address_v4::loopback(), static_cast<std::uint16_t>(port));
+    error_code ec;
+    m_acceptor.open(endpoint.protocol(), ec);
+    if (kMayReuseAddress && !ec) m_acceptor.set_option(asio::socket_base::reuse_address(true), ec);
+    if (!ec) m_acceptor.bind(endpoint, ec);
+    if (!ec) m_acceptor.listen(asio::socket_base::max_listen_connections, ec);
+    if (!ec) m_acceptor.non_blocking(true, ec);
+    return !ec;
+}
+
+void IpcEntrance::accept() {
+    if (std::exchange(m_isAccepting, true)) return;
+    m_acceptor.async_accept(m_strand, [this](error_code ec, tcp::socket socket) {
+        m_isAccepting = false;
+        if (!m_acceptor.is_open()) return;
+        // Out of descriptors, most likely: try again when some client has gone.
+        ec ? pause(kAcceptPause) : receive(acceptMore(std::move(socket)));
+    });
+}
+
+// As many as there are places, so that the system can be asked once for all of them.
+std::vector<tcp::socket> IpcEntrance::acceptMore(tcp::socket first) {
+    std::vector<tcp::socket> burst;
+    burst.push_back(std::move(first));
+    const auto ours = std::count_if(m_outside.begin(), m_outside.end(),
+                                    [](const auto& entry) { return !entry.second.connection->isEnding(); });
+    while (burst.size() + static_cast<std::size_t>(ours) < kMaxOutside) {
+        error_code ec;
+        tcp::socket socket = m_acceptor.accept(m_strand, ec);
+        if (ec) break;
+        burst.push_back(std::move(socket));
+    }
+    return burst;
+}
+
+void IpcEntrance::receive(std::vector<tcp::socket> burst) {
+    const auto ours = areOfOurAccount(burst);
+    for (std::size_t i = 0; i < burst.size(); ++i) {
+        const Arrival arrival = add(std::move(burst[i]));
+        if (!ours[i]) {
+            turnAway(arrival);
+        } else if (makeRoom()) {
+            begin(arrival);
+        } else {
+            m_next = arrival;
+        }
+    }
+    m_next ? letNextIn() : accept();
+}
+
+IpcEntrance::Arrival IpcEntrance::add(tcp::socket socket) {
+    const ClientId id = ++m_lastId;
+    auto connection = std::make_shared<IpcConnection>(std::move(socket), [this, id] { ended(id); });
+    m_connections.emplace(id, connection);
+    return {id, std::move(connection), Clock::now()};
+}
+
+void IpcEntrance::begin(const Arrival& arrival) {
+    m_outside.emplace(arrival.id, arrival);
+    std::make_shared<IpcSession>(arrival.id, arrival.connection, m_events)->start();
+}
+
+void IpcEntrance::turnAway(const Arrival& arrival) {
+    const bool hasPlace = m_outside.size() < kMaxOutside || dropNewestRefused();
+    if (hasPlace) m_outside.emplace(arrival.id, arrival);
+    arrival.connection->refuse(kRefusedQuiet);
+    if (!hasPlace) arrival.connection->reset();
+}
+
+bool IpcEntrance::dropNewestRefused() {
+    const auto newest = std::find_if(m_outside.rbegin(), m_outside.rend(),
+                                     [](const auto& entry) { return entry.second.connection->isEnding(); });
+    if (newest == m_outside.rend()) return false;
+    const auto connection = newest->second.connection;
+    connection->reset();
+    return true;
+}
+
+bool IpcEntrance::makeRoom() {
+    if (m_outside.size() < kMaxOutside || dropNewestRefused()) return true;
+    const Arrival newest = m_outside.rbegin()->second;
+    if (Clock::now() - newest.since < kGrace) return false;
+    newest.connection->reset();
+    return true;
+}
+
+void IpcEntrance::letNextIn() {
+    if (!m_next) return;
+    if (!makeRoom()) return pause(kGrace);
+    begin(*std::exchange(m_next, std::nullopt));
+    accept();
+}
+
+void IpcEntrance::pause(Clock::duration time) {
+    m_pause.expires_after(time);
+    m_pause.async_wait([this](error_code cancelled) {
+        if (cancelled || !m_acceptor.is_open()) return;
+        m_next ? letNextIn() : accept();
+    });
+}
+
+void IpcEntrance::placeIsFree() {
+    if (m_next) asio::post(m_strand, [this] { letNextIn(); });
+}
+
+void IpcEntrance::entered(ClientId id) {
+    if (m_outside.erase(id) != 0) placeIsFree();
+}
+
+void IpcEntrance::ended(ClientId id) {
+    if (m_outside.erase(id) != 0) placeIsFree();
+    m_connections.erase(id);
+    m_events.left(id);
+    if (m_connections.empty() && !m_acceptor.is_open()) m_isEmpty();
+}
+
+void IpcEntrance::close() {
+    error_code ignored;
+    m_acceptor.close(ignored);
+    m_pause.cancel();
+    if (m_next) m_outside.emplace(m_next->id, *std::exchange(m_next, std::nullopt));
+    for (const auto& [id, arrival] : std::map(m_outside))
+        arrival.connection->reset();
+    if (m_connections.empty()) m_isEmpty();
+}
+
+void IpcEntrance::resetAll() {
+    for (const auto& [id, connection] : std::map(m_connections))
+        connection->reset();
+}
+
+}  // namespace vexa
