@@ -30,8 +30,8 @@ bool setText(const Key& key, const wchar_t* name, const std::string& utf8) {
 }
 
 bool writeEntry(const Key& classKey, std::size_t index, const ClassKeyEntry& entry) {
-    std::array<wchar_t, 16> name{};
-    std::swprintf(name.data(), name.size(), L"%04u", static_cast<unsigned>(index));
+    std::array<char, 16> name{};
+    std::snprintf(name.data(), name.size(), "%04u", static_cast<unsigned>(index));
     const Key key = create(classKey.get(), name.data());
     return key && (!entry.netCfgInstanceId || setText(key, L"NetCfgInstanceId", *entry.netCfgInstanceId)) &&
            (!entry.matchingDeviceId || setText(key, L"MatchingDeviceId", *entry.matchingDeviceId));

@@ -140,11 +140,9 @@ void Config::deriveDumpFilePath() {
 }
 
 void Config::readAutoConnectFromRegistry() {
-    m_bHotSpotAutoConnect = true;
     const auto key = platform::RegistryKey::open(platform::RegistryRoot::CurrentUser, contract::kProductKey);
-    if (!key) return;
-    const auto text = key->wideValue(contract::kHotspotSwitchValue, kMaxRegistryBytes);
-    if (text && compareNoCase(*text, L"false") == 0) m_bHotSpotAutoConnect = false;
+    const auto text = key ? key->wideValue(contract::kHotspotSwitchValue, kMaxRegistryBytes) : std::nullopt;
+    m_bHotSpotAutoConnect = !text || compareNoCase(*text, L"false") != 0;
 }
 
 // However many of the three are lost, as with a full disk, one line tells of it.

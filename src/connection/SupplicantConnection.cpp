@@ -229,15 +229,13 @@ ResultCode Supplicant::onDisconnected(const WLAN_CONNECTION_NOTIFICATION_DATA* d
     Log(3, "Received Wlan disconnected event.");
     if (data == nullptr) return kFailure;
     logReason(*data);
-    bool isRealmUpdatePending = false;
-    {
-        const LockGuard lock(g_hs20Lock);
-        setState(SupplicantState::Disconnected);
-        isRealmUpdatePending = m_mgr.takePendingRealmUpdate();
-    }
-    if (isRealmUpdatePending) queryHs20NetworkAnqpInfo();
+    // Under one lock: the state wakes the connecting thread, which must find the query under way.
     const LockGuard lock(g_hs20Lock);
-    if (!isRealmUpdatePending) sendNetworkList();
+    setState(SupplicantState::Disconnected);
+    if (m_mgr.takePendingRealmUpdate())
+        queryHs20NetworkAnqpInfo();
+    else
+        sendNetworkList();
     if (m_history.updateDisconnection(data->dot11Ssid, m_engine.m_networkList) != kSuccess)
         Log(6, "ERROR: Update connection history failed.");
     m_bHs20Connected = false;

@@ -67,7 +67,9 @@ ResultCode Supplicant::onAnqpInfoChanged(Bytes payload) {
 
 // After a failed fetch the query counts as running: the connecting thread must not connect on what it knew
 // before.
+// Under one lock: the list wakes the connecting thread, which must find the query ended when it comes to it.
 void Supplicant::onAnqpQueryCompleted() {
+    const LockGuard lock(g_hs20Lock);
     Log(3, "IHV reports HS20 network query ANQP info completed.");
     if (getHs20BssListFromIHV() != kSuccess) {
         Log(6, "Error: getHs20BssListFromIHV failed in hs20Associate.");

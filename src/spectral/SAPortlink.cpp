@@ -79,7 +79,7 @@ void SAPortlink::OnIpcMessage(const char* bytes, std::uint32_t length, void* con
 std::vector<std::uint8_t> SAPortlink::HandleCommand(int code) {
     switch (code) {
         case kStartScan:
-            return {OnStartFullScan() == ERROR_SUCCESS ? kScanStarted : kFailed, 0, 0};
+            return {StartScanning() == ERROR_SUCCESS ? kScanStarted : kFailed, 0, 0};
         case kStopScan:
             return {OnStopScan() == ERROR_SUCCESS ? kScanStopped : kFailed, 0, 0};
         case kQueryChannel:

@@ -55,7 +55,9 @@ public:
 
     /// 0 or the WLAN service's error. A failed start is tried again by the next pass.
     DWORD OnStartFullScan();
-    DWORD OnStopScan();
+    /// The same as a command: from now on passes start scans, until OnStopScan().
+    DWORD StartScanning() EXCLUDES(m_cs);
+    DWORD OnStopScan() EXCLUDES(m_cs);
 
     /// An event without `Data`.
     static std::string BuildEventText(const std::string& eventId);
@@ -93,7 +95,7 @@ private:
 
     WlanHandle m_hClientHandle;  // presence checks
     WlanHandle m_hWlan;          // notifications, requests, queries
-    std::atomic<bool> m_bScanning{false};
+    bool m_bScanning GUARDED_BY(m_cs) = false;
     std::unique_ptr<platform::PeriodicTimer> m_scanTimer;
 };
 

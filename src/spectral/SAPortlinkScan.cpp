@@ -32,11 +32,19 @@ DWORD SAPortlink::OnStartFullScan() {
                       static_cast<unsigned>(result));
         outputDebugString(text);
     }
+    return result;
+}
+
+// The flag and the request that goes with it change under one lock: what is behind a stop starts no scan.
+DWORD SAPortlink::StartScanning() {
+    const LockGuard lock(m_cs);
+    const DWORD result = OnStartFullScan();
     m_bScanning = true;
     return result;
 }
 
 DWORD SAPortlink::OnStopScan() {
+    const LockGuard lock(m_cs);
     if (!m_bScanning) return ERROR_SUCCESS;
     outputDebugString("portlink begin spectral OnStopScan()");
     const DWORD result = SendSpectralControl(false);
@@ -74,6 +82,7 @@ void SAPortlink::RunPass() {
         m_samples.clear();
     }
     outputDebugString("spectral SAPortlink::HandleFullScanIndication->");
+    const LockGuard lock(m_cs);
     if (!m_bScanning) return;
     OnStartFullScan();
     outputDebugString("spectral SAPortlink::HandleFullScanIndication->OnStartFullScan()");

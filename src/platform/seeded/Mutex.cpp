@@ -34,7 +34,9 @@ struct Ownership {
     void release() {
         if (Scheduler::current() == nullptr || --depth > 0) return;
         owner = nullptr;
-        Scheduler::get().announceFreeLock(this);
+        Scheduler& scheduler = Scheduler::get();
+        scheduler.announceFreeLock(this);
+        scheduler.handOver();
     }
 };
 
