@@ -15,7 +15,7 @@ namespace fs = std::filesystem;
 namespace {
 
 fs::path defaultFolder() {
-    const fs::path folder = posix::machineFolder();
+    fs::path folder = posix::machineFolder();
     if (folder.empty()) throw ClientError("no machine folder: give --machine, or set VEXA_MACHINE or HOME");
     return folder;
 }

@@ -17,6 +17,7 @@ std::vector<TcpEndpoint> readTcpEndpoints() {
     if (!posix::readProcNetTcp(kTable, sockets))
         throw ClientError(std::string("the TCP table cannot be read: ") + kTable);
     std::vector<TcpEndpoint> endpoints;
+    endpoints.reserve(sockets.size());
     for (const posix::TcpSocket& socket : sockets)
         endpoints.push_back({socket.localPort, socket.state == kListening, socket.inode});
     return endpoints;

@@ -86,12 +86,15 @@ STORY(ManualConnect, TellsInTheLogHowItWalksThroughTheCredentials,
         "We have tried all credentials, connection failed.", "Send connection result to vexa.");
 }
 
-STORY(ManualConnect, ARefusedRequestIsToldAtOnce, kOne) {
+STORY(ManualConnect, ARefusedRequestIsToldAtOnceAndLeavesNothingBehind, kOne) {
     settle(story, kBehindStart);
     story.play({failing("WlanConnect", 50), connecting("cafe")});
     expectStanding(story, {.requests = "cafe ttls u1 = 50", .outcomes = "0"});
     story.expectLog("WlanConnect call failed with error code=50.", "Try to connect to HS20 network failed.",
                     "connectBss failed.");
+    story.forget();
+    story.play({connecting("cafe"), passing(5s)});
+    expectStanding(story, {.requests = "cafe ttls u1", .connected = "cafe"});
 }
 
 STORY(ManualConnect, ANextCredentialThatCanNotStartEndsWithoutAWord,
