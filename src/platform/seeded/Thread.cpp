@@ -41,7 +41,7 @@ void Thread::detach() {
 
 // Every thread of the seeded world is known to its scheduler.
 ForeignWait::ForeignWait() = default;
-ForeignWait::~ForeignWait() = default;
+ForeignWait::~ForeignWait() {}  // Not trivial in the header: threads that run have something to say here.
 void beginForeignWork() {}
 void endForeignWork() {}
 
