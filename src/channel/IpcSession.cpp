@@ -16,7 +16,7 @@
 
 #include "channel/IpcEntry.h"
 #include "channel/IpcFrame.h"
-#include "channel/IpcWebSocketServer.h"
+#include "channel/IpcLimits.h"
 
 namespace vexa {
 
@@ -44,11 +44,11 @@ constexpr Duration kEndLimit{2000};
 
 // What one client may have waiting for the handler before his further messages stay in his socket.
 constexpr std::size_t kMaxUnhandledMessages = 256;
-constexpr std::size_t kMaxUnhandledBytes = IpcWebSocketServer::kMaxMessage;
+constexpr std::size_t kMaxUnhandledBytes = kMaxIpcMessage;
 
 // What a client may leave unread before his further commands have to wait: one that asks faster than he reads
 // is slowed down, not dropped. What others cause to be sent to him still counts up to the limit.
-constexpr std::size_t kMaxUnreadBytes = IpcWebSocketServer::kMaxQueued / 2;
+constexpr std::size_t kMaxUnreadBytes = kMaxIpcQueued / 2;
 
 constexpr std::size_t kMaxIdleBuffer = std::size_t{16} << 10;
 
@@ -133,7 +133,7 @@ void IpcSession::onRequest(error_code ec) {
     if (ec == http::error::end_of_stream || ec == asio::error::operation_aborted)
         return m_connection->reset();
     if (ec || !mayEnter()) return m_connection->refuse(kRefusedQuiet);
-    m_protocol->stream.read_message_max(IpcWebSocketServer::kMaxMessage);
+    m_protocol->stream.read_message_max(kMaxIpcMessage);
     m_protocol->stream.async_accept(m_protocol->request->get(),
                                     [self = shared_from_this()](error_code failed) {
                                         if (failed) return self->ended(failed);
@@ -216,9 +216,9 @@ void IpcSession::messageHandled(std::size_t size) {
 
 void IpcSession::send(const Bytes& frame) {
     m_connection->queue(frame);
-    if (m_connection->waiting() <= IpcWebSocketServer::kMaxQueued) return;
+    if (m_connection->waiting() <= kMaxIpcQueued) return;
     flush();  // what came in one rush may well find room in his socket
-    if (m_connection->waiting() > IpcWebSocketServer::kMaxQueued) {
+    if (m_connection->waiting() > kMaxIpcQueued) {
         m_connection->dropWaiting();
         close(websocket::close_code::policy_error);
     }

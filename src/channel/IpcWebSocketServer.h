@@ -6,6 +6,8 @@
 #include <memory>
 #include <string_view>
 
+#include "channel/IpcLimits.h"
+
 namespace vexa {
 
 /// A WebSocket server (RFC 6455) on one port of 127.0.0.1. One WebSocket message is one message: text or
@@ -25,8 +27,8 @@ public:
     /// call.
     using Handler = std::function<void(ClientId client, std::string_view message)>;
 
-    static constexpr std::size_t kMaxMessage = std::size_t{1} << 20;
-    static constexpr std::size_t kMaxQueued = std::size_t{4} << 20;
+    static constexpr std::size_t kMaxMessage = kMaxIpcMessage;
+    static constexpr std::size_t kMaxQueued = kMaxIpcQueued;
 
     class Impl;
 
