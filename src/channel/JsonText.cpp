@@ -29,11 +29,10 @@ Json::Value parseJsonText(std::string_view text) {
     Json::Value root;
     Json::Reader reader;
     try {
-        reader.parse(text.data(), text.data() + text.size(), root);
+        return reader.parse(text.data(), text.data() + text.size(), root) ? root : Json::Value();
     } catch (const Json::Exception&) {
         return {};
     }
-    return root;
 }
 
 std::optional<std::string> readText(const Json::Value& object, const char* member) {

@@ -12,8 +12,8 @@ namespace vexa {
 /// end.
 std::string toStyledText(const Json::Value& value);
 
-/// Comments are allowed and the root may be anything. Errors are not told:
-/// what was read before the error stays, text that isn't JSON and text nested too deeply give null.
+/// Comments are allowed and the root may be anything, whatever comes behind it. Text that isn't JSON and text
+/// nested too deeply give null: half a command is none.
 Json::Value parseJsonText(std::string_view text);
 
 /// The same for the bytes of a message, up to the first NUL. Nothing if memory runs out.

@@ -79,12 +79,12 @@ STORY(Credentials, ACommandThatCannotBeCarriedOutChangesNothingAndStillTellsTheL
                    R"({"Id":1,"CredentialEapMethod":2,"RealName":"x","Username":"u"})",
                    R"({"Id":1,"CredentialEapMethod":1,"RealName":"x","Username":"u","Password":"p"})",
                    R"({"Id":1,"CredentialEapMethod":2,"Username":"u","Password":"p"})"});
-    expectNothing("DELETE_CREDENTIAL",
-                  {"", R"({"Id":0})", R"({"Id":-1})", R"({"Id":9})", R"({"Id":"1"})", R"({"Id":1.5})", "1"});
+    expectNothing("DELETE_CREDENTIAL", {"", R"({"Id":0})", R"({"Id":-1})", R"({"Id":9})", R"({"Id":"1"})",
+                                        R"({"Id":1.5})", R"({"Id":1)", "1"});
     expectNothing("SET_POSITION_CREDENTIAL",
                   {R"({"Id":1,"Order":-1})", R"({"Id":1,"Order":9999})", R"({"Id":1,"Order":2147483647})",
                    R"({"Id":1,"Order":-2147483648})", R"({"Id":0,"Order":0})", R"({"Id":9,"Order":0})",
-                   R"({"Id":1,"Order":"0"})"});
+                   R"({"Id":1,"Order":"0"})", R"({"Id":1,"Order":0)"});
 }
 
 // Data comes as text. A client that sends it otherwise learns so by the list, and the log has one line of it.

@@ -135,7 +135,7 @@ class Reading(unittest.TestCase):
 
     def test_every_beginning_of_a_command_is_survived(self):
         whole = b'{"Data":"{\\"a\\":[1,true]}","CommandId":"@"}'
-        self.assert_answers([whole[:end] for end in range(len(whole) - 1)], 0, 0)
+        self.assert_answers([whole[:end] for end in range(len(whole))], 0, 0)
 
     def test_data_counts_on_the_hotspot_port_alone(self):
         self.assert_answers(with_data(*DATA_OF_WRONG_TYPE), 1, 0)
