@@ -19,6 +19,8 @@ namespace {
 // The table may grow between the question for its size and the one for its rows.
 constexpr int kTableTries = 5;
 constexpr DWORD kSpareRows = 64;
+// While other connections come and go, a table can lack a row that is there, or its owner.
+constexpr int kLooks = 3;
 
 /// Memory for a structure whose size only the operating system knows.
 using Storage = std::vector<std::max_align_t>;
@@ -76,25 +78,38 @@ bool isRunning(HANDLE process) {
     return GetExitCodeProcess(process, &exitCode) != 0 && exitCode == STILL_ACTIVE;
 }
 
-bool isOfUser(DWORD processId, const Storage& user) {
+/// Nothing if there is no such process, or it doesn't tell.
+std::optional<bool> isOfUser(DWORD processId, const Storage& user) {
     const Handle process(OpenProcess(PROCESS_QUERY_LIMITED_INFORMATION, FALSE, processId));
-    if (!process || !isRunning(process.get())) return false;
+    if (!process || !isRunning(process.get())) return std::nullopt;
     const Storage other = userOf(process.get());
-    return !other.empty() && EqualSid(sidOf(other), sidOf(user)) != 0;
+    return other.empty() ? std::nullopt : std::optional(EqualSid(sidOf(other), sidOf(user)) != 0);
+}
+
+/// Looks at those that are open; whether some are still.
+bool answerFrom(const Storage& table, std::span<const PeerPorts> connections, const Storage& own,
+                std::vector<std::optional<bool>>& answers) {
+    for (std::size_t i = 0; i < connections.size(); ++i) {
+        if (answers[i]) continue;
+        if (const auto owner = ownerIn(table, connections[i])) answers[i] = isOfUser(*owner, own);
+    }
+    return std::find(answers.begin(), answers.end(), std::nullopt) != answers.end();
 }
 
 }  // namespace
 
 std::vector<bool> arePeersOfSameAccount(std::span<const PeerPorts> connections) {
-    std::vector<bool> answers(connections.size(), false);
+    std::vector<std::optional<bool>> answers(connections.size());
     const Storage own = userOf(GetCurrentProcess());
-    Storage table;
-    if (own.empty() || !readTable(table)) return answers;
-    for (std::size_t i = 0; i < connections.size(); ++i) {
-        const auto owner = ownerIn(table, connections[i]);
-        answers[i] = owner && isOfUser(*owner, own);
+    bool isOpen = !own.empty();
+    for (int i = 0; isOpen && i < kLooks; ++i) {
+        Storage table;
+        isOpen = !readTable(table) || answerFrom(table, connections, own, answers);
     }
-    return answers;
+    std::vector<bool> known(answers.size());
+    std::transform(answers.begin(), answers.end(), known.begin(),
+                   [](const auto& answer) { return answer.value_or(false); });
+    return known;
 }
 
 }  // namespace vexa::platform
