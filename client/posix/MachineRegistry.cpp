@@ -16,10 +16,7 @@ namespace {
 
 using contract::kEapMethodValue;
 using contract::kHotspotSwitchValue;
-
-std::string productKey() {
-    return std::string("HKEY_CURRENT_USER\\") + contract::kProductKey;
-}
+using contract::productKeyPath;
 
 // The whole registry of a simulated machine: key paths to values.
 Json::Value readRegistry(const MachineFolder& machine) {
@@ -32,7 +29,7 @@ Json::Value readRegistry(const MachineFolder& machine) {
 
 bool readHotspotSwitch(const MachineFolder& machine) {
     const Json::Value registry = readRegistry(machine);
-    const Json::Value& values = registry[productKey()];
+    const Json::Value& values = registry[productKeyPath()];
     if (!values.isObject() || !values[kHotspotSwitchValue].isString()) return true;
     return ::strcasecmp(values[kHotspotSwitchValue].asCString(), "false") != 0;
 }
@@ -40,7 +37,7 @@ bool readHotspotSwitch(const MachineFolder& machine) {
 bool writeHotspotSwitch(const MachineFolder& machine, bool isOn) {
     if (readHotspotSwitch(machine) == isOn) return true;
     Json::Value registry = readRegistry(machine);
-    Json::Value& values = registry[productKey()];
+    Json::Value& values = registry[productKeyPath()];
     if (!values.isObject()) values = Json::Value(Json::objectValue);
     values[kHotspotSwitchValue] = isOn ? "true" : "false";
     return replaceOwnerFile(machine.registryFile(), jsonLine(registry) + "\n");
@@ -48,7 +45,7 @@ bool writeHotspotSwitch(const MachineFolder& machine, bool isOn) {
 
 std::optional<int> readConnectionMethod(const MachineFolder& machine) {
     const Json::Value registry = readRegistry(machine);
-    const Json::Value& values = registry[productKey()];
+    const Json::Value& values = registry[productKeyPath()];
     if (!values.isObject() || !values[kEapMethodValue].isInt()) return std::nullopt;
     return values[kEapMethodValue].asInt();
 }

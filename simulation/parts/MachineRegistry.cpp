@@ -22,10 +22,6 @@ std::string classKeyPath() {
     return std::string("HKEY_LOCAL_MACHINE\\") + contract::kNetworkAdapterClassKey;
 }
 
-std::string productKey() {
-    return std::string("HKEY_CURRENT_USER\\") + contract::kProductKey;
-}
-
 Json::Value localMachine(const std::vector<ClassKeyEntry>& classKey) {
     Json::Value keys(Json::objectValue);
     keys[classKeyPath()] = Json::Value(Json::objectValue);
@@ -116,7 +112,7 @@ std::optional<std::string> MachineRegistry::value(RegistryRoot root, const std::
 bool MachineRegistry::setAutoConnect(const std::optional<std::string>& text) {
     const LockGuard<Mutex> lock(m_mutex);
     Json::Value keys = readContent();
-    Json::Value& values = valuesOf(keys, productKey());
+    Json::Value& values = valuesOf(keys, contract::productKeyPath());
     for (const std::string& name : values.getMemberNames())
         if (compareNoCase(name, contract::kHotspotSwitchValue) == 0) values.removeMember(name);
     if (text) values[contract::kHotspotSwitchValue] = *text;

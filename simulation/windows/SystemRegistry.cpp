@@ -96,8 +96,7 @@ Json::Value readProductKey() {
     if (RegOpenKeyExW(HKEY_CURRENT_USER, wideFromNarrow(contract::kProductKey).c_str(), 0, KEY_READ,
                       key.receive()) != ERROR_SUCCESS)
         return keys;
-    Json::Value& values = keys[std::string("HKEY_CURRENT_USER\\") + contract::kProductKey] =
-        Json::Value(Json::objectValue);
+    Json::Value& values = keys[contract::productKeyPath()] = Json::Value(Json::objectValue);
     for (DWORD index = 0; const auto value = valueAt(key, index); ++index)
         values[utf8FromWide(value->name)] = jsonOf(*value);
     return keys;

@@ -1,5 +1,7 @@
 #pragma once
 
+#include <string>
+
 namespace vexa::contract {
 
 // What stands in the registry.
@@ -11,6 +13,11 @@ inline constexpr const char* kProductKey = "Software\\Korvane\\Vexa";
 inline constexpr const char* kHotspotSwitchValue = "IsHotSpotAutoConnect";
 /// Number: the EAP method of the connection that the service has made, 0 if there is none.
 inline constexpr const char* kEapMethodValue = "EapMethod";
+
+/// The whole path of that key, as it stands in what a simulated machine keeps of its registry.
+inline std::string productKeyPath() {
+    return std::string("HKEY_CURRENT_USER\\") + kProductKey;
+}
 
 /// Below the root of the machine: a subkey for each network adapter.
 inline constexpr const char* kNetworkAdapterClassKey =
