@@ -1,6 +1,5 @@
 #pragma once
 
-#include <array>
 #include <cstdint>
 #include <span>
 #include <vector>
@@ -17,9 +16,5 @@ struct PeerPorts {
 /// end of it. False also where it can't be told. Where the system knows only all connections at once, they
 /// are looked at once for all.
 std::vector<bool> arePeersOfSameAccount(std::span<const PeerPorts> connections);
-
-inline bool isPeerOfSameAccount(std::uint16_t peerPort, std::uint16_t serverPort) {
-    return arePeersOfSameAccount(std::array{PeerPorts{peerPort, serverPort}}).front();
-}
 
 }  // namespace vexa::platform
