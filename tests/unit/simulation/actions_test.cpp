@@ -109,16 +109,6 @@ TEST(Timeline, AdvanceDeliversInTheOrderInWhichThingsAreDue) {
     EXPECT_EQ(times, "100 200 200 200 300 ");
 }
 
-TEST(Timeline, ActsAtZeroBeforeTheMachineIsThere) {
-    TestMachine machine(
-        "{'timeline': [{'atMs': 0, 'do': 'pullAdapter'}, {'atMs': 0, 'do': 'show', 'bssid': "
-        "'02:00:00:00:00:01'},"
-        "{'atMs': 100, 'do': 'insertAdapter'}]}");
-    EXPECT_TRUE(machine->adapters().inserted().empty());
-    machine.advance(100);
-    EXPECT_EQ(machine->adapters().inserted().size(), 1U);
-}
-
 TEST(Timeline, AnAdvanceIsAnsweredWhenWhatItSetOffHasBeenDone) {
     Station station("{'timeline': [{'atMs': 10, 'do': 'notify', 'source': 8, 'code': 1}]}");
     station.listener.onNotification = [](const WLAN_NOTIFICATION_DATA&) {
