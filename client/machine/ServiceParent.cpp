@@ -142,7 +142,7 @@ std::optional<int> ServiceParent::exitCode() {
 
 // A listener that was there before belongs to somebody else, even if the port is the one that we want.
 bool ServiceParent::portsListen() const {
-    const TcpPorts table = TcpPorts::read();
+    const TcpPorts table = TcpPorts::readListeners();
     for (const auto& [port, before] : m_listenersBefore) {
         std::set<std::uint64_t> now = table.listeners(port);
         for (const std::uint64_t socket : before)

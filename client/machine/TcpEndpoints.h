@@ -15,4 +15,7 @@ struct TcpEndpoint {
 /// All of them at this moment. Throws ClientError if they can't be read.
 std::vector<TcpEndpoint> readTcpEndpoints();
 
+/// Those alone that listen, which is quick on a busy host, too.
+std::vector<TcpEndpoint> readTcpListeners();
+
 }  // namespace vexa::client

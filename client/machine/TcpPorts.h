@@ -28,6 +28,7 @@ public:
 
     /// Those of now. Throws ClientError if they can't be read.
     static TcpPorts read() { return TcpPorts(readTcpEndpoints()); }
+    static TcpPorts readListeners() { return TcpPorts(readTcpListeners()); }
 
     /// Any endpoint, in whatever state.
     bool isBusy(std::uint16_t port) const;

@@ -5,12 +5,14 @@ A test gets the folder with the programs from VEXA_BUILD.
 
 import base64
 import collections
+import contextlib
 import fcntl
 import hashlib
 import json
 import os
 import pathlib
 import pty
+import random
 import re
 import select
 import shutil
@@ -59,11 +61,16 @@ def tcp_rows(port):
 
 
 def free_ports(count):
-    """Ports without a row in the TCP table. Bound all at once, so that none comes twice."""
-    sockets = [socket.create_server(("127.0.0.1", 0)) for _ in range(count)]
-    ports = [bound.getsockname()[1] for bound in sockets]
-    for bound in sockets:
-        bound.close()
+    """Ports without a row in the TCP table, which neither an outgoing connection nor another test, nor `vexa start`,
+    takes while this process runs."""
+    ports = []
+    while len(ports) < count:
+        port, name = random.randrange(10000, 32000), socket.socket(socket.AF_UNIX, socket.SOCK_DGRAM)
+        with contextlib.suppress(OSError), socket.socket() as trial:
+            name.bind(f"\0vexa-port-{port}")
+            trial.bind(("127.0.0.1", port))
+            ports.append(port)
+            name.detach()
     return ports
 
 

@@ -72,19 +72,20 @@ class Stranger:
 
 
 def sockets_at(port):
-    """Rows of the TCP table with this port at one end: local port, state, inode."""
-    rows = []
+    """Rows of the TCP table with this port at one end, each once: ports, state, inode. On a busy host the table, which
+    comes in pieces, holds some twice."""
+    rows = set()
     for line in pathlib.Path("/proc/net/tcp").read_text().splitlines()[1:]:
         fields = line.split()
         ends = [int(end.split(":")[1], 16) for end in fields[1:3]]
         if port in ends:
-            rows.append((ends[0], fields[3], fields[9]))
+            rows.add((*ends, fields[3], fields[9]))
     return rows
 
 
 def accepted_at(port):
     """How many connections the service has there."""
-    return sum(local == port and state != "0A" and inode != "0" for local, state, inode in sockets_at(port))
+    return sum(row[0] == port and row[2] != "0A" and row[3] != "0" for row in sockets_at(port))
 
 
 @unittest.skipIf(os.geteuid() != 0, "only root can become somebody else")
@@ -110,7 +111,7 @@ class Strangers(unittest.TestCase):
                 with Stranger(leave_commands):
                     for port in cases:
                         wait_until(
-                            lambda port=port: all(state != FIN_WAIT_1 for _, state, _ in sockets_at(port)),
+                            lambda port=port: all(row[2] != FIN_WAIT_1 for row in sockets_at(port)),
                             "the end of what the stranger has left",
                         )
             finally:

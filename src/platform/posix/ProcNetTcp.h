@@ -17,7 +17,11 @@ struct TcpSocket {
     std::uint64_t inode = 0;  ///< Of the socket; 0: no process has it any more.
 };
 
-/// The rows of such a table, each connection once. False if it can't be read.
-bool readProcNetTcp(const std::string& path, std::vector<TcpSocket>& rows);
+enum class TcpSockets { All, Listening };
+
+/// The rows of such a table, each connection once. Those that listen alone cost little, however many others
+/// there are. False if it can't be read.
+bool readProcNetTcp(const std::string& path, std::vector<TcpSocket>& rows,
+                    TcpSockets which = TcpSockets::All);
 
 }  // namespace vexa::posix

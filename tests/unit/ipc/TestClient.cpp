@@ -13,6 +13,8 @@
 #include <boost/beast/core/flat_buffer.hpp>
 #include <boost/beast/websocket.hpp>
 
+#include "client/machine/TcpPorts.h"
+
 namespace vexa::test {
 
 namespace {
@@ -33,9 +35,8 @@ void connect(tcp::socket& socket, std::int32_t port) {
 }  // namespace
 
 std::int32_t freePort() {
-    asio::io_context io;
-    const tcp::acceptor acceptor(io, {asio::ip::address_v4::loopback(), 0});
-    return acceptor.local_endpoint().port();
+    static std::vector<client::ReservedPort> kept;
+    return kept.emplace_back(client::TcpPorts({}).reserveFree()).port;
 }
 
 std::string handshakeRequest(const std::string& host, const std::string& more) {

@@ -14,7 +14,7 @@ namespace vexa::test {
 /// No wait of a test lasts longer; one that does is a failure.
 inline constexpr std::chrono::seconds kPatience{20};
 
-/// A port on which nothing listens.
+/// A port on which nothing listens, and that nobody else takes while this process runs.
 std::int32_t freePort();
 
 /// A TCP connection that speaks as it likes.

@@ -53,6 +53,8 @@ TEST(ProcNetTcp, HoldsEachConnectionOnceAndEveryoneWhoListens) {
     EXPECT_EQ(rows[2].remotePort, 54321);
     EXPECT_EQ(rows[2].uid, 1000U);
     EXPECT_EQ(rows[2].inode, 4711U);
+    ASSERT_TRUE(posix::readProcNetTcp(path.string(), rows, posix::TcpSockets::Listening));
+    EXPECT_EQ(rows.size(), 2U);
 }
 
 TEST(MachineFolder, IsWhatTheEnvironmentSays) {
