@@ -142,4 +142,8 @@ void Supplicant::tellClient(const std::function<void(const ClientEvents&)>& tell
     if (m_mgr.clientEvents().isComplete()) tell(m_mgr.clientEvents());
 }
 
+void Supplicant::sendConnectionResult(std::uint32_t outcome) {
+    tellClient([&](const ClientEvents& events) { events.sendConnectionResult({.m_result = outcome}); });
+}
+
 }  // namespace vexa

@@ -120,6 +120,8 @@ private:
     void setRadioState(bool on);
     void tellClient(const std::function<void(const ClientEvents&)>& tell) REQUIRES(g_hs20Lock);
     void sendNetworkList() REQUIRES(g_hs20Lock);
+    /// An outcome without a connection's data.
+    void sendConnectionResult(std::uint32_t outcome) REQUIRES(g_hs20Lock);
 
     /// Takes over a report of the networks in range, fetches what ANQP has found out about each, and tells
     /// the client. kInvalidArgument without records.
@@ -134,7 +136,8 @@ private:
     ResultCode onOwnResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::uint32_t& eapMethod)
         REQUIRES(g_hs20Lock);
     ResultCode onForeignResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data) REQUIRES(g_hs20Lock);
-    ResultCode carryOutPendingRequest() REQUIRES(g_hs20Lock);
+    /// Whether a connection is under way now.
+    bool carryOutPendingRequest() REQUIRES(g_hs20Lock);
     ResultCode onSuccess(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const NetworkProfile& profile,
                          std::uint32_t& eapMethod) REQUIRES(g_hs20Lock);
     ResultCode onFailure(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const NetworkProfile& profile)
@@ -153,6 +156,7 @@ private:
     ResultCode connectPlainly(const std::string& ssid) REQUIRES(g_hs20Lock);
     ConnectOutcome tryConnectHs20BssUsingNextCredential(std::string_view ssid) REQUIRES(g_hs20Lock);
     const Credential* nextUntried(const Hs20Network& network) REQUIRES(g_hs20Lock);
+    /// With a new profile, which goes again if no request was made.
     ResultCode connectFreshly(const Hs20Network& network, const Credential& credential) REQUIRES(g_hs20Lock);
     DWORD requestConnection(std::string_view ssid, const NetworkProfile* profile) REQUIRES(g_hs20Lock);
 

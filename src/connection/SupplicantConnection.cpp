@@ -1,5 +1,6 @@
 #include <cstddef>
 #include <string_view>
+#include <utility>
 
 #include "base/DiagnosticLog.h"
 #include "base/WlanText.h"
@@ -95,7 +96,7 @@ ResultCode Supplicant::onOwnResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data
     LogWide(3, L"Connection result initiated by HS20, clearing the cache, profile name=%s.", name.c_str());
     m_connectingSsid.clear();
     m_engine.m_bConnectionStarted = false;
-    if (m_bManualConnectPending) return carryOutPendingRequest();
+    if (m_bManualConnectPending && carryOutPendingRequest()) return kSuccess;
     m_engine.m_hConnectionCompletedEvent.set();
     NetworkProfile* profile = nullptr;
     if (m_engine.m_profileMgr.findProfileByName(name, profile) != kSuccess) {
@@ -105,15 +106,19 @@ ResultCode Supplicant::onOwnResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data
     return data.wlanReasonCode == 0 ? onSuccess(data, *profile, eapMethod) : onFailure(data, *profile);
 }
 
-// The finished attempt leaves no trace; what the client hears comes from the new one.
-ResultCode Supplicant::carryOutPendingRequest() {
+// Once a request is under way the finished attempt leaves no trace: what the client hears comes from the new
+// one. If none can be made the finished attempt is one like any other, and its walk goes on where it was.
+bool Supplicant::carryOutPendingRequest() {
     Log(3, "###User manual connecting request pending, we are going to connect now.###");
-    if (m_pendingManualSsid.empty()) return kFailure;
-    const bool isStarted = connectBssNow(m_pendingManualSsid) == kSuccess;
+    const bool wasManual = std::exchange(m_bManualConnectStarted, false);
+    const std::vector<std::int32_t> tried = m_triedCredentialIds;
+    const bool isRefused = connectBssNow(m_pendingManualSsid) != kSuccess;
     m_bManualConnectPending = false;
-    if (!isStarted)
-        tellClient([](const ClientEvents& events) { events.sendConnectionResult(ConnectionResult{}); });
-    return kSuccess;
+    if (m_engine.m_bConnectionStarted) return true;
+    m_bManualConnectStarted = wasManual;
+    m_triedCredentialIds = tried;
+    if (isRefused) sendConnectionResult(ConnectionResult::kFailed);
+    return false;
 }
 
 ResultCode Supplicant::onSuccess(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const NetworkProfile& profile,
@@ -211,12 +216,8 @@ ResultCode Supplicant::onForeignResult(const WLAN_CONNECTION_NOTIFICATION_DATA& 
     setState(isSuccess ? SupplicantState::Connected : SupplicantState::Disconnected);
     if (!m_bConnectionStartedByOs)
         Log(6, "ERROR: m_bConnectionStartedByOs is not set to true when connecting completed.");
-    ConnectionResult result;
-    result.m_result = ConnectionResult::kSucceeded;
-    tellClient([&](const ClientEvents& events) {
-        events.sendConnectionResult(result);
-        events.sendInternetAccess();
-    });
+    sendConnectionResult(ConnectionResult::kSucceeded);
+    tellClient([](const ClientEvents& events) { events.sendInternetAccess(); });
     m_bConnectionStartedByOs = false;
     return kSuccess;
 }

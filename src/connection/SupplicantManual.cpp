@@ -99,7 +99,9 @@ ConnectOutcome Supplicant::tryConnectHs20BssUsingNextCredential(std::string_view
     Log(3, "Selecting credential with id=%d", credential->m_id);
     m_triedCredentialIds.push_back(credential->m_id);
     if (connectFreshly(*network, *credential) != kSuccess) return kConnectFailed;
-    m_bManualConnectStarted = true;
+    m_bManualConnectStarted = m_engine.m_bConnectionStarted;
+    if (!m_bManualConnectStarted && getConnectedBss(false) == network)
+        sendConnectionResult(ConnectionResult::kSucceeded);
     return kConnectStarted;
 }
 
@@ -126,16 +128,28 @@ const Credential* Supplicant::nextUntried(const Hs20Network& network) {
     return nullptr;
 }
 
+// No request was made: what auto-connect goes by is the network's profile as it was, or none.
 ResultCode Supplicant::connectFreshly(const Hs20Network& network, const Credential& credential) {
+    NetworkProfileMgr& profiles = m_engine.m_profileMgr;
     NetworkProfile* profile = nullptr;
-    if (m_engine.m_profileMgr.findProfileByName(wideFromNarrow(network.ssid()), profile) == kSuccess) {
+    std::optional<NetworkProfile> replaced;
+    if (profiles.findProfileByName(wideFromNarrow(network.ssid()), profile) == kSuccess) {
         if (profile->m_id < 1) return kFailure;
-        m_engine.m_profileMgr.deleteProfile(profile->m_id);
+        replaced = *profile;
+        profiles.deleteProfile(profile->m_id);
     }
-    if (m_engine.m_profileMgr.addProfileFromCredential(credential, network, false,
-                                                       m_engine.m_config.homeRealm(), profile) != kSuccess)
+    if (profiles.addProfileFromCredential(credential, network, false, m_engine.m_config.homeRealm(),
+                                          profile) != kSuccess)
         return kFailure;
-    return connectToNetwork(network, *profile);
+    const ResultCode result = connectToNetwork(network, *profile);
+    if (m_engine.m_bConnectionStarted) return result;
+    if (!replaced) {
+        profiles.deleteProfile(profile->m_id);
+        return result;
+    }
+    replaced->m_priority = profile->m_priority;
+    *profile = *replaced;
+    return result;
 }
 
 }  // namespace vexa

@@ -97,6 +97,21 @@ STORY(ManualConnect, ARefusedRequestIsToldAtOnceAndLeavesNothingBehind, kOne) {
     expectStanding(story, {.requests = "cafe ttls u1", .connected = "cafe"});
 }
 
+// Neither then nor later does a credential go out that waits for the user's hand.
+STORY(ManualConnect, OfWhatIsConnectedIsASuccessAndLeavesNothingBehind,
+      air({kCafe}, storing({byHand(2), {.id = 1}}))) {
+    settle(story, kBehindStart);
+    story.play({connecting("cafe"), passing(5s)});
+    expectStanding(story, {.requests = "", .connected = "cafe", .outcomes = "1"});
+    story.expectLog("Selecting credential with id=2", "Connect to network cafe",
+                    "Already in connected state while requesting to connect to the same network, skip "
+                    "connecting again.");
+    story.play({doing("userDisconnect", R"("ssid":"cafe")"), doing("dropConnection"), passing(30s)});
+    expectStanding(story, {.requests = "", .connected = "-"});
+    story.play({on("setNetwork", 1, lettingIn("")), kRadioOff, kRadioOn, passing(60s)});
+    expectStanding(story, {.requests = "cafe ttls u1; cafe ttls u1"});
+}
+
 STORY(ManualConnect, ANextCredentialThatCanNotStartEndsWithoutAWord,
       air({network(1, "cafe", ttls())}, storing({byHand(1), byHand(2)}))) {
     settle(story, kBehindStart);
@@ -179,6 +194,8 @@ void waits(const char* what, const char* accepts, const std::vector<std::string>
             "Connection result initiated by HS20, clearing the cache, profile name=cafe.",
             "###User manual connecting request pending, we are going to connect now.###",
             "###We are actually going to connect to HS20 network now.###");
+        story.play({kHs20Off, passing(1s)});
+        expectStanding(story, {.connected = "-"});
     }) << what;
 }
 
@@ -188,9 +205,34 @@ TEST(PendingRequest, RunsWhenTheRunningAttemptHasEndedAndIsAllThatTheClientHears
     waits("after a success", all, {connecting("hotel")}, inTheHotel);
     waits("after a failure", "", {connecting("hotel")}, inTheHotel);
     waits("the last of two", "", {connecting("cafe"), connecting("hotel")}, inTheHotel);
-    waits("one that is in no list", all, {connecting("motel")}, {"cafe ttls u1", "0", "cafe"});
     waits("the network that is just being joined", all, {connecting("cafe")},
           {"cafe ttls u1; cafe ttls u1", "1 access", "cafe"});
+}
+
+TEST(PendingRequest, ThatCanNotBeginLeavesTheAttemptThatRanAsItIs) {
+    const char* const all = R"({"eapMethod":21})";
+    const std::string mute = adding(network(3, "mute", R"("anqp":"never")"));
+    const std::string refused = failing("WlanConnect", 50);
+    waits("one that is in no list", all, {connecting("motel")}, {"cafe ttls u1", "0 1 access", "cafe", 2});
+    waits("a refused one", all, {refused, connecting("hotel")},
+          {"cafe ttls u1; hotel ttls u2 = 50", "0 1 access", "cafe", 2});
+    waits("one whose realms aren't known", all, {mute, kReport, connecting("mute")},
+          {"cafe ttls u1", "1 access", "cafe", 2});
+    waits("after a failure", "", {connecting("motel")}, {"cafe ttls u1", "0 0 no access", "-", 0});
+}
+
+STORY(PendingRequest, ThatIsRefusedLeavesItsNetworkTheProfileThatItHas,
+      air({open(1, "cafe", both())}, storing({byHand(2), {.isTls = true}}) + R"(,"connectMs":1000)")) {
+    story.play({passing(500ms), failing("WlanConnect", 50), connecting("cafe"), passing(5s)});
+    expectStanding(story, {"cafe tls ca1 machineOrUser; cafe ttls u2 = 50", "0 1 access", "cafe", 1});
+}
+
+STORY(PendingRequest, ThatIsRefusedLeavesTheWalkByHandWhereItWas,
+      air({network(1, "cafe", ttls()), kHotel},
+          storing({byHand(1), byHand(3), byHand(2, false, "b.example")}) + R"(,"connectMs":1000)")) {
+    story.play(
+        {connecting("cafe"), passing(500ms), failing("WlanConnect", 50), connecting("hotel"), passing(8s)});
+    expectStanding(story, {"cafe ttls u1; hotel ttls u2 = 50; cafe ttls u3", "0 0 no access", "-", 0});
 }
 
 }  // namespace
