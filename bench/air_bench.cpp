@@ -1,5 +1,11 @@
 #include <benchmark/benchmark.h>
-#include <json/value.h>
+
+// The writer whose form clients know.
+#if defined(__GNUC__)
+#pragma GCC diagnostic ignored "-Wdeprecated-declarations"
+#endif
+
+#include <json/writer.h>
 
 #include <cstdio>
 #include <cstdlib>
@@ -10,7 +16,6 @@
 #include <vector>
 
 #include "channel/IpcInProcess.h"
-#include "channel/JsonText.h"
 #include "connection/Supplicant.h"
 #include "connection/SupplicantMgr.h"
 #include "hotspotport/SAHotSpotPortlink.h"
@@ -162,8 +167,8 @@ void bareUpdate(benchmark::State& state) {
         for (const BareNetwork& network : folded)
             list.append(asJson(network));
         Json::Value event;
-        event["Data"] = vexa::toStyledText(list);
-        benchmark::DoNotOptimize(vexa::toStyledText(event));
+        event["Data"] = Json::StyledWriter().write(list);
+        benchmark::DoNotOptimize(Json::StyledWriter().write(event));
     }
     rate(state);
 }

@@ -117,8 +117,7 @@ void IpcSession::start() {
     m_connection->socket().set_option(tcp::no_delay(true), ignored);
     m_connection->resetAfter(kHandshakeLimit);
     m_connection->whenWritten([weak = weak_from_this()] {
-        const auto self = weak.lock();
-        if (self && !self->isBehind()) self->resume();
+        if (const auto self = weak.lock()) self->readAhead();
     });
     readRequest();
 }
@@ -191,9 +190,9 @@ void IpcSession::onMessage(error_code ec) {
     if (!m_isIn) return read();  // on the way to his answer to the goodbye
     m_unhandledMessages += 1;
     m_unhandledBytes += message.size();
-    m_events.received(shared_from_this(), std::move(message));
     m_isPaused = true;
-    if (!isBehind()) resume();
+    m_events.received(shared_from_this(), std::move(message));
+    if (m_events.isHandlerSlow()) readAhead();
 }
 
 bool IpcSession::isBehind() const {
@@ -202,16 +201,17 @@ bool IpcSession::isBehind() const {
 }
 
 void IpcSession::resume() {
-    if (m_isPaused.exchange(false)) read();
+    if (std::exchange(m_isPaused, false)) read();
 }
 
-// The reader marks himself as paused before he looks at the counts, which are taken down here before the mark
-// is looked at: one of the two sees the other.
+void IpcSession::readAhead() {
+    if (!isBehind()) resume();
+}
+
 void IpcSession::messageHandled(std::size_t size) {
     m_unhandledMessages -= 1;
     m_unhandledBytes -= size;
-    if (!m_isPaused || isBehind()) return;
-    asio::post(m_connection->socket().get_executor(), [self = shared_from_this()] { self->resume(); });
+    readAhead();
 }
 
 void IpcSession::send(const Bytes& frame) {

@@ -1,6 +1,5 @@
 #pragma once
 
-#include <atomic>
 #include <boost/system/error_code.hpp>
 #include <cstddef>
 #include <cstdint>
@@ -27,6 +26,8 @@ public:
         /// never in, and more than once.
         virtual void left(ClientId client) = 0;
         virtual void received(std::shared_ptr<IpcSession> session, std::string message) = 0;
+        /// Whether the next message is to be read before the last one has been handled.
+        virtual bool isHandlerSlow() const = 0;
 
     protected:
         ~Events() = default;
@@ -48,8 +49,10 @@ public:
     /// Says goodbye: behind all that is queued, except to one who does not read.
     void close(std::uint16_t code);
 
-    /// One of his messages has been handled. On the thread of the handler.
+    /// One of his messages has been handled.
     void messageHandled(std::size_t size);
+    /// Reads on although one has not been.
+    void readAhead();
 
 private:
     class Layer;
@@ -73,9 +76,9 @@ private:
     bool m_isIn = false;
     bool m_isDropped = false;
     bool m_hasSaidGoodbye = false;
-    std::atomic<bool> m_isPaused{false};
-    std::atomic<std::size_t> m_unhandledMessages{0};
-    std::atomic<std::size_t> m_unhandledBytes{0};
+    bool m_isPaused = false;
+    std::size_t m_unhandledMessages = 0;
+    std::size_t m_unhandledBytes = 0;
 };
 
 }  // namespace vexa

@@ -6,8 +6,10 @@
 #include <chrono>
 #include <condition_variable>
 #include <cstdint>
+#include <functional>
 #include <mutex>
 #include <thread>
+#include <utility>
 
 namespace vexa {
 
@@ -16,7 +18,9 @@ namespace vexa {
 /// message.
 class IpcStandby {
 public:
-    explicit IpcStandby(boost::asio::io_context& io) : m_io(io) {}
+    /// `helps` is called on its thread whenever it begins to help.
+    IpcStandby(boost::asio::io_context& io, std::function<void()> helps)
+        : m_io(io), m_helps(std::move(helps)) {}
 
     void start();
     void stop();
@@ -24,6 +28,9 @@ public:
     /// Around each call of the handler, one at a time.
     void callBegins();
     void callEnds() { ++m_phase; }
+
+    /// Whether it runs the input and output. Whoever is told no has been seen by the next `helps`.
+    bool isHelping() const { return m_isHelping; }
 
 private:
     // How soon the standby helps when a handler is slow, and how long it stays awake when there was nothing
@@ -36,6 +43,8 @@ private:
     void helpDuring(std::uint64_t phase);
 
     boost::asio::io_context& m_io;
+    const std::function<void()> m_helps;
+    std::atomic<bool> m_isHelping{false};
     std::atomic<std::uint64_t> m_phase{0};  // odd during a call
     std::atomic<bool> m_isAwake{false};
     std::mutex m_mutex;
@@ -95,8 +104,11 @@ inline void IpcStandby::watch(std::unique_lock<std::mutex>& lock) {
 
 // What became ready here just before the end of the help needs somebody to take it on.
 inline void IpcStandby::helpDuring(std::uint64_t phase) {
+    m_isHelping = true;
+    m_helps();
     while (m_phase == phase && m_io.run_one() > 0) {
     }
+    m_isHelping = false;
     boost::asio::post(m_io, [] {});
 }
 

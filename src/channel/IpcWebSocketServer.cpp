@@ -2,6 +2,7 @@
 
 #include <atomic>
 #include <boost/asio/defer.hpp>
+#include <boost/asio/dispatch.hpp>
 #include <boost/asio/executor_work_guard.hpp>
 #include <boost/asio/io_context.hpp>
 #include <boost/asio/post.hpp>
@@ -66,10 +67,13 @@ private:
     void entered(std::shared_ptr<IpcSession> session) override;
     void left(ClientId client) override;
     void received(std::shared_ptr<IpcSession> session, std::string message) override;
+    bool isHandlerSlow() const override { return m_standby.isHelping(); }
 
     void flushOutbox();
     void dispatch();
     void handle(const Incoming& incoming);
+    void handled(const Incoming& incoming);
+    void helpSlowHandler();
     void sayFarewell();
 
     const Handler m_handler;
@@ -86,7 +90,8 @@ private:
     std::vector<Outgoing> m_outbox;
     std::mutex m_inboxMutex;
     std::deque<Incoming> m_inbox;  // in front the message that is being handled
-    IpcStandby m_standby{m_io};
+    IpcStandby m_standby{m_io, [this] { helpSlowHandler(); }};
+    std::atomic<std::thread::id> m_handlerThread;
     std::thread m_thread;
 };
 
@@ -113,7 +118,8 @@ void IpcWebSocketServer::Impl::left(ClientId client) {
     m_clientCount = m_clients.size();
 }
 
-// Posted, not deferred: the standby may have to write while the handler that sends is slow.
+// What a handler sends is written when it returns, by its own thread, or by the standby once the handler is
+// slow. Posted, not deferred: who sends may go on for long.
 void IpcWebSocketServer::Impl::queue(ClientId client, std::string_view message) {
     Outgoing outgoing{client, std::make_shared<const std::string>(textFrame(message))};
     {
@@ -121,6 +127,7 @@ void IpcWebSocketServer::Impl::queue(ClientId client, std::string_view message) 
         m_outbox.push_back(std::move(outgoing));
         if (m_outbox.size() > 1) return;
     }
+    if (m_handlerThread == std::this_thread::get_id() && !m_standby.isHelping()) return;
     asio::post(m_inout, [this] { flushOutbox(); });
 }
 
@@ -152,29 +159,44 @@ void IpcWebSocketServer::Impl::received(std::shared_ptr<IpcSession> session, std
     asio::defer(m_io, [this] { dispatch(); });
 }
 
-// What was queued for sending meanwhile, by whomever, is written before the next message is handled.
 void IpcWebSocketServer::Impl::dispatch() {
     std::unique_lock lock(m_inboxMutex);
     const Incoming& incoming = m_inbox.front();  // stays where it is when others come
     lock.unlock();
     handle(incoming);
     lock.lock();
-    const Incoming handled = std::move(m_inbox.front());
+    Incoming done = std::move(m_inbox.front());
     m_inbox.pop_front();
     const bool isLast = m_inbox.empty();
     lock.unlock();
-    if (isLast) return platform::endForeignWork();
-    asio::post(m_inout, [this] {
-        flushOutbox();
-        asio::post(m_io, [this] { dispatch(); });
+    if (isLast) platform::endForeignWork();
+    asio::dispatch(m_inout, [this, done = std::move(done), isLast] {
+        handled(done);
+        if (!isLast) asio::post(m_io, [this] { dispatch(); });
     });
 }
 
 void IpcWebSocketServer::Impl::handle(const Incoming& incoming) {
+    m_handlerThread = std::this_thread::get_id();
     m_standby.callBegins();
     if (!m_isStopped) m_handler(incoming.session->id(), incoming.message);
     m_standby.callEnds();
+    m_handlerThread = std::thread::id();
+}
+
+// What was queued for sending meanwhile, by whomever, is written before the next message is handled, and
+// before the client's next one is read.
+void IpcWebSocketServer::Impl::handled(const Incoming& incoming) {
+    flushOutbox();
     incoming.session->messageHandled(incoming.message.size());
+}
+
+void IpcWebSocketServer::Impl::helpSlowHandler() {
+    asio::post(m_inout, [this] {
+        flushOutbox();
+        for (const auto& [id, session] : m_clients)
+            session->readAhead();
+    });
 }
 
 void IpcWebSocketServer::Impl::sayFarewell() {

@@ -1,21 +1,15 @@
 #include "channel/JsonText.h"
 
-// The styled writer's text is what clients know; the library's newer one indents otherwise.
+// The old reader takes what clients send; the library's newer one is stricter.
 #if defined(__GNUC__)
 #pragma GCC diagnostic ignored "-Wdeprecated-declarations"
 #endif
 
 #include <json/reader.h>
-#include <json/writer.h>
 
 #include <new>
 
 namespace vexa {
-
-std::string toStyledText(const Json::Value& value) {
-    Json::StyledWriter writer;
-    return writer.write(value);
-}
 
 std::optional<Json::Value> parseReceived(std::string_view bytes) {
     try {

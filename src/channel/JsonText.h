@@ -8,10 +8,6 @@
 
 namespace vexa {
 
-/// The form in which every JSON text leaves this process: members sorted, indented by 3, a line end at the
-/// end.
-std::string toStyledText(const Json::Value& value);
-
 /// Comments are allowed and the root may be anything, whatever comes behind it. Text that isn't JSON and text
 /// nested too deeply give null: half a command is none.
 Json::Value parseJsonText(std::string_view text);

@@ -2,7 +2,7 @@
 #include "base/NetworkListLock.h"
 #include "base/StandardOutput.h"
 #include "base/WlanMemory.h"
-#include "channel/JsonText.h"
+#include "channel/StyledText.h"
 #include "connection/Supplicant.h"
 #include "contract/Ports.h"
 #include "hotspotport/SAHotSpotPortlink.h"

@@ -1,6 +1,6 @@
 #include "base/DiagnosticLog.h"
 #include "base/NetworkListLock.h"
-#include "channel/JsonText.h"
+#include "channel/StyledText.h"
 #include "connection/Supplicant.h"
 #include "contract/Ports.h"
 #include "hotspotport/SAHotSpotPortlink.h"

@@ -5,11 +5,12 @@
 #include <cstdint>
 #include <limits>
 
+#include "spectral/LevelEstimate.h"
+
 namespace vexa {
 
 namespace {
 
-constexpr double kFloor = -120.0;
 constexpr double kLargest = std::numeric_limits<double>::max();
 
 int limitToPercent(std::int64_t value) {
@@ -32,25 +33,49 @@ double powerOfTen(double exponent) {
     return exponent < 0.0 ? 1.0 / std::pow(10.0, -exponent) : std::pow(10.0, exponent);
 }
 
-double sumOfSquares(const SampleRecord& record) {
-    std::int64_t sum = 0;
-    for (const std::byte bin : record.bins()) {
-        const int value = std::to_integer<int>(bin);
-        sum += std::int64_t{value} * value;
-    }
-    return static_cast<double>(sum);
-}
-
 struct ChannelSums {
     double level = 0.0;
     double congestion = 0.0;
-    int count = 0;
+    std::size_t count = 0;
+    bool isExact = true;
+    bool hasBound = true;
+
+    void add(const SampleRecord& record);
+    double meanLevel() const { return withoutInfinity(level) / static_cast<double>(count); }
+    double meanCongestion() const { return congestion / static_cast<double>(count); }
+    bool isNoiseCertain() const;
 };
 
-ChannelValues valuesOf(const ChannelSums& sums) {
-    const double level = withoutInfinity(sums.level) / sums.count;
-    const double congestion = withoutInfinity(sums.congestion) / sums.count;
-    return {limitToPercent(toInt32(congestion)), limitToPercent(toInt32(level) + 120)};
+void ChannelSums::add(const SampleRecord& record) {
+    congestion += record.congestion();
+    ++count;
+    const auto estimate = estimateLevel(record);
+    if (estimate) level += estimate->level;
+    isExact = isExact && estimate && estimate->isExact;
+    hasBound = hasBound && estimate && count <= kMostEstimates;
+}
+
+// The integer changes at whole decibels alone, and above -20 no more.
+bool ChannelSums::isNoiseCertain() const {
+    if (isExact) return true;
+    const double mean = meanLevel();
+    const bool isLoudest = mean > kLevelFloor + 100.0 + kEstimateError;
+    return hasBound && (isLoudest || std::fabs(mean - std::round(mean)) > kEstimateError);
+}
+
+int noiseOf(double meanLevel) {
+    return limitToPercent(toInt32(meanLevel) - static_cast<int>(kLevelFloor));
+}
+
+// The samples are summed in their order, as they come: that decides the last bit of the sum.
+int exactNoise(int channel, std::span<const SampleRecord> samples) {
+    ChannelSums sums;
+    for (const SampleRecord& record : samples) {
+        if (frequencyToChannel(record.frequency()) != channel) continue;
+        sums.level += sampleLevel(record);
+        ++sums.count;
+    }
+    return noiseOf(sums.meanLevel());
 }
 
 }  // namespace
@@ -76,40 +101,38 @@ std::optional<int> frequencyToChannel(int frequency) {
     return channel == -1 ? std::nullopt : std::optional(channel);
 }
 
-// Neighbouring bins are often equal, and a logarithm costs more than all the rest.
-double sampleLevel(const SampleRecord& record) {
-    const double total = sumOfSquares(record);
-    const double factor = powerOfTen((record.power() - 96) / 10.0);
-    double sum = 0.0;
-    double level = 0.0;
-    int lastBin = -1;
+double sumOfSquares(const SampleRecord& record) {
+    int sum = 0;
     for (const std::byte bin : record.bins()) {
         const int value = std::to_integer<int>(bin);
-        if (value != lastBin) {
-            const double magnitude = value == 0 ? 1.0 : value;
-            level = 10.0 * std::log10(magnitude * magnitude / total * factor);
-            if (level < kFloor) level = kFloor;
-            lastBin = value;
-        }
-        sum += level;
+        sum += value * value;
+    }
+    return sum;
+}
+
+double sampleLevel(const SampleRecord& record) {
+    const double total = sumOfSquares(record);
+    const double factor = powerOfTen((record.power() + kLevelOfPowerZero) / 10.0);
+    double sum = 0.0;
+    for (const std::byte bin : record.bins()) {
+        const double magnitude = std::max(1, std::to_integer<int>(bin));
+        const double level = 10.0 * std::log10(magnitude * magnitude / total * factor);
+        sum += level < kLevelFloor ? kLevelFloor : level;
     }
     return sum / static_cast<double>(SampleRecord::kBinCount);
 }
 
-// The samples of a channel are summed in their order, as they come: that decides the last bit of the sums.
+// A level is only ever seen as a whole number: nearly is enough, unless it lies next to one.
 std::map<int, ChannelValues> computeChannelValues(std::span<const SampleRecord> samples) {
     std::map<int, ChannelSums> sums;
-    for (const SampleRecord& record : samples) {
-        const auto channel = frequencyToChannel(record.frequency());
-        if (!channel) continue;
-        ChannelSums& channelSums = sums[*channel];
-        channelSums.level += sampleLevel(record);
-        channelSums.congestion += record.congestion();
-        ++channelSums.count;
-    }
+    for (const SampleRecord& record : samples)
+        if (const auto channel = frequencyToChannel(record.frequency())) sums[*channel].add(record);
     std::map<int, ChannelValues> values;
-    for (const auto& [channel, channelSums] : sums)
-        values.emplace(channel, valuesOf(channelSums));
+    for (const auto& [channel, ofChannel] : sums) {
+        const int noise =
+            ofChannel.isNoiseCertain() ? noiseOf(ofChannel.meanLevel()) : exactNoise(channel, samples);
+        values.emplace(channel, ChannelValues{limitToPercent(toInt32(ofChannel.meanCongestion())), noise});
+    }
     return values;
 }
 

@@ -1,7 +1,7 @@
 #include <algorithm>
 
 #include "channel/Envelope.h"
-#include "channel/JsonText.h"
+#include "channel/StyledText.h"
 #include "contract/Ports.h"
 #include "spectral/SAPortlink.h"
 

@@ -1,7 +1,7 @@
 #include "base/StandardOutput.h"
 #include "base/WlanMemory.h"
 #include "channel/Envelope.h"
-#include "channel/JsonText.h"
+#include "channel/StyledText.h"
 #include "contract/Ports.h"
 #include "spectral/SAPortlink.h"
 

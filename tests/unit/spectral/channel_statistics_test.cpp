@@ -2,7 +2,9 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <array>
+#include <cmath>
 
 namespace vexa {
 namespace {
@@ -70,6 +72,25 @@ TEST(ChannelStatistics, ValuesOfOneChannel) {
         EXPECT_EQ(values.at(1).congestion, c.congestion) << c.story;
         EXPECT_EQ(values.at(1).noise, c.noise) << c.story;
     }
+}
+
+// Ones among zeros, 1 or 10 of them, and all levels are whole but for the last bit, which decides the
+// integer.
+TEST(ChannelStatistics, ALevelNextToAWholeOneIsThatOfTheExactOrder) {
+    int aboveWhole = 0;
+    for (int power = -24; power < 96; ++power) {
+        for (const std::size_t ones : {1U, 10U}) {
+            std::vector<int> bins(SampleRecord::kBinCount, 0);
+            std::fill_n(bins.begin(), ones, 1);
+            const std::vector records(3, record(2412, 0, power, bins));
+            const double mean =
+                (sampleLevel(records[0]) + sampleLevel(records[1]) + sampleLevel(records[2])) / 3;
+            aboveWhole += mean > std::round(mean) ? 1 : 0;
+            const int noise = std::min(static_cast<int>(mean) + 120, 100);
+            EXPECT_EQ(computeChannelValues(records).at(1).noise, noise) << power << ' ' << ones;
+        }
+    }
+    EXPECT_GT(aboveWhole, 2);
 }
 
 TEST(ChannelStatistics, RecordsWithoutAChannelAreSkippedAndOthersSorted) {
