@@ -45,9 +45,9 @@ public:
     /// Until this is done, a loss of power can take what was written.
     bool flush();
 
-    /// Gives it another name in its folder, at once and for good: there is no moment without a file of that name if there
-    /// was one before. A process that has the existing file open, a virus scanner or a backup, is waited for
-    /// a fraction of a second, by the wall clock.
+    /// Gives it another name in its folder, at once and for good: there is no moment without a file of that
+    /// name if there was one before. A process that has the existing file open, a virus scanner or a backup,
+    /// is waited for a fraction of a second, by the wall clock.
     bool rename(const std::wstring& to, Existing existing);
 
     void remove();
