@@ -57,9 +57,10 @@ STORY(Credentials, ACommandThatCannotBeCarriedOutChangesNothingAndStillTellsTheL
     std::vector<std::string> additions = {"", "[]", "\"text\"", "{", "{}", tlsData("x", R"("CaCert":["c"])")};
     for (const char* const members :
          {R"("CredentialEapMethod":"2")", R"("Type":"1")", R"("Type":1.5)", R"("Type":4294967297)",
-          R"("Type":true)", R"("Type":2)", R"("RealName":7)", R"("RealName":"x\uffff")",
-          R"("Username":["u"])", R"("Password":"a\u0001b")", R"("AutoConnect":"true")", R"("IsPrefered":1)",
-          R"("RealName":"a.example","CredentialName":"x")", R"("CredentialName":"a.example")"})
+          R"("Type":true)", R"("Type":2)", R"("AccessType":3)", R"("AccessType":-1)", R"("RealName":7)",
+          R"("RealName":"x\uffff")", R"("Username":["u"])", R"("Password":"a\u0001b")",
+          R"("AutoConnect":"true")", R"("IsPrefered":1)", R"("RealName":"a.example","CredentialName":"x")",
+          R"("CredentialName":"a.example")"})
         additions.push_back(ttlsData("x", members));
     const std::string edited = R"("CredentialEapMethod":2,"RealName":"x","Username":"u","Password":"p"})";
 
@@ -69,7 +70,11 @@ STORY(Credentials, ACommandThatCannotBeCarriedOutChangesNothingAndStillTellsTheL
     const auto expectNothing = [&](const std::string& command, const std::vector<std::string>& inputs) {
         for (const std::string& data : inputs) {
             story.about(command + " " + data);
+            story.forget();
             story.expect("list", list(story, command, data), "2 b.example, 1 a.example");
+            const int refusals =
+                count(story.messages(), "ERROR: ") + count(story.messages(), "Unknown credential");
+            if (command == "ADD_CREDENTIAL") story.expect("refusals in the log", refusals, 1);
             story.expect("file", story.config(), file);
         }
     };
