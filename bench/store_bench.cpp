@@ -167,9 +167,9 @@ template <int Size>
 void save(benchmark::State& state) {
     Store::instance().fill(Size);
     const LockGuard lock(vexa::g_hs20Lock);
+    vexa::Config& config = SupplicantMgr::instance().config();
     for (auto _ : state)
-        if (SupplicantMgr::instance().config().saveConfig() != vexa::kSuccess)
-            state.SkipWithError("the save failed");
+        if (config.saveConfig(config.lockFile()) != vexa::kSuccess) state.SkipWithError("the save failed");
     countRate(state);
 }
 

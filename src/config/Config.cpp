@@ -68,8 +68,10 @@ ResultCode Config::openDocument() {
     return m_xmlDoc.load(m_configPath) == kSuccess ? kSuccess : kFailure;
 }
 
-void Config::saveDocument() {
-    if (m_xmlDoc.save(m_configPath) != kSuccess) m_bSaveFailed = true;
+bool Config::saveDocument() {
+    if (m_xmlDoc.save(m_configPath) != kSuccess) return false;
+    remember();
+    return true;
 }
 
 ResultCode Config::readConfig(bool* configChanged) {
@@ -78,7 +80,11 @@ ResultCode Config::readConfig(bool* configChanged) {
     if (const ResultCode result = openDocument(); result != kSuccess) return result;
     readGlobalSettings();
     bool isChanged = false;
-    if (readCredentials() != kSuccess || readUsers(isChanged) != kSuccess) return kFailure;
+    Reading reading{.table = m_credentials, .trace = Trace::Yes};
+    if (readCredentials(reading, isChanged) != kSuccess || readUsers(reading, isChanged) != kSuccess)
+        return kFailure;
+    remember();
+    m_bUnsaved = false;
     if (configChanged != nullptr) *configChanged = isChanged;
     return kSuccess;
 }
@@ -112,7 +118,6 @@ void Config::readGlobalSettings() {
     DiagnosticLog::setEnableDump(m_bEnableDump);
     if (m_bEnableDump) m_dumpLevel = readNumber("/*/global/dumplevel");
     m_homeRealm = m_xmlDoc.getText("/*/global/homerealm", Node()).value_or(L"");
-    m_nextCredId = readNumber("/*/global/nextcredid");
     readAutoConnectFromRegistry();
 }
 
@@ -145,33 +150,32 @@ void Config::readAutoConnectFromRegistry() {
     m_bHotSpotAutoConnect = !text || compareNoCase(*text, L"false") != 0;
 }
 
-// However many of the three are lost, as with a full disk, one line tells of it.
-ResultCode Config::saveConfig() {
-    m_bSaveFailed = false;
-    const bool isDone =
-        saveNextCredId() == kSuccess && saveCredentials() == kSuccess && saveUsers() == kSuccess;
-    if (!isDone || m_bSaveFailed) Log(6, "ERROR: Saving the configuration file failed.");
-    return isDone ? kSuccess : kFailure;
+// However little is lost, as with a full disk, one line tells of it.
+ResultCode Config::saveConfig(const FileLock& held) {
+    const ScopeGuard release([this]() NO_THREAD_SAFETY_ANALYSIS { m_xmlDoc.release(); });
+    ResultCode result = held ? openDocument() : kFailure;
+    bool isWritten = false;
+    for (const auto section : {&Config::writeNextCredId, &Config::writeCredentials, &Config::writeUsers}) {
+        if (result == kSuccess) result = (this->*section)();
+        isWritten = isWritten || result == kSuccess;
+    }
+    const bool isSaved = isWritten && saveDocument();
+    m_bUnsaved = result != kSuccess || !isSaved;
+    if (m_bUnsaved) Log(6, "ERROR: Saving the configuration file failed.");
+    return result == kSuccess ? kSuccess : kFailure;
 }
 
 // A file that has lost the element gets it back: otherwise nothing could be saved any more.
-ResultCode Config::saveNextCredId() {
-    const ScopeGuard release([this]() NO_THREAD_SAFETY_ANALYSIS { m_xmlDoc.release(); });
-    if (const ResultCode result = openDocument(); result != kSuccess) return result;
+ResultCode Config::writeNextCredId() {
     const std::wstring number = std::to_wstring(m_nextCredId);
     Node node;
     m_xmlDoc.selectSingleNode("/*/global/nextcredid", Node(), node);
-    if (node) {
-        XmlDocument::setText(node, number);
-    } else {
-        Log(6, "ERROR: No nextcredid node in the config xml file.");
-        Node global;
-        m_xmlDoc.selectSingleNode("/*/global", Node(), global);
-        if (!global && m_xmlDoc.setChild("global", L"", Node(), true, &global) != kSuccess) return kFailure;
-        m_xmlDoc.setChild("nextcredid", number, global, true);
-    }
-    saveDocument();
-    return kSuccess;
+    if (node) return XmlDocument::setText(node, number);
+    Log(6, "ERROR: No nextcredid node in the config xml file.");
+    Node global;
+    m_xmlDoc.selectSingleNode("/*/global", Node(), global);
+    if (!global && m_xmlDoc.setChild("global", L"", Node(), true, &global) != kSuccess) return kFailure;
+    return m_xmlDoc.setChild("nextcredid", number, global, true);
 }
 
 }  // namespace vexa

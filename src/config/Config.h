@@ -2,19 +2,26 @@
 
 #include <atomic>
 #include <cstdint>
+#include <optional>
 #include <string>
+#include <unordered_map>
+#include <unordered_set>
 #include <vector>
 
 #include "base/NetworkListLock.h"
 #include "config/CredentialTable.h"
 #include "config/ResultCodes.h"
 #include "config/XmlDocument.h"
+#include "platform/Files.h"
 
 namespace vexa {
 
 /// Owns config.xml, the one file of all users of the machine: global settings, everybody's credentials, and
 /// each user's order of those that he sees. No document stays in memory between operations: each reads the
-/// file as it is at that moment, and a save changes its own section alone.
+/// file as it is at that moment, and a save changes this user's part alone.
+///
+/// Services of several users change the file at once. So a change is one critical section under the file's
+/// lock: beginChange, the change in the table, saveConfig.
 ///
 /// Results: kSuccess, kFailure, kNotFound (the file can't be opened), kNoDocument.
 class Config {
@@ -26,17 +33,24 @@ public:
     /// to save.
     ResultCode readConfig(bool* configChanged) REQUIRES(g_hs20Lock);
 
-    /// The three saves below, up to the first that fails. That the file could not be written is no failure of
-    /// theirs: memory and file then differ until the next save that succeeds.
-    ResultCode saveConfig() REQUIRES(g_hs20Lock);
-    ResultCode saveNextCredId() REQUIRES(g_hs20Lock);
-    ResultCode saveCredentials() REQUIRES(g_hs20Lock);
-    ResultCode saveUsers() REQUIRES(g_hs20Lock);
+    /// The lock of the file, which is taken behind the network list lock and ends with its holder. Empty: it
+    /// was not to be had, and what is changed stays in memory until the next save that succeeds.
+    using FileLock = std::optional<platform::FolderLock>;
+    [[nodiscard]] FileLock lockFile() const REQUIRES(g_hs20Lock);
+
+    /// Locks the file, and brings into memory what others have changed in it since it was last read or saved.
+    /// What memory has and could not be saved stays; so does all, where the file can't be read.
+    [[nodiscard]] FileLock beginChange() REQUIRES(g_hs20Lock);
+
+    /// Writes the next id, the credentials, and the user's list, up to the first that the file has no place
+    /// for, in one save. That the file could not be written is no failure: memory and file then differ until
+    /// the next save that succeeds.
+    ResultCode saveConfig(const FileLock& held) REQUIRES(g_hs20Lock);
 
     CredentialTable& credentials() REQUIRES(g_hs20Lock) { return m_credentials; }
     const std::wstring& userName() const REQUIRES(g_hs20Lock) { return m_userName; }
     std::int32_t nextCredId() const REQUIRES(g_hs20Lock) { return m_nextCredId; }
-    void advanceNextCredId() REQUIRES(g_hs20Lock) { ++m_nextCredId; }
+    void advanceNextCredId() REQUIRES(g_hs20Lock) { m_nextCredId = followingId(m_nextCredId); }
 
     /// Where the log goes.
     const std::wstring& dumpFilePath() const REQUIRES(g_hs20Lock) { return m_dumpFilePath; }
@@ -53,9 +67,28 @@ private:
 
     static constexpr const wchar_t* kInvalid = L"Invalid";  // what a missing element reads as
 
+    /// Whether the log tells of each step of a reading.
+    enum class Trace { Yes, No };
+
+    /// What is read of the file's credentials.
+    struct Reading {
+        CredentialTable& table;
+        Trace trace;
+        std::int32_t highestId = 0;                        // whoever's it is
+        std::unordered_set<std::int32_t> foreignIds = {};  // of other users' private credentials
+    };
+
+    /// A credential as the file held it when it was last read or saved, its place as the user's list gave it,
+    /// and as memory held it then.
+    struct Known {
+        Credential inFile;
+        Credential inMemory;
+    };
+
     ResultCode createDefaultFile(const std::wstring& path) REQUIRES(g_hs20Lock);
     ResultCode openDocument() REQUIRES(g_hs20Lock);
-    void saveDocument() REQUIRES(g_hs20Lock);
+    bool saveDocument() REQUIRES(g_hs20Lock);
+    void forgetIfFileIsGone() REQUIRES(g_hs20Lock);
 
     void readGlobalSettings() REQUIRES(g_hs20Lock);
     bool readFlag(const char* xpath, bool missing) REQUIRES(g_hs20Lock);
@@ -65,15 +98,30 @@ private:
     void deriveDumpFilePath() REQUIRES(g_hs20Lock);
     void readAutoConnectFromRegistry();
 
-    ResultCode readCredentials() REQUIRES(g_hs20Lock);
-    void readCredential(Node node) REQUIRES(g_hs20Lock);
-    void repairNextCredId() REQUIRES(g_hs20Lock);
-    ResultCode readUsers(bool& isChanged) REQUIRES(g_hs20Lock);
-    Node findCurrentUser(const std::vector<Node>& users) REQUIRES(g_hs20Lock);
-    bool applyReferences(const std::vector<Node>& references) REQUIRES(g_hs20Lock);
-    bool mustRemove(Node node, const std::unordered_map<std::int32_t, Credential*>& present)
+    ResultCode readCredentials(Reading& reading, bool& isChanged) REQUIRES(g_hs20Lock);
+    void readCredential(Node node, Reading& reading) REQUIRES(g_hs20Lock);
+    static std::int32_t followingId(std::int32_t id);
+    bool isForeign(std::int32_t access, const std::wstring& creator) const REQUIRES(g_hs20Lock);
+    bool repairIds(const Reading& reading) REQUIRES(g_hs20Lock);
+    ResultCode readUsers(const Reading& reading, bool& isChanged) REQUIRES(g_hs20Lock);
+    Node findCurrentUser(const std::vector<Node>& users, Trace trace) REQUIRES(g_hs20Lock);
+    bool applyReferences(const std::vector<Node>& references, const Reading& reading) REQUIRES(g_hs20Lock);
+
+    bool readSilently(Reading& reading) REQUIRES(g_hs20Lock);
+    void remember() REQUIRES(g_hs20Lock);
+    void takeOver(const Reading& stored) REQUIRES(g_hs20Lock);
+    void takeOverDeletions(const CredentialTable& stored) REQUIRES(g_hs20Lock);
+    void giveNewId(Credential& credential) REQUIRES(g_hs20Lock);
+    Credential takeOverKnown(const Credential& theirs, const Known& before, Credential* mine)
         REQUIRES(g_hs20Lock);
+    Credential takeOverNew(const Credential& theirs, Credential* mine) REQUIRES(g_hs20Lock);
+    void takeOverPlaces(const CredentialTable& stored) REQUIRES(g_hs20Lock);
+
+    ResultCode writeNextCredId() REQUIRES(g_hs20Lock);
+    ResultCode writeCredentials() REQUIRES(g_hs20Lock);
+    bool mustRemove(Node node) REQUIRES(g_hs20Lock);
     ResultCode writeCredential(const Credential& credential, Node section) REQUIRES(g_hs20Lock);
+    ResultCode writeUsers() REQUIRES(g_hs20Lock);
     ResultCode writeReferences(Node list) REQUIRES(g_hs20Lock);
 
     std::wstring m_userName GUARDED_BY(g_hs20Lock);
@@ -87,7 +135,8 @@ private:
     std::atomic<bool> m_bAutoConnect{true};
     std::wstring m_homeRealm GUARDED_BY(g_hs20Lock);
     std::wstring m_baseDir GUARDED_BY(g_hs20Lock);
-    bool m_bSaveFailed GUARDED_BY(g_hs20Lock) = false;
+    bool m_bUnsaved GUARDED_BY(g_hs20Lock) = false;  // the last save did not bring all into the file
+    std::unordered_map<std::int32_t, Known> m_known GUARDED_BY(g_hs20Lock);
     std::wstring m_configPath GUARDED_BY(g_hs20Lock);
 };
 

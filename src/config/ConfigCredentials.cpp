@@ -5,12 +5,13 @@
 
 #include "base/DiagnosticLog.h"
 #include "config/Config.h"
-#include "text/ScopeGuard.h"
 #include "text/TextConversion.h"
 
 namespace vexa {
 
 namespace {
+
+constexpr std::int32_t kLargest = std::numeric_limits<std::int32_t>::max();
 
 std::int32_t typeFromText(const std::wstring& text) {
     if (text == L"eapttls") return CRED_TYPE_EAP_TTLS;
@@ -50,34 +51,42 @@ const wchar_t* textOfAccess(std::int32_t accessType) {
 
 }  // namespace
 
-ResultCode Config::readCredentials() {
-    Log(2, "Reading all credentials...");
-    m_credentials.clear();
+ResultCode Config::readCredentials(Reading& reading, bool& isChanged) {
+    const bool isTraced = reading.trace == Trace::Yes;
+    if (isTraced) Log(2, "Reading all credentials...");
+    reading.table.clear();
     if (m_userName.empty()) return kFailure;
     std::vector<Node> nodes;
     if (m_xmlDoc.selectNodes("/*/credentials/*", Node(), nodes) != kSuccess) return kFailure;
-    Log(2, "Retrieved total %d credentials:", static_cast<int>(nodes.size()));
+    if (isTraced) Log(2, "Retrieved total %d credentials:", static_cast<int>(nodes.size()));
     int index = 0;
     for (const Node node : nodes) {
-        Log(2, "\tReading credential with index=%d...", ++index);
-        readCredential(node);
+        ++index;
+        if (isTraced) Log(2, "\tReading credential with index=%d...", index);
+        readCredential(node, reading);
     }
-    m_credentials.sortByPriority();
-    if (m_nextCredId <= 0) repairNextCredId();
+    reading.table.sortByPriority();
+    isChanged = repairIds(reading);
     return kSuccess;
 }
 
-void Config::readCredential(Node node) {
+// Seen by its creator alone, who is somebody else.
+bool Config::isForeign(std::int32_t access, const std::wstring& creator) const {
+    return access == CRED_ACCESS_PER_USER && creator != m_userName;
+}
+
+void Config::readCredential(Node node, Reading& reading) {
     const std::int32_t id = numberOf(node, "id");
     if (id <= 0) {
-        Log(2, "Invalid credential id=%d", id);
+        if (reading.trace == Trace::Yes) Log(2, "Invalid credential id=%d", id);
         return;
     }
+    reading.highestId = std::max(reading.highestId, id);
     const std::int32_t type = typeFromText(textOf(node, "type", kInvalid));
     const std::int32_t access = accessFromText(textOf(node, "accesstype", kInvalid));
-    if (type == 0 || access == 0) return;
     const std::wstring creator = textOf(node, "creator", kInvalid);
-    if (access == CRED_ACCESS_PER_USER && creator != m_userName) return;
+    if (isForeign(access, creator)) reading.foreignIds.insert(id);
+    if (type == 0 || access == 0 || isForeign(access, creator)) return;
 
     auto credential = std::make_unique<Credential>(id, creator, type, access);
     credential->m_bAutoConnect = textOf(node, "autoconnect", L"true") == L"true";
@@ -94,49 +103,59 @@ void Config::readCredential(Node node) {
     const std::int32_t missingEap = type == CRED_TYPE_EAP_TTLS ? 0 : kEapMethodTls;
     credential->m_eapMethod = eap.empty() ? missingEap : leadingInteger(eap);
     if (credential->m_credName.empty()) credential->m_credName = credential->m_realm;
-    m_credentials.appendUnplaced(std::move(credential));
+    reading.table.appendUnplaced(std::move(credential));
 }
 
-// One above the highest id in the file, other users' credentials included, so that no id is given out twice.
-// Only in memory.
-void Config::repairNextCredId() {
-    std::vector<Node> nodes;
-    m_xmlDoc.selectNodes("/*/credentials/*", Node(), nodes);
-    std::int32_t highest = 0;
-    for (const Node node : nodes)
-        highest = std::max(highest, leadingInteger(textOf(node, "id", L"")));
-    m_nextCredId = highest == std::numeric_limits<std::int32_t>::max() ? highest : highest + 1;
+std::int32_t Config::followingId(std::int32_t id) {
+    return id == kLargest ? id : id + 1;
 }
 
-ResultCode Config::saveCredentials() {
-    const ScopeGuard release([this]() NO_THREAD_SAFETY_ANALYSIS { m_xmlDoc.release(); });
-    if (const ResultCode result = openDocument(); result != kSuccess) return result;
+// The next id is above all ids in the file, other users' included, whatever the file says; it never goes
+// back. An id that is there twice stays with another user, or with the first that has it.
+bool Config::repairIds(const Reading& reading) {
+    std::int32_t next = std::max(readNumber("/*/global/nextcredid"), followingId(reading.highestId));
+    std::unordered_set<std::int32_t> taken = reading.foreignIds;
+    bool isChanged = false;
+    for (Credential* credential : reading.table.copyCredentialPointers()) {
+        if (taken.insert(credential->m_id).second || next == kLargest) continue;
+        if (reading.trace == Trace::Yes)
+            Log(6, "ERROR: Found duplicate credential id=%d, new id=%d", credential->m_id, next);
+        credential->m_id = next;
+        next = followingId(next);
+        isChanged = true;
+    }
+    m_nextCredId = std::max(m_nextCredId, next);
+    return isChanged;
+}
+
+// What was there is taken out last, so that a failure changes nothing.
+ResultCode Config::writeCredentials() {
     Node section;
     std::vector<Node> nodes;
     if (m_xmlDoc.selectSingleNode("/*/credentials", Node(), section) != kSuccess ||
         m_xmlDoc.selectNodes("/*/credentials/*", Node(), nodes) != kSuccess)
         return kFailure;
-    const auto present = m_credentials.credentialsById();
-    for (const Node node : nodes)
-        if (mustRemove(node, present)) XmlDocument::remove(node);
+    std::erase_if(nodes, [this](Node node) NO_THREAD_SAFETY_ANALYSIS { return !mustRemove(node); });
+    const Node last = section.last_child();
+    ResultCode result = kSuccess;
     for (const Credential* credential : m_credentials.copyCredentialPointers())
-        if (!section || writeCredential(*credential, section) != kSuccess) return kFailure;
+        if (result == kSuccess) result = section ? writeCredential(*credential, section) : kFailure;
+    while (result != kSuccess && section.last_child() != last)
+        XmlDocument::remove(section.last_child());
+    if (result != kSuccess) return result;
+    for (const Node node : nodes)
+        XmlDocument::remove(node);
     Log(2, "Saving credentials to xml file...");
-    saveDocument();
     return kSuccess;
 }
 
-// What the table holds is written anew. Of the rest only what this process never loaded stays: other users'
-// private credentials, and what has no valid id.
-bool Config::mustRemove(Node node, const std::unordered_map<std::int32_t, Credential*>& present) {
+// Only what this process never loaded stays: other users' private credentials, and what has no valid id.
+// Whatever the ids of those are, they are no reason to take them for the user's own.
+bool Config::mustRemove(Node node) {
     const std::int32_t id = numberOf(node, "id");
-    if (id <= 0) {
-        Log(2, "Invalid credential id=%d", id);
-        return false;
-    }
-    const std::wstring access = textOf(node, "accesstype", kInvalid);
-    const std::wstring creator = textOf(node, "creator", kInvalid);
-    return present.contains(id) || accessFromText(access) != CRED_ACCESS_PER_USER || creator == m_userName;
+    if (id <= 0) Log(2, "Invalid credential id=%d", id);
+    const std::int32_t access = accessFromText(textOf(node, "accesstype", kInvalid));
+    return id > 0 && !isForeign(access, textOf(node, "creator", kInvalid));
 }
 
 ResultCode Config::writeCredential(const Credential& credential, Node section) {

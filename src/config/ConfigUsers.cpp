@@ -4,31 +4,33 @@
 
 #include "base/DiagnosticLog.h"
 #include "config/Config.h"
-#include "text/ScopeGuard.h"
 
 namespace vexa {
 
-ResultCode Config::readUsers(bool& isChanged) {
-    Log(2, "Reading all user info...");
+ResultCode Config::readUsers(const Reading& reading, bool& isChanged) {
+    const bool isTraced = reading.trace == Trace::Yes;
+    if (isTraced) Log(2, "Reading all user info...");
     if (m_userName.empty()) return kFailure;
     std::vector<Node> users;
     if (m_xmlDoc.selectNodes("/*/users/*", Node(), users) != kSuccess) return kFailure;
-    Log(2, "Retrieved total %d user info", static_cast<int>(users.size()));
-    if (const Node user = findCurrentUser(users)) {
+    if (isTraced) Log(2, "Retrieved total %d user info", static_cast<int>(users.size()));
+    if (const Node user = findCurrentUser(users, reading.trace)) {
         std::vector<Node> references;
         if (m_xmlDoc.selectNodes("credentials/*", user, references) != kSuccess) return kFailure;
-        Log(2, "\t\tcredential count=%d", static_cast<int>(references.size()));
-        isChanged = applyReferences(references);
+        if (isTraced) Log(2, "\t\tcredential count=%d", static_cast<int>(references.size()));
+        isChanged = applyReferences(references, reading) || isChanged;
     }
-    m_credentials.placeUnplacedCredentials();
-    m_credentials.dumpCredentials();
+    if (!isTraced) return kSuccess;
+    reading.table.placeUnplacedCredentials();
+    reading.table.dumpCredentials();
     return kSuccess;
 }
 
-Config::Node Config::findCurrentUser(const std::vector<Node>& users) {
+Config::Node Config::findCurrentUser(const std::vector<Node>& users, Trace trace) {
     int index = 0;
     for (const Node user : users) {
-        Log(2, "\tReading user info with index=%d...", ++index);
+        ++index;
+        if (trace == Trace::Yes) Log(2, "\tReading user info with index=%d...", index);
         if (textOf(user, "username", kInvalid) == m_userName) return user;
     }
     return {};
@@ -36,8 +38,9 @@ Config::Node Config::findCurrentUser(const std::vector<Node>& users) {
 
 // The user's places, one by one. True if others have deleted credentials that he lists, or added some that he
 // doesn't.
-bool Config::applyReferences(const std::vector<Node>& references) {
-    const auto present = m_credentials.credentialsById();
+bool Config::applyReferences(const std::vector<Node>& references, const Reading& reading) {
+    const bool isTraced = reading.trace == Trace::Yes;
+    const auto present = reading.table.credentialsById();
     std::unordered_set<std::int32_t> listed;
     bool isChanged = false;
     for (const Node reference : references) {
@@ -49,40 +52,39 @@ bool Config::applyReferences(const std::vector<Node>& references) {
         const auto found = present.find(id);
         if (found != present.end()) {
             found->second->m_priority = priority;
-            Log(2, "\t\t\tid=%d, priority=%d", id, priority);
+            if (isTraced) Log(2, "\t\t\tid=%d, priority=%d", id, priority);
         } else {
-            Log(3,
-                "All-user credential deleted by others,we should delete this credential for current user, cred id=%d",
-                id);
             isChanged = true;
+            if (isTraced)
+                Log(3,
+                    "All-user credential deleted by others,we should delete this credential for current user, cred id=%d",
+                    id);
         }
     }
-    const auto all = m_credentials.copyCredentialPointers();
+    const auto all = reading.table.copyCredentialPointers();
     return isChanged || std::any_of(all.begin(), all.end(), [&](const Credential* credential) {
                return !listed.contains(credential->m_id);
            });
 }
 
-ResultCode Config::saveUsers() {
-    if (m_userName.empty()) return kFailure;
-    const ScopeGuard release([this]() NO_THREAD_SAFETY_ANALYSIS { m_xmlDoc.release(); });
-    m_xmlDoc.create();
-    if (m_xmlDoc.load(m_configPath) != kSuccess) return kFailure;
+// What was there is taken out last, so that a failure changes nothing.
+ResultCode Config::writeUsers() {
     Node section;
     std::vector<Node> users;
-    if (m_xmlDoc.selectSingleNode("/*/users", Node(), section) != kSuccess || !section ||
-        m_xmlDoc.selectNodes("/*/users/*", Node(), users) != kSuccess)
+    if (m_userName.empty() || m_xmlDoc.selectSingleNode("/*/users", Node(), section) != kSuccess ||
+        !section || m_xmlDoc.selectNodes("/*/users/*", Node(), users) != kSuccess)
         return kFailure;
-    for (const Node user : users)
-        if (textOf(user, "username", kInvalid) == m_userName) XmlDocument::remove(user);
     Node user;
     Node list;
     if (m_xmlDoc.setChild("user", L"", section, true, &user) != kSuccess ||
         m_xmlDoc.setChild("username", m_userName, user, true) != kSuccess ||
         m_xmlDoc.setChild("credentials", L"", user, true, &list) != kSuccess ||
-        writeReferences(list) != kSuccess)
+        writeReferences(list) != kSuccess) {
+        XmlDocument::remove(user);
         return kFailure;
-    saveDocument();
+    }
+    for (const Node old : users)
+        if (textOf(old, "username", kInvalid) == m_userName) XmlDocument::remove(old);
     return kSuccess;
 }
 

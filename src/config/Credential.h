@@ -24,6 +24,7 @@ inline constexpr std::int32_t CRED_PRIORITY_LOWEST = 9999;  // not yet placed
 /// One stored credential, as the current user sees it.
 struct Credential {
     Credential(std::int32_t id, std::wstring creator, std::int32_t type, std::int32_t accessType);
+    bool operator==(const Credential&) const = default;
 
     std::int32_t m_id;
     std::int32_t m_priority = CRED_PRIORITY_LOWEST;  // 1 is first; 0: none, left alone by all shifting

@@ -64,7 +64,10 @@ bool CredentialTable::isDuplicate(const CredentialInput& input, const std::wstri
 ResultCode CredentialTable::addCredential(const CredentialInput& input, std::int32_t nextId,
                                           const std::wstring& userName, std::int32_t& outId) {
     outId = -1;
-    if (input.type == 0) return kInvalidArgument;
+    if (input.type == 0) {
+        Log(6, "ERROR: Invalid credential type.");
+        return kInvalidArgument;
+    }
     const std::wstring& name = input.credName.empty() ? input.realm : input.credName;
     if (isDuplicate(input, name)) return kFailure;
     const std::wstring& creator = input.creator.empty() ? userName : input.creator;
@@ -72,7 +75,10 @@ ResultCode CredentialTable::addCredential(const CredentialInput& input, std::int
         Log(6, "ERROR: Invalid credential creator.");
         return kFailure;
     }
-    if (nextId == kLargest) return kFailure;
+    if (nextId == kLargest) {
+        Log(6, "ERROR: No credential id is left.");
+        return kFailure;
+    }
     const std::int32_t accessType = input.accessType == 0 ? CRED_ACCESS_ALL_USER : input.accessType;
     auto record = makeRecord(nextId, creator, input.type, accessType);
     if (!record) return kOutOfMemory;

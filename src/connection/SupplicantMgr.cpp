@@ -35,11 +35,13 @@ ResultCode SupplicantMgr::init() {
     {
         const LockGuard lock(g_hs20Lock);
         bool isChanged = false;
-        if (m_config.initPaths() != kSuccess || m_config.readConfig(&isChanged) != kSuccess) return kFailure;
+        if (m_config.initPaths() != kSuccess) return kFailure;
+        const auto file = m_config.lockFile();
+        if (m_config.readConfig(&isChanged) != kSuccess) return kFailure;
         if (m_config.isDumpEnabled())
             DiagnosticLog::instance().start(narrowFromWide(m_config.dumpFilePath()));
         if (isChanged) {
-            if (m_config.saveConfig() != kSuccess)
+            if (m_config.saveConfig(file) != kSuccess)
                 Log(6, "ERROR: Reading config detected config changes, but saving config failed.");
             else
                 Log(3, "Reading config detected config changes, and saving config succeeded.");
@@ -64,9 +66,10 @@ void SupplicantMgr::deinit() {
 ResultCode SupplicantMgr::reloadData() {
     const LockGuard lock(g_hs20Lock);
     bool isChanged = false;
+    const auto file = m_config.lockFile();
     if (m_config.readConfig(&isChanged) != kSuccess) return kFailure;
     if (isChanged) {
-        if (m_config.saveConfig() != kSuccess) {
+        if (m_config.saveConfig(file) != kSuccess) {
             Log(6, "ERROR: Reading config detected config changes, but saving config failed.");
             return kFailure;
         }

@@ -8,9 +8,18 @@
 
 namespace vexa {
 
+namespace {
+
+// 0: the client leaves it to the store.
+bool isKnownAccess(std::int32_t accessType) {
+    return accessType == 0 || accessType == CRED_ACCESS_ALL_USER || accessType == CRED_ACCESS_PER_USER;
+}
+
+}  // namespace
+
 bool addCredential(SAHotSpotPortlink& server, const Json::Value& data) {
     const auto input = readCredentialInput(data);
-    if (!input) return false;
+    if (!input || !isKnownAccess(input->accessType)) return false;
     const auto supplicant = hotspotSupplicant(server);
     if (supplicant) supplicant->addCredential(*input);
     return true;

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <chrono>
 #include <memory>
 #include <optional>
 #include <string>
@@ -44,9 +45,9 @@ public:
     /// Until this is done, a loss of power can take what was written.
     bool flush();
 
-    /// Gives it another name in its folder, at once: there is no moment without a file of that name if there
-    /// was one before. A process that has the existing file open, a virus scanner or a backup, is waited for
-    /// a fraction of a second, by the wall clock.
+    /// Gives it another name in its folder, at once and for good: there is no moment without a file of that
+    /// name if there was one before. A process that has the existing file open, a virus scanner or a backup,
+    /// is waited for a fraction of a second, by the wall clock.
     bool rename(const std::wstring& to, Existing existing);
 
     void remove();
@@ -54,6 +55,23 @@ public:
 private:
     struct State;
     explicit NewFile(std::unique_ptr<State> state);
+    std::unique_ptr<State> m_state;
+};
+
+/// A folder held against all others, threads of this process and other processes, that hold it in this way.
+/// Ends with its holder, who must not hold it twice.
+class FolderLock {
+public:
+    /// Waits for a holder to let go, by the wall clock. Nothing: not within the limit, or no such folder.
+    static std::optional<FolderLock> take(const std::wstring& folder, std::chrono::milliseconds limit);
+
+    ~FolderLock();
+    FolderLock(FolderLock&&) noexcept;
+    FolderLock& operator=(FolderLock&&) noexcept;
+
+private:
+    struct State;
+    explicit FolderLock(std::unique_ptr<State> state);
     std::unique_ptr<State> m_state;
 };
 

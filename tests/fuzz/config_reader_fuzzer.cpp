@@ -27,8 +27,8 @@ std::string contentOf(Config& config) REQUIRES(g_hs20Lock) {
     return text;
 }
 
-// Two credentials of one id share one entry of the user's list, and places at the end of the range can't be
-// kept apart from having none.
+// At the end of the range an id that is there twice can't be repaired, and a place can't be told from having
+// none.
 bool isRegular(Config& config) REQUIRES(g_hs20Lock) {
     const auto all = config.credentials().copyCredentialPointers();
     std::set<std::int32_t> ids;
@@ -43,11 +43,11 @@ void readAndSave(FuzzMachine& machine, std::string_view file) {
     Config config;
     require(config.initPaths() == kSuccess, "the paths are there");
     if (config.readConfig(nullptr) != kSuccess) {
-        require(config.saveConfig() != kSuccess, "what isn't read isn't saved");
+        require(config.saveConfig(config.lockFile()) != kSuccess, "what isn't read isn't saved");
         require(machine.read("config.xml") == file, "what isn't read is left alone");
         return;
     }
-    const bool isSaved = config.saveConfig() == kSuccess;
+    const bool isSaved = config.saveConfig(config.lockFile()) == kSuccess;
     Config again;
     bool isChanged = false;
     require(again.initPaths() == kSuccess && again.readConfig(&isChanged) == kSuccess,

@@ -1,11 +1,12 @@
-"""The file of the credentials: two users of one machine share it, one after the other; and what a killed service
-leaves: everything that a client was told is there, and a file that anybody can read."""
+"""The file of the credentials: two users of one machine share it, one after the other and both at once; and what a
+killed service leaves: everything that a client was told is there, and a file that anybody can read."""
 
 import os
 import random
 import re
 import signal
 import stat
+import threading
 import time
 import xml.etree.ElementTree
 
@@ -21,6 +22,8 @@ ALICE, BOB = "PC\\alice", "PC\\bob"
 PRIVATE, PUBLIC = 2, 1
 SEED = 20
 ROUNDS = 12
+STEPS = 100
+KILLED = 0.03  # of the steps
 
 
 def realms(credentials):
@@ -151,3 +154,86 @@ class Crash(StoreStory):
             self.add(client)
             self.assertEqual(self.strays(), [], "a save leaves no temporary of the dead")
         self.check_file()
+
+
+class Neighbour(threading.Thread):
+    """A user whose service runs beside another's on the same file. What he was told has to stay: what he adds is his to
+    delete, and where he moves a credential it stands."""
+
+    def __init__(self, user, folder, seed, steps):
+        super().__init__()
+        self.user, self.folder, self.random, self.steps = user, folder, random.Random(seed), steps
+        self.own, self.unsure, self.sent, self.told, self.problem = set(), set(), 0, [], None
+        self.machine = None
+
+    def run(self):
+        try:
+            self.begin()
+            while self.steps > 0:
+                self.steps -= 1
+                self.step()
+            self.hear(self.client.credentials())
+        except Exception as problem:
+            self.problem = problem
+        finally:
+            self.machine.__exit__(type(self.problem) if self.problem else None)
+
+    def begin(self):
+        self.machine = Machine({"user": self.user}, folder=self.folder, control=False).__enter__()
+        self.client, self.pid = self.machine.hs20(), self.machine.service_pid()
+        self.hear(self.client.credentials())
+
+    def hear(self, told):
+        names = realms(told)
+        self.unsure -= self.own
+        missing, doubled = self.own - set(names), len(names) - len(set(names))
+        if missing or doubled or len({entry["Id"] for entry in told}) < len(told):
+            raise AssertionError(f"{self.user}: {missing} is missing, {doubled} doubled in {names}")
+        self.told = told
+
+    def step(self):
+        kind, kills = self.random.random(), self.random.random() < KILLED
+        mine = [entry for entry in self.told if entry["RealName"] in self.own]
+        if kind < 0.4 or not mine:
+            self.sent += 1
+            realm = f"{self.user[3:]}{self.sent}"
+            change = ("ADD_CREDENTIAL", credential(realm, self.random.choice((PRIVATE, PUBLIC)))), {realm}
+        elif kind < 0.7:
+            place, moved = self.random.randrange(len(self.told)), self.random.choice(self.told)
+            change = ("SET_POSITION_CREDENTIAL", {"Id": moved["Id"], "Order": place}), set()
+        else:
+            gone = self.random.choice(mine)
+            change = ("DELETE_CREDENTIAL", {"Id": gone["Id"]}), {gone["RealName"]}
+        command, touched = change
+        self.own -= touched
+        if kills:
+            self.unsure |= touched
+            self.client.send(*command)
+            time.sleep(self.random.uniform(0, 0.01))  # where in a save the kill falls is the point of the test
+            os.kill(self.pid, signal.SIGKILL)
+            self.machine.parent.wait()
+            self.machine.__exit__(None)
+            return self.begin()
+        told = self.client.credentials(*command)
+        if command[0] == "ADD_CREDENTIAL":
+            self.own |= touched
+        elif touched & set(realms(told)):
+            raise AssertionError(f"{touched} is back")
+        self.hear(told)
+
+
+class Neighbours(StoreStory):
+    def test_nothing_that_either_was_told_is_lost(self):
+        other = self.new_folder()
+        (self.folder / "Public").mkdir()
+        (other / "Public").symlink_to(self.folder / "Public")
+        both = [Neighbour(ALICE, self.folder, SEED, STEPS), Neighbour(BOB, other, SEED + 1, STEPS)]
+        for neighbour in both:
+            neighbour.start()
+        for neighbour in both:
+            neighbour.join()
+        self.assertEqual([neighbour.problem for neighbour in both], [None, None])
+        stored, ids = ([node.findtext(name) for node in self.stored()] for name in ("realm", "id"))
+        self.assertEqual((len(set(stored)), len(set(ids))), (len(stored), len(ids)))
+        own, unsure = (set().union(*(getattr(one, name) for one in both)) for name in ("own", "unsure"))
+        self.assertEqual((own - set(stored), set(stored) - own - unsure), (set(), set()))

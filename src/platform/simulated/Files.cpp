@@ -9,6 +9,7 @@
 #include <cerrno>
 #include <cstdio>
 #include <filesystem>
+#include <thread>
 #include <utility>
 
 #include "platform/posix/Descriptor.h"
@@ -27,6 +28,7 @@ constexpr mode_t kOwnerOnlyFile = 0600;
 constexpr mode_t kOwnerOnlyFolder = 0700;
 constexpr std::uint32_t kErrorSharingViolation = 32;
 constexpr int kRenameTries = 5;
+constexpr std::chrono::milliseconds kLockPause{1};
 
 Descriptor openFile(const fs::path& path, int flags) {
     if (fileFault("open", path)) return Descriptor();
@@ -46,6 +48,12 @@ bool isRenameRefused(const fs::path& target) {
         if (*error != kErrorSharingViolation) return true;
     }
     return true;
+}
+
+// Which file a name stands for is part of its folder.
+void flushFolderOf(const fs::path& file) {
+    const Descriptor folder(::open(file.parent_path().c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
+    if (folder) ::fsync(folder.get());
 }
 
 }  // namespace
@@ -114,9 +122,12 @@ bool NewFile::rename(const std::wstring& to, Existing existing) {
     const fs::path target = hostPath(to);
     if (isRenameRefused(target)) return false;
     const fs::path& source = m_state->path;
-    if (existing == Existing::Replace) return ::rename(source.c_str(), target.c_str()) == 0;
-    if (::link(source.c_str(), target.c_str()) != 0) return false;
-    remove();
+    const bool isReplacing = existing == Existing::Replace;
+    if ((isReplacing ? ::rename(source.c_str(), target.c_str()) : ::link(source.c_str(), target.c_str())) !=
+        0)
+        return false;
+    if (!isReplacing) remove();
+    flushFolderOf(target);
     return true;
 }
 
@@ -130,6 +141,27 @@ void NewFile::removeIfAbandoned(const std::wstring& path) {
     const Descriptor file(::open(host.c_str(), O_RDONLY | O_CLOEXEC));
     if (file && ::flock(file.get(), LOCK_EX | LOCK_NB) == 0) ::unlink(host.c_str());
 }
+
+struct FolderLock::State {
+    Descriptor folder;
+};
+
+// Shown to every process that has the folder, by whatever path. The kernel lets go with the last descriptor.
+std::optional<FolderLock> FolderLock::take(const std::wstring& folder, std::chrono::milliseconds limit) {
+    Descriptor file(::open(hostPath(folder).c_str(), O_RDONLY | O_DIRECTORY | O_CLOEXEC));
+    const auto end = std::chrono::steady_clock::now() + limit;
+    while (file && ::flock(file.get(), LOCK_EX | LOCK_NB) != 0) {
+        if (std::chrono::steady_clock::now() >= end) return std::nullopt;
+        std::this_thread::sleep_for(kLockPause);
+    }
+    if (!file) return std::nullopt;
+    return FolderLock(std::make_unique<State>(State{std::move(file)}));
+}
+
+FolderLock::FolderLock(std::unique_ptr<State> state) : m_state(std::move(state)) {}
+FolderLock::~FolderLock() = default;
+FolderLock::FolderLock(FolderLock&&) noexcept = default;
+FolderLock& FolderLock::operator=(FolderLock&&) noexcept = default;
 
 std::optional<std::size_t> appendToFile(const std::string& narrowPath, std::string_view text) {
     const fs::path path = hostPath(narrowPath);

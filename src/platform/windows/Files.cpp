@@ -18,6 +18,7 @@ namespace {
 
 constexpr int kRenameTries = 5;
 constexpr DWORD kRenamePauseMs = 50;
+constexpr DWORD kLockPauseMs = 2;
 
 constexpr DWORD kShareAll = FILE_SHARE_READ | FILE_SHARE_WRITE | FILE_SHARE_DELETE;
 
@@ -135,6 +136,28 @@ void NewFile::remove() {
 void NewFile::removeIfAbandoned(const std::wstring& path) {
     open(path, DELETE, 0, OPEN_EXISTING, FILE_FLAG_DELETE_ON_CLOSE);
 }
+
+struct FolderLock::State {
+    Handle file;
+};
+
+// A file that one handle at a time can have open, and that goes with it. It takes its rights from the folder,
+// so it shuts out users of other sessions, too, which a named mutex would not without rights of its own.
+std::optional<FolderLock> FolderLock::take(const std::wstring& folder, std::chrono::milliseconds limit) {
+    const auto end = std::chrono::steady_clock::now() + limit;
+    for (;;) {
+        Handle file =
+            open(folder + L"\\lock", GENERIC_WRITE | DELETE, 0, OPEN_ALWAYS, FILE_FLAG_DELETE_ON_CLOSE);
+        if (file) return FolderLock(std::make_unique<State>(State{std::move(file)}));
+        if (!meansInUse(GetLastError()) || std::chrono::steady_clock::now() >= end) return std::nullopt;
+        Sleep(kLockPauseMs);
+    }
+}
+
+FolderLock::FolderLock(std::unique_ptr<State> state) : m_state(std::move(state)) {}
+FolderLock::~FolderLock() = default;
+FolderLock::FolderLock(FolderLock&&) noexcept = default;
+FolderLock& FolderLock::operator=(FolderLock&&) noexcept = default;
 
 // By the C runtime, which ends the lines of a text file as this system's editors want it.
 std::optional<std::size_t> appendToFile(const std::string& narrowPath, std::string_view text) {

@@ -49,14 +49,21 @@ void StoreMachine::fail(const std::string& call, int skip, int times, int error)
                   ",'skip':" + std::to_string(skip) + ",'times':" + std::to_string(times) + "}");
 }
 
-void StoreMachine::add(const std::wstring& realm) {
-    CredentialInput input;
-    input.type = CRED_TYPE_EAP_TTLS;
-    input.realm = realm;
-    std::int32_t id = 0;
-    EXPECT_EQ(m_config.credentials().addCredential(input, m_config.nextCredId(), m_config.userName(), id),
-              kSuccess);
-    m_config.advanceNextCredId();
+ResultCode StoreMachine::change(const std::function<void(CredentialTable&)>& change) {
+    const auto held = m_config.beginChange();
+    change(m_config.credentials());
+    return m_config.saveConfig(held);
+}
+
+ResultCode StoreMachine::add(const std::wstring& realm) {
+    return change([&](CredentialTable& table) {
+        CredentialInput input;
+        input.type = CRED_TYPE_EAP_TTLS;
+        input.realm = realm;
+        std::int32_t id = 0;
+        EXPECT_EQ(table.addCredential(input, m_config.nextCredId(), m_config.userName(), id), kSuccess);
+        m_config.advanceNextCredId();
+    });
 }
 
 ResultCode open(Config& config, bool* isChanged) {

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <filesystem>
+#include <functional>
 #include <string>
 #include <string_view>
 
@@ -34,8 +35,13 @@ public:
     /// Writes the file, and reads it as a service that starts. What failed, or 0.
     ResultCode openWith(std::string_view content, bool* isChanged = nullptr);
 
+    /// Changes the table in one critical section with what the file says before and the save behind it.
+    ResultCode change(const std::function<void(CredentialTable&)>& change);
+
     /// Stores a credential for this realm.
-    void add(const std::wstring& realm);
+    ResultCode add(const std::wstring& realm);
+
+    ResultCode save() { return m_config.saveConfig(m_config.lockFile()); }
 
 private:
     simulation::TestMachine m_machine;

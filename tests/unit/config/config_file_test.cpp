@@ -20,11 +20,11 @@ TEST(ConfigFile, IsMadeWhereThereIsNoneAndKeepsItsOtherSections) {
     EXPECT_FALSE(config.isDumpEnabled());
     EXPECT_EQ(config.nextCredId(), 1);
     const std::string made = store.file();
-    ASSERT_EQ(config.saveConfig(), kSuccess);
+    ASSERT_EQ(store.save(), kSuccess);
     const std::string once = store.file();
     EXPECT_EQ(once.substr(0, once.find("<users>")), made.substr(0, made.find("<users>")));
     ASSERT_EQ(config.readConfig(nullptr), kSuccess);
-    ASSERT_EQ(config.saveConfig(), kSuccess);
+    ASSERT_EQ(store.save(), kSuccess);
     EXPECT_EQ(store.file(), once);
 }
 
@@ -135,11 +135,8 @@ TEST(ConfigFile, TheSwitchComesFromTheRegistry) {
 TEST(ConfigFile, WhatDoesNotParseIsLeftAlone) {
     for (const char* content : {"", "garbage", "<configurations>"}) {
         StoreMachine store;
-        Config& config = store.config();
         EXPECT_EQ(store.openWith(content), kFailure) << content;
-        EXPECT_EQ(config.saveConfig(), kFailure) << content;
-        EXPECT_EQ(config.saveCredentials(), kFailure) << content;
-        EXPECT_EQ(config.saveUsers(), kFailure) << content;
+        EXPECT_EQ(store.save(), kFailure) << content;
         EXPECT_EQ(store.file(), content);
         EXPECT_EQ(store.listing(), "Dump config.xml");
     }
@@ -151,9 +148,7 @@ TEST(ConfigFile, ThatHasGoneIsNotFound) {
     ASSERT_EQ(open(config), kSuccess);
     std::filesystem::remove(store.folder() / "config.xml");
     EXPECT_EQ(config.readConfig(nullptr), kNotFound);
-    EXPECT_EQ(config.saveNextCredId(), kNotFound);
-    EXPECT_EQ(config.saveCredentials(), kNotFound);
-    EXPECT_EQ(config.saveUsers(), kFailure);
+    EXPECT_EQ(store.add(L"a"), kFailure);
     EXPECT_EQ(store.listing(), "Dump");
 }
 
@@ -163,7 +158,7 @@ TEST(ConfigFile, GetsALostNextIdBackWithTheNextSave) {
         ASSERT_EQ(store.openWith(content), kSuccess);
         EXPECT_EQ(store.file(), content);
         store.config().advanceNextCredId();
-        EXPECT_EQ(store.config().saveConfig(), kSuccess);
+        EXPECT_EQ(store.save(), kSuccess);
         EXPECT_NE(store.file().find("<nextcredid>2</nextcredid></global>"), std::string::npos)
             << store.file();
     }

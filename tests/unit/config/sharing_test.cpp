@@ -1,6 +1,11 @@
 #include <gtest/gtest.h>
 
+#include <functional>
+#include <regex>
+#include <vector>
+
 #include "unit/config/StoreMachine.h"
+#include "unit/hotspot/LogCapture.h"
 
 namespace vexa::test {
 namespace {
@@ -100,43 +105,271 @@ TEST(Sharing, WhatASaveKeepsAndWhatItTakesAway) {
     for (const Case& c : cases) {
         StoreMachine store;
         ASSERT_EQ(store.openWith(document(c.before, "")), kSuccess) << c.story;
-        ASSERT_EQ(store.config().saveCredentials(), kSuccess) << c.story;
-        EXPECT_EQ(store.file(), saved(c.after, "")) << c.story;
+        ASSERT_EQ(store.save(), kSuccess) << c.story;
+        const std::string list = user("PC\\alice", places(store.config().credentials()));
+        EXPECT_EQ(store.file(), saved(c.after, list)) << c.story;
     }
 }
 
 TEST(Sharing, ASaveRewritesTheUsersOwnListAlone) {
     StoreMachine store;
-    const std::string credentials = ttls(1, "a") + ttls(3, "c");
+    const std::string credentials = ttls(3, "c") + ttls(1, "a");
     const std::string bob = user("PC\\bob", "9:1 1:2");
     const std::string alice = user("PC\\alice", "3:1 1:2");
     const std::string users = alice + bob + user("PC\\alice", "7:1") + "<!-- n --><user><x/></user>";
     ASSERT_EQ(store.openWith(document(credentials, users)), kSuccess);
-    ASSERT_EQ(store.config().saveUsers(), kSuccess);
+    ASSERT_EQ(store.save(), kSuccess);
     EXPECT_EQ(store.file(), saved(credentials, bob + "<!-- n --><user><x></x></user>" + alice));
 }
 
 TEST(Sharing, AFileThatLacksASectionIsOnlySavedWhereNothingIsLost) {
     StoreMachine store;
     ASSERT_EQ(store.openWith("<c><global/><users/></c>"), kSuccess);
-    EXPECT_EQ(store.config().saveCredentials(), kSuccess);
-    store.add(L"r");
-    EXPECT_EQ(store.config().saveCredentials(), kFailure);
+    EXPECT_EQ(store.save(), kSuccess);
+    EXPECT_EQ(store.add(L"r"), kFailure);
+    EXPECT_EQ(store.file().find("<credentials>"), store.file().rfind("<credentials>")) << "in the list alone";
     store.write("config.xml", "<c><global/><credentials/></c>");
-    EXPECT_EQ(store.config().saveUsers(), kFailure);
-    EXPECT_EQ(store.file(), "<c><global/><credentials/></c>");
+    EXPECT_EQ(store.save(), kFailure);
+    EXPECT_EQ(store.file().find("<users>"), std::string::npos);
 }
 
-TEST(Sharing, AnEditByHandSurvivesInWhatASaveDoesNotRewrite) {
-    const auto global = [](const std::string& nextId) {
-        return "<homerealm>by hand</homerealm><nextcredid>" + nextId + "</nextcredid><x>y</x>";
+using Deed = std::function<void(StoreMachine&)>;
+
+Deed byHand(const std::string& credentials, const std::string& users, int next) {
+    const std::string global =
+        "<homerealm>h</homerealm><nextcredid>" + std::to_string(next) + "</nextcredid>";
+    return [=](StoreMachine& store) { store.write("config.xml", document(credentials, users, global)); };
+}
+
+Deed adding(const std::wstring& realm) {
+    return [=](StoreMachine& store) { store.add(realm); };
+}
+
+Deed editing(int id, const std::wstring& realm) {
+    return [=](StoreMachine& store) {
+        store.change([&](CredentialTable& table) {
+            if (Credential* const edited = table.findCredentialById(id)) edited->m_realm = realm;
+        });
     };
-    const std::string bob = user("PC\\bob", "1:1");
+}
+
+Deed deleting(int id) {
+    return [=](StoreMachine& store) {
+        store.change([&](CredentialTable& table) { table.deleteCredential(id); });
+    };
+}
+
+Deed moving(int id, int place) {
+    return [=](StoreMachine& store) {
+        store.change([&](CredentialTable& table) { table.setCredentialPosition(id, place); });
+    };
+}
+
+/// What the deed changes can't be saved.
+Deed inVain(const Deed& deed) {
+    return [=](StoreMachine& store) {
+        store.fail("rename");
+        deed(store);
+    };
+}
+
+const Deed kRemoving = [](StoreMachine& store) { std::filesystem::remove(store.folder() / "config.xml"); };
+const Deed kBreaking = [](StoreMachine& store) { store.write("config.xml", "<half"); };
+const Deed kReading = [](StoreMachine& store) { EXPECT_EQ(store.config().readConfig(nullptr), kSuccess); };
+
+/// The credentials of a file: "3:c 1:a", by id and realm.
+std::string entries(const std::string& file) {
+    std::string text;
+    const std::regex entry("<id>(\\d+)</id><type>.*?<realm>(.*?)</realm>");
+    for (std::sregex_iterator at(file.begin(), file.end(), entry), end; at != end; ++at)
+        text += (text.empty() ? "" : " ") + (*at)[1].str() + ":" + (*at)[2].str();
+    return text;
+}
+
+// PC\alice's service has two credentials, 1:a and 2:b, when others change the file: another user's service,
+// or somebody by hand. Each of her own changes reads it anew.
+TEST(Sharing, WhatOthersChangedIsTakenOverAndWhatCouldNotBeSavedStays) {
+    const std::string one = ttls(1, "a");
+    const std::string both = one + ttls(2, "b");
+    const std::string list = user("PC\\alice", "1:1 2:2");
+    const auto bobs = [](int id) { return ttls(id, "x", "PC\\bob", "peruser"); };
+    struct Case {
+        const char* story;
+        std::vector<Deed> deeds;
+        const char* file;
+        const char* places;
+        int nextId = 4;
+    };
+    const Case cases[] = {
+        {"nobody else", {adding(L"c")}, "3:c 1:a 2:b", "3:1 1:2 2:3"},
+        {"another's private one",
+         {byHand(bobs(3) + both, list, 4), adding(L"c")},
+         "3:x 4:c 1:a 2:b",
+         "4:1 1:2 2:3",
+         5},
+        {"another's private one has the same id",
+         {byHand(bobs(2) + both, list, 3), adding(L"c")},
+         "2:x 4:c 3:b 1:a",
+         "4:1 3:2 1:3",
+         5},
+        {"and is behind",
+         {byHand(both + bobs(2), list, 3), kReading, adding(L"c")},
+         "2:x 4:c 3:b 1:a",
+         "4:1 3:2 1:3",
+         5},
+        {"an id twice",
+         {byHand(both + ttls(2, "y"), list, 3), adding(L"c")},
+         "4:c 3:y 1:a 2:b",
+         "4:1 3:2 1:3 2:4",
+         5},
+        {"an id twice at a read",
+         {byHand(both + ttls(2, "y"), list, 3), kReading, adding(L"c")},
+         "4:c 3:y 1:a 2:b",
+         "4:1 3:2 1:3 2:4",
+         5},
+        {"the next id went back",
+         {byHand(bobs(7) + both, list, 1), adding(L"c")},
+         "7:x 8:c 1:a 2:b",
+         "8:1 1:2 2:3",
+         9},
+        {"or back behind what was given out",
+         {adding(L"c"), deleting(3), byHand(both, list, 1), kReading, adding(L"d")},
+         "4:d 1:a 2:b",
+         "4:1 1:2 2:3",
+         5},
+        {"one for all was added",
+         {byHand(both + ttls(3, "y"), list, 4), moving(1, 3)},
+         "3:y 2:b 1:a",
+         "3:1 2:2 1:3"},
+        {"one was deleted", {byHand(ttls(2, "b"), list, 3), moving(2, 1)}, "2:b", "2:1", 3},
+        {"one was edited", {byHand(one + ttls(2, "y"), list, 3), moving(2, 1)}, "2:y 1:a", "2:1 1:2", 3},
+        {"the order was changed",
+         {byHand(both, user("PC\\alice", "2:1 1:2"), 3), adding(L"c")},
+         "3:c 2:b 1:a",
+         "3:1 2:2 1:3"},
+        {"unsaved: an addition",
+         {inVain(adding(L"c")), adding(L"d")},
+         "4:d 3:c 1:a 2:b",
+         "4:1 3:2 1:3 2:4",
+         5},
+        {"unsaved: an addition, and its id given to another",
+         {inVain(adding(L"c")), byHand(both + ttls(3, "y"), list, 4), moving(1, 1)},
+         "1:a 3:y 4:c 2:b",
+         "1:1 3:2 4:3 2:4",
+         5},
+        {"unsaved: an addition, and its id given to a private one",
+         {inVain(adding(L"c")), byHand(bobs(3) + both, list, 4), moving(2, 1)},
+         "3:x 2:b 4:c 1:a",
+         "2:1 4:2 1:3",
+         5},
+        {"unsaved: an edit",
+         {inVain(editing(2, L"z")), byHand(both, list, 3), moving(2, 1)},
+         "2:z 1:a",
+         "2:1 1:2",
+         3},
+        {"unsaved: an edit of what was edited",
+         {inVain(editing(2, L"z")), byHand(one + ttls(2, "y"), list, 3), moving(2, 1)},
+         "2:z 1:a",
+         "2:1 1:2",
+         3},
+        {"unsaved: an edit of what was deleted",
+         {inVain(editing(2, L"z")), byHand(one, list, 3), moving(2, 1)},
+         "2:z 1:a",
+         "2:1 1:2",
+         3},
+        {"unsaved: a deletion",
+         {inVain(deleting(2)), byHand(one + ttls(2, "y"), list, 3), adding(L"c")},
+         "3:c 1:a",
+         "3:1 1:2"},
+        {"unsaved: one thing, and another was deleted",
+         {inVain(adding(L"c")), byHand(one, list, 3), moving(1, 1)},
+         "1:a 3:c",
+         "1:1 3:2"},
+        {"unsaved: a move",
+         {inVain(moving(2, 1)), byHand(both, user("PC\\alice", "1:5 2:6"), 3), adding(L"c")},
+         "3:c 2:b 1:a",
+         "3:1 2:2 1:3"},
+        {"unsaved, and read anew by command",
+         {inVain(adding(L"c")), kReading, adding(L"d")},
+         "4:d 1:a 2:b",
+         "4:1 1:2 2:3",
+         5},
+        {"the file was broken for a while",
+         {kBreaking, adding(L"c"), byHand(both, list, 3), adding(L"d")},
+         "4:d 3:c 1:a 2:b",
+         "4:1 3:2 1:3 2:4",
+         5},
+        {"the file was removed, and made by another",
+         {kRemoving, adding(L"c"), byHand("", "", 1), adding(L"d")},
+         "4:d 3:c 1:a 2:b",
+         "4:1 3:2 1:3 2:4",
+         5},
+        {"the file was removed, and an old one brought back",
+         {kRemoving, deleting(2), byHand(ttls(1, "a") + bobs(2), list, 3), adding(L"c")},
+         "2:x 3:c 1:a",
+         "3:1 1:2"},
+    };
+    for (const Case& c : cases) {
+        StoreMachine store;
+        ASSERT_EQ(store.openWith(document(both, list, "<nextcredid>3</nextcredid>")), kSuccess);
+        for (const Deed& deed : c.deeds)
+            deed(store);
+        EXPECT_EQ(entries(store.file()), c.file) << c.story;
+        EXPECT_EQ(places(store.config().credentials()), c.places) << c.story;
+        EXPECT_EQ(store.config().nextCredId(), c.nextId) << c.story;
+        const std::string next = "<nextcredid>" + std::to_string(c.nextId) + "</nextcredid>";
+        EXPECT_NE(store.file().find(next), std::string::npos) << c.story;
+        bool isChanged = true;
+        const std::string settled = store.file();
+        Config reader;
+        ASSERT_EQ(open(reader, &isChanged), kSuccess);
+        EXPECT_FALSE(isChanged) << c.story << settled;
+    }
+}
+
+// The lock's holder hangs in the middle of his save.
+TEST(Sharing, WithoutTheLockNothingIsWrittenAndNothingIsLost) {
     StoreMachine store;
-    ASSERT_EQ(store.openWith(document(ttls(1, "a"), "")), kSuccess);
-    store.write("config.xml", document(ttls(1, "by hand") + ttls(4, "new"), bob, global("77")));
-    ASSERT_EQ(store.config().saveConfig(), kSuccess);
-    EXPECT_EQ(store.file(), saved(ttls(1, "a"), bob + user("PC\\alice", "1:1"), global("10")));
+    const std::string before = document(ttls(1, "a"), "");
+    ASSERT_EQ(store.openWith(before), kSuccess);
+    auto other = store.config().lockFile();
+    EXPECT_EQ(store.add(L"b"), kFailure);
+    EXPECT_EQ(store.file(), before);
+    other.reset();
+    EXPECT_EQ(store.add(L"c"), kSuccess);
+    EXPECT_EQ(entries(store.file()), "11:c 10:b 1:a");
+}
+
+// Reading anew before a change is told of by no line.
+TEST(Sharing, TheLogTellsEachStepOfAReadingAndOfASave) {
+    StoreMachine store;
+    LogCapture log;
+    const std::string credentials = ttls(0, "z") + kBobs + ttls(2, "c") + ttls(1, "a");
+    const std::string users = user("PC\\bob", "2:1") + user("PC\\alice", "1:1 9:2");
+    ASSERT_EQ(store.openWith(document(credentials, users, "<enabledump>true</enabledump>")), kSuccess);
+    EXPECT_EQ(
+        log.text(),
+        "Reading all credentials...\nRetrieved total 4 credentials:\n"
+        "\tReading credential with index=1...\nInvalid credential id=0\n"
+        "\tReading credential with index=2...\n\tReading credential with index=3...\n"
+        "\tReading credential with index=4...\n"
+        "ERROR: Found duplicate credential id=2, new id=3\n"
+        "Reading all user info...\nRetrieved total 2 user info\n"
+        "\tReading user info with index=1...\n\tReading user info with index=2...\n"
+        "\t\tcredential count=2\n\t\t\tid=1, priority=1\n"
+        "All-user credential deleted by others,we should delete this credential for current user, cred id=9\n"
+        "\tDumping all credentials...\nCredential: id=3, name=c, priority=1\n"
+        "Credential: id=1, name=a, priority=2\n");
+    EXPECT_EQ(store.add(L"b"), kSuccess);
+    EXPECT_EQ(log.text(),
+              "ERROR: No nextcredid node in the config xml file.\nInvalid credential id=0\n"
+              "Saving credentials to xml file...\n");
+    EXPECT_EQ(entries(store.file()), "0:z 2:b 4:b 3:c 1:a");
+    store.fail("rename");
+    store.add(L"d");
+    EXPECT_EQ(log.text(),
+              "Invalid credential id=0\nSaving credentials to xml file...\n"
+              "ERROR: Saving the configuration file failed.\n");
 }
 
 // The highest id counts whoever's it is, so that none is given out twice.

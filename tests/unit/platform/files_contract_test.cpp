@@ -1,6 +1,7 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <thread>
 
 #include "platform/Files.h"
 #include "text/TextConversion.h"
@@ -82,6 +83,21 @@ TEST_F(Files, AFileIsAbandonedWhenNobodyHoldsIt) {
     { const NewFile last = std::move(moved); }
     NewFile::removeIfAbandoned(path(L"held"));
     EXPECT_FALSE(canOpenFile(path(L"held")));
+}
+
+TEST_F(Files, AFolderHasOneHolderAtATimeAndIsWaitedFor) {
+    const auto take = [&](int limit) {
+        return FolderLock::take(world.folder(), std::chrono::milliseconds(limit));
+    };
+    auto held = take(0);
+    ASSERT_TRUE(held);
+    EXPECT_FALSE(take(5));
+    std::thread waiter([&] { EXPECT_TRUE(take(60000)); });
+    held.reset();
+    waiter.join();
+    EXPECT_TRUE(take(0));
+    EXPECT_TRUE(filesIn(world.folder()).empty());
+    EXPECT_FALSE(FolderLock::take(path(L"no folder"), std::chrono::milliseconds(0)));
 }
 
 TEST_F(Files, AFolderListsItsFilesAndOneThatExistsIsAsGoodAsANewOne) {

@@ -1,0 +1,143 @@
+#include <algorithm>
+#include <memory>
+
+#include "base/DiagnosticLog.h"
+#include "config/Config.h"
+#include "contract/Store.h"
+#include "text/ScopeGuard.h"
+#include "text/TextConversion.h"
+
+namespace vexa {
+
+namespace {
+
+constexpr std::chrono::milliseconds kLockPatience{2000};
+
+// But for the place, which is not of the credential but of the user's list.
+bool holdTheSame(Credential a, const Credential& b) {
+    a.m_priority = b.m_priority;
+    return a == b;
+}
+
+Credential* find(const std::unordered_map<std::int32_t, Credential*>& byId, std::int32_t id) {
+    const auto found = byId.find(id);
+    return found == byId.end() ? nullptr : found->second;
+}
+
+}  // namespace
+
+// A holder that hangs must not hang the others with it.
+Config::FileLock Config::lockFile() const {
+    return platform::FolderLock::take(m_baseDir, kLockPatience);
+}
+
+Config::FileLock Config::beginChange() {
+    FileLock held = lockFile();
+    const ScopeGuard release([this]() NO_THREAD_SAFETY_ANALYSIS { m_xmlDoc.release(); });
+    CredentialTable table;
+    Reading stored{.table = table, .trace = Trace::No};
+    if (openDocument() != kSuccess)
+        forgetIfFileIsGone();
+    else if (readSilently(stored))
+        takeOver(stored);
+    return held;
+}
+
+// Nothing of what memory holds is in the file then, and a new one must not be taken for others' deletions.
+// One that merely can't be opened comes back as it was.
+void Config::forgetIfFileIsGone() {
+    const auto files = platform::filesIn(m_baseDir);
+    if (std::find(files.begin(), files.end(), wideFromNarrow(contract::kConfigFile)) == files.end())
+        m_known.clear();
+}
+
+// The credentials of the open document in the places that the user's list gives them; what it doesn't list
+// has none.
+bool Config::readSilently(Reading& reading) {
+    bool isChanged = false;
+    return readCredentials(reading, isChanged) == kSuccess && readUsers(reading, isChanged) == kSuccess;
+}
+
+// Memory and the open document hold the same now, each in its way.
+void Config::remember() {
+    CredentialTable stored;
+    Reading reading{.table = stored, .trace = Trace::No};
+    readSilently(reading);
+    m_known.clear();
+    const auto inMemory = m_credentials.credentialsById();
+    for (const Credential* theirs : stored.copyCredentialPointers())
+        if (const Credential* const mine = find(inMemory, theirs->m_id))
+            m_known.try_emplace(theirs->m_id, Known{*theirs, *mine});
+}
+
+// What the file holds otherwise than before is what others changed; what memory holds otherwise is what could
+// not be saved. That has no id of its own until it is in the file.
+void Config::takeOver(const Reading& stored) {
+    takeOverDeletions(stored.table);
+    for (Credential* mine : m_credentials.copyCredentialPointers())
+        if (stored.foreignIds.contains(mine->m_id)) giveNewId(*mine);
+    const auto inMemory = m_credentials.credentialsById();
+    std::unordered_map<std::int32_t, Known> known;
+    for (const Credential* theirs : stored.table.copyCredentialPointers()) {
+        const auto before = m_known.find(theirs->m_id);
+        Credential* const mine = find(inMemory, theirs->m_id);
+        Credential now = before == m_known.end() ? takeOverNew(*theirs, mine)
+                                                 : takeOverKnown(*theirs, before->second, mine);
+        known.try_emplace(theirs->m_id, Known{*theirs, std::move(now)});
+    }
+    takeOverPlaces(stored.table);
+    m_known = std::move(known);
+}
+
+void Config::takeOverDeletions(const CredentialTable& stored) {
+    const auto inFile = stored.credentialsById();
+    const auto inMemory = m_credentials.credentialsById();
+    for (const auto& [id, before] : m_known) {
+        const Credential* const mine = find(inMemory, id);
+        if (mine != nullptr && !inFile.contains(id) && holdTheSame(*mine, before.inMemory))
+            m_credentials.deleteCredential(id);
+    }
+}
+
+void Config::giveNewId(Credential& credential) {
+    if (m_nextCredId == followingId(m_nextCredId)) return;
+    Log(6, "ERROR: Found duplicate credential id=%d, new id=%d", credential.m_id, m_nextCredId);
+    credential.m_id = m_nextCredId;
+    advanceNextCredId();
+}
+
+// This and the next give what memory held when it last agreed with the file.
+Credential Config::takeOverKnown(const Credential& theirs, const Known& before, Credential* mine) {
+    if (mine == nullptr || !holdTheSame(*mine, before.inMemory)) return before.inMemory;
+    if (holdTheSame(theirs, before.inFile)) return *mine;
+    const std::int32_t place = mine->m_priority;
+    *mine = theirs;
+    mine->m_priority = place;
+    return theirs;
+}
+
+// One that could not be saved may have the id that another was given meanwhile.
+Credential Config::takeOverNew(const Credential& theirs, Credential* mine) {
+    if (mine != nullptr && mine->m_type == theirs.m_type && mine->m_realm == theirs.m_realm) return theirs;
+    if (mine != nullptr) giveNewId(*mine);
+    m_credentials.appendUnplaced(std::make_unique<Credential>(theirs));
+    return theirs;
+}
+
+// The list is the user's own; somebody may have changed it by hand, or he himself by another service.
+void Config::takeOverPlaces(const CredentialTable& stored) {
+    const auto all = stored.copyCredentialPointers();
+    const bool isChanged =
+        std::any_of(all.begin(), all.end(), [this](const Credential* theirs) NO_THREAD_SAFETY_ANALYSIS {
+            const auto before = m_known.find(theirs->m_id);
+            return before != m_known.end() && before->second.inFile.m_priority != theirs->m_priority;
+        });
+    if (isChanged && !m_bUnsaved) {
+        const auto inMemory = m_credentials.credentialsById();
+        for (const Credential* theirs : all)
+            if (Credential* const mine = find(inMemory, theirs->m_id)) mine->m_priority = theirs->m_priority;
+    }
+    m_credentials.placeUnplacedCredentials();
+}
+
+}  // namespace vexa
