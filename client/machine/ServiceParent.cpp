@@ -22,6 +22,8 @@ constexpr milliseconds kLongestCheck{100};
 constexpr seconds kStopLimit{30};
 constexpr seconds kGiveUpLimit{2};
 
+// Its ports or its configuration: it does not say which.
+constexpr int kServiceFailed = 1;
 constexpr int kScenarioRefused = 2;
 
 fs::path servicePath(const std::string& given) {
@@ -152,6 +154,12 @@ bool ServiceParent::portsListen() const {
     return true;
 }
 
+bool ServiceParent::portIsBusy() const {
+    const TcpPorts table = TcpPorts::read();
+    const auto wanted = wantedPorts(m_ports);
+    return std::any_of(wanted.begin(), wanted.end(), [&](std::uint16_t port) { return table.isBusy(port); });
+}
+
 bool ServiceParent::waitForExit(milliseconds limit) {
     const Deadline deadline = Deadline::in(limit);
     while (!m_process->exitCode()) {
@@ -181,6 +189,8 @@ void ServiceParent::reportEarlyEnd(int exitCode) const {
     std::cerr << "vexa: the service ended with exit code " << exitCode << " before it was ready: ";
     if (exitCode == 0) {
         std::cerr << "another one seems to run on the machine " << m_folder.path().string() << '\n';
+    } else if (exitCode == kServiceFailed && !portIsBusy()) {
+        std::cerr << "its configuration file " << m_folder.configFile().string() << " cannot be read\n";
     } else {
         std::cerr << "one of the ports " << portNames(m_ports) << " may be busy; its output is in "
                   << m_folder.outputFile().string() << '\n';

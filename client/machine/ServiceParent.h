@@ -69,6 +69,7 @@ private:
     void choosePorts(const StartRequest& request);
     void start(const StartRequest& request);
     bool portsListen() const;
+    bool portIsBusy() const;
     bool waitForExit(std::chrono::milliseconds limit);
     void letGo();
     [[noreturn]] void giveUp();

@@ -6,8 +6,6 @@
 #include <type_traits>
 #include <utility>
 
-#include "channel/IpcEntry.h"
-
 namespace vexa {
 
 namespace asio = boost::asio;
@@ -58,57 +56,55 @@ void IpcEntrance::accept() {
         m_isAccepting = false;
         if (!m_acceptor.is_open()) return;
         // Out of descriptors, most likely: try again when some client has gone.
-        ec ? pause(kAcceptPause) : receive(acceptMore(std::move(socket)));
+        if (ec) return pause(kAcceptPause);
+        receive(std::move(socket));
+        acceptMore();
     });
 }
 
 // As many as there are places, so that the system can be asked once for all of them.
-std::vector<tcp::socket> IpcEntrance::acceptMore(tcp::socket first) {
-    std::vector<tcp::socket> burst;
-    burst.push_back(std::move(first));
+void IpcEntrance::acceptMore() {
     const auto ours = std::count_if(m_outside.begin(), m_outside.end(),
                                     [](const auto& entry) { return !entry.second.connection->isEnding(); });
-    while (burst.size() + static_cast<std::size_t>(ours) < kMaxOutside) {
+    while (m_unjudged.size() + static_cast<std::size_t>(ours) < kMaxOutside) {
         error_code ec;
         tcp::socket socket = m_acceptor.accept(m_strand, ec);
         if (ec) break;
-        burst.push_back(std::move(socket));
+        receive(std::move(socket));
     }
-    return burst;
 }
 
-void IpcEntrance::receive(std::vector<tcp::socket> burst) {
-    const auto ours = areOfOurAccount(burst);
-    for (std::size_t i = 0; i < burst.size(); ++i) {
-        const Arrival arrival = add(std::move(burst[i]));
-        if (!ours[i]) {
-            turnAway(arrival);
-        } else if (makeRoom()) {
-            begin(arrival);
-        } else {
-            m_next = arrival;
-        }
-    }
-    m_next ? letNextIn() : accept();
-}
-
-IpcEntrance::Arrival IpcEntrance::add(tcp::socket socket) {
+void IpcEntrance::receive(tcp::socket socket) {
     const ClientId id = ++m_lastId;
     auto connection = std::make_shared<IpcConnection>(std::move(socket), [this, id] { ended(id); });
-    m_connections.emplace(id, connection);
-    return {id, std::move(connection), Clock::now()};
+    m_owners.ask(connection->socket(), [this, id](bool isOurs) { judged(id, isOurs); });
+    m_connections.emplace(id, std::move(connection));
+    m_unjudged.insert(id);
+}
+
+void IpcEntrance::judged(ClientId id, bool isOurs) {
+    if (m_unjudged.erase(id) == 0) return;  // nobody comes in any more
+    const Arrival arrival{id, m_connections.at(id), Clock::now()};
+    if (!isOurs) {
+        turnAway(arrival);
+    } else if (makeRoom()) {
+        begin(arrival);
+    } else {
+        m_next = arrival;
+    }
+    if (m_unjudged.empty()) m_next ? letNextIn() : accept();
 }
 
 void IpcEntrance::begin(const Arrival& arrival) {
     m_outside.emplace(arrival.id, arrival);
-    std::make_shared<IpcSession>(arrival.id, arrival.connection, m_events)->start();
+    std::make_shared<IpcSession>(arrival.id, arrival.connection, m_owners, m_events)->start();
 }
 
+// In a crowd it costs next to nothing to turn one away: who is to get in waits behind all of them.
 void IpcEntrance::turnAway(const Arrival& arrival) {
-    const bool hasPlace = m_outside.size() < kMaxOutside || dropNewestRefused();
-    if (hasPlace) m_outside.emplace(arrival.id, arrival);
+    if (m_outside.size() >= kMaxOutside) return arrival.connection->reset();
+    m_outside.emplace(arrival.id, arrival);
     arrival.connection->refuse(kRefusedQuiet);
-    if (!hasPlace) arrival.connection->reset();
 }
 
 bool IpcEntrance::dropNewestRefused() {
@@ -163,6 +159,10 @@ void IpcEntrance::close() {
     m_acceptor.close(ignored);
     m_pause.cancel();
     if (m_next) m_outside.emplace(m_next->id, *std::exchange(m_next, std::nullopt));
+    for (const ClientId id : std::exchange(m_unjudged, {})) {
+        const auto connection = m_connections.at(id);
+        connection->reset();
+    }
     for (const auto& [id, arrival] : std::map(m_outside))
         arrival.connection->reset();
     if (m_connections.empty()) m_isEmpty();

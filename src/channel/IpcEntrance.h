@@ -10,9 +10,10 @@
 #include <map>
 #include <memory>
 #include <optional>
-#include <vector>
+#include <set>
 
 #include "channel/IpcConnection.h"
+#include "channel/IpcOwnerLookup.h"
 #include "channel/IpcSession.h"
 
 namespace vexa {
@@ -48,9 +49,9 @@ private:
         Clock::time_point since;
     };
 
-    std::vector<boost::asio::ip::tcp::socket> acceptMore(boost::asio::ip::tcp::socket first);
-    void receive(std::vector<boost::asio::ip::tcp::socket> burst);
-    Arrival add(boost::asio::ip::tcp::socket socket);
+    void acceptMore();
+    void receive(boost::asio::ip::tcp::socket socket);
+    void judged(ClientId id, bool isOurs);
     void begin(const Arrival& arrival);
     void turnAway(const Arrival& arrival);
     bool dropNewestRefused();
@@ -67,9 +68,11 @@ private:
     boost::asio::steady_timer m_pause;
     ClientId m_lastId = 0;
     std::map<ClientId, std::shared_ptr<IpcConnection>> m_connections;
+    std::set<ClientId> m_unjudged;  // it is asked whose they are; until then nobody is accepted
     std::map<ClientId, Arrival> m_outside;
     bool m_isAccepting = false;
     std::optional<Arrival> m_next;  // one of ours that waits for a place; until then nobody is accepted
+    IpcOwnerLookup m_owners{m_strand};
 };
 
 }  // namespace vexa

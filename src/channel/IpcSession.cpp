@@ -104,9 +104,11 @@ struct IpcSession::Protocol {
     std::optional<http::request_parser<http::empty_body>> request;
 };
 
-IpcSession::IpcSession(ClientId id, std::shared_ptr<IpcConnection> connection, Events& events)
+IpcSession::IpcSession(ClientId id, std::shared_ptr<IpcConnection> connection, IpcOwnerLookup& owners,
+                       Events& events)
     : m_id(id),
       m_connection(std::move(connection)),
+      m_owners(owners),
       m_events(events),
       m_protocol(std::make_unique<Protocol>(*this)) {}
 
@@ -131,7 +133,24 @@ void IpcSession::readRequest() {
 void IpcSession::onRequest(error_code ec) {
     if (ec == http::error::end_of_stream || ec == asio::error::operation_aborted)
         return m_connection->reset();
-    if (ec || !mayEnter()) return m_connection->refuse(kRefusedQuiet);
+    if (ec || !mayAsk()) return m_connection->refuse(kRefusedQuiet);
+    m_owners.ask(m_connection->socket(), [self = shared_from_this()](bool isOurs) { self->onOwner(isOurs); });
+}
+
+// A web page in a browser can reach a loopback port, but it can't hide its origin.
+bool IpcSession::mayAsk() const {
+    const auto& request = m_protocol->request->get();
+    return request.count(http::field::host) == 1 && isLoopbackHost(request[http::field::host]) &&
+           request.count(http::field::origin) == 0 && websocket::is_upgrade(request);
+}
+
+// A client has to wait for the answer before he says more, and still has to be there: what a process has sent
+// and left behind has no owner.
+void IpcSession::onOwner(bool isOurs) {
+    if (!m_connection->socket().is_open()) return;
+    error_code ec;
+    const bool saysMore = m_protocol->buffer.size() != 0 || m_connection->socket().available(ec) != 0;
+    if (!isOurs || saysMore || ec) return m_connection->refuse(kRefusedQuiet);
     m_protocol->stream.read_message_max(kMaxIpcMessage);
     m_protocol->stream.async_accept(m_protocol->request->get(),
                                     [self = shared_from_this()](error_code failed) {
@@ -141,19 +160,6 @@ void IpcSession::onRequest(error_code ec) {
                                         self->m_protocol->buffer = {};
                                         self->read();
                                     });
-}
-
-// A web page in a browser can reach a loopback port, but it can't hide its origin. A client has to wait for
-// the answer before he says more, and still has to be there: what a process has sent and left behind has no
-// owner.
-bool IpcSession::mayEnter() const {
-    const auto& request = m_protocol->request->get();
-    if (request.count(http::field::host) != 1 || !isLoopbackHost(request[http::field::host]) ||
-        request.count(http::field::origin) != 0 || !websocket::is_upgrade(request))
-        return false;
-    error_code ec;
-    const bool saysMore = m_protocol->buffer.size() != 0 || m_connection->socket().available(ec) != 0;
-    return !saysMore && !ec && isOfOurAccount(m_connection->socket());
 }
 
 // One who is let in misses nothing that is sent once he has the answer. Behind a goodbye nothing may follow.

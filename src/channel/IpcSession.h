@@ -7,6 +7,7 @@
 #include <string>
 
 #include "channel/IpcConnection.h"
+#include "channel/IpcOwnerLookup.h"
 
 namespace vexa {
 
@@ -33,7 +34,9 @@ public:
         ~Events() = default;
     };
 
-    IpcSession(ClientId id, std::shared_ptr<IpcConnection> connection, Events& events);
+    /// The lookup must outlive it.
+    IpcSession(ClientId id, std::shared_ptr<IpcConnection> connection, IpcOwnerLookup& owners,
+               Events& events);
     ~IpcSession();
     IpcSession(const IpcSession&) = delete;
     IpcSession& operator=(const IpcSession&) = delete;
@@ -60,7 +63,8 @@ private:
 
     void readRequest();
     void onRequest(boost::system::error_code ec);
-    bool mayEnter() const;
+    bool mayAsk() const;
+    void onOwner(bool isOurs);
     void protocolWrites(std::string bytes);
     void read();
     void onMessage(boost::system::error_code ec);
@@ -71,6 +75,7 @@ private:
 
     const ClientId m_id;
     const std::shared_ptr<IpcConnection> m_connection;
+    IpcOwnerLookup& m_owners;
     Events& m_events;
     const std::unique_ptr<Protocol> m_protocol;
     bool m_isIn = false;

@@ -6,7 +6,7 @@ import socket
 import stat
 import subprocess
 
-from harness import Story, clean_environment, free_ports, is_running, run_client, tcp_rows, wait_until
+from harness import STORE, Story, clean_environment, free_ports, is_running, run_client, tcp_rows, wait_until
 
 LISTENING = [("0100007F", "0A")]  # on the loopback address alone
 
@@ -84,6 +84,14 @@ class ServiceThatDoesNotCome(Story):
         with socket.create_server(("127.0.0.1", 0)) as taken:
             port = str(taken.getsockname()[1])
             self.assert_ends(self.begin("--sa-port", port), 1, port)
+
+    def test_a_configuration_that_cannot_be_read_gives_1_and_is_named(self):
+        file = self.folder / "machine" / STORE / "config.xml"
+        file.parent.mkdir(parents=True)
+        for make in (file.mkdir, file.touch, lambda: file.write_text("<configurations>")):
+            make()
+            self.assert_ends(self.begin(), 1, f"{file} cannot be read")
+            file.rmdir() if file.is_dir() else file.unlink()
 
     def test_its_exit_code_is_passed_on(self):
         for code in (0, 1, 77):
