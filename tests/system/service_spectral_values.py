@@ -49,6 +49,8 @@ SCANS = [
     ("and on", [record(2437, 0)], "3:c1"),
     ("to its end", [record(2437, 0)], "3:c0"),
     ("from where a value counts as it is", [record(2437, 60, 61)], "3:c60 3:i68"),
+    ("7 bins at -84.45 and 49 at the floor", [record(2437, 60, 20, ([255] + [0] * 7) * 7)], "3:i5"),
+    ("bins in pairs, 28 at -14.64 and 28 at -28.62", [record(2437, 60, 96, [5, 5, 1, 1] * 14)], "3:i99"),
 ]
 
 

@@ -19,7 +19,8 @@ BASE = (
     '<?xml version="1.0" encoding="UTF-8"?><!-- c --><configurations a="1" b=\'&lt;2\'><global>'
     "<nextcredid>9</nextcredid></global><credentials><credential><id>7</id><type>eapttls</type>"
     "<accesstype>alluser</accesstype><creator>x</creator><eap>2</eap><credname>n&amp;&#233;&#x1F600; é</credname>"
-    "<realm> r<![CDATA[<&>]]>\r\n</realm><username/><password>p&#13;&quot;</password></credential></credentials>"
+    "<realm> r<!-- n -->y<b>z</b><![CDATA[<&>]]>\r\n&#13;v\rw </realm><username/><password>p&#13;&quot;</password>"
+    "</credential></credentials>"
     "<?p i?><users></users></configurations>\n"
 ).encode()
 PIECES = [
@@ -45,12 +46,32 @@ def mutant(rng):
     return bytes(text)
 
 
-TEXT = BASE.decode()
+DECLARATION, TEXT = b'<?xml version="1.0" encoding="UTF-8"?>', BASE.decode()
+WIDE = "\ufeff" + TEXT.replace("UTF-8", "UTF-16")
+# What a file may begin with, or may not.
+BEGINNINGS = [
+    b"", b"<?xml version='1.0' encoding=\"utf-8\" standalone='yes' ?>", b"\xef\xbb\xbf" + DECLARATION,
+    b"<?xml encoding='UTF-8'?>", b"<?xml version='1.0' encoding='UTF-8'>", b"<?xml version='1.0' standalone='perhaps'?>",
+    b"text", b"<a/>", b"<!DOCTYPE a SYSTEM \"a.dtd\">", b"<!-- -- -->", b"<?xml-model x?>",
+]  # fmt: skip
+# What text may hold, or may not.
+PARTS = [
+    b"]] >", b"]]>", b"<![CDATA[x]]", b"<!-- -- -->", b"<!-- x", b"&lt;&gt;&amp;&quot;&apos;&#65;&#x1F6a;&#x1F6A;",
+    b"&", b"& ", b"&nbsp;", b"&lt", b"&#;", b"&#x;", b"&#0;", b"&#x110000;", b"&#xD800;", b"<x></x >", b"<x >y</x>",
+    b"<\xc3\xa9/>", b"<x b='1' c=\"2\"/>", b"<x>", b"<x", b"<x/", b"</x>", b"<x></y>", b"<x><y></x></y>", b"<1/>",
+    b"< x/>", b"<x b/>", b"<x b=1/>", b"<x b='1' b='2'/>", b"<x b='1'c='2'/>", b"<x b='<'/>", b"<x b='&'/>", b"<x b='1/>",
+    b"\x01", b"\0", b"\xef\xbf\xbf", b"\xc3", b"\xc0\x80", b"\xed\xa0\x80", b"<?xml version='1.0'?>",
+]  # fmt: skip
 # Whole ones beside those that random damage makes.
 CORPUS = [
     BASE,
-    TEXT.replace("UTF-8", "UTF-16").encode("utf-16"),
+    *(WIDE.replace("é", text).encode("utf-16-be", "surrogatepass") for text in ("é", "\ud800", "\udc00")),
+    *(WIDE.encode("utf-16-le") + end for end in (b"", b"x")),
+    *(text.encode("utf-16") for text in (TEXT, WIDE)),
+    *(BASE.replace(DECLARATION, beginning) for beginning in BEGINNINGS),
+    *(BASE.replace(b"&#x1F600;", part) for part in PARTS),
     TEXT.replace("&#x1F600;", "").replace("UTF-8", "ISO-8859-1").encode("latin-1"),
+    BASE.replace(b" \xc3\xa9", b"").replace(b"UTF-8", b"us-ascii"),
     *(BASE.replace(b"UTF-8", name) for name in (b"UTF-16", b"US-ASCII", b"nonsense")),
     *(BASE.replace(b"<!-- c -->", types) for types in (b"<!DOCTYPE configurations>", b"<!DOCTYPE x><!DOCTYPE y>")),
     *(b"", b"\xff\xfe", BASE * 2, b" " + BASE, BASE[:-30], BASE.replace(b"\r\n", b"\r")),

@@ -3,101 +3,68 @@
 // from then on all bytes go to that port and back. Says "port N" on standard output, and ends with its
 // standard input.
 
-#include <winsock2.h>
-// After <winsock2.h>.
-#include <windows.h>
-
 #include <array>
+#include <boost/asio/buffer.hpp>
+#include <boost/asio/io_context.hpp>
+#include <boost/asio/ip/tcp.hpp>
+#include <boost/asio/write.hpp>
 #include <cstdio>
 #include <cstdlib>
-#include <optional>
 #include <string>
 #include <thread>
 
 namespace {
 
-constexpr std::size_t kLongestLine = 8;
+using boost::asio::ip::tcp;
+using boost::system::error_code;
 
-SOCKET newSocket() {
-    return socket(AF_INET, SOCK_STREAM, IPPROTO_TCP);
+tcp::endpoint loopback(unsigned short port) {
+    return {boost::asio::ip::address_v4::loopback(), port};
 }
 
-sockaddr_in loopback(unsigned short port) {
-    sockaddr_in address{};
-    address.sin_family = AF_INET;
-    address.sin_port = htons(port);
-    address.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
-    return address;
-}
-
-/// Byte by byte, so that nothing behind the line is taken.
-std::optional<unsigned short> readPort(SOCKET client) {
+/// Byte by byte, so that nothing behind the line is taken; 0 if none comes.
+unsigned short readPort(tcp::socket& client) {
     std::string line;
-    for (char c = 0; line.size() < kLongestLine && recv(client, &c, 1, 0) == 1; line += c)
+    error_code error;
+    for (char c = 0; client.read_some(boost::asio::buffer(&c, 1), error) == 1; line += c)
         if (c == '\n') return static_cast<unsigned short>(std::atoi(line.c_str()));
-    return std::nullopt;
-}
-
-bool sendAll(SOCKET to, const char* data, int size) {
-    while (size > 0) {
-        const int sent = send(to, data, size, 0);
-        if (sent <= 0) return false;
-        data += sent;
-        size -= sent;
-    }
-    return true;
+    return 0;
 }
 
 /// Until one side ends, which the other one is told.
-void pump(SOCKET from, SOCKET to) {
+void pump(tcp::socket& from, tcp::socket& to) {
     std::array<char, 65536> buffer{};
-    int count = 0;
-    do
-        count = recv(from, buffer.data(), static_cast<int>(buffer.size()), 0);
-    while (count > 0 && sendAll(to, buffer.data(), count));
-    shutdown(to, SD_SEND);
-    shutdown(from, SD_RECEIVE);
+    error_code error;
+    while (!error) {
+        const std::size_t count = from.read_some(boost::asio::buffer(buffer), error);
+        if (!error) boost::asio::write(to, boost::asio::buffer(buffer, count), error);
+    }
+    to.shutdown(tcp::socket::shutdown_send, error);
+    from.shutdown(tcp::socket::shutdown_receive, error);
 }
 
-void serve(SOCKET client) {
-    if (const auto port = readPort(client)) {
-        const SOCKET server = newSocket();
-        const sockaddr_in address = loopback(*port);
-        if (connect(server, reinterpret_cast<const sockaddr*>(&address), sizeof address) == 0) {
-            std::thread back([&] { pump(server, client); });
-            pump(client, server);
-            back.join();
-        }
-        closesocket(server);
-    }
-    closesocket(client);
-}
-
-void acceptAll(SOCKET listener) {
-    for (;;) {
-        const SOCKET accepted = accept(listener, nullptr, nullptr);
-        if (accepted == INVALID_SOCKET) return;
-        std::thread(serve, accepted).detach();
-    }
+void serve(tcp::socket client) {
+    tcp::socket server(client.get_executor());
+    error_code error;
+    if (server.connect(loopback(readPort(client)), error)) return;
+    std::thread back([&] { pump(server, client); });
+    pump(client, server);
+    back.join();
 }
 
 }  // namespace
 
 int main() {
-    WSADATA data{};
-    if (WSAStartup(MAKEWORD(2, 2), &data) != 0) return 1;
-    const SOCKET listener = newSocket();
-    sockaddr_in address = loopback(0);
-    int size = sizeof address;
-    auto* const name = reinterpret_cast<sockaddr*>(&address);
-    if (bind(listener, name, size) != 0 || listen(listener, SOMAXCONN) != 0 ||
-        getsockname(listener, name, &size) != 0)
-        return 1;
-    std::printf("port %u\n", static_cast<unsigned>(ntohs(address.sin_port)));
+    boost::asio::io_context context;
+    tcp::acceptor acceptor(context, loopback(0));
+    std::printf("port %u\n", static_cast<unsigned>(acceptor.local_endpoint().port()));
     std::fflush(stdout);
-    std::thread(acceptAll, listener).detach();
+    std::thread([&] {
+        for (;;)
+            std::thread(serve, acceptor.accept()).detach();
+    }).detach();
     while (std::getchar() != EOF) {
     }
     std::fflush(stdout);
-    TerminateProcess(GetCurrentProcess(), 0);
+    std::_Exit(0);
 }

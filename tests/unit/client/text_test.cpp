@@ -41,11 +41,5 @@ TEST(Text, RowsAreAlignedByColumns) {
     EXPECT_TRUE(alignedLines({}).empty());
 }
 
-TEST(Text, CountsHaveTheirNumber) {
-    EXPECT_EQ(counted(0, "channel"), "0 channels");
-    EXPECT_EQ(counted(1, "channel"), "1 channel");
-    EXPECT_EQ(counted(2, "channel"), "2 channels");
-}
-
 }  // namespace
 }  // namespace vexa::client

@@ -68,6 +68,8 @@ TEST_F(Machine, ARegistryKeyHoldsTheBytesOfItsNumbers) {
     EXPECT_FALSE(key->value("Number", 3)) << "it doesn't fit";
     ASSERT_TRUE(writeRegistryNumber(kPath, "Number", 0x00004241));
     EXPECT_EQ(key->value("Number", kEnough), "AB") << "up to the first NUL";
+    const auto sameKey = RegistryKey::open(RegistryRoot::CurrentUser, "software\\KORVANE\\vexa contract");
+    EXPECT_EQ(sameKey ? sameKey->value("NUMBER", kEnough) : "none", "AB") << "names have no case";
     EXPECT_FALSE(key->value("Another", kEnough));
     EXPECT_FALSE(key->wideValue("Another", kEnough));
     EXPECT_FALSE(key->subkeyName(0, kEnough));

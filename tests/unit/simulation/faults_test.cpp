@@ -1,7 +1,6 @@
 #include <gtest/gtest.h>
 
 #include "Station.h"
-#include "platform/TcpTable.h"
 
 namespace vexa::simulation {
 namespace {
@@ -51,26 +50,6 @@ TEST_F(InjectedFaults, StrikeOnlyWhatMatches) {
     EXPECT_EQ(query(wlan_intf_opcode_interface_state), 34U);
     EXPECT_EQ(query(wlan_intf_opcode_channel_number), 33U);
     EXPECT_EQ(query(wlan_intf_opcode_channel_number), ERROR_SUCCESS);
-}
-
-TEST_F(InjectedFaults, ReachEveryCall) {
-    for (const char* call : {"WlanCloseHandle", "WlanEnumInterfaces", "WlanRegisterNotification",
-                             "GetTcpTable", "WlanConnect", "WlanDisconnect", "WlanReasonCodeToString"}) {
-        station.act(std::string("{'do': 'fail', 'error': 77, 'call': '") + call + "'}");
-    }
-    const HANDLE handle = station.listener.handle();
-    PWLAN_INTERFACE_INFO_LIST list = nullptr;
-    std::uint32_t size = 0;
-    char16_t text[4];
-    EXPECT_EQ(WlanCloseHandle(handle, nullptr), 77U);
-    EXPECT_EQ(WlanEnumInterfaces(handle, nullptr, &list), 77U);
-    EXPECT_EQ(WlanRegisterNotification(handle, 0, FALSE, nullptr, nullptr, nullptr, nullptr), 77U);
-    EXPECT_EQ(platform::getTcpTable(nullptr, size, true), 77U);
-    EXPECT_EQ(station.connect(ttlsProfile("a", "61")), 77U);
-    EXPECT_EQ(station.disconnect(), 77U);
-    EXPECT_EQ(WlanReasonCodeToString(0, 4, text, nullptr), 77U);
-    EXPECT_EQ(station.told(), Texts{});
-    EXPECT_EQ(station.connect(ttlsProfile("a", "61")), ERROR_SUCCESS);
 }
 
 TEST_F(InjectedFaults, AReplyTakesThePlaceOfTheModules) {

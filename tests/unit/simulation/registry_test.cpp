@@ -39,36 +39,34 @@ protected:
     TestMachine machine{"{'hotspotAutoConnect': '1'}"};
 };
 
-TEST(MachineRegistry, HasASubkeyForEachAdapter) {
-    TestMachine machine("{'adapters': [{}, {'hardwareId': null, 'inserted': false}]}");
-    const auto key = classKey();
-    ASSERT_TRUE(key);
-    EXPECT_EQ(key->subkeyName(0, 256), "0000");
-    EXPECT_EQ(key->subkeyName(1, 5), "0001");
-    EXPECT_EQ(key->subkeyName(1, 4), "");
-    EXPECT_EQ(key->subkeyName(2, 256), std::nullopt);
-    const auto second = classKey("\\0001");
-    ASSERT_TRUE(second);
-    EXPECT_EQ(second->value("netcfginstanceid", 39), "{6B1E8A4C-5D2F-4E0B-9C37-1F5D00000002}");
-    EXPECT_EQ(second->value("NetCfgInstanceId", 38), std::nullopt);
-    EXPECT_EQ(second->value("MatchingDeviceId", 256), std::nullopt);
-    EXPECT_FALSE(classKey("\\0002"));
-    EXPECT_FALSE(classKey("", RegistryRoot::CurrentUser));
+TEST(MachineRegistry, HasASubkeyForEachAdapterIfTheScenarioDoesNotSayOtherwise) {
+    // Of each subkey its name, the interface and the hardware id.
+    const std::pair<const char*, std::string> cases[] = {
+        {"{'adapters': []}", ""},
+        {"{'adapters': [{}, {'hardwareId': null, 'inserted': false}]}",
+         "0000 {6B1E8A4C-5D2F-4E0B-9C37-1F5D00000001} pci\\ven_1f5d&dev_0101 "
+         "0001 {6B1E8A4C-5D2F-4E0B-9C37-1F5D00000002} - "},
+        {"{'registryClass': [{'netCfgInstanceId': null, 'matchingDeviceId': 'caf\xC3\xA9'}]}",
+         "0000 - caf\xE9 "},
+    };
+    for (const auto& [scenario, expected] : cases) {
+        const TestMachine machine(scenario);
+        std::string found;
+        for (std::uint32_t i = 0; const auto name = classKey().value().subkeyName(i, 5); ++i) {
+            const auto key = classKey("\\" + *name).value();
+            found += *name + " " + key.value("netcfginstanceid", 39).value_or("-") + " " +
+                     key.value("MatchingDeviceId", 256).value_or("-") + " ";
+        }
+        EXPECT_EQ(found, expected) << scenario;
+    }
 }
 
-TEST(MachineRegistry, TheScenarioCanSayWhatTheClassKeyHolds) {
-    {
-        TestMachine machine(
-            "{'registryClass': [{'netCfgInstanceId': null, 'matchingDeviceId': 'caf\xC3\xA9'}]}");
-        const auto key = classKey("\\0000");
-        ASSERT_TRUE(key);
-        EXPECT_EQ(key->value("NetCfgInstanceId", 256), std::nullopt);
-        EXPECT_EQ(key->value("MatchingDeviceId", 256), "caf\xE9");
-    }
-    TestMachine machine("{'adapters': []}");
-    const auto key = classKey();
-    ASSERT_TRUE(key);
-    EXPECT_EQ(key->subkeyName(0, 256), std::nullopt);
+TEST(MachineRegistry, GivesWhatFits) {
+    const TestMachine machine;
+    EXPECT_EQ(classKey().value().subkeyName(0, 4), "");
+    EXPECT_EQ(classKey("\\0000").value().value("NetCfgInstanceId", 38), std::nullopt);
+    EXPECT_FALSE(classKey("\\0001"));
+    EXPECT_FALSE(classKey("", RegistryRoot::CurrentUser));
 }
 
 TEST_F(UsersRegistry, IsKeptInAFileOfTheOwner) {
@@ -82,12 +80,10 @@ TEST_F(UsersRegistry, IsKeptInAFileOfTheOwner) {
     machine.perform("{'do': 'setRegistry', 'value': '0'}");
     EXPECT_TRUE(platform::writeRegistryNumber("software\\korvane\\vexa", "eapmethod", 0xFFFFFFFF));
     EXPECT_EQ(values(), R"({"EapMethod":4294967295,"IsHotSpotAutoConnect":"0"})");
-}
-
-TEST_F(UsersRegistry, CanNotBeWrittenWhereThereIsNoFile) {
     std::filesystem::remove(file());
     std::filesystem::create_directory(file());
-    EXPECT_FALSE(platform::writeRegistryNumber(kProductKey, "EapMethod", 2));
+    EXPECT_FALSE(platform::writeRegistryNumber(kProductKey, "EapMethod", 2))
+        << "there is no place for a file";
 }
 
 TEST_F(UsersRegistry, IsReadAsOthersWroteIt) {

@@ -26,6 +26,23 @@ protected:
 
     DWORD query(int opcode) { return station.query(static_cast<WLAN_INTF_OPCODE>(opcode), answer); }
 
+    /// What each of the calls with a handle gives.
+    std::vector<DWORD> resultsWith(HANDLE handle) {
+        WLAN_CONNECTION_PARAMETERS parameters{};
+        PWLAN_INTERFACE_INFO_LIST list = nullptr;
+        PVOID data = nullptr;
+        DWORD size = 0;
+        return {WlanCloseHandle(handle, nullptr),
+                WlanEnumInterfaces(handle, nullptr, &list),
+                WlanQueryInterface(handle, &station.guid, wlan_intf_opcode_radio_state, nullptr, &size, &data,
+                                   nullptr),
+                WlanRegisterNotification(handle, 0, FALSE, nullptr, nullptr, nullptr, nullptr),
+                WlanIhvControl(handle, &station.guid, wlan_ihv_control_type_driver, 0, nullptr, 0, nullptr,
+                               &size),
+                WlanConnect(handle, &station.guid, &parameters, nullptr),
+                WlanDisconnect(handle, &station.guid, nullptr)};
+    }
+
     std::string calls(const std::string& members = "") {
         return compactJson(station.machine.query("{'query': 'calls'" + members + "}"));
     }
@@ -44,24 +61,18 @@ TEST_F(WlanCalls, AHandleIsGoodUntilItIsClosed) {
         EXPECT_EQ(handles(), 2U);
     }
     EXPECT_EQ(handles(), 1U);
-    WLAN_CONNECTION_PARAMETERS parameters{};
-    PWLAN_INTERFACE_INFO_LIST list = nullptr;
-    PVOID data = nullptr;
-    DWORD size = 0;
-    for (const HANDLE bad : {HANDLE{nullptr}, other, INVALID_HANDLE_VALUE}) {
-        const DWORD results[] = {
-            WlanCloseHandle(bad, nullptr),
-            WlanEnumInterfaces(bad, nullptr, &list),
-            WlanQueryInterface(bad, &station.guid, wlan_intf_opcode_radio_state, nullptr, &size, &data,
-                               nullptr),
-            WlanRegisterNotification(bad, 0, FALSE, nullptr, nullptr, nullptr, nullptr),
-            WlanIhvControl(bad, &station.guid, wlan_ihv_control_type_driver, 0, nullptr, 0, nullptr, &size),
-            WlanConnect(bad, &station.guid, &parameters, nullptr),
-            WlanDisconnect(bad, &station.guid, nullptr),
-        };
-        for (const DWORD result : results)
-            EXPECT_EQ(result, ERROR_INVALID_HANDLE);
-    }
+    for (const HANDLE bad : {HANDLE{nullptr}, other, INVALID_HANDLE_VALUE})
+        EXPECT_EQ(resultsWith(bad), std::vector<DWORD>(7, ERROR_INVALID_HANDLE));
+}
+
+TEST_F(WlanCalls, CanAllBeMadeToFail) {
+    for (const std::string call : {"CloseHandle", "EnumInterfaces", "QueryInterface", "RegisterNotification",
+                                   "IhvControl", "Connect", "Disconnect", "ReasonCodeToString"})
+        station.act("{'do': 'fail', 'error': 77, 'call': 'Wlan" + call + "'}");
+    EXPECT_EQ(resultsWith(station.listener.handle()), std::vector<DWORD>(7, 77));
+    char16_t text[4];
+    EXPECT_EQ(WlanReasonCodeToString(0, 4, text, nullptr), 77U);
+    EXPECT_EQ(station.connect(kProfile), ERROR_SUCCESS);
 }
 
 TEST_F(WlanCalls, AnAdapterIsServedWhileItIsInsertedAndItsModulesOnTheFirstAlone) {

@@ -18,18 +18,18 @@ TEST(TextConversion, TheLocalesNarrowingEndsAtTheFirstUnitThatHasNoByte) {
 }
 
 TEST(TextConversion, ALeadingIntegerIsReadAsFarAsItGoes) {
-    using Case = std::pair<const wchar_t*, std::int32_t>;
-    for (const auto& [text, value] : {Case{L" \t8002 rest", 8002},
-                                      {L"+7", 7},
-                                      {L"-5x", -5},
-                                      {L"", 0},
-                                      {L"- 5", 0},
-                                      {L"\u00bd", 0},
-                                      {L"0x10", 0},
-                                      {L"2147483647", 2147483647},
-                                      {L"2147483648", 2147483647},
-                                      {L"-2147483648", -2147483647 - 1},
-                                      {L"-99999999999999999999", -2147483647 - 1}})
+    const std::pair<const wchar_t*, std::int32_t> cases[] = {{L" \t8002 rest", 8002},
+                                                             {L"+7", 7},
+                                                             {L"-5x", -5},
+                                                             {L"", 0},
+                                                             {L"- 5", 0},
+                                                             {L"\u00bd", 0},
+                                                             {L"0x10", 0},
+                                                             {L"2147483647", 2147483647},
+                                                             {L"2147483648", 2147483647},
+                                                             {L"-2147483648", -2147483647 - 1},
+                                                             {L"-99999999999999999999", -2147483647 - 1}};
+    for (const auto& [text, value] : cases)
         EXPECT_EQ(leadingInteger(text), value) << narrowFromWide(text);
 }
 
