@@ -10,9 +10,10 @@ using namespace std::chrono_literals;
 constexpr auto kBehindStart = 15s;
 
 /// With the log off no thread stops at its first line until a handler has ended.
-void underManySeeds(const std::string& scenario, const Tale& tale) {
+void underManySeeds(const std::string& scenario, const Tale& tale, int seeds = 300) {
     for (const bool withLog : {true, false})
-        EXPECT_STORY(Run({.seeds = 300, .log = withLog}), scenario, tale) << (withLog ? "log on" : "log off");
+        EXPECT_STORY(Run({.seeds = seeds, .log = withLog}), scenario, tale)
+            << (withLog ? "log on" : "log off");
 }
 
 int milliseconds(Story& story) {
@@ -61,6 +62,26 @@ TEST(Races, ARealmUpdateGoesBeforeTheNextConnection) {
         story.expect("ms to the next connection", firstAt(story, "WlanConnect") - left, 200);
         story.expect("connected again", connectedTo(story), "cafe");
     });
+}
+
+// The connecting thread wakes while the switch is read anew.
+TEST(Races, AReloadWithTheSwitchOffConnectsNothing) {
+    const std::string scenario = air({open(1, "cafe", ttls() + R"(,"visible":false)")}, storing({{}}));
+    underManySeeds(
+        scenario,
+        [](Story& story) {
+            story.act("setRegistry", R"("value":"false")");
+            story.order("READ_CREDENTIAL_FROM_FILE");
+            story.perform(on("show", 1));
+            story.advance(kBehindStart);
+            for (int i = 0; i < 10; ++i) {
+                story.perform(kReport);
+                story.order("READ_CREDENTIAL_FROM_FILE");
+            }
+            story.advance(kBehindStart);
+            story.expect("first request", firstAt(story, "WlanConnect"), -1);
+        },
+        60);
 }
 
 TEST(Races, AStopEndsTheScanWhenever) {
