@@ -36,7 +36,7 @@ STORY(AirModule, AnAnswerAboutABssIsReadWithinItsBytes, air({network(1, "Airport
         story.expectLog(
             "Fetching BSS with ssid=Airport and mac address=02:aa:00:00:00:01  ANQP info "
             "from HS20 IHV...");
-        story.expect(line, story.messages().find(line) != std::string::npos, true);
+        story.expectOfLog(line, story.messages().find(line) != std::string::npos, true);
         story.expect("list", askedList(story), wanted);
     };
     expectRead("nothing", {}, "");
@@ -74,11 +74,11 @@ STORY(AirModule, ARequestThatFailsLeavesItsLineAndChangesNothing,
       air({network(1, "Airport", tls()), network(2, "Cafe", ttls("c.example"))})) {
     settle(story);
     story.play({failing("WlanIhvControl", 31, R"("match":"bssList")"), moduleMessage(4, {})});
-    story.expect("log", story.messages(),
-                 "IHV reports HS20 network query ANQP info completed.\n"
-                 "Get HS20 BSS list from IHV.\n"
-                 "WlanIhvControl failed with error code=31\n"
-                 "Error: getHs20BssListFromIHV failed in hs20Associate.\n");
+    story.expectOfLog("log", story.messages(),
+                      "IHV reports HS20 network query ANQP info completed.\n"
+                      "Get HS20 BSS list from IHV.\n"
+                      "WlanIhvControl failed with error code=31\n"
+                      "Error: getHs20BssListFromIHV failed in hs20Associate.\n");
     story.expect("heard", heard(story), "");
     story.play({on("setNetwork", 1, tls("x.example")), on("setNetwork", 2, tls("y.example")),
                 failing("WlanIhvControl", 31, R"("match":"anqpInfo")"), kReport});
@@ -94,8 +94,9 @@ STORY(AirModule, AReportIsAsLongAsItClaimsAndNoLongerThanItsBlock,
         story.perform(moduleMessage(2, cut(kTwo, sent), claimed));
         story.expect("heard", heard(story), wanted);
         if (wanted.empty())
-            story.expect("log", story.messages(),
-                         "IHV reports HS20 network list changed.\nERROR: Update HS20 network list failed.\n");
+            story.expectOfLog(
+                "log", story.messages(),
+                "IHV reports HS20 network list changed.\nERROR: Update HS20 network list failed.\n");
         story.advance(0ms);
     };
     expectHeard(104, 104, "networks One Two");
@@ -163,13 +164,16 @@ STORY(AirModule, TheDriversStateIsPassedOnWhereItsTwoNumbersAre, "{}") {
     story.act("pullAdapter");
     story.forget();
     expectHeard(state, "");
+    const std::string printed = story.printed();
+    story.expect("printed", printed.substr(printed.find("Previous")),
+                 "PreviousState=3 \nCurrentState=5 \nPreviousState=8 \nCurrentState=7 \n");
 }
 
 STORY(AirModule, SubtypesThatNobodyKnowsAreIgnored, air({network(1, "Airport")})) {
     settle(story);
     for (const unsigned subtype : {0U, 7U, 8U, 0x80000001U, 0xFFFFFFFFU})
         story.perform(moduleMessage(subtype, bssRecord("02aa00000001", "Airport")));
-    story.expect("log", story.messages(), "");
+    story.expectOfLog("log", story.messages(), "");
     story.expect("heard", heard(story), "");
 }
 

@@ -6,6 +6,7 @@ namespace vexa::test {
 namespace {
 
 using namespace std::chrono_literals;
+using namespace std::string_literals;
 
 // The thread sleeps for ten seconds when it has learnt of the radio, at the start too.
 constexpr auto kBehindStart = 15s;
@@ -118,8 +119,8 @@ STORY(AutoConnect, SwitchedOffInTheFileItBuildsTheProfileOnceAndConnectsNothing,
     story.expectLog("!!!Creating a new network profile", "connectNetwork returns with op succeeded.",
                     "\tEAP method matches, don't create new profile.",
                     "connectNetwork returns with op succeeded.");
-    story.expect("profiles", count(story.messages(), "!!!Creating"), 1);
-    story.expect("attempts that count", count(story.messages(), "Increase retry"), 0);
+    story.expectOfLog("profiles", count(story.messages(), "!!!Creating"), 1);
+    story.expectOfLog("attempts that count", count(story.messages(), "Increase retry"), 0);
 }
 
 STORY(AutoConnect, ComesBackAfterADropAndAfterTheNetworkWasAway, air({kCafe, kHotel}, storing({kPassword}))) {
@@ -172,10 +173,25 @@ STORY(AutoConnect, ARefusedRequestCostsAnAttempt,
                     "Connection succeeded! profile name=cafe");
 }
 
-STORY(AutoConnect, SaysThatThereIsNoAccessWithoutANameServer,
-      air({kCafe}, storing({kPassword}) + R"(,"adapters":[{"dns":[]}])")) {
-    story.advance(5s);
-    expectStanding(story, {.results = "1 no access"});
+STORY(AutoConnect, SaysThatThereIsNoAccessWithoutANameServerOrAnAnswer, air({kCafe}, storing({kPassword}))) {
+    settle(story, 5s);
+    const auto expectAccess = [&](const std::string& deed, const char* wanted) {
+        story.play({deed, sending("GET_IS_INTERNET_ACCESS")});
+        expectStanding(story, {.results = wanted});
+    };
+    expectAccess(failing("GetPerAdapterInfo", 8), "no access");
+    expectAccess(failing("GetPerAdapterInfo", 111, R"("times":2)"), "access");
+    expectAccess(failing("GetPerAdapterInfo", 111, R"("times":3)"), "no access");
+    expectAccess(doing("setDns", R"("dns":[])"), "no access");
+    for (const char* const error : {"8", "111"})
+        story.expectOfLog(error, count(story.messages(), "GetPerAdapterInfo failed with error: "s + error),
+                          1);
+}
+
+STORY(AutoConnect, GivesTheHomeRealmAsTheDomainAndSoDoesTheUser,
+      air({kCafe}, storing({kPassword}, {.homeRealm = "home.example"}))) {
+    story.play({passing(5s), disconnecting("cafe"), passing(1s), connecting("cafe")});
+    expectStanding(story, {"cafe ttls u1@home.example; disconnect; cafe ttls u1@home.example"});
 }
 
 }  // namespace

@@ -12,12 +12,14 @@ constexpr auto kBehindStart = 15s;
 
 constexpr const char* kSlow = R"(,"connectMs":2000)";
 
+const std::string kOther = network(2, "other", ttls("other.example"));
+
 const std::string kDeletion = sending("DELETE_CREDENTIAL", R"({"Id":1})");
 
 /// Something comes over an attempt of auto-connect one second before its result.
 void comesBetween(const std::string& what, const Standing& end, const std::vector<std::string>& deeds,
                   const std::string& cafe = open(1, "cafe", tls())) {
-    EXPECT_STORY(air({cafe}, storing({{.isTls = true}}) + kSlow), [&](Story& story) {
+    EXPECT_STORY(air({cafe, kOther}, storing({{.isTls = true}}) + kSlow), [&](Story& story) {
         settle(story, 1s);
         story.play(deeds);
         story.advance(60s);
@@ -39,11 +41,22 @@ TEST(Midway, EndsAsItShould) {
     comesBetween("the credential is deleted, and its network lets it in", {"", "", "cafe"}, {kDeletion});
     comesBetween("the credential is deleted, and its network doesn't let it in", {"", "", "-"}, {kDeletion},
                  network(1, "cafe", tls()));
-    const Standing failure{"cafe tls ca1 machine", "0 no access", "-"};
-    comesBetween("the network goes, but not from the list", failure, {on("hide", 1)});
-    comesBetween("the network goes from the list too", failure, {on("hide", 1), kReport});
+    comesBetween("the network goes, but not from the list", {"cafe tls ca1 machine", "0 no access", "-"},
+                 {on("hide", 1)});
+    comesBetween("the network goes from the list too", {"", "", "-", 0}, {on("hide", 1), kReport});
+    comesBetween("the network goes from the list alone", {"", "", "cafe", 0},
+                 {on("setNetwork", 1, R"("reported":false)"), kReport});
     comesBetween("the adapter arrives once more: the result is the system's now", {"", "1 access", "cafe"},
                  {insert});
+}
+
+STORY(Midway, AWalkByHandEndsWhereItsNetworkLeavesTheList,
+      air({network(1, "cafe", ttls()), kOther},
+          storing({{.autoConnect = false}, {.id = 2, .autoConnect = false}}) + kSlow)) {
+    story.play({connecting("cafe"), passing(1s), on("hide", 1), kReport, passing(5s)});
+    expectStanding(story, {"cafe ttls u1", "0 no access", "-", 0});
+    story.expectLog("connResult=0 after invoking tryConnectHs20BssUsingNextCredential.",
+                    "WARNING: The network we were connecting is no longer available, a naughty network!");
 }
 
 STORY(Midway, ADeletedCredentialTakesItsProfileWithItAndEndsTheAttemptWithoutAWord,
@@ -78,7 +91,8 @@ STORY(Midway, AnArrivalOfAnAdapterThatIsThereForgetsWhatWasUnderWay,
     story.hotspot().events();
     story.play({doing("insertAdapter"), passing(60s)});
     expectStanding(story, {"cafe ttls u1", "1 access", "cafe"});
-    story.expect("pending requests", count(story.messages(), "User manual connecting request pending"), 0);
+    story.expectOfLog("pending requests", count(story.messages(), "User manual connecting request pending"),
+                      0);
 }
 
 STORY(RealmUpdate, LetsGoOfTheConnectionAsksAnewAndComesBack,
@@ -114,13 +128,18 @@ STORY(RealmUpdate, AsksAtOnceWhileNothingIsConnected,
     story.expect("heard", heard(story), "networks A[a.example TTLS]");
 }
 
-STORY(RealmUpdate, DoesNothingWithoutAnAdapter, air({network(1, "A")})) {
-    settle(story, kBehindStart);
-    story.act("pullAdapter");
-    story.forget();
-    story.order("UPDATE_NETWORK_REALM");
-    story.expect("log", story.messages(), "UI requested to update HS20 network realm.\n");
-    story.expect("calls", story.perform(R"({"query":"calls"})").size(), 0U);
+// Nor while the adapter counts as out, because it couldn't be looked for.
+TEST(RealmUpdate, DoesNothingWithoutAnAdapter) {
+    const std::string removal = doing("notify", R"("source":8,"code":14)");
+    for (const auto& deeds : {std::vector{doing("pullAdapter")}, {failing("WlanEnumInterfaces", 8), removal}})
+        EXPECT_STORY(air({network(1, "A")}), [&](Story& story) {
+            settle(story, kBehindStart);
+            story.play(deeds);
+            story.forget();
+            story.order("UPDATE_NETWORK_REALM");
+            story.expectOfLog("log", story.messages(), "UI requested to update HS20 network realm.\n");
+            story.expect("calls", story.perform(R"({"query":"calls"})").size(), 0U);
+        });
 }
 
 STORY(HotspotSwitch, OffWhileConnectedLeavesTheNetworkWithoutBlockingIt, air({kCafe}, storing({{}}))) {

@@ -103,7 +103,7 @@ STORY(Credentials, DataThatIsNoTextIsTheSame, "{}") {
             story.hotspot().sendRaw(R"({"CommandId":")" + command + R"(","Data":)" + data + "}");
             story.advance(0ms);
             story.expect("heard", heard(story), "GET_ALL_CREDENTIAL_LIST");
-            story.expect("errors", count(story.messages(), "ERROR: "), 1);
+            story.expectOfLog("errors", count(story.messages(), "ERROR: "), 1);
             story.expect("list", list(story), "1 a.example");
         }
 }
@@ -193,15 +193,15 @@ STORY(Credentials, AReloadTakesWhatOthersWroteAndAnswersNothing, "{}") {
         story.forget();
         story.order("READ_CREDENTIAL_FROM_FILE");
         story.expect("heard", heard(story), "");
-        story.expect("reloads", count(story.messages(), kReloaded), 1);
-        story.expect("saves", count(story.messages(), kChangesSaved), saves);
+        story.expectOfLog("reloads", count(story.messages(), kReloaded), 1);
+        story.expectOfLog("saves", count(story.messages(), kChangesSaved), saves);
         story.expect("list", list(story), "7 b.example, 1 a.example");
     }
     story.writeConfig("<half");
     story.order("READ_CREDENTIAL_FROM_FILE");
     expectList(story, "ADD_CREDENTIAL", ttlsData("c.example"), "8 c.example, 7 b.example, 1 a.example");
     story.expect("file", story.config(), "<half");
-    story.expect("failures", count(story.messages(), kNotSaved), 1);
+    story.expectOfLog("failures", count(story.messages(), kNotSaved), 1);
 }
 
 STORY(Credentials, AFullDiskIsToldInOneLineAndTheNextSaveHeals, "{}") {
@@ -210,11 +210,11 @@ STORY(Credentials, AFullDiskIsToldInOneLineAndTheNextSaveHeals, "{}") {
     story.perform(failing("write", 112, R"("match":"config.xml")"));
     expectList(story, "ADD_CREDENTIAL", ttlsData("b.example"), "2 b.example, 1 a.example");
     story.expect("file", story.config(), file);
-    story.expect("failures", count(story.messages(), kNotSaved), 1);
+    story.expectOfLog("failures", count(story.messages(), kNotSaved), 1);
     expectList(story, "ADD_CREDENTIAL", ttlsData("c.example"), "3 c.example, 2 b.example, 1 a.example");
     story.expect("next id", count(story.config(), "<nextcredid>4</nextcredid>"), 1);
     story.expect("realms", count(story.config(), "<realm>"), 3);
-    story.expect("failures", count(story.messages(), kNotSaved), 1);
+    story.expectOfLog("failures", count(story.messages(), kNotSaved), 1);
 }
 
 }  // namespace

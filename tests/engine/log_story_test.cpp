@@ -21,7 +21,7 @@ void expectWritten(Story& story, const char* what, const std::string& wanted,
     story.expect(what, std::regex_replace(written, std::regex("\\[[0-9]+\\]"), "[#]"), wanted);
 }
 
-STORY(Log, WritesWhatItIsGiven, "{}") {
+STORY(Log, WritesWhatItIsGiven, {.log = true}, "{}") {
     expectWritten(story, "a line has a number, a time and two blanks",
                   kTime + "Radio state changed from On == > Off\n" + kTime + "wide 7 text more %s!\n", [] {
                       Log(3, "Radio state changed from %s == > %s", "On", "Off");
@@ -65,7 +65,7 @@ STORY(Log, WritesWhatItIsGiven, "{}") {
 }
 
 // Time and text together fill the buffer but for its terminator.
-STORY(Log, CutsWhatDoesNotFit, "{}") {
+STORY(Log, CutsWhatDoesNotFit, {.log = true}, "{}") {
     const std::string longText(30000, 'x');
     const std::string cut(20479 - std::string("01/05 08:00:00  ").size() - 1, 'x');
     std::string hex;
@@ -94,7 +94,7 @@ STORY(Log, SwitchedOffMakesNoFileAndCannotBeSwitchedOnWhileTheServiceRuns, {.log
     }
 }
 
-STORY(Log, AReloadSilencesItAndResumesIt, "{}") {
+STORY(Log, AReloadSilencesItAndResumesIt, {.log = true}, "{}") {
     Log(3, "first");
     reloadWith(story, "false");
     Log(3, "second");
@@ -105,7 +105,7 @@ STORY(Log, AReloadSilencesItAndResumesIt, "{}") {
         story.expect(line, count(story.log(), line), times);
 }
 
-STORY(Log, TellsAStartLineByLineInItsFileBehindTenSeconds, "{}") {
+STORY(Log, TellsAStartLineByLineInItsFileBehindTenSeconds, {.log = true}, "{}") {
     story.advance(9s);
     story.expect("file", std::filesystem::exists(story.logFile()), false);
     story.advance(2s);

@@ -24,7 +24,7 @@ void expectNames(Story& story, int source, const std::vector<std::string>& names
     for (const std::string& name : names)
         lines.push_back(prefix + name);
     story.expectLines(lines);
-    story.expect("names", count(story.messages(), prefix), static_cast<int>(names.size()));
+    story.expectOfLog("names", count(story.messages(), prefix), static_cast<int>(names.size()));
 }
 
 STORY(Routing, EveryKnownCodeLeavesItsLineAndOthersNone, "{}") {
@@ -42,7 +42,7 @@ STORY(Routing, EveryKnownCodeLeavesItsLineAndOthersNone, "{}") {
     for (const int source : {4, 32, 0})
         for (int code = 0; code <= 25; ++code)
             story.perform(notify(source, code));
-    story.expect("log of other sources", story.messages(), "");
+    story.expectOfLog("log of other sources", story.messages(), "");
 }
 
 STORY(Routing, BadIhvNotificationsEndInTheirLineAndChangeNothingElse, R"({"spectrum":{"channels":[1]}})") {
@@ -62,7 +62,7 @@ STORY(Routing, BadIhvNotificationsEndInTheirLineAndChangeNothingElse, R"({"spect
     for (const auto& [dataHex, line] : cases) {
         story.forget();
         story.perform(notify(kIhv, 3, dataHex));
-        story.expect(dataHex, story.messages(), line);
+        story.expectOfLog(dataHex, story.messages(), line);
         story.expect("spectral events", story.spectral().events().size(), 0U);
         story.expect("hotspot events", heard(story), "");
     }
@@ -87,7 +87,7 @@ STORY(Routing, CommandsOfTheHotspotPortLeaveOneErrorLineWhenTheyCanNotBeRead, "{
         story.forget();
         story.hotspot().sendRaw(message);
         story.advance(platform::Duration(0));
-        story.expect(message, story.messages(), line);
+        story.expectOfLog(message, story.messages(), line);
         story.expect("heard", heard(story), "");
     }
 }

@@ -93,7 +93,7 @@ void failsToInit(const char* call, int error, int times, const char* state, int 
             story.expect("handles", handles(story), before + moreHandles);
             for (const char* const line : {"Call to GetAdaptersAddresses failed with error: ",
                                            "ERROR: Initiailize supplicant failed."})
-                story.expect(line, count(story.messages(), line), linesOfEach);
+                story.expectOfLog(line, count(story.messages(), line), linesOfEach);
         })
         << call << " " << error << " " << times;
 }
@@ -112,7 +112,7 @@ STORY(SupplicantStory, AnUnlistedAdapterGivesOneThatIsNotInitialisedButServesIts
       R"({"adapters":[{"listed":false}]})") {
     expectState(story, "not initialised");
     story.expect("list", list(story, "ADD_CREDENTIAL", ttlsData("a.example")), "1 a.example");
-    story.expect("lines", count(story.messages(), "!!!Cannot query interface mac address."), 2);
+    story.expectOfLog("lines", count(story.messages(), "!!!Cannot query interface mac address."), 2);
 }
 
 STORY(SupplicantStory, LookupsKeepTheirObjectAlive, "{}") {
@@ -123,6 +123,25 @@ STORY(SupplicantStory, LookupsKeepTheirObjectAlive, "{}") {
     const WLAN_PHY_RADIO_STATE off{0, dot11_radio_state_off, dot11_radio_state_off};
     kept->onRadioStateChanged(&off);
     story.expect("removing it again", SupplicantMgr::instance().removeSupplicant(*kept) == kNotFound, true);
+}
+
+// Neither the hotspot module nor the file brings these yet.
+STORY(SupplicantStory, TheHomeNetworkGoesFirstAndARoamingConsortiumIsLeftAlone,
+      air({open(1, "first", ttls()), open(2, "home", ttls("b.example"))},
+          storing({{}, {.id = 2, .realm = "b.example"}}) + R"(,"session":"disconnected")")) {
+    {
+        const platform::LockGuard lock(g_hs20Lock);
+        const auto supplicant = supplicantOf(kFirst);
+        const auto networks = supplicant->networks().copyPointers();
+        Credential& credential = *supplicant->credentials().copyCredentialPointers().at(0);
+        credential.m_homeSpFqdn = credential.m_roamingConsortium = L"ab";
+        networks.at(0)->m_anqpRoamingConsortium = bytesOfHex("026162");
+        networks.at(1)->m_anqpDomainName = bytesOfHex("026162");
+    }
+    story.play({doing("setSession", R"("session":"active")"), passing(6s), connecting("first"), passing(5s)});
+    expectStanding(story, {"home ttls u2", "1 access", "home"});
+    story.play({on("setNetwork", 2, R"("reported":false)"), kReport, on("hide", 2), passing(60s)});
+    expectStanding(story, {"home ttls u2", "", "-"});
 }
 
 // The adapter comes and goes between and within the commands. Whatever the order of threads, what the client

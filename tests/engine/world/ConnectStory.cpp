@@ -22,9 +22,10 @@ std::string ssidOf(const std::string& profile) {
 std::string shownProfile(const std::string& profile) {
     const std::string mode = firstMatch(profile, "<authMode>([A-Za-z]*)</authMode>");
     const std::string name = ssidOf(profile);
+    const std::string domain = firstMatch(profile, "<domain>([^<]*)</domain>");
     if (profile.find(">21</Type>") != std::string::npos)
         return name + " ttls " + firstMatch(profile, "<username>([^<]*)</username>") +
-               (mode == "machineOrUser" ? "" : " " + mode);
+               (domain.empty() ? "" : "@" + domain) + (mode == "machineOrUser" ? "" : " " + mode);
     return name + " tls " + firstMatch(profile, "<TrustedRootCA>([^<]*)</TrustedRootCA>") + " " + mode;
 }
 

@@ -22,7 +22,7 @@ namespace fs = std::filesystem;
                        const Tale& tale) {
     int exitCode = 1;
     platform::runSeeded(run.seed, [&] {
-        Story story(scenario, folder, run.log);
+        Story story(scenario, folder, run.log.value_or(run.seed % 2 == 1));
         try {
             tale(story);
         } catch (const std::exception& fault) {
@@ -45,7 +45,7 @@ Ending runOnce(const Run& run, const std::string& scenario, const Tale& tale) {
     std::fflush(nullptr);
     const pid_t child = fork();
     if (child == 0) {
-        if (std::freopen("/dev/null", "w", stdout) == nullptr) _exit(1);
+        if (std::freopen((folder / "stdout.txt").c_str(), "w", stdout) == nullptr) _exit(1);
         if (std::freopen(errors.c_str(), "w", stderr) == nullptr) _exit(1);
         live(run, scenario, folder, tale);
     }
@@ -79,7 +79,7 @@ std::string wrongIn(const Run& run, const std::string& scenario, const Tale& tal
 }
 
 std::string wrongIn(const std::string& scenario, const Tale& tale) {
-    return wrongIn(Run(), scenario, tale);
+    return wrongIn({.seeds = 2}, scenario, tale);
 }
 
 }  // namespace vexa::test

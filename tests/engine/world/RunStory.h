@@ -2,6 +2,7 @@
 
 #include <cstdint>
 #include <functional>
+#include <optional>
 #include <string>
 
 #include "engine/world/Story.h"
@@ -11,8 +12,8 @@ namespace vexa::test {
 /// How a story is told.
 struct Run {
     std::uint64_t seed = 1;
-    int seeds = 1;    ///< so many, from `seed` on; VEXA_STORY_SEEDS in the environment makes it more
-    bool log = true;  ///< the diagnostic log
+    int seeds = 1;  ///< so many, from `seed` on; VEXA_STORY_SEEDS in the environment makes it more
+    std::optional<bool> log = {};  ///< the diagnostic log; where nothing is said odd seeds have it on
 };
 
 using Tale = std::function<void(Story&)>;
@@ -28,7 +29,7 @@ struct Ending {
 /// has to stop in order after it. Ends with the first seed that went wrong.
 Ending runStory(const Run& run, const std::string& scenario, const Tale& tale);
 
-/// Its `wrong` alone; for the macro below.
+/// Its `wrong` alone; for the macro below. Without a run there are two, with the log on and off.
 std::string wrongIn(const Run& run, const std::string& scenario, const Tale& tale);
 std::string wrongIn(const std::string& scenario, const Tale& tale);
 

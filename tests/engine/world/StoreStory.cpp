@@ -48,9 +48,10 @@ std::string storing(const std::vector<StoredCredential>& credentials, const Stor
         R"(<?xml version="1.0" encoding="UTF-8"?><configurations><global>)"
         "<dump_file_path>hs20log.txt</dump_file_path><create_new_dump_file>false</create_new_dump_file>" +
         element("autoconnect", flag(options.autoConnect)) + element("enabledump", flag(options.log)) +
-        "<dumplevel>0</dumplevel><homerealm></homerealm>" + element("nextcredid", std::to_string(next)) +
-        "</global>" + element("credentials", all) + "<users><user><username>KORVANE-PC\\user</username>" +
-        element("credentials", places) + "</user></users></configurations>";
+        "<dumplevel>0</dumplevel>" + element("homerealm", options.homeRealm) +
+        element("nextcredid", std::to_string(next)) + "</global>" + element("credentials", all) +
+        "<users><user><username>KORVANE-PC\\user</username>" + element("credentials", places) +
+        "</user></users></configurations>";
     return "\"config\":" + Json::valueToQuotedString(text.c_str());
 }
 

@@ -18,6 +18,7 @@ struct StoredCredential {
 struct StoreOptions {
     bool autoConnect = true;
     bool log = true;
+    std::string homeRealm = {};
 };
 
 /// The `config` member of a scenario. A credential's texts tell its id: "name1", "u1" and "p1", or "ca1".

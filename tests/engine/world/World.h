@@ -95,6 +95,8 @@ public:
     std::filesystem::path logFile() const { return store() / "Dump" / "hs20log.txt_user.txt"; }
     /// One line per call.
     std::string debugLog() const { return contentOf(m_folder / "debug.log"); }
+    /// What went to standard output, in a story.
+    std::string printed() const { return contentOf(m_folder / "stdout.txt"); }
 
     Client& spectral() { return *m_spectral; }
     Client& hotspot() { return *m_hotspot; }
