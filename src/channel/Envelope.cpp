@@ -20,14 +20,18 @@ std::string timestamp() {
 
 }  // namespace
 
-std::string buildEnvelope(const std::string& eventId, const char* source,
-                          const std::optional<std::string>& data) {
+// `Data` stands first, and may be long: it is never held more than twice.
+std::string buildEnvelope(const std::string& eventId, const char* source, std::optional<std::string> data) {
     Json::Value event;
     event["Source"] = source;
     event["EventId"] = eventId;
-    if (data) event["Data"] = *data;
     event["Timestamp"] = timestamp();
-    return toStyledText(event);
+    const std::string withoutData = toStyledText(event);
+    if (!data) return withoutData;
+    std::string text = "{\n   \"Data\" : ";
+    text.reserve(text.size() + data->size() + data->size() / 4 + withoutData.size());
+    appendQuoted(text, *data);
+    return text.append(",").append(withoutData, 1);
 }
 
 }  // namespace vexa

@@ -12,6 +12,10 @@ namespace vexa {
 /// end.
 std::string toStyledText(const Json::Value& value);
 
+/// Appends a text in its quotes as the above writes it, at a fraction of the cost. What is no UTF-8 becomes
+/// U+FFFD, one for each byte.
+void appendQuoted(std::string& json, std::string_view text);
+
 /// Comments are allowed and the root may be anything, whatever comes behind it. Text that isn't JSON and text
 /// nested too deeply give null: half a command is none.
 Json::Value parseJsonText(std::string_view text);

@@ -1,6 +1,7 @@
 #include "hotspotport/SAHotSpotPortlink.h"
 
 #include <cstdlib>
+#include <utility>
 
 #include "base/DiagnosticLog.h"
 #include "channel/Envelope.h"
@@ -37,8 +38,8 @@ void SAHotSpotPortlink::updateCardState() {
     m_bCardIn = m_interfaceGuid.refresh(m_hClientHandle.get());
 }
 
-bool SAHotSpotPortlink::SendData(const std::string& data, const std::string& eventId) {
-    const std::string text = buildEnvelope(eventId, contract::kHotspotSource, data);
+bool SAHotSpotPortlink::SendData(std::string data, const std::string& eventId) {
+    const std::string text = buildEnvelope(eventId, contract::kHotspotSource, std::move(data));
     const IpcHandle ipc = m_hIpc;
     if (ipc == 0) {
         Log(6, "ERROR: IPC handle is NULL in SAHotSpotPortlink::SendData.");

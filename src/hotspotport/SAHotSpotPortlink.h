@@ -39,7 +39,7 @@ public:
     void HandleCommand(const Json::Value& root);
 
     /// Sends one event to all clients; true if one took it. A message that could not be sent is lost.
-    bool SendData(const std::string& data, const std::string& eventId);
+    bool SendData(std::string data, const std::string& eventId);
     void SendRadioState();
     /// Tells the card state as it was last asked for.
     void SendCardState();
