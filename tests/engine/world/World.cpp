@@ -103,7 +103,8 @@ std::vector<ClientEvent> Client::events() {
         events.push_back({event["EventId"].asString(), event["Source"].asString(), event.isMember("Data"),
                           data, parsed(data)});
         const Json::Value& inner = events.back().data;
-        if (toStyledText(event) != text || (!inner.empty() && toStyledText(inner) != data))
+        const bool isStructured = inner.isArray() || inner.isObject();
+        if (toStyledText(event) != text || (isStructured && toStyledText(inner) != data))
             throw std::runtime_error("not styled: " + text);
     }
     return events;
