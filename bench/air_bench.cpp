@@ -7,9 +7,11 @@
 
 #include <json/writer.h>
 
+#include <malloc.h>
 #include <cstdio>
 #include <cstdlib>
 #include <filesystem>
+#include <fstream>
 #include <memory>
 #include <string>
 #include <unordered_map>
@@ -43,27 +45,69 @@ std::string bssid(int number) {
     return text;
 }
 
+/// What a network says of its realms: a member of the scenario.
+using RealmsOf = std::string (*)(int network);
+
 // Each network has as many realms as this, half of them with EAP-TLS and half with EAP-TTLS.
-std::string scenario(int namesShared) {
+std::string fortyRealms(int network) {
+    std::string realms;
+    for (int realm = 0; realm < kRealms; ++realm)
+        realms += std::string(realm == 0 ? "" : ",") + R"({"names":[")" + realmOf(network, realm) +
+                  R"("],"eapMethods":[)" + (realm % 2 == 0 ? "13" : "21") + "]}";
+    return R"("realms":[)" + realms + "]";
+}
+
+std::string asHex(const std::string& bytes) {
+    std::string hex;
+    for (const char byte : bytes)
+        for (const int shift : {4, 0})
+            hex += "0123456789abcdef"[static_cast<unsigned char>(byte) >> shift & 15];
+    return hex;
+}
+
+// As many realms as an answer has room for, each of these names, and each with this method 255 times.
+std::string hostile(const std::string& names, char method) {
+    constexpr std::size_t kRoom = 10236;
+    std::string entry{'\0', static_cast<char>(names.size())};
+    entry += names + '\xFF';
+    for (int i = 0; i < 255; ++i)
+        entry += {'\2', method, '\0'};
+    const auto size = static_cast<unsigned>(entry.size());
+    entry = std::string{static_cast<char>(size & 0xFF), static_cast<char>(size >> 8)} + entry;
+    const std::size_t count = (kRoom - 2) / entry.size();
+    std::string list{static_cast<char>(count), '\0'};
+    for (std::size_t i = 0; i < count; ++i)
+        list += entry;
+    return R"("naiRealmHex":")" + asHex(list) + "\"";
+}
+
+std::string manyNames(int /*network*/) {
+    return hostile(std::string(255, ';'), 13);
+}
+
+std::string longNames(int /*network*/) {
+    return hostile(std::string(255, '\1'), 13);
+}
+
+std::string unknownMethods(int /*network*/) {
+    return hostile(std::string(255, ';'), 18);
+}
+
+std::string scenario(int namesShared, RealmsOf realmsOf) {
     std::string networks;
-    for (int network = 0; network < kNetworks; ++network) {
-        std::string realms;
-        for (int realm = 0; realm < kRealms; ++realm)
-            realms += std::string(realm == 0 ? "" : ",") + R"({"names":[")" + realmOf(network, realm) +
-                      R"("],"eapMethods":[)" + (realm % 2 == 0 ? "13" : "21") + "]}";
+    for (int network = 0; network < kNetworks; ++network)
         networks += std::string(network == 0 ? "" : ",") + R"({"bssid":")" + bssid(network) +
-                    R"(","ssid":"Network )" + std::to_string(network / namesShared) + R"(","realms":[)" +
-                    realms + "]}";
-    }
+                    R"(","ssid":"Network )" + std::to_string(network / namesShared) + R"(",)" +
+                    realmsOf(network) + "}";
     return R"({"speed":0,"networks":[)" + networks + "]}";
 }
 
 /// The service without its threads' time: the clock stands still, so that only the update costs.
 class Air {
 public:
-    explicit Air(int namesShared)
+    Air(int namesShared, RealmsOf realmsOf)
         : m_folder(temporaryFolder()),
-          m_machine(vexa::simulation::parseScenario(scenario(namesShared)), m_folder) {
+          m_machine(vexa::simulation::parseScenario(scenario(namesShared, realmsOf)), m_folder) {
         SupplicantMgr::instance().init();
         SAHotSpotPortlink& server = SAHotSpotPortlink::instance();
         server.updateCardState();
@@ -104,11 +148,29 @@ void rate(benchmark::State& state) {
         benchmark::Counter(static_cast<double>(state.iterations()), benchmark::Counter::kIsRate);
 }
 
+double residentMegabytes(const std::string& what) {
+    std::ifstream status("/proc/self/status");
+    for (std::string line; std::getline(status, line);)
+        if (line.starts_with(what)) return std::stod(line.substr(what.size())) / 1024;
+    return 0;
+}
+
+// How much more memory than before is taken at the most while this runs.
+template <class Run>
+double peakMegabytes(Run run) {
+    malloc_trim(0);
+    const double before = residentMegabytes("VmRSS:");
+    std::ofstream("/proc/self/clear_refs") << 5;
+    run();
+    return residentMegabytes("VmHWM:") - before;
+}
+
 // One report of the module, with all that follows: the fetch for each network, folding, the list to the
 // client.
-template <int NamesShared>
+template <int NamesShared, RealmsOf RealmsOf>
 void update(benchmark::State& state) {
-    Air air(NamesShared);
+    Air air(NamesShared, RealmsOf);
+    state.counters["peak_mb"] = peakMegabytes([&] { air.update(); });
     for (auto _ : state) {
         air.update();
         state.PauseTiming();
@@ -123,12 +185,12 @@ struct BareNetwork {
     std::vector<std::string> realms;
 };
 
-std::vector<BareNetwork> bareReport(int namesShared) {
+std::vector<BareNetwork> bareReport(int namesShared, int realms) {
     std::vector<BareNetwork> networks;
     for (int network = 0; network < kNetworks; ++network) {
         auto& entry = networks.emplace_back();
         entry.name = "Network " + std::to_string(network / namesShared);
-        for (int realm = 0; realm < kRealms; ++realm)
+        for (int realm = 0; realm < realms; ++realm)
             entry.realms.push_back(realmOf(network, realm));
     }
     return networks;
@@ -151,9 +213,9 @@ Json::Value asJson(const BareNetwork& network) {
 }
 
 // The same list from names at hand: folded, and written twice, as a text within the text of an event.
-template <int NamesShared>
+template <int NamesShared, int Realms>
 void bareUpdate(benchmark::State& state) {
-    const std::vector<BareNetwork> report = bareReport(NamesShared);
+    const std::vector<BareNetwork> report = bareReport(NamesShared, Realms);
     for (auto _ : state) {
         std::vector<BareNetwork> folded;
         std::unordered_map<std::string, std::size_t> places;
@@ -173,9 +235,15 @@ void bareUpdate(benchmark::State& state) {
     rate(state);
 }
 
-BENCHMARK(update<1>)->Name("air_update_196_names/ours")->Unit(benchmark::kMillisecond);
-BENCHMARK(bareUpdate<1>)->Name("air_update_196_names/bare")->Unit(benchmark::kMillisecond);
-BENCHMARK(update<4>)->Name("air_update_49_names/ours")->Unit(benchmark::kMillisecond);
-BENCHMARK(bareUpdate<4>)->Name("air_update_49_names/bare")->Unit(benchmark::kMillisecond);
+BENCHMARK(update<1, fortyRealms>)->Name("air_update_196_names/ours")->Unit(benchmark::kMillisecond);
+BENCHMARK(bareUpdate<1, kRealms>)->Name("air_update_196_names/bare")->Unit(benchmark::kMillisecond);
+BENCHMARK(update<4, fortyRealms>)->Name("air_update_49_names/ours")->Unit(benchmark::kMillisecond);
+BENCHMARK(bareUpdate<4, kRealms>)->Name("air_update_49_names/bare")->Unit(benchmark::kMillisecond);
+BENCHMARK(update<1, manyNames>)->Name("air_update_hostile_names/ours")->Unit(benchmark::kMillisecond);
+BENCHMARK(bareUpdate<1, 256>)->Name("air_update_hostile_names/bare")->Unit(benchmark::kMillisecond);
+BENCHMARK(update<1, longNames>)->Name("air_update_hostile_lengths/ours")->Unit(benchmark::kMillisecond);
+BENCHMARK(bareUpdate<1, 256>)->Name("air_update_hostile_lengths/bare")->Unit(benchmark::kMillisecond);
+BENCHMARK(update<1, unknownMethods>)->Name("air_update_hostile_methods/ours")->Unit(benchmark::kMillisecond);
+BENCHMARK(bareUpdate<1, 0>)->Name("air_update_hostile_methods/bare")->Unit(benchmark::kMillisecond);
 
 }  // namespace

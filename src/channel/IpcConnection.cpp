@@ -57,6 +57,11 @@ void IpcConnection::dropWaiting() {
     m_unsent = m_queue.empty() ? 0 : m_queue.front()->size();
 }
 
+bool IpcConnection::hasWaiting(std::size_t bytes) const {
+    const std::size_t notMessages = m_queue.size() > 1 && isPongFrame(*m_queue[1]) ? 2 : 1;
+    return m_queue.size() > notMessages + 1 && m_unsent - m_queue.front()->size() > bytes;
+}
+
 std::size_t IpcConnection::writeSome(error_code& ec) {
     std::array<asio::const_buffer, kMostAtOnce> frames;
     const std::size_t count = std::min(m_queue.size(), frames.size());

@@ -44,8 +44,8 @@ public:
     void whenWritten(std::function<void()> callback) { m_hasWritten = std::move(callback); }
     bool isAllWritten() const { return m_queue.empty(); }
 
-    /// The bytes of the frames behind the one that goes out.
-    std::size_t waiting() const { return m_queue.empty() ? 0 : m_unsent - m_queue.front()->size(); }
+    /// Whether several messages wait behind the one that goes out, of more than so many bytes.
+    bool hasWaiting(std::size_t bytes) const;
     /// The bytes of all frames that have not gone out. Any thread.
     std::size_t unsent() const { return m_unsent; }
 

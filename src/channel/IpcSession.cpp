@@ -222,9 +222,9 @@ void IpcSession::messageHandled(std::size_t size) {
 
 void IpcSession::send(const Bytes& frame) {
     m_connection->queue(frame);
-    if (m_connection->waiting() <= kMaxIpcQueued) return;
+    if (!m_connection->hasWaiting(kMaxIpcQueued)) return;
     flush();  // what came in one rush may well find room in his socket
-    if (m_connection->waiting() > kMaxIpcQueued) {
+    if (m_connection->hasWaiting(kMaxIpcQueued)) {
         m_connection->dropWaiting();
         close(websocket::close_code::policy_error);
     }

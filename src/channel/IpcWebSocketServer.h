@@ -44,8 +44,8 @@ public:
     IpcWebSocketServer& operator=(const IpcWebSocketServer&) = delete;
 
     /// Queues a message for every client. Never blocks; any thread. False if there is no client to take it. A
-    /// client with more than kMaxQueued bytes waiting behind the message that goes out is dropped with close
-    /// code 1008.
+    /// client with several messages of more than kMaxQueued bytes waiting behind the one that goes out is
+    /// dropped with close code 1008.
     bool sendToAll(std::string_view message);
 
     /// Queues a message for one client, dropped if he has left.

@@ -20,6 +20,12 @@ std::optional<std::string> narrowForMatch(const std::wstring& text) {
     return narrow.text.size() > kMaxNarrow ? std::nullopt : std::optional(narrow.text);
 }
 
+// A realm that can't be told is not empty: an access point of anybody's may announce an empty one, and would
+// be given the password.
+std::optional<std::string> narrowRealm(const std::wstring& realm) {
+    return narrowByLocale(realm).isComplete ? narrowForMatch(realm) : std::nullopt;
+}
+
 std::string_view textOf(Bytes bytes) {
     return {reinterpret_cast<const char*>(bytes.data()), bytes.size()};
 }
@@ -59,7 +65,7 @@ bool isComplete(const Credential& credential) {
 CredentialMatcher::CredentialMatcher(const CredentialTable& table) {
     for (Credential* credential : table.copyCredentialPointers())
         if (!credential->m_realm.empty())
-            m_candidates.push_back({credential, narrowForMatch(credential->m_realm)});
+            m_candidates.push_back({credential, narrowRealm(credential->m_realm)});
 }
 
 std::vector<Credential*> CredentialMatcher::findCredentialsForNetwork(const Hs20Network& network) const {

@@ -8,6 +8,7 @@
 #include <utility>
 
 #include "base/DiagnosticLog.h"
+#include "hotspot/RealmCollection.h"
 
 namespace vexa {
 
@@ -34,14 +35,14 @@ std::unique_ptr<Hs20Network> buildNew(const Hs20BssRecord& record) {
 }
 
 std::vector<RealmInfo> unionOfRealms(const Group& group) {
-    std::vector<RealmInfo> all;
+    RealmCollection all;
     std::set<RealmInfo> seen;
     for (const Hs20Network* network : group) {
         Log(3, "\tMacAddress=%s", toText(network->m_macAddress).c_str());
         for (const RealmInfo& realm : network->m_realms)
-            if (seen.insert(realm).second) all.push_back(realm);
+            if (!all.isFull() && seen.insert(realm).second) all.add(realm);
     }
-    return all;
+    return all.take();
 }
 
 Hs20Network* networkToKeep(const Group& group, const std::set<MacAddress>& oldMacs) {

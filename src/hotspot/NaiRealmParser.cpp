@@ -1,9 +1,11 @@
 #include "hotspot/NaiRealmParser.h"
 
 #include <algorithm>
+#include <iterator>
 #include <string_view>
 
 #include "base/DiagnosticLog.h"
+#include "hotspot/RealmCollection.h"
 
 namespace vexa {
 
@@ -13,6 +15,9 @@ constexpr std::size_t kLeastRealmData = 5;
 constexpr std::size_t kLeastRealmLength = 3;
 constexpr std::size_t kLeastMethod = 3;
 constexpr std::size_t kLeastMethodLength = 2;
+
+// Lines about methods of one network.
+constexpr std::size_t kMaxComplaints = 256;
 
 constexpr std::uint8_t kEapTls = 13;
 constexpr std::uint8_t kEapTtls = 21;
@@ -141,6 +146,27 @@ std::vector<std::string> splitNames(std::string_view realm) {
     }
 }
 
+// 0: a method that this client has no credentials for.
+std::uint32_t eapTypeOf(const NaiRealmEap& eap) {
+    return eap.method == kEapTtls ? 2 : eap.method == kEapTls ? 1 : 0;
+}
+
+// Names and methods multiply, so nothing here may take as long as there are pairs of them.
+void flatten(const NaiRealm& realm, RealmCollection& kept, std::size_t& complaints) {
+    std::vector<NaiRealmEap> usable;
+    std::copy_if(realm.eap.begin(), realm.eap.end(), std::back_inserter(usable), eapTypeOf);
+    if (usable.empty() && complaints == kMaxComplaints) return;
+    for (const std::string& name : splitNames(realm.realm))
+        for (const NaiRealmEap& eap : complaints < kMaxComplaints ? realm.eap : usable) {
+            if (const std::uint32_t type = eapTypeOf(eap)) {
+                if (!kept.add({type, name})) return;
+            } else if (complaints < kMaxComplaints) {
+                ++complaints;
+                Log(6, "ERROR: Invalid EAP type.");
+            }
+        }
+}
+
 }  // namespace
 
 std::optional<std::vector<NaiRealm>> parseNaiRealmList(Bytes list) {
@@ -161,18 +187,13 @@ std::optional<std::vector<NaiRealm>> parseNaiRealmList(Bytes list) {
 }
 
 std::vector<RealmInfo> flattenRealms(const std::vector<NaiRealm>& realms) {
-    std::vector<RealmInfo> flat;
-    for (const NaiRealm& realm : realms)
-        for (const std::string& name : splitNames(realm.realm))
-            for (const NaiRealmEap& eap : realm.eap) {
-                if (eap.method == kEapTtls)
-                    flat.push_back({2, name});
-                else if (eap.method == kEapTls)
-                    flat.push_back({1, name});
-                else
-                    Log(6, "ERROR: Invalid EAP type.");
-            }
-    return flat;
+    RealmCollection kept;
+    std::size_t complaints = 0;
+    for (const NaiRealm& realm : realms) {
+        if (kept.isFull()) break;
+        flatten(realm, kept, complaints);
+    }
+    return kept.take();
 }
 
 }  // namespace vexa

@@ -39,8 +39,8 @@ struct RealmInfo {
 /// entry loses the whole list. No read goes beyond the bytes, whatever they claim.
 std::optional<std::vector<NaiRealm>> parseNaiRealmList(Bytes list);
 
-/// One entry for each name of each realm and each of its methods; methods other than EAP-TLS and EAP-TTLS are
-/// left out, with a line in the log.
+/// One entry for each name of each realm and each of its methods, as many as a network keeps; methods other
+/// than EAP-TLS and EAP-TTLS are left out, with a line in the log.
 std::vector<RealmInfo> flattenRealms(const std::vector<NaiRealm>& realms);
 
 }  // namespace vexa

@@ -1,3 +1,5 @@
+#include <utility>
+
 #include "base/DiagnosticLog.h"
 #include "base/NetworkListLock.h"
 #include "channel/StyledText.h"
@@ -19,30 +21,39 @@ int internetAccessCode(const Supplicant& supplicant, const Hs20Network& network,
     return supplicant.hasInternetAccess() ? kNoWarning : kConnectedWithoutAccess;
 }
 
-Json::Value realmsAsJson(const Hs20Network& network) {
-    Json::Value realms(Json::arrayValue);
+// A list can have some 50,000 realms, each of which would be a dozen allocations as a Json::Value: it is
+// written straight away, in the styled form.
+void appendRealms(std::string& json, const Hs20Network& network) {
+    const char* before = "[\n";
     for (const RealmInfo& realm : network.m_realms) {
-        if (realm.m_eapType != kEapMethodTls && realm.m_eapType != kEapMethodTtls) {
-            Log(6, "ERROR: Invalid EAP type.");
-            continue;
-        }
-        Json::Value& entry = realms.append(Json::Value(Json::objectValue));
-        entry["CredentialEapMethod"] = realm.m_eapType;
-        entry["RealmName"] = realm.m_realm;
+        json += std::exchange(before, ",\n");
+        json += "         {\n            \"CredentialEapMethod\" : ";
+        json += std::to_string(realm.m_eapType);
+        json += ",\n            \"RealmName\" : ";
+        appendQuoted(json, realm.m_realm);
+        json += "\n         }";
     }
-    return realms;
+    json += "\n      ]";
 }
 
-Json::Value networkAsJson(const Supplicant& supplicant, const Hs20Network& network, bool isConnected) {
-    Json::Value object;
-    object["NetWorkName"] = network.ssidText();
-    object["NetworkType"] = network.m_networkType;
-    object["IsConnected"] = isConnected;
-    object["IsInternetAccess"] = internetAccessCode(supplicant, network, isConnected);
-    object["RealmFetched"] = network.hasRealmData();
-    if (network.hasRealmData() && !network.m_realms.empty())
-        object["SupportRealmList"] = realmsAsJson(network);
-    return object;
+void appendNetwork(std::string& json, const Supplicant& supplicant, const Hs20Network& network,
+                   bool isConnected) {
+    const auto asText = [](bool flag) { return flag ? "true" : "false"; };
+    json += "   {\n      \"IsConnected\" : ";
+    json += asText(isConnected);
+    json += ",\n      \"IsInternetAccess\" : ";
+    json += std::to_string(internetAccessCode(supplicant, network, isConnected));
+    json += ",\n      \"NetWorkName\" : ";
+    appendQuoted(json, network.ssidText());
+    json += ",\n      \"NetworkType\" : ";
+    json += std::to_string(network.m_networkType);
+    json += ",\n      \"RealmFetched\" : ";
+    json += asText(network.hasRealmData());
+    if (network.hasRealmData() && !network.m_realms.empty()) {
+        json += ",\n      \"SupportRealmList\" : ";
+        appendRealms(json, network);
+    }
+    json += "\n   }";
 }
 
 }  // namespace
@@ -57,11 +68,13 @@ void SAHotSpotPortlink::SendNetworkList(Supplicant* supplicant) {
     const bool isEnabled = supplicant->isHs20Enabled();
     const Hs20Network* const connected = supplicant->getConnectedBss(false);
     if (!listed) return;
-    Json::Value networks;
+    std::string text;
     if (supplicant->isRadioOnCached() && isEnabled)
-        for (const Hs20Network* network : listed->networks().copyPointers())
-            networks.append(networkAsJson(*supplicant, *network, network == connected));
-    const std::string text = toStyledText(networks);
+        for (const Hs20Network* network : listed->networks().copyPointers()) {
+            text += text.empty() ? "[\n" : ",\n";
+            appendNetwork(text, *supplicant, *network, network == connected);
+        }
+    text += text.empty() ? "null\n" : "\n]\n";
     Log(0, "GET_ALL_NETWORK_LIST=%s", text.c_str());
     SendData(text, contract::kGetAllNetworkList);
 }

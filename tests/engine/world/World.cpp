@@ -8,6 +8,7 @@
 #include <stdexcept>
 
 #include "base/DiagnosticLog.h"
+#include "channel/StyledText.h"
 #include "contract/Process.h"
 #include "hotspotport/SAHotSpotPortlink.h"
 #include "platform/ClockControl.h"
@@ -101,6 +102,10 @@ std::vector<ClientEvent> Client::events() {
         const std::string data = event.get("Data", "").asString();
         events.push_back({event["EventId"].asString(), event["Source"].asString(), event.isMember("Data"),
                           data, parsed(data)});
+        const Json::Value& inner = events.back().data;
+        const bool isStructured = inner.isArray() || inner.isObject();
+        if (toStyledText(event) != text || (isStructured && toStyledText(inner) != data))
+            throw std::runtime_error("not styled: " + text);
     }
     return events;
 }

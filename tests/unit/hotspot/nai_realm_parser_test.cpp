@@ -23,6 +23,13 @@ std::string realmsAfter(const Block& list) {
     return text;
 }
 
+int countOf(std::string_view text, std::string_view part) {
+    int found = 0;
+    for (std::size_t at = text.find(part); at != text.npos; at = text.find(part, at + part.size()))
+        ++found;
+    return found;
+}
+
 const std::string kHead = "Parsing NAI Realm list from 01:02:03:04:05:06\n\tParsing NAI Realm...\n";
 
 std::string counted(int count) {
@@ -135,6 +142,35 @@ TEST(NaiRealms, ReplaceTheOldOnesByAllOfAGoodListAndByNothingOfABadOne) {
     };
     for (const Case& c : cases)
         EXPECT_EQ(realmsAfter(c.list), c.realms) << c.what;
+}
+
+TEST(NaiRealms, OfTooManyTheFirstAreKeptAndOneLineTellsIt) {
+    const auto methods = [](std::size_t count, unsigned method) {
+        return std::vector<Block>(count, eapMethod(method));
+    };
+    const auto invalid = methods(150, 18);
+    struct Case {
+        std::vector<Block> entries;
+        int kept;
+        int lines;
+        int complaints;
+    };
+    const Case cases[] = {
+        {{realmData("a;b", methods(128, 13))}, 256, 0, 0},
+        {{realmData("a;b", methods(128, 13)), realmData("c", methods(1, 13))}, 256, 1, 0},
+        {std::vector<Block>(13, realmData(std::string(253, ';'), methods(167, 21))), 256, 1, 0},
+        {{realmData(std::string(255, 'x'), methods(255, 13))}, 32, 1, 0},
+        {{realmData(";;;a", invalid), realmData("b", methods(2, 13))}, 2, 0, 256},
+        {{realmData(std::string(253, ';'), invalid)}, 0, 0, 256},
+    };
+    for (const Case& c : cases) {
+        LogCapture log;
+        const std::string realms = realmsAfter(realmList(c.entries));
+        const std::string text = log.text();
+        EXPECT_EQ(countOf(realms, "TLS"), c.kept);
+        EXPECT_EQ(countOf(text, "too many realms, only the first"), c.lines);
+        EXPECT_EQ(countOf(text, "ERROR: Invalid EAP type."), c.complaints);
+    }
 }
 
 TEST(NaiRealms, ParametersAreReadWhereTheyHaveAValueAndUnknownOnesNamed) {

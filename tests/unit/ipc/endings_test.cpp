@@ -97,7 +97,7 @@ TEST(IpcEndings, OneMessageAloneCostsNobodyHisPlaceAndPingsDoNotPileUpBehindIt) 
         IpcWebSocketServer::create(port, [&](ClientId, std::string_view) { handled.set_value(); });
     RawClient client = shakenHands(port);
     ASSERT_TRUE(server->sendToAll(large));
-    ASSERT_TRUE(server->sendToAll(std::string(IpcWebSocketServer::kMaxQueued - 20, 'y')));
+    ASSERT_TRUE(server->sendToAll(std::string(kMoreThanSockets, 'y')));
     client.send(masked(0x89, "1") + masked(0x89, "2") + masked(0x81, "that was all"));
     ASSERT_EQ(handled.get_future().wait_for(kPatience), std::future_status::ready);
     EXPECT_EQ(client.receive(10 + large.size()).substr(10), large);
