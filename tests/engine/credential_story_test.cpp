@@ -74,7 +74,7 @@ STORY(Credentials, ACommandThatCannotBeCarriedOutChangesNothingAndStillTellsTheL
             story.expect("list", list(story, command, data), "2 b.example, 1 a.example");
             const int refusals =
                 count(story.messages(), "ERROR: ") + count(story.messages(), "Unknown credential");
-            if (command == "ADD_CREDENTIAL") story.expect("refusals in the log", refusals, 1);
+            if (command == "ADD_CREDENTIAL") story.expectOfLog("refusals", refusals, 1);
             story.expect("file", story.config(), file);
         }
     };
