@@ -254,6 +254,16 @@ STORY(PendingRequest, ThatIsRefusedLeavesItsNetworkTheProfileThatItHas,
     expectStanding(story, {"cafe tls ca1 machineOrUser; cafe ttls u2 = 50", "0 1 access", "cafe", 1});
 }
 
+// What the system joins is no walk: behind it auto-connect doesn't go on with what waits for the user's hand.
+STORY(PendingRequest, ThatIsLeftToTheSystemEndsTheWalkByHand,
+      air({network(1, "cafe", ttls()), network(2, "other", ttls("x.example") + R"(,"osProfile":true)")},
+          storing({{}, byHand(2)}) + R"(,"connectMs":1000)")) {
+    story.play({passing(500ms), connecting("cafe"), passing(1s), connecting("other"), passing(3s)});
+    expectStanding(story, {.connected = "other"});
+    story.play({doing("dropConnection"), passing(60s)});
+    expectStanding(story, {.requests = "cafe ttls u1; cafe ttls u1; plain other; cafe ttls u1"});
+}
+
 STORY(PendingRequest, ThatIsRefusedLeavesTheWalkByHandWhereItWas,
       air({network(1, "cafe", ttls()), kHotel},
           storing({byHand(1), byHand(3), byHand(2, false, "b.example")}) + R"(,"connectMs":1000)")) {
