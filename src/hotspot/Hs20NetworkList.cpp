@@ -9,6 +9,7 @@
 
 #include "base/DiagnosticLog.h"
 #include "hotspot/RealmCollection.h"
+#include "hotspot/ShownName.h"
 
 namespace vexa {
 
@@ -66,6 +67,13 @@ Hs20Network* Hs20NetworkList::findBySsid(std::string_view ssid) const {
         return std::string_view(network->m_ssid.data(), network->m_ssid.size()).starts_with(ssid);
     });
     return found == m_networks.end() ? nullptr : found->get();
+}
+
+std::string Hs20NetworkList::ssidShownAs(std::string_view name) const {
+    const auto found = std::find_if(m_networks.begin(), m_networks.end(), [&](const auto& network) {
+        return shownName(network->ssidText()) == name;
+    });
+    return std::string(found == m_networks.end() ? name : (*found)->ssid());
 }
 
 std::vector<Hs20Network*> Hs20NetworkList::copyPointers() const {

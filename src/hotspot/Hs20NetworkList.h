@@ -1,6 +1,7 @@
 #pragma once
 
 #include <memory>
+#include <string>
 #include <string_view>
 #include <vector>
 
@@ -18,6 +19,9 @@ public:
     /// for no bytes.
     Hs20Network* findByMac(const MacAddress& mac) const REQUIRES(g_hs20Lock);
     Hs20Network* findBySsid(std::string_view ssid) const REQUIRES(g_hs20Lock);
+
+    /// The SSID of the network that clients know by this name; the name itself if there is none.
+    std::string ssidShownAs(std::string_view name) const REQUIRES(g_hs20Lock);
 
     /// In order. Good only while the lock is held.
     std::vector<Hs20Network*> copyPointers() const REQUIRES(g_hs20Lock);

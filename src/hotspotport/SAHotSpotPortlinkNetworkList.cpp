@@ -5,6 +5,7 @@
 #include "channel/StyledText.h"
 #include "connection/Supplicant.h"
 #include "contract/Ports.h"
+#include "hotspot/ShownName.h"
 #include "hotspotport/SAHotSpotPortlink.h"
 
 namespace vexa {
@@ -44,7 +45,7 @@ void appendNetwork(std::string& json, const Supplicant& supplicant, const Hs20Ne
     json += ",\n      \"IsInternetAccess\" : ";
     json += std::to_string(internetAccessCode(supplicant, network, isConnected));
     json += ",\n      \"NetWorkName\" : ";
-    appendQuoted(json, network.ssidText());
+    appendQuoted(json, shownName(network.ssidText()));
     json += ",\n      \"NetworkType\" : ";
     json += std::to_string(network.m_networkType);
     json += ",\n      \"RealmFetched\" : ";

@@ -8,6 +8,15 @@
 
 namespace vexa {
 
+namespace {
+
+std::string ssidShownAs(const Supplicant& supplicant, const std::string& name) {
+    const platform::LockGuard lock(g_hs20Lock);
+    return supplicant.networks().ssidShownAs(name);
+}
+
+}  // namespace
+
 void SAHotSpotPortlink::setHotSpotAutoConnect(bool enable) {
     const platform::LockGuard lock(g_hs20Lock);
     Log(3, "Set enable/disable HS20, param=%s", enable ? "true" : "false");
@@ -26,14 +35,15 @@ void SAHotSpotPortlink::updateNetworkRealm() {
 void SAHotSpotPortlink::connectNetworkByName(const std::string& name) {
     const auto supplicant = hotspotSupplicant(*this);
     if (name.empty() || !supplicant) return;
-    if (name.size() <= kMaxSsidLength && supplicant->connectBss(name) == kSuccess) return;
+    const std::string ssid = ssidShownAs(*supplicant, name);
+    if (ssid.size() <= kMaxSsidLength && supplicant->connectBss(ssid) == kSuccess) return;
     Log(6, "connectBss failed.");
     SendConnectionResult(ConnectionResult{});
 }
 
 void SAHotSpotPortlink::disconnectNetworkByName(const std::string& name) {
     const auto supplicant = hotspotSupplicant(*this);
-    if (!name.empty() && supplicant) supplicant->disconnectBss(name);
+    if (!name.empty() && supplicant) supplicant->disconnectBss(ssidShownAs(*supplicant, name));
 }
 
 }  // namespace vexa

@@ -53,6 +53,39 @@ TEST(ManualConnect, AsksForNothingWhereThereIsNoSuchNetwork) {
             {"", "", "-", -1});
 }
 
+// Two of them are text: what the list shows for the first, and the mark for what is no text.
+TEST(ManualConnect, JoinsAndLeavesByTheNamesThatTheListShowsWhatHasNoTextForAName) {
+    const std::vector<std::pair<std::string, std::string>> names = {{"Caf\xE9", R"(Caf\xE9)"},
+                                                                    {"Caf\xE9s", R"(Caf\xE9s)"},
+                                                                    {"\xE9", R"(\xE9)"},
+                                                                    {"\xFF\\xFF", R"(\xFF\x5CxFF)"},
+                                                                    {R"(Caf\xE9)", R"(Caf\x5CxE9)"},
+                                                                    {"\xEF\xBF\xBD", "\uFFFD"},
+                                                                    {std::string(32, '\xE9'), [] {
+                                                                         std::string text;
+                                                                         for (int i = 0; i < 32; ++i)
+                                                                             text += R"(\xE9)";
+                                                                         return text;
+                                                                     }()}};
+    std::vector<std::string> networks;
+    for (const auto& [ssid, shown] : names)
+        networks.push_back(R"({"bssid":"02:aa:00:00:00:0)" + std::to_string(networks.size()) +
+                           R"(","ssidHex":")" + hexOf(bytesOfText(ssid)) + "\"," + ttls() + "," +
+                           lettingIn(R"({"eapMethod":21})") + "}");
+    EXPECT_STORY(air(networks, storing({byHand(1)})), [&](Story& story) {
+        settle(story, kBehindStart);
+        std::string list;
+        for (const auto& [ssid, shown] : names)
+            list += (list.empty() ? "" : " ") + shown + "[a.example TTLS]";
+        story.expect("list", askedList(story), list);
+        for (const auto& [ssid, shown] : names) {
+            story.forget();
+            story.play({connecting(shown), passing(5s), disconnecting(shown), passing(5s)});
+            story.expect(shown, joined(requests(story)), ssid + " ttls u1; disconnect");
+        }
+    });
+}
+
 TEST(ManualConnect, LeavesToTheSystemWhatNoCredentialFits) {
     const std::string elsewhere = ttls("other.example");
     asksFor("a network that it knows", "cafe", {network(1, "cafe", elsewhere + R"(,"osProfile":true)")},
