@@ -3,6 +3,9 @@
 from harness import Story
 
 
+LONG = "n" * 127  # as long as a name may be
+
+
 class CredentialStory(Story):
     scenario = {}
 
@@ -50,10 +53,10 @@ class Listing(CredentialStory):
         self.assertEqual(self.list("--show-passwords")[0]["password"], "gEh31m")
 
     def test_text_can_do_nothing_to_the_terminal(self):
-        name = "a\x9b31m"
+        name = "a\x9b\x7f\t31m"
         data = {"Type": 3, "CredentialEapMethod": 1, "RealName": "r", "CredentialName": name}
         self.machine.hs20().send("ADD_CREDENTIAL", data)
-        self.assertIn("a\\x9b31m", self.done("credentials"))
+        self.assertIn("a\\x9b\\x7f\\x0931m", self.done("credentials"))
         self.assertEqual(self.names(), [name])
 
 
@@ -81,10 +84,11 @@ class Adding(CredentialStory):
              [*bare, "--method", "tls"], [*tls, "--username", "u"], [*tls, "--client-cert", "a\nb"],
              ["credential", "edit", "1"], ["credential", "move", "1", "0"], ["credential", "delete"]),
             ("p", [*user, "--client-cert", "c"], [*user, "--password", "p"], [*user, "--per-user", "--all-users"],
-             [*user, "--auto-connect", "--no-auto-connect"], [*user, "--realm", "x" * 128],
-             [*tls, "--password-stdin"]),
-            ("p" * 64, user),
-            ("a\x1bb", user),
+             [*user, "--auto-connect", "--no-auto-connect"], [*tls, "--password-stdin"],
+             *([*user, option, "x" * 128] for option in ("--realm", "--name")),
+             *([*tls, option, text] for option in ("--client-cert", "--ca-cert") for text in ("x" * 128, "caf\udce9")),
+             *([*user, option, "x" * 64] for option in ("--username", "--creator"))),
+            *((password, user) for password in ("p" * 64, "😀" * 32, "a\x1bb", "a\tb", "a\x7f")),
         ):  # fmt: skip
             for command in commands:
                 with self.subTest(command):
@@ -100,7 +104,7 @@ class Adding(CredentialStory):
         self.assertEqual(passwords, ["dos", "one", "  sp ace "])
 
     def test_any_text_is_stored_as_it_is(self):
-        for text in ("空港ラウンジ", "<&>\"'", " blanks ", "😀" * 31, "-dash", "a;b%s", "0"):
+        for text in ("空港ラウンジ", "<&>\"'", " blanks ", "😀" * 31 + "x", "-dash", "a;b%s", "0"):
             with self.subTest(text):
                 arguments = [f"--realm=r{text}", f"--name={text}", f"--username={text}", "--password-stdin", "--json"]
                 self.done("credential", "add", *arguments, stdin=text)
@@ -131,11 +135,11 @@ class Changing(CredentialStory):
         self.add_certificate("T")
         entries = {entry["name"]: entry for entry in self.list("--show-passwords")}
         for which, options, changes, words in (
-            ("B", ["--realm", "n", "--no-auto-connect"], {"realm": "n", "autoConnect": False}, "realm, auto-connect"),
+            ("B", ["--realm", LONG, "--no-auto-connect"], {"realm": LONG, "autoConnect": False}, "realm, auto-connect"),
             ("A", ["--username", "bert"], {"username": "bert"}, "user name"),
             ("A", ["--password-stdin"], {"password": "typed"}, "password"),
-            ("T", ["--client-cert", "new"], {"clientCert": "new"}, "client certificate"),
-            ("T", ["--ca-cert", "root"], {"caCert": "root"}, "CA certificate"),
+            ("T", ["--client-cert", LONG], {"clientCert": LONG}, "client certificate"),
+            ("T", ["--ca-cert", LONG], {"caCert": LONG}, "CA certificate"),
             ("T", ["--ca-cert", ""], {"caCert": ""}, "CA certificate"),
         ):
             with self.subTest((which, options)):
@@ -157,13 +161,15 @@ class Changing(CredentialStory):
         self.assertEqual(self.names(), ["C"])
 
     def test_who_is_unknown_is_told(self):
-        for which in ("77", "nobody", "-1", "0", "99999999999"):
+        for which in ("77", "nobody", "-1", "0", "99999999999", "3 ", ""):
             for arguments in (["delete", "--", which], ["move", "--", which, "1"], ["edit", "--name=x", "--", which]):
                 with self.subTest(arguments):
                     self.assertIn(which, self.refused(1, "credential", *arguments))
         self.assertEqual(self.names(), ["A", "B", "C"])
         self.done("credential", "edit", "A", "--name", "B")
         self.assertIn("several", self.refused(1, "credential", "delete", "B"))
+        self.done("credential", "edit", "C", "--name", "3")
+        self.assertIn('credential 3 "B"', self.done("credential", "delete", "3"), "an id goes before a name")
 
     def test_reload_takes_what_was_edited_by_hand(self):
         path = self.machine.config()

@@ -141,3 +141,17 @@ class Switching(NetworkStory):
         self.assertEqual((self.status()["hotspot"], self.networks()), (False, []))
         self.done("enable")
         self.all_reported()
+
+    def test_it_is_on_unless_the_registry_says_false_and_leaves_the_rest_alone(self):
+        path, key = self.machine.folder / "registry.json", "HKEY_CURRENT_USER\\Software\\Korvane\\Vexa"
+        other = {"HKEY_CURRENT_USER\\Other": {"a": 1}}
+        switches = (({"IsHotSpotAutoConnect": value}, value != "False") for value in (7, "False", "false "))
+        for values, is_on in ((7, True), ({}, True), *switches):
+            path.write_text(json.dumps({key: values}))
+            self.assertEqual(self.status()["hotspot"], is_on, values)
+        for before, command, after in (({}, "disable", "false"), ({"IsHotSpotAutoConnect": "fAlse"}, "enable", "true")):
+            path.write_text(json.dumps({**other, key: {"b": "c", **before}}))
+            self.done(command)
+            self.assertEqual(json.loads(path.read_text()), {**other, key: {"IsHotSpotAutoConnect": after, "b": "c"}})
+        path.write_text("nonsense")
+        self.assertTrue(self.status()["hotspot"])

@@ -45,6 +45,9 @@ class WithService(Story):
         self.assertEqual([entry[k] for k in ("name", "caCert", "clientCert", "autoConnect")], ["new"] * 3 + [False])
 
 
+NO_DATA = object()
+
+
 class Peer:
     """Listens like a service and lets the test say what each command is answered with, in which order; None closes the
     connection."""
@@ -81,7 +84,8 @@ class Peer:
                 if events is None:
                     return
                 for event, data, *source in events:
-                    envelope = {"EventId": event, "Source": (source or ["HotSpot20"])[0], "Data": json.dumps(data)}
+                    envelope = {"EventId": event, "Source": (source or ["HotSpot20"])[0]}
+                    envelope |= {} if data is NO_DATA else {"Data": json.dumps(data)}
                     connection.sendall(frame(TEXT, json.dumps(envelope).encode()))
 
     @staticmethod

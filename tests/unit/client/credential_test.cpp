@@ -4,8 +4,6 @@
 
 #include "client/hotspot/CredentialText.h"
 #include "client/hotspot/Fitting.h"
-#include "client/port/JsonLine.h"
-#include "client/terminal/ClientError.h"
 
 namespace vexa::client {
 namespace {
@@ -16,56 +14,11 @@ Credential userCredential(int id, const std::string& name) {
     credential.type = kTypeUser;
     credential.method = kMethodTtls;
     credential.access = kPerUser;
-    credential.autoConnect = true;
     credential.name = name;
     credential.realm = "realm";
-    credential.creator = "creator";
     credential.username = "user";
     credential.password = "pässword";
     return credential;
-}
-
-TEST(Credential, WhatIsSentComesBackTheSameAndEntriesThatAreNoneAreLeftOut) {
-    const Credential credential = userCredential(7, "A \"quoted\" 空港");
-    Json::Value list = parseJson("[7, null, [], {}, {\"Id\": \"x\"}]").value();
-    list.append(parseJson(credentialData(credential)).value());
-    EXPECT_EQ(credentialList(list), CredentialList{credential});
-    for (const char* text : {"null", "{}", "7", "[]"})
-        EXPECT_TRUE(credentialList(parseJson(text).value()).empty()) << text;
-}
-
-TEST(Credential, IsFoundByIdOrOnlyName) {
-    const CredentialList list{userCredential(3, "x"), userCredential(4, "3"), userCredential(5, "twice"),
-                              userCredential(6, "twice")};
-    EXPECT_EQ(findCredential(list, "x").id, 3);
-    EXPECT_EQ(findCredential(list, "3").id, 3) << "an id goes before a name";
-    EXPECT_EQ(findCredential(list, "4").id, 4);
-    for (const char* unknown : {"", "twice", "nobody", "7", "3 ", "-3", "99999999999999"})
-        EXPECT_THROW(findCredential(list, unknown), ClientError) << unknown;
-    EXPECT_EQ(positionOf(list, 5), 3U);
-}
-
-TEST(Credential, TextThatTheServiceCannotStoreIsKnown) {
-    const auto isStored = [](std::string Credential::*field, const std::string& text) {
-        Credential credential = userCredential(1, "n");
-        credential.*field = text;
-        return !objectionTo(credential);
-    };
-    std::string sixtyTwo;  // UTF-16 units
-    for (int i = 0; i < 31; ++i)
-        sixtyTwo += "😀";
-    for (const auto field :
-         {&Credential::name, &Credential::realm, &Credential::clientCert, &Credential::caCert}) {
-        EXPECT_TRUE(isStored(field, std::string(127, 'x')));
-        EXPECT_FALSE(isStored(field, std::string(128, 'x')));
-    }
-    for (const auto field : {&Credential::username, &Credential::creator, &Credential::password}) {
-        EXPECT_TRUE(isStored(field, sixtyTwo + "x"));
-        EXPECT_FALSE(isStored(field, sixtyTwo + "😀"));
-    }
-    EXPECT_TRUE(isStored(&Credential::realm, " <&>\"' "));
-    for (const char* text : {"a\tb", "a\x7F", "caf\xE9"})
-        EXPECT_FALSE(isStored(&Credential::password, text)) << text;
 }
 
 TEST(CredentialText, NumbersKindsThatAreNotKnown) {

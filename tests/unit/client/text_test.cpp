@@ -14,16 +14,6 @@ TEST(Text, WhatIsNoUtf8IsKnown) {
         EXPECT_FALSE(isValidUtf8(text)) << text;
 }
 
-TEST(Text, PrintableTextHasNoControlCharacters) {
-    EXPECT_EQ(printable("a\x1B[31mb"), "a\\x1b[31mb");
-    EXPECT_EQ(printable("\x7F\xC2\x9B"), "\\x7f\\x9b");
-    EXPECT_EQ(printable(std::string_view("a\0b", 3)), "a\\x00b");
-    EXPECT_EQ(printable("a\tb"), "a\\x09b");
-    EXPECT_EQ(printable("a\tb\n", Tabs::Kept), "a\tb\\x0a");
-    EXPECT_EQ(printable("空港 é"), "空港 é");
-    EXPECT_EQ(printable("caf\xE9 \x9B"), "café \\x9b");
-}
-
 TEST(Text, ColumnsFollowTheWidthOfCharacters) {
     EXPECT_EQ(columnsOf("abc"), 3);
     EXPECT_EQ(columnsOf("空港"), 4);
