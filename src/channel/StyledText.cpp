@@ -135,7 +135,7 @@ void StyledText::writeArray(const Json::Value& array) {
 
 // Whether it is short and of scalars alone.
 bool StyledText::writeOnOneLine(const Json::Value& array) {
-    if (array.size() * 3 >= kRightMargin) return false;
+    if (std::size_t{array.size()} * 3 >= kRightMargin) return false;
     std::string line;
     for (const Json::Value& element : array) {
         if ((element.isArray() || element.isObject()) && !element.empty()) return false;

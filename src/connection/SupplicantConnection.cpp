@@ -6,6 +6,7 @@
 #include "base/WlanText.h"
 #include "connection/Supplicant.h"
 #include "connection/SupplicantMgr.h"
+#include "platform/CodePage.h"
 #include "platform/Registry.h"
 #include "text/ScopeGuard.h"
 #include "text/TextConversion.h"
@@ -26,18 +27,11 @@ std::wstring profileNameOf(const WLAN_CONNECTION_NOTIFICATION_DATA& data) {
     return fromWlanText({data.strProfileName, WLAN_MAX_NAME_LENGTH});
 }
 
-// The default code page has a question mark for what it lacks.
-std::string inCodePage(std::wstring text) {
-    std::replace_if(
-        text.begin(), text.end(), [](wchar_t unit) { return unit > 0xFF; }, L'?');
-    return narrowByLocale(text).text;
-}
-
 std::wstring logReason(const WLAN_CONNECTION_NOTIFICATION_DATA& data) {
     WCHAR text[kReasonCapacity] = {};
     WlanReasonCodeToString(data.wlanReasonCode, kReasonCapacity, text, nullptr);
     std::wstring reason = fromWlanText({text, kReasonCapacity});
-    Log(3, "Reason code desc=%s", inCodePage(reason).c_str());
+    Log(3, "Reason code desc=%s", platform::inCodePage(reason).c_str());
     return reason;
 }
 

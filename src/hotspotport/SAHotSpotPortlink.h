@@ -5,6 +5,7 @@
 #include <atomic>
 #include <cstdint>
 #include <memory>
+#include <optional>
 #include <string>
 
 #include "base/AdapterIdentity.h"
@@ -57,8 +58,9 @@ public:
 
     /// The client's switch for the whole hotspot function. Holds the network list lock.
     void setHotSpotAutoConnect(bool enable);
-    /// The user's wish to join a network or to leave it. The outcome comes as an event.
-    void connectNetworkByName(const std::string& name);
+    /// The user's wish to join a network or to leave it. The outcome comes as an event. No name at all is one
+    /// that no network can have; an empty one is no wish.
+    void connectNetworkByName(const std::optional<std::string>& name);
     void disconnectNetworkByName(const std::string& name);
     /// Reads the realms of all networks anew, after a disconnection if need be.
     void updateNetworkRealm();

@@ -1,5 +1,7 @@
 #include <algorithm>
 #include <array>
+#include <optional>
+#include <string>
 #include <string_view>
 
 #include "base/DiagnosticLog.h"
@@ -55,12 +57,23 @@ bool autoConnect(Server& server, const Json::Value& data) {
     return true;
 }
 
-template <void (Server::*Act)(const std::string& name)>
-bool withNetwork(Server& server, const Json::Value& data) {
-    const auto name = readText(data, "NetWorkName");
-    if (!name || (data.isObject() && data["NetWorkName"].isBool())) return false;
-    (server.*Act)(*name);
+// Nothing for a name of a wrong type.
+std::optional<std::string> networkName(const Json::Value& data) {
+    if (data.isObject() && data["NetWorkName"].isBool()) return std::nullopt;
+    return readText(data, "NetWorkName");
+}
+
+bool connectNetwork(Server& server, const Json::Value& data) {
+    const auto name = networkName(data);
+    if (!name && !data.isObject()) return false;
+    server.connectNetworkByName(name);
     return true;
+}
+
+bool disconnectNetwork(Server& server, const Json::Value& data) {
+    const auto name = networkName(data);
+    if (name) server.disconnectNetworkByName(*name);
+    return name.has_value();
 }
 
 constexpr std::array<Command, 14> kCommands = {{
@@ -74,8 +87,8 @@ constexpr std::array<Command, 14> kCommands = {{
     {contract::kDeleteCredential, changeCredentials<deleteCredential>, true},
     {contract::kEditCredential, changeCredentials<editCredential>, true},
     {contract::kSetPositionCredential, changeCredentials<setCredentialPosition>, true},
-    {contract::kConnectNetwork, withNetwork<&Server::connectNetworkByName>},
-    {contract::kDisconnectNetwork, withNetwork<&Server::disconnectNetworkByName>},
+    {contract::kConnectNetwork, connectNetwork},
+    {contract::kDisconnectNetwork, disconnectNetwork},
     {contract::kGetAllNetworkList, networkList},
     {contract::kGetIsInternetAccess, answer<&Server::SendInternetAccess>},
 }};

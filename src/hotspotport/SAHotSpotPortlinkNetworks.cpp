@@ -32,11 +32,13 @@ void SAHotSpotPortlink::updateNetworkRealm() {
 }
 
 // An SSID has 32 bytes at most; a longer name is refused like one that can't be joined.
-void SAHotSpotPortlink::connectNetworkByName(const std::string& name) {
+void SAHotSpotPortlink::connectNetworkByName(const std::optional<std::string>& name) {
     const auto supplicant = hotspotSupplicant(*this);
-    if (name.empty() || !supplicant) return;
-    const std::string ssid = ssidShownAs(*supplicant, name);
-    if (ssid.size() <= kMaxSsidLength && supplicant->connectBss(ssid) == kSuccess) return;
+    if ((name && name->empty()) || !supplicant) return;
+    if (name) {
+        const std::string ssid = ssidShownAs(*supplicant, *name);
+        if (ssid.size() <= kMaxSsidLength && supplicant->connectBss(ssid) == kSuccess) return;
+    }
     Log(6, "connectBss failed.");
     SendConnectionResult(ConnectionResult{});
 }

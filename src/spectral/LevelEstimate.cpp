@@ -18,9 +18,9 @@ constexpr int kLargestPower = 400;
 double floorShare(int power) {
     static const auto shares = [] {
         std::array<double, 2 * kLargestPower + 1> all{};
-        for (int i = 0; i < static_cast<int>(all.size()); ++i)
-            all[static_cast<std::size_t>(i)] =
-                std::pow(10.0, (kLevelFloor - kLevelOfPowerZero - (i - kLargestPower)) / 10.0);
+        double power = -kLargestPower;
+        for (double& share : all)
+            share = std::pow(10.0, (kLevelFloor - kLevelOfPowerZero - power++) / 10.0);
         return all;
     }();
     return shares[static_cast<std::size_t>(power + kLargestPower)];

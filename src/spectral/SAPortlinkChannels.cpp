@@ -13,7 +13,8 @@ using platform::LockGuard;
 
 }  // namespace
 
-// An adapter that is gone or a module that fails leaves the channels as they were known.
+// An adapter that is gone, a module that fails and an answer that is cut short leave the channels as they
+// were known.
 void SAPortlink::QueryChannelList() {
     const LockGuard lock(m_cs);
     updateCardState();
@@ -28,7 +29,9 @@ void SAPortlink::QueryChannelList() {
         return;
 
     buffer.resize(std::min<std::size_t>(returned, buffer.size()));
-    m_channelOrder = orderChannels(parseChannelList(buffer));
+    const auto channels = parseChannelList(buffer);
+    if (!channels) return;
+    m_channelOrder = orderChannels(*channels);
     for (std::vector<int>* table : {&m_congestion, &m_noise, &m_lastCongestion, &m_lastNoise})
         table->assign(m_channelOrder.size(), 0);
 }

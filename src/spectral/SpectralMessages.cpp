@@ -52,8 +52,8 @@ std::vector<std::byte> channelListRequest() {
     return request;
 }
 
-std::vector<int> parseChannelList(Bytes answer) {
-    if (answer.size() < kEntriesOffset) return {};
+std::optional<std::vector<int>> parseChannelList(Bytes answer) {
+    if (answer.size() < kEntriesOffset) return std::nullopt;
     const std::size_t returned = (answer.size() - kEntriesOffset) / kEntrySize;
     const std::size_t announced = readLittleEndian<std::uint32_t>(answer, kCountOffset);
     std::vector<int> channels(std::min({announced, kMaxEntries, returned}));

@@ -3,6 +3,7 @@
 #include <array>
 #include <cstddef>
 #include <cstdint>
+#include <optional>
 #include <span>
 #include <vector>
 
@@ -24,7 +25,8 @@ std::array<std::byte, kScanControlSize> scanControlRequest(bool enable);
 std::vector<std::byte> channelListRequest();
 
 /// The channel numbers of an answer, in its order, repeats included; no more than lie within `answer`.
-std::vector<int> parseChannelList(Bytes answer);
+/// Nothing if it is too short to have any.
+std::optional<std::vector<int>> parseChannelList(Bytes answer);
 
 /// What the module measured on one channel, as it sent it.
 class SampleRecord {

@@ -83,13 +83,19 @@ STORY(Routing, CommandsOfTheHotspotPortLeaveOneErrorLineWhenTheyCanNotBeRead, "{
         {R"({"CommandId":"GET_RADIO","Data":3})", data},
     };
     settle(story);
-    for (const auto& [message, line] : cases) {
+    const auto expectHeard = [&](const std::string& message, const std::string& line, const char* wanted) {
         story.forget();
         story.hotspot().sendRaw(message);
         story.advance(platform::Duration(0));
         story.expectOfLog(message, story.messages(), line);
-        story.expect("heard", heard(story), "");
-    }
+        story.expect("heard", heard(story), wanted);
+    };
+    for (const auto& [message, line] : cases)
+        expectHeard(message, line, "");
+    for (const char* name : {"5", "true", "{}", R"([\"cafe\"])", R"(\"0123456789abcdef0123456789abcdef!\")"})
+        expectHeard(
+            R"({"CommandId":"CONNECT_NETWORK","Data":"{\"NetWorkName\":)" + std::string(name) + "}\"}",
+            "connectBss failed.\nSend connection result to vexa.\n", "CONNECT_DISCONNECT");
 }
 
 }  // namespace

@@ -136,14 +136,17 @@ class Cycle(ScanStory):
 
 
 class Lists(ScanStory):
-    def test_a_list_forgets_the_values_and_one_that_fails_does_not(self):
+    def test_a_list_forgets_the_values_and_one_that_fails_or_is_cut_short_does_not(self):
         self.begin()
         self.send("GET_CHANNEL_LIST", "FULL_SCAN")
         self.advance(400)
         self.assertEqual(self.values(), [CONGESTION, NOISE])
         self.control.do("fail", call="WlanIhvControl", match="channelList", error=31)
-        known = json.loads(self.client.ask("GET_CHANNEL_LIST")["Data"])
-        self.assertEqual(known, [{"Channel": 1, "Order": 1}, {"Channel": 6, "Order": 2}])
+        for cut in (None, 0, 43):
+            if cut is not None:
+                self.control.do("reply", match="channelList", dataHex="00" * cut)
+            known = json.loads(self.client.ask("GET_CHANNEL_LIST")["Data"])
+            self.assertEqual(known, [{"Channel": 1, "Order": 1}, {"Channel": 6, "Order": 2}], cut)
         self.advance(4000)
         self.assertEqual(self.values(), [])
         self.control.do("levels", levels={"1": {"congestion": 80, "power": 60, "spread": 0}})

@@ -1,6 +1,7 @@
 #include <gtest/gtest.h>
 
 #include "platform/Account.h"
+#include "platform/CodePage.h"
 #include "platform/DebugOutput.h"
 #include "platform/Files.h"
 #include "platform/KnownFolders.h"
@@ -32,6 +33,11 @@ TEST_F(Machine, ADebuggerHearsOneTextForEachCall) {
     outputDebugString(std::string_view("two\n"));
     outputDebugString(std::wstring_view(L"three"));
     EXPECT_EQ(world.debugLines(), (std::vector<std::string>{"one", "two", "three"}));
+}
+
+TEST_F(Machine, ACodePageHasAMarkForWhatItLacks) {
+    EXPECT_EQ(inCodePage(L""), "");
+    EXPECT_EQ(inCodePage(L"caf\u00e9 \u4e2d!"), "caf\xE9 ?!");
 }
 
 TEST_F(Machine, ThePublicFolderIsThereAndHasNoBackslashAtItsEnd) {
