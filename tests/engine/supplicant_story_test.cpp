@@ -5,6 +5,7 @@
 #include "connection/Supplicant.h"
 #include "connection/SupplicantMgr.h"
 #include "engine/world/ConnectStory.h"
+#include "platform/Thread.h"
 
 namespace vexa::test {
 namespace {
@@ -42,6 +43,19 @@ STORY(SupplicantStory, ComesAndGoesWithTheAdapterAndLeavesNoHandle, "{}") {
         expectState(story, "initialised");
         story.expect("handles", handles(story), before);
     }
+}
+
+STORY(SupplicantStory, ARemovalIsToldWhileTheConnectingThreadStillSleeps, "{}") {
+    platform::Thread pull;
+    pull.start("pull", [&] { story.act("pullAdapter"); });
+    story.advance(1s);
+    for (Client* client : {&story.spectral(), &story.hotspot()}) {
+        const auto events = client->events();
+        story.expect("heard", events.empty() ? "" : events.back().id, "CARD_PLUG_OUT");
+    }
+    story.expect("still there", supplicantOf(kFirst) != nullptr, true);
+    pull.join(30s);
+    expectState(story, "none");
 }
 
 STORY(SupplicantStory, AnAdapterIsKnownHoweverItsIdentifierIsWritten,

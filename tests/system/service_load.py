@@ -90,7 +90,7 @@ class Messages(Story):
     def test_clients_that_come_and_go_disturb_nobody_and_miss_nothing(self):
         for _ in range(50):
             vanishing = self.machine.sa()
-            vanishing.send_frame(TEXT, COMMAND[:13], final=False)
+            vanishing.send_frame(TEXT, COMMAND, final=False)  # whole, but for the end of its message
             vanishing.close()
             passing = self.machine.sa()
             passing.send("GET_CURRENT_CHANNEL")

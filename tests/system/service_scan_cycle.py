@@ -29,6 +29,12 @@ def samples(*congestions, count=None, magic=MAGIC):
     return header(SAMPLES, magic) + struct.pack("<H", announced) + b"".join(records)
 
 
+def debug_texts(what, result):
+    operation = {"start": "OnStartFullScan()", "stop": "OnStopScan()"}[what]
+    ends = {0: ["dwErr == ERROR_SUCCESS"], 31: ["dwErr=0x1f"] if what == "start" else []}[result]
+    return [f"portlink begin spectral {operation}", *(f"portlink spectral {operation} {end}" for end in ends)]
+
+
 class ScanStory(Story):
     def begin(self, **spectrum):
         levels = {"1": {"congestion": 30, "power": 60, "spread": 0}}
@@ -84,11 +90,14 @@ class Requests(ScanStory):
         ):
             with self.subTest(commands, failing=failing):
                 self.control.do("clearCalls")
+                before = len(self.machine.debug_log().splitlines())
                 if failing is not None:
                     self.control.do("fail", call="WlanIhvControl", match="scan", error=31, **failing)
                 self.send(*commands)
                 self.advance(3 * PERIOD)
                 self.assertEqual([(what, result) for what, _, result in self.requests()], asked)
+                said = [line for line in self.machine.debug_log().splitlines()[before:] if line.startswith("portlink")]
+                self.assertEqual(said, [text for request in asked for text in debug_texts(*request)])
 
 
 class Cycle(ScanStory):

@@ -156,14 +156,16 @@ class Strangers(unittest.TestCase):
 class Silent(unittest.TestCase):
     def test_clients_of_ours_that_say_nothing_shut_nobody_out(self):
         with Machine({"speed": 20}) as machine:
-            early = connect(machine.sa_port)
-            early.sendall(HALF_A_REQUEST)
+            early = [connect(machine.sa_port) for _ in range(MOST_OUTSIDE - 1)]
+            for connection in early:
+                connection.sendall(HALF_A_REQUEST)
             silent = [connect(machine.sa_port) for _ in range(2 * MOST_OUTSIDE)]
             WebSocket(machine.sa_port).close()
             self.assertLessEqual(accepted_at(machine.sa_port), MOST_OUTSIDE + 1)
-            early.sendall(REST + b"\r\n")
-            self.assertTrue(early.recv(100).startswith(b"HTTP/1.1 101"))
-            for connection in (early, *silent):
+            for connection in early:
+                connection.sendall(REST + b"\r\n")
+                self.assertTrue(connection.recv(100).startswith(b"HTTP/1.1 101"))
+            for connection in (*early, *silent):
                 connection.close()
 
 

@@ -1,18 +1,26 @@
 #include "platform/Files.h"
 
+#include <fcntl.h>
+#include <io.h>
+#include <windows.h>
+// After <windows.h>.
+#include <sddl.h>
+
 #include <algorithm>
 #include <array>
+#include <cstdint>
 #include <cstdio>
 #include <limits>
 #include <utility>
 
 #include "platform/windows/Handle.h"
+#include "platform/windows/ProcessUser.h"
 
 namespace vexa::platform {
 
-// All files keep the access rights that they inherit from their folder, which is one that all users share:
-// the configuration is one file for all of them, and whichever user saves it replaces the file of another.
-// The log lies in a folder of the same tree, so that who supports a user can read it under his own account.
+// The store keeps the access rights that it inherits from its folder, which all users share: the
+// configuration is one file for all of them, and whichever user saves it replaces the file of another. A log
+// is of one user and can hold his passwords: it is for him alone, and for those who own the machine.
 
 namespace {
 
@@ -57,6 +65,30 @@ bool meansInUse(DWORD error) {
 struct CloseFile {
     void operator()(std::FILE* file) const { std::fclose(file); }
 };
+
+using SecurityDescriptor = Owned<PSECURITY_DESCRIPTOR, &::LocalFree>;
+
+// All rights for the system, the administrators and the user of this process, and nothing inherited. Empty if
+// the user can't be told.
+SecurityDescriptor ownerOnly() {
+    SecurityDescriptor descriptor;
+    const Storage user = userOf(GetCurrentProcess());
+    Owned<LPWSTR, &::LocalFree> sid;
+    if (user.empty() || ConvertSidToStringSidW(sidOf(user), sid.receive()) == 0) return descriptor;
+    const std::wstring rights = L"D:P(A;;FA;;;SY)(A;;FA;;;BA)(A;;FA;;;" + std::wstring(sid.get()) + L")";
+    ConvertStringSecurityDescriptorToSecurityDescriptorW(rights.c_str(), SDDL_REVISION_1,
+                                                         descriptor.receive(), nullptr);
+    return descriptor;
+}
+
+// The rights of a file that exists stay what they are.
+Handle openOwnersFile(const std::string& narrowPath) {
+    const SecurityDescriptor descriptor = ownerOnly();
+    if (!descriptor) return {};
+    SECURITY_ATTRIBUTES attributes{sizeof attributes, descriptor.get(), FALSE};
+    return Handle(CreateFileA(narrowPath.c_str(), FILE_APPEND_DATA | SYNCHRONIZE, kShareAll, &attributes,
+                              OPEN_ALWAYS, FILE_ATTRIBUTE_NORMAL, nullptr));
+}
 
 }  // namespace
 
@@ -161,7 +193,11 @@ FolderLock& FolderLock::operator=(FolderLock&&) noexcept = default;
 
 // By the C runtime, which ends the lines of a text file as this system's editors want it.
 std::optional<std::size_t> appendToFile(const std::string& narrowPath, std::string_view text) {
-    const std::unique_ptr<std::FILE, CloseFile> file(std::fopen(narrowPath.c_str(), "a+"));
+    Handle handle = openOwnersFile(narrowPath);
+    if (!handle) return std::nullopt;
+    const int descriptor =
+        _open_osfhandle(reinterpret_cast<std::intptr_t>(handle.release()), _O_APPEND | _O_TEXT);
+    const std::unique_ptr<std::FILE, CloseFile> file(_fdopen(descriptor, "a"));
     if (!file) return std::nullopt;
     const std::size_t taken = std::fwrite(text.data(), 1, text.size(), file.get());
     return std::fflush(file.get()) == 0 ? taken : 0;

@@ -27,6 +27,9 @@ public:
         if (m_raw != nullptr) close(std::exchange(m_raw, nullptr));
     }
 
+    /// Leaves it to the caller.
+    Raw release() { return std::exchange(m_raw, nullptr); }
+
     /// Where a call that gives its result through a pointer puts it.
     Raw* receive() {
         reset();

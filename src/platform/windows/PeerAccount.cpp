@@ -5,12 +5,11 @@
 #include <iphlpapi.h>
 
 #include <algorithm>
-#include <cstddef>
 #include <optional>
 #include <span>
 #include <vector>
 
-#include "platform/windows/Handle.h"
+#include "platform/windows/ProcessUser.h"
 
 namespace vexa::platform {
 
@@ -21,13 +20,6 @@ constexpr int kTableTries = 5;
 constexpr DWORD kSpareRows = 64;
 // While other connections come and go, a table can lack a row that is there, or its owner.
 constexpr int kLooks = 3;
-
-/// Memory for a structure whose size only the operating system knows.
-using Storage = std::vector<std::max_align_t>;
-
-void makeRoom(Storage& storage, DWORD size) {
-    storage.resize(size / sizeof(std::max_align_t) + 1);
-}
 
 bool readTable(Storage& table) {
     DWORD size = 0;
@@ -54,22 +46,6 @@ std::optional<DWORD> ownerIn(const Storage& storage, const PeerPorts& connection
                ntohs(static_cast<u_short>(row.dwRemotePort)) == connection.server;
     });
     return found != rows.end() ? std::optional(found->dwOwningPid) : std::nullopt;
-}
-
-/// The user of a process: a TOKEN_USER; empty if it can't be told.
-Storage userOf(HANDLE process) {
-    Handle token;
-    if (OpenProcessToken(process, TOKEN_QUERY, token.receive()) == 0) return {};
-    DWORD size = 0;
-    GetTokenInformation(token.get(), TokenUser, nullptr, 0, &size);
-    Storage user;
-    makeRoom(user, size);
-    if (GetTokenInformation(token.get(), TokenUser, user.data(), size, &size) == 0) return {};
-    return user;
-}
-
-PSID sidOf(const Storage& user) {
-    return reinterpret_cast<const TOKEN_USER*>(user.data())->User.Sid;
 }
 
 // A process that has ended can still be opened as long as somebody else has it open.

@@ -1,7 +1,13 @@
 #include <gtest/gtest.h>
 
+#include <windows.h>
+// After <windows.h>.
+#include <aclapi.h>
+
 #include "platform/Files.h"
 #include "platform/windows/Handle.h"
+#include "platform/windows/ProcessUser.h"
+#include "text/TextConversion.h"
 #include "unit/platform/MachineWorld.h"
 
 namespace vexa::platform {
@@ -35,6 +41,28 @@ TEST(WindowsFiles, AFileThatIsHeldCanBeReadByOthersAndWrittenByNone) {
     constexpr DWORD kAll = FILE_SHARE_READ | FILE_SHARE_WRITE | FILE_SHARE_DELETE;
     EXPECT_TRUE(openSharing(path, GENERIC_READ, kAll));
     EXPECT_FALSE(openSharing(path, GENERIC_WRITE, kAll));
+}
+
+TEST(WindowsFiles, ALogIsForItsOwnerAndThoseWhoOwnTheMachine) {
+    const test::MachineWorld world;
+    const std::wstring path = world.folder() + L"\\log.txt";
+    ASSERT_TRUE(appendToFile(narrowFromWide(path), "line\n"));
+    Owned<PSECURITY_DESCRIPTOR, &::LocalFree> descriptor;
+    PACL list = nullptr;
+    ASSERT_EQ(GetNamedSecurityInfoW(path.c_str(), SE_FILE_OBJECT, DACL_SECURITY_INFORMATION, nullptr, nullptr,
+                                    &list, nullptr, descriptor.receive()),
+              DWORD{ERROR_SUCCESS});
+    ASSERT_NE(list, nullptr);
+    const Storage user = userOf(GetCurrentProcess());
+    for (DWORD i = 0; i < list->AceCount; ++i) {
+        ACCESS_ALLOWED_ACE* entry = nullptr;
+        ASSERT_NE(GetAce(list, i, reinterpret_cast<void**>(&entry)), 0);
+        PSID const who = &entry->SidStart;
+        EXPECT_TRUE(EqualSid(who, sidOf(user)) || IsWellKnownSid(who, WinLocalSystemSid) ||
+                    IsWellKnownSid(who, WinBuiltinAdministratorsSid))
+            << "entry " << i;
+    }
+    EXPECT_EQ(readFile(path), "line\r\n");
 }
 
 }  // namespace
