@@ -2,11 +2,26 @@
 
 #include <json/value.h>
 
+#include <new>
 #include <optional>
 #include <string>
 #include <string_view>
 
+#include "text/OutOfMemory.h"
+
 namespace vexa {
+
+/// withinMemory() for work with JSON, whose library tells in its own way that there is no memory for a text.
+template <class Work>
+[[nodiscard]] bool withinMemoryOfJson(Work&& work) {
+    return withinMemory([&] {
+        try {
+            work();
+        } catch (const Json::RuntimeError&) {
+            throw std::bad_alloc();
+        }
+    });
+}
 
 /// The form in which every JSON text leaves this process: members sorted, indented by 3, a line end at the
 /// end.

@@ -1,7 +1,10 @@
 #include "config/Config.h"
 
 #include <algorithm>
+#include <new>
 #include <string_view>
+#include <tuple>
+#include <utility>
 
 #include "base/DiagnosticLog.h"
 #include "config/SafeSave.h"
@@ -11,6 +14,7 @@
 #include "platform/Files.h"
 #include "platform/KnownFolders.h"
 #include "platform/Registry.h"
+#include "text/OutOfMemory.h"
 #include "text/ScopeGuard.h"
 #include "text/TextConversion.h"
 
@@ -78,9 +82,21 @@ ResultCode Config::readConfig(bool* configChanged) {
     if (const ResultCode result = openDocument(); result != kSuccess) return result;
     readGlobalSettings();
     bool isChanged = false;
-    if (readCredentials() != kSuccess || readUsers(isChanged) != kSuccess) return kFailure;
+    if (readTable(isChanged) != kSuccess) return kFailure;
     if (configChanged != nullptr) *configChanged = isChanged;
     return kSuccess;
+}
+
+// A table that was read in part would take the rest out of the file when it is saved.
+ResultCode Config::readTable(bool& isChanged) {
+    CredentialTable before = std::exchange(m_credentials, {});
+    try {
+        const bool isRead = readCredentials() == kSuccess && readUsers(isChanged) == kSuccess;
+        return isRead ? kSuccess : kFailure;
+    } catch (const std::bad_alloc&) {
+        m_credentials = std::move(before);
+        throw;
+    }
 }
 
 bool Config::readFlag(const char* xpath, bool missing) {
@@ -148,8 +164,10 @@ void Config::readAutoConnectFromRegistry() {
 // However many of the three are lost, as with a full disk, one line tells of it.
 ResultCode Config::saveConfig() {
     m_bSaveFailed = false;
-    const bool isDone =
-        saveNextCredId() == kSuccess && saveCredentials() == kSuccess && saveUsers() == kSuccess;
+    bool isDone = false;
+    std::ignore = withinMemory([&]() NO_THREAD_SAFETY_ANALYSIS {
+        isDone = saveNextCredId() == kSuccess && saveCredentials() == kSuccess && saveUsers() == kSuccess;
+    });
     if (!isDone || m_bSaveFailed) Log(6, "ERROR: Saving the configuration file failed.");
     return isDone ? kSuccess : kFailure;
 }
@@ -162,13 +180,13 @@ ResultCode Config::saveNextCredId() {
     Node node;
     m_xmlDoc.selectSingleNode("/*/global/nextcredid", Node(), node);
     if (node) {
-        XmlDocument::setText(node, number);
+        if (XmlDocument::setText(node, number) != kSuccess) return kFailure;
     } else {
         Log(6, "ERROR: No nextcredid node in the config xml file.");
         Node global;
         m_xmlDoc.selectSingleNode("/*/global", Node(), global);
         if (!global && m_xmlDoc.setChild("global", L"", Node(), true, &global) != kSuccess) return kFailure;
-        m_xmlDoc.setChild("nextcredid", number, global, true);
+        if (m_xmlDoc.setChild("nextcredid", number, global, true) != kSuccess) return kFailure;
     }
     saveDocument();
     return kSuccess;

@@ -65,6 +65,7 @@ private:
     void deriveDumpFilePath() REQUIRES(g_hs20Lock);
     void readAutoConnectFromRegistry();
 
+    ResultCode readTable(bool& isChanged) REQUIRES(g_hs20Lock);
     ResultCode readCredentials() REQUIRES(g_hs20Lock);
     void readCredential(Node node) REQUIRES(g_hs20Lock);
     void repairNextCredId() REQUIRES(g_hs20Lock);

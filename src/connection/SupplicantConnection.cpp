@@ -1,5 +1,6 @@
 #include <cstddef>
 #include <string_view>
+#include <utility>
 
 #include "base/DiagnosticLog.h"
 #include "base/WlanText.h"
@@ -91,10 +92,11 @@ ResultCode Supplicant::onConnectionComplete(const WLAN_CONNECTION_NOTIFICATION_D
 }
 
 ResultCode Supplicant::onOwnResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::uint32_t& eapMethod) {
-    const std::wstring name = profileNameOf(data);
-    LogWide(3, L"Connection result initiated by HS20, clearing the cache, profile name=%s.", name.c_str());
+    // Before anything that memory may not allow: the attempt has ended.
     m_connectingSsid.clear();
     m_engine.m_bConnectionStarted = false;
+    const std::wstring name = profileNameOf(data);
+    LogWide(3, L"Connection result initiated by HS20, clearing the cache, profile name=%s.", name.c_str());
     if (m_bManualConnectPending) return carryOutPendingRequest();
     m_engine.m_hConnectionCompletedEvent.set();
     NetworkProfile* profile = nullptr;
@@ -109,8 +111,8 @@ ResultCode Supplicant::onOwnResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data
 ResultCode Supplicant::carryOutPendingRequest() {
     Log(3, "###User manual connecting request pending, we are going to connect now.###");
     if (m_pendingManualSsid.empty()) return kFailure;
-    const bool isStarted = connectBssNow(m_pendingManualSsid) == kSuccess;
     m_bManualConnectPending = false;
+    const bool isStarted = connectBssNow(m_pendingManualSsid) == kSuccess;
     if (!isStarted)
         tellClient([](const ClientEvents& events) { events.sendConnectionResult(ConnectionResult{}); });
     return kSuccess;
@@ -206,10 +208,11 @@ ResultCode Supplicant::report(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std
 // The client hears of a success, whatever the reason: the connection was none of this program's.
 ResultCode Supplicant::onForeignResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data) {
     const bool isSuccess = data.wlanReasonCode == 0;
+    const bool isStartKnown = std::exchange(m_bConnectionStartedByOs, false);
     LogWide(3, L"Connection result not initiated by HS20, profile name=%s, result=%s",
             profileNameOf(data).c_str(), isSuccess ? L"Success" : L"Failure");
     setState(isSuccess ? SupplicantState::Connected : SupplicantState::Disconnected);
-    if (!m_bConnectionStartedByOs)
+    if (!isStartKnown)
         Log(6, "ERROR: m_bConnectionStartedByOs is not set to true when connecting completed.");
     ConnectionResult result;
     result.m_result = ConnectionResult::kSucceeded;
@@ -217,7 +220,6 @@ ResultCode Supplicant::onForeignResult(const WLAN_CONNECTION_NOTIFICATION_DATA& 
         events.sendConnectionResult(result);
         events.sendInternetAccess();
     });
-    m_bConnectionStartedByOs = false;
     return kSuccess;
 }
 

@@ -8,6 +8,7 @@
 #include <utility>
 
 #include "base/DiagnosticLog.h"
+#include "text/OutOfMemory.h"
 
 namespace vexa {
 
@@ -67,6 +68,13 @@ Hs20Network* Hs20NetworkList::findBySsid(std::string_view ssid) const {
     return found == m_networks.end() ? nullptr : found->get();
 }
 
+Hs20NetworkList Hs20NetworkList::copy() const {
+    Hs20NetworkList copy;
+    for (const auto& network : m_networks)
+        copy.m_networks.push_back(std::make_unique<Hs20Network>(*network));
+    return copy;
+}
+
 std::vector<Hs20Network*> Hs20NetworkList::copyPointers() const {
     std::vector<Hs20Network*> pointers;
     pointers.reserve(m_networks.size());
@@ -92,7 +100,8 @@ Hs20NetworkList::Networks Hs20NetworkList::replace(const std::vector<Hs20BssReco
     for (const Hs20BssRecord& record : records) {
         const auto found = known.find(record.macAddress);
         if (found == known.end() || found->second.empty()) {
-            updated.push_back(buildNew(record));
+            if (!withinMemory([&] { updated.push_back(buildNew(record)); }))
+                Log(6, "ERROR: Invalid HS20 network pointer.");
             continue;
         }
         updated.push_back(std::move(found->second.front()));
