@@ -6,8 +6,12 @@
 #include <chrono>
 #include <condition_variable>
 #include <cstdint>
+#include <functional>
 #include <mutex>
 #include <thread>
+#include <utility>
+
+#include "text/OutOfMemory.h"
 
 namespace vexa {
 
@@ -16,7 +20,9 @@ namespace vexa {
 /// message.
 class IpcStandby {
 public:
-    explicit IpcStandby(boost::asio::io_context& io) : m_io(io) {}
+    /// `isShort` is called where memory runs out in the input and output.
+    IpcStandby(boost::asio::io_context& io, std::function<void()> isShort)
+        : m_io(io), m_isShort(std::move(isShort)) {}
 
     void start();
     void stop();
@@ -36,6 +42,7 @@ private:
     void helpDuring(std::uint64_t phase);
 
     boost::asio::io_context& m_io;
+    const std::function<void()> m_isShort;
     std::atomic<std::uint64_t> m_phase{0};  // odd during a call
     std::atomic<bool> m_isAwake{false};
     std::mutex m_mutex;
@@ -95,9 +102,12 @@ inline void IpcStandby::watch(std::unique_lock<std::mutex>& lock) {
 
 // What became ready here just before the end of the help needs somebody to take it on.
 inline void IpcStandby::helpDuring(std::uint64_t phase) {
-    while (m_phase == phase && m_io.run_one() > 0) {
-    }
-    boost::asio::post(m_io, [] {});
+    const bool isHelp = withinMemory([&] {
+        while (m_phase == phase && m_io.run_one() > 0) {
+        }
+        boost::asio::post(m_io, [] {});
+    });
+    if (!isHelp) m_isShort();
 }
 
 }  // namespace vexa

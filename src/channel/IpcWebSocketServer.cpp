@@ -23,6 +23,7 @@
 #include "channel/IpcSession.h"
 #include "channel/IpcStandby.h"
 #include "platform/Thread.h"
+#include "text/OutOfMemory.h"
 
 namespace vexa {
 
@@ -36,6 +37,7 @@ using ClientId = IpcWebSocketServer::ClientId;
 
 constexpr std::uint16_t kGoingAway = 1001;
 constexpr std::chrono::milliseconds kFarewellLimit{500};
+constexpr std::chrono::milliseconds kShortagePause{10};
 
 }  // namespace
 
@@ -67,8 +69,12 @@ private:
     void left(ClientId client) override;
     void received(std::shared_ptr<IpcSession> session, std::string message) override;
 
+    void run();
+    void beginAnew();
     void flushOutbox();
     void dispatch();
+    void passOn();
+    bool handleFirst();
     void handle(const Incoming& incoming);
     void sayFarewell();
 
@@ -84,9 +90,10 @@ private:
     std::atomic<bool> m_isStopped{false};
     std::mutex m_outboxMutex;
     std::vector<Outgoing> m_outbox;
+    bool m_isFlushPosted = false;
     std::mutex m_inboxMutex;
     std::deque<Incoming> m_inbox;  // in front the message that is being handled
-    IpcStandby m_standby{m_io};
+    IpcStandby m_standby{m_io, [this] { beginAnew(); }};
     std::thread m_thread;
 };
 
@@ -94,12 +101,28 @@ bool IpcWebSocketServer::Impl::start() {
     asio::post(m_inout, [this] { m_entrance.accept(); });
     try {
         m_standby.start();
-        m_thread = std::thread([this] { m_io.run(); });
+        m_thread = std::thread([this] { run(); });
         return true;
     } catch (const std::system_error&) {
         stop();
         return false;
     }
+}
+
+void IpcWebSocketServer::Impl::run() {
+    while (!withinMemory([this] { m_io.run(); }))
+        beginAnew();
+}
+
+// Where memory ran out, something of some client has ended half way: all are dropped, and may come back.
+void IpcWebSocketServer::Impl::beginAnew() {
+    const auto begin = [this] {
+        m_entrance.resetAll();
+        m_isStopped ? m_io.stop() : m_entrance.acceptAnew();
+    };
+    do
+        std::this_thread::sleep_for(kShortagePause);
+    while (!withinMemory([&] { asio::post(m_inout, begin); }));
 }
 
 void IpcWebSocketServer::Impl::entered(std::shared_ptr<IpcSession> session) {
@@ -119,9 +142,11 @@ void IpcWebSocketServer::Impl::queue(ClientId client, std::string_view message) 
     {
         const std::lock_guard lock(m_outboxMutex);
         m_outbox.push_back(std::move(outgoing));
-        if (m_outbox.size() > 1) return;
+        if (std::exchange(m_isFlushPosted, true)) return;
     }
-    asio::post(m_inout, [this] { flushOutbox(); });
+    if (withinMemory([this] { asio::post(m_inout, [this] { flushOutbox(); }); })) return;
+    const std::lock_guard lock(m_outboxMutex);
+    m_isFlushPosted = false;  // it goes with the next message
 }
 
 void IpcWebSocketServer::Impl::flushOutbox() {
@@ -129,6 +154,7 @@ void IpcWebSocketServer::Impl::flushOutbox() {
     {
         const std::lock_guard lock(m_outboxMutex);
         outgoing.swap(m_outbox);
+        m_isFlushPosted = false;
     }
     if (outgoing.empty()) return;
     // Who does not read is dropped from the map meanwhile.
@@ -149,11 +175,28 @@ void IpcWebSocketServer::Impl::received(std::shared_ptr<IpcSession> session, std
         if (m_inbox.size() > 1) return;
     }
     platform::beginForeignWork();
-    asio::defer(m_io, [this] { dispatch(); });
+    if (!withinMemory([this] { asio::defer(m_io, [this] { dispatch(); }); })) passOn();
 }
 
 // What was queued for sending meanwhile, by whomever, is written before the next message is handled.
 void IpcWebSocketServer::Impl::dispatch() {
+    while (handleFirst() && !withinMemory([this] { asio::post(m_inout, [this] { passOn(); }); })) {
+    }
+}
+
+// Without the memory for it the next message is handled here: the chain must not break.
+void IpcWebSocketServer::Impl::passOn() {
+    const bool isPassedOn = withinMemory([this] {
+        flushOutbox();
+        asio::post(m_io, [this] { dispatch(); });
+    });
+    if (isPassedOn) return;
+    beginAnew();
+    dispatch();
+}
+
+// False: it was the last one.
+bool IpcWebSocketServer::Impl::handleFirst() {
     std::unique_lock lock(m_inboxMutex);
     const Incoming& incoming = m_inbox.front();  // stays where it is when others come
     lock.unlock();
@@ -163,18 +206,18 @@ void IpcWebSocketServer::Impl::dispatch() {
     m_inbox.pop_front();
     const bool isLast = m_inbox.empty();
     lock.unlock();
-    if (isLast) return platform::endForeignWork();
-    asio::post(m_inout, [this] {
-        flushOutbox();
-        asio::post(m_io, [this] { dispatch(); });
-    });
+    if (isLast) platform::endForeignWork();
+    return !isLast;
 }
 
 void IpcWebSocketServer::Impl::handle(const Incoming& incoming) {
     m_standby.callBegins();
-    if (!m_isStopped) m_handler(incoming.session->id(), incoming.message);
+    const bool isHandled = withinMemory([&] {
+        if (!m_isStopped) m_handler(incoming.session->id(), incoming.message);
+    });
     m_standby.callEnds();
-    incoming.session->messageHandled(incoming.message.size());
+    if (!withinMemory([&] { incoming.session->messageHandled(incoming.message.size()); }) || !isHandled)
+        beginAnew();
 }
 
 void IpcWebSocketServer::Impl::sayFarewell() {
@@ -188,10 +231,13 @@ void IpcWebSocketServer::Impl::sayFarewell() {
 // A handler that runs now is waited for by the join; messages that still wait for it are dropped.
 void IpcWebSocketServer::Impl::stop() {
     if (m_isStopped.exchange(true)) return;
-    asio::post(m_inout, [this] {
-        flushOutbox();
-        sayFarewell();
+    const bool isFarewell = withinMemory([this] {
+        asio::post(m_inout, [this] {
+            flushOutbox();
+            sayFarewell();
+        });
     });
+    if (!isFarewell) m_io.stop();
     {
         const platform::ForeignWait waiting;
         if (m_thread.joinable()) m_thread.join();
