@@ -2,6 +2,8 @@
 
 #include <algorithm>
 
+#include "simulation/parts/MachineCode.h"
+
 namespace vexa::simulation {
 
 using platform::Event;
@@ -103,6 +105,7 @@ void NotificationQueue::stop() {
 }
 
 void NotificationQueue::run() {
+    const MachineCode here;
     for (;;) {
         Item item;
         if (takeNext(item)) {
@@ -138,9 +141,14 @@ void NotificationQueue::deliver(Item& item) {
         block.InterfaceGuid = notification.guid;
         block.dwDataSize = static_cast<DWORD>(data.size());
         block.pData = data.empty() ? nullptr : data.data();
-        receiver->callback(&block, receiver->context);
+        call(*receiver, block);
         endCallback(*receiver);
     }
+}
+
+void NotificationQueue::call(const Registration& receiver, WLAN_NOTIFICATION_DATA& block) {
+    const MachineCode theProgram(false);
+    receiver.callback(&block, receiver.context);
 }
 
 bool NotificationQueue::beginCallback(Registration& registration) {

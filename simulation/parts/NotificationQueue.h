@@ -65,6 +65,7 @@ private:
     void run();
     bool takeNext(Item& item);
     void deliver(Item& item);
+    static void call(const Registration& receiver, WLAN_NOTIFICATION_DATA& block);
     bool beginCallback(Registration& registration);
     void endCallback(Registration& registration);
     void finish(Ticket ticket);

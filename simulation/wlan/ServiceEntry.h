@@ -3,6 +3,7 @@
 #include <string_view>
 
 #include "simulation/Machine.h"
+#include "simulation/parts/MachineCode.h"
 
 namespace vexa::simulation {
 

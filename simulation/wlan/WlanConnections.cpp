@@ -15,6 +15,7 @@ using vexa::simulation::Bytes;
 using vexa::simulation::ConnectionWish;
 using vexa::simulation::kServiceNotActive;
 using vexa::simulation::Machine;
+using vexa::simulation::MachineCode;
 
 // Empty where there is none, or none that can be.
 Bytes ssidOf(const WLAN_CONNECTION_PARAMETERS& parameters) {
@@ -82,6 +83,7 @@ Json::Value detailsOf(const WLAN_CONNECTION_PARAMETERS* parameters) {
 }  // namespace
 
 DWORD WlanConnect(HANDLE handle, const GUID* guid, PWLAN_CONNECTION_PARAMETERS parameters, PVOID reserved) {
+    const MachineCode here;
     Machine* const machine = Machine::current();
     if (!machine) return kServiceNotActive;
     if (reserved) return ERROR_INVALID_PARAMETER;
@@ -93,6 +95,7 @@ DWORD WlanConnect(HANDLE handle, const GUID* guid, PWLAN_CONNECTION_PARAMETERS p
 }
 
 DWORD WlanDisconnect(HANDLE handle, const GUID* guid, PVOID reserved) {
+    const MachineCode here;
     Machine* const machine = Machine::current();
     if (!machine) return kServiceNotActive;
     if (reserved) return ERROR_INVALID_PARAMETER;
@@ -103,6 +106,7 @@ DWORD WlanDisconnect(HANDLE handle, const GUID* guid, PVOID reserved) {
 }
 
 DWORD WlanReasonCodeToString(DWORD reason, DWORD size, LPWSTR buffer, PVOID reserved) {
+    const MachineCode here;
     Machine* const machine = Machine::current();
     if (!machine) return kServiceNotActive;
     if (const auto error = machine->faults().nextError("WlanReasonCodeToString")) return *error;

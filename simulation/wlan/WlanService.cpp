@@ -17,6 +17,7 @@ using vexa::simulation::Bytes;
 using vexa::simulation::IhvRequest;
 using vexa::simulation::kServiceNotActive;
 using vexa::simulation::Machine;
+using vexa::simulation::MachineCode;
 
 constexpr DWORD kNegotiatedVersion = 2;
 
@@ -79,6 +80,7 @@ std::span<T> block(PVOID data, DWORD size) {
 }  // namespace
 
 DWORD WlanOpenHandle(DWORD /*clientVersion*/, PVOID reserved, PDWORD negotiatedVersion, PHANDLE handle) {
+    const MachineCode here;
     Machine* const machine = Machine::current();
     if (!machine) return kServiceNotActive;
     if (const auto error = machine->faults().nextError("WlanOpenHandle")) return *error;
@@ -89,6 +91,7 @@ DWORD WlanOpenHandle(DWORD /*clientVersion*/, PVOID reserved, PDWORD negotiatedV
 }
 
 DWORD WlanCloseHandle(HANDLE handle, PVOID /*reserved*/) {
+    const MachineCode here;
     Machine* const machine = Machine::current();
     const DWORD admitted = admit(machine, handle, "WlanCloseHandle");
     if (admitted != ERROR_SUCCESS) return admitted;
@@ -98,6 +101,7 @@ DWORD WlanCloseHandle(HANDLE handle, PVOID /*reserved*/) {
 }
 
 DWORD WlanEnumInterfaces(HANDLE handle, PVOID reserved, PWLAN_INTERFACE_INFO_LIST* list) {
+    const MachineCode here;
     Machine* const machine = Machine::current();
     const DWORD admitted = admit(machine, handle, "WlanEnumInterfaces");
     if (admitted != ERROR_SUCCESS) return admitted;
@@ -114,6 +118,7 @@ void WlanFreeMemory(PVOID memory) {
 
 DWORD WlanQueryInterface(HANDLE handle, const GUID* guid, WLAN_INTF_OPCODE opcode, PVOID /*reserved*/,
                          PDWORD size, PVOID* data, WLAN_OPCODE_VALUE_TYPE* valueType) {
+    const MachineCode here;
     Machine* const machine = Machine::current();
     const DWORD result = queryInterface(machine, handle, guid, opcode, size, data);
     if (!machine) return result;
@@ -127,6 +132,7 @@ DWORD WlanQueryInterface(HANDLE handle, const GUID* guid, WLAN_INTF_OPCODE opcod
 DWORD WlanRegisterNotification(HANDLE handle, DWORD sources, BOOL /*ignoreDuplicate*/,
                                WLAN_NOTIFICATION_CALLBACK callback, PVOID context, PVOID reserved,
                                PDWORD previousSources) {
+    const MachineCode here;
     Machine* const machine = Machine::current();
     const DWORD admitted = admit(machine, handle, "WlanRegisterNotification");
     if (admitted != ERROR_SUCCESS) return admitted;
@@ -141,6 +147,7 @@ DWORD WlanRegisterNotification(HANDLE handle, DWORD sources, BOOL /*ignoreDuplic
 
 DWORD WlanIhvControl(HANDLE handle, const GUID* guid, WLAN_IHV_CONTROL_TYPE type, DWORD inSize,
                      PVOID inBuffer, DWORD outSize, PVOID outBuffer, PDWORD bytesReturned) {
+    const MachineCode here;
     Machine* const machine = Machine::current();
     if (!machine) return kServiceNotActive;
     const IhvCall call{handle, guid, type, block<const std::uint8_t>(inBuffer, inSize),

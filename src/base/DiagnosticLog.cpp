@@ -7,12 +7,14 @@
 #include <cstdio>
 #include <cwchar>
 #include <span>
+#include <tuple>
 #include <utility>
 #include <vector>
 
 #include "platform/Clock.h"
 #include "platform/Files.h"
 #include "text/NeverDestroyed.h"
+#include "text/OutOfMemory.h"
 #include "text/TextConversion.h"
 
 namespace vexa {
@@ -47,6 +49,12 @@ void addTimedLine(std::string text) {
     DiagnosticLog::instance().addLine(line, true);
 }
 
+// Whoever logs goes on without the line for which there is no memory.
+template <class Work>
+void logWithinMemory(Work&& work) {
+    if (!withinMemory(std::forward<Work>(work))) DiagnosticLog::instance().countLostLine();
+}
+
 // printf's `%s` takes a narrow string in a wide format everywhere but on Windows; `%ls` means the same on
 // both.
 std::wstring withWideStrings(std::wstring_view format) {
@@ -69,47 +77,54 @@ void Log(int level, const char* format, ...) {
     va_start(arguments, format);
     std::vsnprintf(text.data(), text.size(), format, arguments);
     va_end(arguments);
-    addTimedLine(text.data());
+    logWithinMemory([&] { addTimedLine(text.data()); });
 }
 
 void LogWide(int level, const wchar_t* format, ...) {
     if (!DiagnosticLog::isEnabled() || level < kLowestWrittenLevel) return;
-    std::vector<wchar_t> text(kBufferSize);
     std::va_list arguments;
     va_start(arguments, format);
-    std::vswprintf(text.data(), text.size(), withWideStrings(format).c_str(), arguments);
+    logWithinMemory([&] {
+        std::vector<wchar_t> text(kBufferSize);
+        std::vswprintf(text.data(), text.size(), withWideStrings(format).c_str(), arguments);
+        text.back() = L'\0';
+        addTimedLine(narrowByLocale(text.data()).text);
+    });
     va_end(arguments);
-    text.back() = L'\0';
-    addTimedLine(narrowByLocale(text.data()).text);
 }
 
 void LogHex(int /*level*/, const char* title, const void* data, std::size_t length) {
     if (!DiagnosticLog::isEnabled() || title == nullptr || data == nullptr || length == 0) return;
     constexpr std::size_t kTextPerByte = 3;
     const auto* const bytes = static_cast<const unsigned char*>(data);
-    std::string hex;
-    for (const unsigned char byte : std::span(bytes, std::min(length, kMaxText / kTextPerByte))) {
-        char text[kTextPerByte + 1];
-        std::snprintf(text, sizeof text, " %02x", byte);
-        hex += text;
-    }
-    DiagnosticLog& log = DiagnosticLog::instance();
-    log.addLine(title, true);
-    log.addLine(hex, false);
+    logWithinMemory([&] {
+        std::string hex;
+        for (const unsigned char byte : std::span(bytes, std::min(length, kMaxText / kTextPerByte))) {
+            char text[kTextPerByte + 1];
+            std::snprintf(text, sizeof text, " %02x", byte);
+            hex += text;
+        }
+        DiagnosticLog& log = DiagnosticLog::instance();
+        log.addLine(title, true);
+        log.addLine(hex, false);
+    });
 }
 
 void LogBytes(int level, const char* title, const void* data, std::int64_t length, bool appendNewline) {
     if (!DiagnosticLog::isEnabled() || title == nullptr || data == nullptr || length <= 0 ||
         level < kLowestWrittenLevel)
         return;
-    std::string text = timePrefix() + title;
     const auto* const bytes = static_cast<const unsigned char*>(data);
-    for (const unsigned char byte : std::span(bytes, std::min(static_cast<std::size_t>(length), kMaxText)))
-        text += std::isprint(byte) != 0 ? static_cast<char>(byte) : '_';
-    if (text.size() > kMaxText) text.resize(kMaxText);
-    DiagnosticLog& log = DiagnosticLog::instance();
-    log.addLine(text, true);
-    if (appendNewline) log.addLine("\n", false);
+    logWithinMemory([&] {
+        std::string text = timePrefix() + title;
+        for (const unsigned char byte :
+             std::span(bytes, std::min(static_cast<std::size_t>(length), kMaxText)))
+            text += std::isprint(byte) != 0 ? static_cast<char>(byte) : '_';
+        if (text.size() > kMaxText) text.resize(kMaxText);
+        DiagnosticLog& log = DiagnosticLog::instance();
+        log.addLine(text, true);
+        if (appendNewline) log.addLine("\n", false);
+    });
 }
 
 DiagnosticLog& DiagnosticLog::instance() {
@@ -163,6 +178,12 @@ void DiagnosticLog::addLine(std::string_view text, bool numbered) {
     m_lineCount = m_lines.size();
 }
 
+void DiagnosticLog::countLostLine() {
+    if (!m_bEnabled) return;
+    const LockGuard lock(g_hs20Lock);
+    ++m_lost;
+}
+
 void DiagnosticLog::dropOldest() {
     while (m_lines.size() > kMaxQueuedLines || (m_bDiskFull && m_bytes > kMaxBytesKept)) {
         m_bytes -= m_lines.front().size();
@@ -185,9 +206,7 @@ void DiagnosticLog::removeWritten(std::size_t bytes) {
 
 // A file that could not be opened is tried empty first: each line of a long queue comes here, and to join
 // them all for nothing would cost more than the queue is worth.
-void DiagnosticLog::flushToFile() {
-    if (!m_bEnabled) return;
-    const LockGuard lock(g_hs20Lock);
+void DiagnosticLog::writeQueue() {
     if (m_bFileFailed && !platform::appendToFile(m_filePath, {})) return;
     std::string text;
     if (m_lost > 0) text = timePrefix() + std::to_string(m_lost) + " lines of the log were lost.\n";
@@ -204,6 +223,13 @@ void DiagnosticLog::flushToFile() {
     m_bDiskFull = *taken < text.size();
     dropOldest();
     m_lineCount = m_lines.size();
+}
+
+// Without the memory to join them, the lines wait for the next time.
+void DiagnosticLog::flushToFile() {
+    if (!m_bEnabled) return;
+    const LockGuard lock(g_hs20Lock);
+    std::ignore = withinMemory([this]() NO_THREAD_SAFETY_ANALYSIS { writeQueue(); });
 }
 
 }  // namespace vexa

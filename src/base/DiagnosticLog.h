@@ -50,13 +50,17 @@ public:
     /// Appends to the queue, with the next number or as it is; writes the queue out first if it is long.
     void addLine(std::string_view text, bool numbered);
 
-    /// Writes out and empties the queue; leaves it alone if the file can't be opened. What a full disk
-    /// doesn't take is kept for later, the last of it.
+    /// Writes out and empties the queue; leaves it alone if the file can't be opened or memory runs out. What
+    /// a full disk doesn't take is kept for later, the last of it.
     void flushToFile();
+
+    /// A line for which there was no memory.
+    void countLostLine();
 
 private:
     void runThread();
     std::string nextNumber() REQUIRES(g_hs20Lock);
+    void writeQueue() REQUIRES(g_hs20Lock);
     void removeWritten(std::size_t bytes) REQUIRES(g_hs20Lock);
     void dropOldest() REQUIRES(g_hs20Lock);
 

@@ -1,6 +1,7 @@
 #include "base/IpInterface.h"
 
 #include <algorithm>
+#include <new>
 #include <string>
 
 #include "base/DiagnosticLog.h"
@@ -26,7 +27,7 @@ auto queryWithGrowingBuffer(const char* name, Query query) {
 
 }  // namespace
 
-bool IpInterface::find(const GUID& guid) {
+bool IpInterface::find(const GUID& guid) try {
     const std::string guidText = guidToString(guid);
     const auto list = queryWithGrowingBuffer("GetAdaptersAddresses", platform::getAdaptersAddresses);
     if (list.error != 0) return false;
@@ -45,6 +46,8 @@ bool IpInterface::find(const GUID& guid) {
     Log(2, "!!!Query interface mac address succeeded, mac address %02x:%02x:%02x:%02x:%02x:%02x", mac[0],
         mac[1], mac[2], mac[3], mac[4], mac[5]);
     return true;
+} catch (const std::bad_alloc&) {
+    return false;
 }
 
 bool IpInterface::hasInternetAccess() const {

@@ -20,7 +20,7 @@ IpcHandle IpcCreateServer(std::int32_t kind, std::int32_t options, IpcReceiveCal
                           std::int32_t port);
 
 /// Queues one message for every client; never blocks, any thread. 1 if at least one client took it; 0 if
-/// there is none, for handle 0 and for a closed handle.
+/// there is none, for handle 0, for a closed handle, and if memory runs out.
 std::uint32_t IpcSend(IpcHandle handle, const void* bytes, std::uint32_t length);
 
 /// Drops the clients and closes the port. Returns after the last callback has returned. REQUIRES: not called

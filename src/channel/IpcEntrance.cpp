@@ -53,6 +53,7 @@ bool IpcEntrance::open(std::int32_t port) {
 void IpcEntrance::accept() {
     if (std::exchange(m_isAccepting, true)) return;
     m_acceptor.async_accept(m_strand, [this](error_code ec, tcp::socket socket) {
+        if (ec == asio::error::operation_aborted) return;
         m_isAccepting = false;
         if (!m_acceptor.is_open()) return;
         // Out of descriptors, most likely: try again when some client has gone.
@@ -148,9 +149,10 @@ void IpcEntrance::entered(ClientId id) {
 }
 
 void IpcEntrance::ended(ClientId id) {
-    if (m_outside.erase(id) != 0) placeIsFree();
+    const bool hadPlace = m_outside.erase(id) != 0;
     m_connections.erase(id);
     m_events.left(id);
+    if (hadPlace) placeIsFree();
     if (m_connections.empty() && !m_acceptor.is_open()) m_isEmpty();
 }
 
@@ -169,8 +171,19 @@ void IpcEntrance::close() {
 }
 
 void IpcEntrance::resetAll() {
-    for (const auto& [id, connection] : std::map(m_connections))
-        connection->reset();
+    while (!m_connections.empty())
+        m_connections.extract(m_connections.begin()).mapped()->reset();
+}
+
+void IpcEntrance::acceptAnew() {
+    error_code ignored;
+    m_acceptor.cancel(ignored);
+    m_pause.cancel();
+    m_next.reset();
+    m_unjudged.clear();
+    m_owners.forget();
+    m_isAccepting = false;
+    accept();
 }
 
 }  // namespace vexa

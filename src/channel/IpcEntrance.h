@@ -40,6 +40,8 @@ public:
     void entered(ClientId id);
 
     void resetAll();
+    /// Whatever has become of the last accept(). REQUIRES: all are reset.
+    void acceptAnew();
 
 private:
     using Clock = std::chrono::steady_clock;

@@ -10,6 +10,7 @@
 #include "platform/Event.h"
 #include "platform/Mutex.h"
 #include "platform/Thread.h"
+#include "text/OutOfMemory.h"
 
 namespace vexa {
 
@@ -157,8 +158,12 @@ IpcHandle IpcCreateServer(std::int32_t /*kind*/, std::int32_t /*options*/, IpcRe
 }
 
 std::uint32_t IpcSend(IpcHandle handle, const void* bytes, std::uint32_t length) {
-    const auto server = findServer(handle);
-    return server && server->send(std::string(static_cast<const char*>(bytes), length)) ? 1 : 0;
+    bool isTaken = false;
+    const bool isSent = withinMemory([&] {
+        const auto server = findServer(handle);
+        isTaken = server && server->send(std::string(static_cast<const char*>(bytes), length));
+    });
+    return isSent && isTaken ? 1 : 0;
 }
 
 void IpcClose(IpcHandle handle) {

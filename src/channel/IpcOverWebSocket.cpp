@@ -7,6 +7,7 @@
 #include "channel/IpcWebSocketServer.h"
 #include "platform/Mutex.h"
 #include "text/NeverDestroyed.h"
+#include "text/OutOfMemory.h"
 
 namespace vexa {
 
@@ -59,9 +60,12 @@ IpcHandle IpcCreateServer(std::int32_t /*kind*/, std::int32_t /*options*/, IpcRe
 }
 
 std::uint32_t IpcSend(IpcHandle handle, const void* bytes, std::uint32_t length) {
-    const auto server = handleTable().find(handle);
-    if (!server) return 0;
-    return server->sendToAll({static_cast<const char*>(bytes), length}) ? 1 : 0;
+    bool isTaken = false;
+    const bool isQueued = withinMemory([&] {
+        const auto server = handleTable().find(handle);
+        isTaken = server && server->sendToAll({static_cast<const char*>(bytes), length});
+    });
+    return isQueued && isTaken ? 1 : 0;
 }
 
 void IpcClose(IpcHandle handle) {

@@ -1,8 +1,12 @@
 #include "channel/IpcOwnerLookup.h"
 
 #include <boost/asio/post.hpp>
+#include <chrono>
 #include <cstddef>
+#include <thread>
 #include <utility>
+
+#include "text/OutOfMemory.h"
 
 namespace vexa {
 
@@ -11,6 +15,8 @@ using asio::ip::tcp;
 using boost::system::error_code;
 
 namespace {
+
+constexpr std::chrono::milliseconds kShortagePause{100};
 
 // Ports that no connection has where it has just ended.
 platform::PeerPorts portsOf(const tcp::socket& connection) {
@@ -28,18 +34,32 @@ void IpcOwnerLookup::ask(const tcp::socket& connection, Answer answer) {
     if (!std::exchange(m_isAsking, true)) asio::post(m_strand, [this] { askAll(); });
 }
 
+void IpcOwnerLookup::forget() {
+    m_connections.clear();
+    m_answers.clear();
+    m_isAsking = false;
+}
+
 void IpcOwnerLookup::askAll() {
     m_isAsking = !m_answers.empty();
     if (!m_isAsking) return;
     asio::post(m_thread, [this, connections = std::exchange(m_connections, {}),
-                          answers = std::exchange(m_answers, {})]() mutable {
-        auto ours = platform::arePeersOfSameAccount(connections);
-        asio::post(m_strand, [this, ours = std::move(ours), answers = std::move(answers)] {
+                          answers = std::exchange(m_answers, {})] { answer(connections, answers); });
+}
+
+// On the thread of its own. Without memory it asks again: nobody gets in unasked.
+void IpcOwnerLookup::answer(const std::vector<platform::PeerPorts>& connections,
+                            const std::vector<Answer>& answers) {
+    const auto ask = [&] {
+        const auto ours = platform::arePeersOfSameAccount(connections);
+        asio::post(m_strand, [this, ours, answers] {
             for (std::size_t i = 0; i < answers.size(); ++i)
                 answers[i](ours[i]);
             askAll();
         });
-    });
+    };
+    while (!withinMemory(ask))
+        std::this_thread::sleep_for(kShortagePause);
 }
 
 }  // namespace vexa

@@ -22,9 +22,12 @@ public:
 
     /// Never calls `answer` before it returns.
     void ask(const boost::asio::ip::tcp::socket& connection, Answer answer);
+    /// Questions that have not been asked yet get no answer.
+    void forget();
 
 private:
     void askAll();
+    void answer(const std::vector<platform::PeerPorts>& connections, const std::vector<Answer>& answers);
 
     const boost::asio::any_io_executor m_strand;
     std::vector<platform::PeerPorts> m_connections;

@@ -11,6 +11,8 @@
 #include <thread>
 #include <utility>
 
+#include "text/OutOfMemory.h"
+
 namespace vexa {
 
 /// The second thread of a server. It sleeps, for as long as no handler runs longer than a tick or two, and
@@ -18,9 +20,10 @@ namespace vexa {
 /// message.
 class IpcStandby {
 public:
-    /// `helps` is called on its thread whenever it begins to help.
-    IpcStandby(boost::asio::io_context& io, std::function<void()> helps)
-        : m_io(io), m_helps(std::move(helps)) {}
+    /// `helps` is called on its thread whenever it begins to help, `isShort` where memory runs out in the
+    /// input and output.
+    IpcStandby(boost::asio::io_context& io, std::function<void()> helps, std::function<void()> isShort)
+        : m_io(io), m_helps(std::move(helps)), m_isShort(std::move(isShort)) {}
 
     void start();
     void stop();
@@ -45,6 +48,7 @@ private:
     boost::asio::io_context& m_io;
     const std::function<void()> m_helps;
     std::atomic<bool> m_isHelping{false};
+    const std::function<void()> m_isShort;
     std::atomic<std::uint64_t> m_phase{0};  // odd during a call
     std::atomic<bool> m_isAwake{false};
     std::mutex m_mutex;
@@ -105,11 +109,14 @@ inline void IpcStandby::watch(std::unique_lock<std::mutex>& lock) {
 // What became ready here just before the end of the help needs somebody to take it on.
 inline void IpcStandby::helpDuring(std::uint64_t phase) {
     m_isHelping = true;
-    m_helps();
-    while (m_phase == phase && m_io.run_one() > 0) {
-    }
+    const bool isHelp = withinMemory([&] {
+        m_helps();
+        while (m_phase == phase && m_io.run_one() > 0) {
+        }
+        boost::asio::post(m_io, [] {});
+    });
     m_isHelping = false;
-    boost::asio::post(m_io, [] {});
+    if (!isHelp) m_isShort();
 }
 
 }  // namespace vexa

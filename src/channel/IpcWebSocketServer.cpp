@@ -24,6 +24,7 @@
 #include "channel/IpcSession.h"
 #include "channel/IpcStandby.h"
 #include "platform/Thread.h"
+#include "text/OutOfMemory.h"
 
 namespace vexa {
 
@@ -37,6 +38,7 @@ using ClientId = IpcWebSocketServer::ClientId;
 
 constexpr std::uint16_t kGoingAway = 1001;
 constexpr std::chrono::milliseconds kFarewellLimit{500};
+constexpr std::chrono::milliseconds kShortagePause{10};
 
 }  // namespace
 
@@ -63,16 +65,24 @@ private:
         std::shared_ptr<IpcSession> session;
         std::string message;
     };
+    struct Handled {
+        std::shared_ptr<IpcSession> session;
+        std::size_t size;
+        bool isLast;
+    };
 
     void entered(std::shared_ptr<IpcSession> session) override;
     void left(ClientId client) override;
     void received(std::shared_ptr<IpcSession> session, std::string message) override;
     bool isHandlerSlow() const override { return m_standby.isHelping(); }
 
+    void run();
+    void beginAnew();
     void flushOutbox();
     void dispatch();
+    void passOn(const Handled& handled);
+    Handled handleFirst();
     void handle(const Incoming& incoming);
-    void handled(const Incoming& incoming);
     void helpSlowHandler();
     void sayFarewell();
 
@@ -88,9 +98,10 @@ private:
     std::atomic<bool> m_isStopped{false};
     std::mutex m_outboxMutex;
     std::vector<Outgoing> m_outbox;
+    bool m_isFlushPosted = false;
     std::mutex m_inboxMutex;
     std::deque<Incoming> m_inbox;  // in front the message that is being handled
-    IpcStandby m_standby{m_io, [this] { helpSlowHandler(); }};
+    IpcStandby m_standby{m_io, [this] { helpSlowHandler(); }, [this] { beginAnew(); }};
     std::atomic<std::thread::id> m_handlerThread;
     std::thread m_thread;
 };
@@ -99,12 +110,28 @@ bool IpcWebSocketServer::Impl::start() {
     asio::post(m_inout, [this] { m_entrance.accept(); });
     try {
         m_standby.start();
-        m_thread = std::thread([this] { m_io.run(); });
+        m_thread = std::thread([this] { run(); });
         return true;
     } catch (const std::system_error&) {
         stop();
         return false;
     }
+}
+
+void IpcWebSocketServer::Impl::run() {
+    while (!withinMemory([this] { m_io.run(); }))
+        beginAnew();
+}
+
+// Where memory ran out, something of some client has ended half way: all are dropped, and may come back.
+void IpcWebSocketServer::Impl::beginAnew() {
+    const auto begin = [this] {
+        m_entrance.resetAll();
+        m_isStopped ? m_io.stop() : m_entrance.acceptAnew();
+    };
+    do
+        std::this_thread::sleep_for(kShortagePause);
+    while (!withinMemory([&] { asio::post(m_inout, begin); }));
 }
 
 void IpcWebSocketServer::Impl::entered(std::shared_ptr<IpcSession> session) {
@@ -125,10 +152,12 @@ void IpcWebSocketServer::Impl::queue(ClientId client, std::string_view message) 
     {
         const std::lock_guard lock(m_outboxMutex);
         m_outbox.push_back(std::move(outgoing));
-        if (m_outbox.size() > 1) return;
+        const bool isByHandler = m_handlerThread == std::this_thread::get_id() && !m_standby.isHelping();
+        if (isByHandler || std::exchange(m_isFlushPosted, true)) return;
     }
-    if (m_handlerThread == std::this_thread::get_id() && !m_standby.isHelping()) return;
-    asio::post(m_inout, [this] { flushOutbox(); });
+    if (withinMemory([this] { asio::post(m_inout, [this] { flushOutbox(); }); })) return;
+    const std::lock_guard lock(m_outboxMutex);
+    m_isFlushPosted = false;  // it goes with the next message
 }
 
 void IpcWebSocketServer::Impl::flushOutbox() {
@@ -136,6 +165,7 @@ void IpcWebSocketServer::Impl::flushOutbox() {
     {
         const std::lock_guard lock(m_outboxMutex);
         outgoing.swap(m_outbox);
+        m_isFlushPosted = false;
     }
     if (outgoing.empty()) return;
     // Who does not read is dropped from the map meanwhile.
@@ -156,39 +186,55 @@ void IpcWebSocketServer::Impl::received(std::shared_ptr<IpcSession> session, std
         if (m_inbox.size() > 1) return;
     }
     platform::beginForeignWork();
-    asio::defer(m_io, [this] { dispatch(); });
+    if (!withinMemory([this] { asio::defer(m_io, [this] { dispatch(); }); })) dispatch();
 }
 
+// Where memory doesn't allow to pass the next message on, it is handled here: the chain must not break.
 void IpcWebSocketServer::Impl::dispatch() {
+    for (bool isLast = false; !isLast;) {
+        const Handled handled = handleFirst();
+        isLast = handled.isLast;
+        if (withinMemory([&] { asio::dispatch(m_inout, [this, handled] { passOn(handled); }); })) return;
+        beginAnew();
+    }
+}
+
+// What was queued for sending meanwhile, by whomever, is written before the next message is handled, and
+// before the client's next one is read.
+void IpcWebSocketServer::Impl::passOn(const Handled& handled) {
+    const bool isPassedOn = withinMemory([&] {
+        flushOutbox();
+        handled.session->messageHandled(handled.size);
+        if (!handled.isLast) asio::post(m_io, [this] { dispatch(); });
+    });
+    if (isPassedOn) return;
+    beginAnew();
+    if (!handled.isLast) dispatch();
+}
+
+IpcWebSocketServer::Impl::Handled IpcWebSocketServer::Impl::handleFirst() {
     std::unique_lock lock(m_inboxMutex);
     const Incoming& incoming = m_inbox.front();  // stays where it is when others come
     lock.unlock();
     handle(incoming);
     lock.lock();
-    Incoming done = std::move(m_inbox.front());
+    Incoming first = std::move(m_inbox.front());
     m_inbox.pop_front();
     const bool isLast = m_inbox.empty();
     lock.unlock();
     if (isLast) platform::endForeignWork();
-    asio::dispatch(m_inout, [this, done = std::move(done), isLast] {
-        handled(done);
-        if (!isLast) asio::post(m_io, [this] { dispatch(); });
-    });
+    return {std::move(first.session), first.message.size(), isLast};
 }
 
 void IpcWebSocketServer::Impl::handle(const Incoming& incoming) {
     m_handlerThread = std::this_thread::get_id();
     m_standby.callBegins();
-    if (!m_isStopped) m_handler(incoming.session->id(), incoming.message);
+    const bool isHandled = withinMemory([&] {
+        if (!m_isStopped) m_handler(incoming.session->id(), incoming.message);
+    });
     m_standby.callEnds();
     m_handlerThread = std::thread::id();
-}
-
-// What was queued for sending meanwhile, by whomever, is written before the next message is handled, and
-// before the client's next one is read.
-void IpcWebSocketServer::Impl::handled(const Incoming& incoming) {
-    flushOutbox();
-    incoming.session->messageHandled(incoming.message.size());
+    if (!isHandled) beginAnew();
 }
 
 void IpcWebSocketServer::Impl::helpSlowHandler() {
@@ -210,10 +256,13 @@ void IpcWebSocketServer::Impl::sayFarewell() {
 // A handler that runs now is waited for by the join; messages that still wait for it are dropped.
 void IpcWebSocketServer::Impl::stop() {
     if (m_isStopped.exchange(true)) return;
-    asio::post(m_inout, [this] {
-        flushOutbox();
-        sayFarewell();
+    const bool isFarewell = withinMemory([this] {
+        asio::post(m_inout, [this] {
+            flushOutbox();
+            sayFarewell();
+        });
     });
+    if (!isFarewell) m_io.stop();
     {
         const platform::ForeignWait waiting;
         if (m_thread.joinable()) m_thread.join();

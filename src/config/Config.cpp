@@ -1,7 +1,10 @@
 #include "config/Config.h"
 
 #include <algorithm>
+#include <new>
 #include <string_view>
+#include <tuple>
+#include <utility>
 
 #include "base/DiagnosticLog.h"
 #include "config/SafeSave.h"
@@ -11,6 +14,7 @@
 #include "platform/Files.h"
 #include "platform/KnownFolders.h"
 #include "platform/Registry.h"
+#include "text/OutOfMemory.h"
 #include "text/ScopeGuard.h"
 #include "text/TextConversion.h"
 
@@ -81,12 +85,24 @@ ResultCode Config::readConfig(bool* configChanged) {
     readGlobalSettings();
     bool isChanged = false;
     Reading reading{.table = m_credentials, .trace = Trace::Yes};
-    if (readCredentials(reading, isChanged) != kSuccess || readUsers(reading, isChanged) != kSuccess)
-        return kFailure;
+    if (readTable(reading, isChanged) != kSuccess) return kFailure;
     remember();
     m_bUnsaved = false;
     if (configChanged != nullptr) *configChanged = isChanged;
     return kSuccess;
+}
+
+// A table that was read in part would take the rest out of the file when it is saved.
+ResultCode Config::readTable(Reading& reading, bool& isChanged) {
+    CredentialTable before = std::exchange(m_credentials, {});
+    try {
+        const bool isRead =
+            readCredentials(reading, isChanged) == kSuccess && readUsers(reading, isChanged) == kSuccess;
+        return isRead ? kSuccess : kFailure;
+    } catch (const std::bad_alloc&) {
+        m_credentials = std::move(before);
+        throw;
+    }
 }
 
 bool Config::readFlag(const char* xpath, bool missing) {
@@ -153,13 +169,19 @@ void Config::readAutoConnectFromRegistry() {
 // However little is lost, as with a full disk, one line tells of it.
 ResultCode Config::saveConfig(const FileLock& held) {
     const ScopeGuard release([this]() NO_THREAD_SAFETY_ANALYSIS { m_xmlDoc.release(); });
-    ResultCode result = held ? openDocument() : kFailure;
-    bool isWritten = false;
-    for (const auto section : {&Config::writeNextCredId, &Config::writeCredentials, &Config::writeUsers}) {
-        if (result == kSuccess) result = (this->*section)();
-        isWritten = isWritten || result == kSuccess;
-    }
-    const bool isSaved = isWritten && saveDocument();
+    ResultCode result = kFailure;
+    bool isSaved = false;
+    const bool isWithinMemory = withinMemory([&]() NO_THREAD_SAFETY_ANALYSIS {
+        bool isWritten = false;
+        if (held) result = openDocument();
+        for (const auto section :
+             {&Config::writeNextCredId, &Config::writeCredentials, &Config::writeUsers}) {
+            if (result == kSuccess) result = (this->*section)();
+            isWritten = isWritten || result == kSuccess;
+        }
+        isSaved = isWritten && saveDocument();
+    });
+    if (!isWithinMemory) result = kFailure;
     m_bUnsaved = result != kSuccess || !isSaved;
     if (m_bUnsaved) Log(6, "ERROR: Saving the configuration file failed.");
     return result == kSuccess ? kSuccess : kFailure;

@@ -98,6 +98,7 @@ private:
     void deriveDumpFilePath() REQUIRES(g_hs20Lock);
     void readAutoConnectFromRegistry();
 
+    ResultCode readTable(Reading& reading, bool& isChanged) REQUIRES(g_hs20Lock);
     ResultCode readCredentials(Reading& reading, bool& isChanged) REQUIRES(g_hs20Lock);
     void readCredential(Node node, Reading& reading) REQUIRES(g_hs20Lock);
     static std::int32_t followingId(std::int32_t id);

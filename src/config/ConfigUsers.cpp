@@ -91,9 +91,11 @@ ResultCode Config::writeUsers() {
 ResultCode Config::writeReferences(Node list) {
     for (const Credential* credential : m_credentials.copyCredentialPointers()) {
         Node reference;
-        if (m_xmlDoc.setChild("credential", L"", list, true, &reference) != kSuccess) return kFailure;
-        m_xmlDoc.setChild("id", std::to_wstring(credential->m_id), reference, true);
-        m_xmlDoc.setChild("priority", std::to_wstring(credential->m_priority), reference, true);
+        if (m_xmlDoc.setChild("credential", L"", list, true, &reference) != kSuccess ||
+            m_xmlDoc.setChild("id", std::to_wstring(credential->m_id), reference, true) != kSuccess ||
+            m_xmlDoc.setChild("priority", std::to_wstring(credential->m_priority), reference, true) !=
+                kSuccess)
+            return kFailure;
     }
     return kSuccess;
 }

@@ -93,6 +93,7 @@ ResultCode CredentialTable::addCredential(const CredentialInput& input, std::int
 }
 
 void CredentialTable::insertCredential(std::unique_ptr<Credential> record) {
+    m_list.reserve(m_list.size() + 1);
     record->m_priority = CRED_PRIORITY_HIGHEST;
     makeRoomAtTop();
     m_list.push_back(std::move(record));
@@ -124,7 +125,9 @@ ResultCode CredentialTable::updateCredential(const CredentialInput& input) {
     }
     if (input.realm.empty()) return kFailure;
     if (isTtls && (input.username.empty() || input.password.empty())) return kFailure;
-    applyTexts(*credential, input, input.credName);
+    Credential changed = *credential;
+    applyTexts(changed, input, input.credName);
+    *credential = std::move(changed);
     return kSuccess;
 }
 

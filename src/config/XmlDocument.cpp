@@ -120,8 +120,9 @@ ResultCode XmlDocument::load(const std::wstring& path) {
 ResultCode XmlDocument::save(const std::wstring& path) const {
     if (!m_document) return kNoDocument;
     const Node first = m_document->first_child();
-    if (first.type() == pugi::node_declaration && first.attribute("encoding"))
-        first.attribute("encoding").set_value("UTF-8");
+    if (first.type() == pugi::node_declaration && first.attribute("encoding") &&
+        !first.attribute("encoding").set_value("UTF-8"))
+        return kFailure;
     StringWriter writer;
     writer.text.reserve(m_text.size() + kUsualGrowth);
     m_document->save(writer, "", kFormat, pugi::encoding_utf8);
@@ -159,8 +160,7 @@ ResultCode XmlDocument::setText(Node node, const std::wstring& text) {
     if (!canStandInXml(text)) return kFailure;
     while (const Node child = node.last_child())
         remove(child);
-    node.append_child(pugi::node_pcdata).set_value(utf8FromWide(text).c_str());
-    return kSuccess;
+    return node.append_child(pugi::node_pcdata).set_value(utf8FromWide(text).c_str()) ? kSuccess : kFailure;
 }
 
 // From the leaves up: the library's own way is recursive, and the depth of a document is its author's choice.

@@ -33,11 +33,13 @@ public:
     std::optional<std::wstring> getText(const char* xpath, Node parent) const;
 
     /// Sets the text of the child `tag` of `parent`, or of the root element if that is null; creates it, and
-    /// gives it to `created`, if there is none or if `forceNew`. kFailure also for text that XML can't hold.
+    /// gives it to `created`, if there is none or if `forceNew`. kFailure also for text that XML can't hold,
+    /// and if memory runs out.
     ResultCode setChild(const char* tag, const std::wstring& text, Node parent, bool forceNew,
                         Node* created = nullptr);
 
-    /// In place of all that the node holds. kFailure, and no change: the text holds what XML can't.
+    /// In place of all that the node holds. kFailure: the text holds what XML can't, and nothing has changed;
+    /// or memory ran out, and the document must not be saved.
     static ResultCode setText(Node node, const std::wstring& text);
 
     /// Takes a node and all below it out of the document.

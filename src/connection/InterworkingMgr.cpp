@@ -10,6 +10,7 @@
 #include "connection/Supplicant.h"
 #include "platform/Clock.h"
 #include "platform/Session.h"
+#include "text/OutOfMemory.h"
 
 namespace vexa {
 
@@ -160,7 +161,8 @@ void InterworkingMgr::runNetworkingLoop() {
         Log(3, "\n\n#####Start new round of network connecting...#####");
         if (waitForWork() == 0) break;
         if (m_bTerminate) break;
-        runRound();
+        if (!withinMemory([this] { runRound(); }))
+            Log(6, "ERROR: Out of memory, this round of network connecting has ended early.");
     }
     Log(2, "The NetworkingMgr thread is to be terminated...");
 }

@@ -63,6 +63,9 @@ private:
     NetworkProfile* reusableProfile(const NetworkChoice& choice, const std::wstring& name)
         REQUIRES(g_hs20Lock);
 
+    ResultCode countAndConnect(const NetworkChoice& choice, const NetworkProfile& profile)
+        REQUIRES(g_hs20Lock);
+
     Supplicant& m_supplicant;
     EngineState& m_engine;
     std::atomic<bool> m_bInited{false};

@@ -1,3 +1,4 @@
+#include <new>
 #include <string>
 
 #include "base/DiagnosticLog.h"
@@ -123,6 +124,20 @@ NetworkProfile* InterworkingMgr::profileFor(const NetworkChoice& choice, const s
     return profile;
 }
 
+// An attempt that couldn't be made for lack of memory doesn't count.
+ResultCode InterworkingMgr::countAndConnect(const NetworkChoice& choice, const NetworkProfile& profile) {
+    NetworkRetryHelper& retries = m_engine.m_retryHelper;
+    const std::int32_t id = choice.credential->m_id;
+    const std::uint32_t before = retries.getNumRetries(id, choice.network->ssid());
+    retries.increaseNumRetries(id, choice.network->ssid());
+    try {
+        return m_supplicant.connectToNetwork(*choice.network, profile);
+    } catch (const std::bad_alloc&) {
+        retries.setNumRetries(id, choice.network->ssid(), before);
+        throw;
+    }
+}
+
 ConnectOutcome InterworkingMgr::connectNetwork() {
     const LockGuard lock(g_hs20Lock);
     Log(3, "\n>>>> Enter connectNetwork");
@@ -146,8 +161,7 @@ ConnectOutcome InterworkingMgr::connectNetwork() {
     if (profile == nullptr) return kConnectFailed;
     if (m_engine.m_config.isAutoConnect()) {
         LogWide(3, L"Going to connect to network with ssid=%s", name.c_str());
-        m_engine.m_retryHelper.increaseNumRetries(choice.credential->m_id, choice.network->ssid());
-        if (m_supplicant.connectToNetwork(*choice.network, *profile) != kSuccess) {
+        if (countAndConnect(choice, *profile) != kSuccess) {
             Log(6, "ERROR: Connect to network failed.");
             return kConnectFailed;
         }

@@ -88,17 +88,19 @@ ResultCode NetworkProfileMgr::addEapTtlsProfile(const Credential& credential, co
 }
 
 NetworkProfile* NetworkProfileMgr::add(NetworkProfile profile) {
+    m_profiles.reserve(m_profiles.size() + 1);
+    auto added = std::make_unique<NetworkProfile>(std::move(profile));
     std::int32_t highest = 0;
     for (const auto& existing : m_profiles) {
         highest = std::max(highest, existing->m_id);
         if (isPlaced(*existing)) ++existing->m_priority;
     }
-    profile.m_id = highest + 1;
-    profile.m_priority = CRED_PRIORITY_HIGHEST;
-    m_profiles.push_back(std::make_unique<NetworkProfile>(std::move(profile)));
-    NetworkProfile* const added = m_profiles.back().get();
+    added->m_id = highest + 1;
+    added->m_priority = CRED_PRIORITY_HIGHEST;
+    NetworkProfile* const result = added.get();
+    m_profiles.push_back(std::move(added));
     sortByPriority();
-    return added;
+    return result;
 }
 
 bool NetworkProfileMgr::deleteProfile(std::int32_t id) {

@@ -1,10 +1,12 @@
 #include "connection/Supplicant.h"
 
 #include <cassert>
+#include <tuple>
 
 #include "base/DiagnosticLog.h"
 #include "connection/SupplicantMgr.h"
 #include "platform/Guid.h"
+#include "text/OutOfMemory.h"
 
 namespace vexa {
 
@@ -38,7 +40,9 @@ Supplicant::~Supplicant() {
 
 void Supplicant::init() {
     Log(2, "Initializing supplicant...");
-    if (const char* const error = initSteps()) {
+    const char* error = "ERROR: Out of memory.";
+    std::ignore = withinMemory([&] { error = initSteps(); });
+    if (error != nullptr) {
         Log(6, "%s", error);
         Log(6, "ERROR: Initiailize supplicant failed.");
         deinit();

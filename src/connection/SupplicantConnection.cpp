@@ -86,10 +86,11 @@ ResultCode Supplicant::onConnectionComplete(const WLAN_CONNECTION_NOTIFICATION_D
 }
 
 ResultCode Supplicant::onOwnResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::uint32_t& eapMethod) {
-    const std::wstring name = profileNameOf(data);
-    LogWide(3, L"Connection result initiated by HS20, clearing the cache, profile name=%s.", name.c_str());
+    // Before anything that memory may not allow: the attempt has ended.
     m_connectingSsid.clear();
     m_engine.m_bConnectionStarted = false;
+    const std::wstring name = profileNameOf(data);
+    LogWide(3, L"Connection result initiated by HS20, clearing the cache, profile name=%s.", name.c_str());
     if (m_bManualConnectPending && carryOutPendingRequest()) return kSuccess;
     m_engine.m_hConnectionCompletedEvent.set();
     NetworkProfile* profile = nullptr;
@@ -106,8 +107,8 @@ bool Supplicant::carryOutPendingRequest() {
     Log(3, "###User manual connecting request pending, we are going to connect now.###");
     const bool wasManual = std::exchange(m_bManualConnectStarted, false);
     const std::vector<std::int32_t> tried = m_triedCredentialIds;
-    const bool isRefused = connectBssNow(m_pendingManualSsid) != kSuccess;
     m_bManualConnectPending = false;
+    const bool isRefused = connectBssNow(m_pendingManualSsid) != kSuccess;
     if (m_engine.m_bConnectionStarted) return true;
     m_bManualConnectStarted = wasManual;
     m_triedCredentialIds = tried;
@@ -205,14 +206,14 @@ ResultCode Supplicant::report(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std
 // The client hears of a success, whatever the reason: the connection was none of this program's.
 ResultCode Supplicant::onForeignResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data) {
     const bool isSuccess = data.wlanReasonCode == 0;
+    const bool isStartKnown = std::exchange(m_bConnectionStartedByOs, false);
     LogWide(3, L"Connection result not initiated by HS20, profile name=%s, result=%s",
             profileNameOf(data).c_str(), isSuccess ? L"Success" : L"Failure");
     setState(isSuccess ? SupplicantState::Connected : SupplicantState::Disconnected);
-    if (!m_bConnectionStartedByOs)
+    if (!isStartKnown)
         Log(6, "ERROR: m_bConnectionStartedByOs is not set to true when connecting completed.");
     sendConnectionResult(ConnectionResult::kSucceeded);
     tellClient([](const ClientEvents& events) { events.sendInternetAccess(); });
-    m_bConnectionStartedByOs = false;
     return kSuccess;
 }
 

@@ -1,4 +1,5 @@
 #include <algorithm>
+#include <utility>
 
 #include "base/DiagnosticLog.h"
 #include "connection/Supplicant.h"
@@ -17,10 +18,13 @@ ResultCode Supplicant::updateHs20NetworkList(const std::vector<Hs20BssRecord>& r
     if (records.empty()) return kInvalidArgument;
     const LockGuard lock(g_hs20Lock);
     const std::vector<MacAddress> oldMacs = m_engine.m_networkList.macAddresses();
-    const Hs20NetworkList::Networks gone = m_engine.m_networkList.replace(records);
-    for (Hs20Network* network : m_engine.m_networkList.copyPointers())
+    // Made aside: if memory runs out half way, the list stands as it was.
+    Hs20NetworkList updated = m_engine.m_networkList.copy();
+    updated.replace(records);
+    for (Hs20Network* network : updated.copyPointers())
         if (fetchBssAnqpInfo(*network) != kSuccess) Log(3, "Fetch ANQP info failed.");
-    m_engine.m_networkList.processDuplicatedHs20Networks(oldMacs);
+    updated.processDuplicatedHs20Networks(oldMacs);
+    std::swap(m_engine.m_networkList, updated);
     Log(3, "\tSet events m_hHs20NetworkChangedEvent and m_hAnqpInfoReadyEvent.");
     m_engine.m_hHs20NetworkChangedEvent.set();
     m_engine.m_hAnqpInfoReadyEvent.set();

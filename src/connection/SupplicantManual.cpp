@@ -1,4 +1,5 @@
 #include <algorithm>
+#include <new>
 #include <optional>
 
 #include "base/DiagnosticLog.h"
@@ -50,19 +51,21 @@ int numberInLog(ConnectOutcome outcome) {
 
 }  // namespace
 
-ResultCode Supplicant::connectBss(std::string_view ssid) {
+ResultCode Supplicant::connectBss(std::string_view ssid) try {
     const LockGuard lock(g_hs20Lock);
     Log(3, "###Manually connect to a BSS started.###");
     if (ssid.empty()) return kInvalidArgument;
     if (!m_engine.m_bConnectionStarted) return connectBssNow(std::string(ssid));
     Log(3,
         "\tConnection has already been started, maybe by auto connecting thread, we will wait until the auto connecting completed, either succeed or fail.");
-    m_bManualConnectPending = true;
     m_pendingManualSsid = ssid;
+    m_bManualConnectPending = true;
     return kSuccess;
+} catch (const std::bad_alloc&) {
+    return kFailure;
 }
 
-ResultCode Supplicant::connectBssNow(const std::string& ssid) {
+ResultCode Supplicant::connectBssNow(const std::string& ssid) try {
     Log(3, "###We are actually going to connect to HS20 network now.###");
     Hs20Network* const network = m_engine.m_networkList.findBySsid(ssid);
     if (network == nullptr) return kFailure;
@@ -78,6 +81,9 @@ ResultCode Supplicant::connectBssNow(const std::string& ssid) {
     m_triedCredentialIds.clear();
     const auto result = resultOf(tryConnectHs20BssUsingNextCredential(ssid), kFirstStep);
     return result ? *result : connectPlainly(ssid);
+} catch (const std::bad_alloc&) {
+    Log(6, "ERROR: Out of memory, the manual connection was not started.");
+    return kFailure;
 }
 
 // The operating system chooses the profile; the connection counts as own all the same.

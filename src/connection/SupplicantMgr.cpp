@@ -79,9 +79,13 @@ ResultCode SupplicantMgr::reloadData() {
     return kSuccess;
 }
 
-// Null if memory runs out.
+// Null if memory runs out. With a place for it, and for each that may have to be retired, so that none with a
+// thread is lost.
 std::shared_ptr<Supplicant> SupplicantMgr::makeSupplicant(const GUID& guid) {
     try {
+        const LockGuard lock(m_listMutex);
+        m_supplicants.reserve(m_supplicants.size() + 1);
+        m_retired.reserve(m_retired.size() + m_supplicants.size() + 1);
         return std::make_shared<Supplicant>(guid, *this);
     } catch (const std::bad_alloc&) {
         return nullptr;

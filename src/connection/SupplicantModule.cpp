@@ -1,5 +1,9 @@
+#include <new>
+#include <utility>
+
 #include "base/DiagnosticLog.h"
 #include "connection/Supplicant.h"
+#include "text/OutOfMemory.h"
 
 namespace vexa {
 
@@ -11,18 +15,29 @@ constexpr std::size_t kRealmLengthSize = 4;
 
 }  // namespace
 
-ResultCode Supplicant::sendIhvCmd() {
+ResultCode Supplicant::sendIhvCmd() try {
     const DWORD result = m_wlan.tellModule(ihvRequest(IhvRequest::QueryAnqp));
     if (result == ERROR_SUCCESS) return kSuccess;
     Log(3, "WlanIhvControl call failed in sendIhvCmd with result code=%d", static_cast<int>(result));
+    return kFailure;
+} catch (const std::bad_alloc&) {
     return kFailure;
 }
 
 ResultCode Supplicant::getHs20BssListFromIHV() {
     const LockGuard lock(g_hs20Lock);
     Log(3, "Get HS20 BSS list from IHV.");
+    std::vector<std::byte> request;
+    if (!withinMemory([&] { request = ihvRequest(IhvRequest::GetBssList); })) {
+        Log(3, "PrivateMemoryAlloc failed.");
+        return kFailure;
+    }
     std::vector<std::byte> reply;
-    const DWORD result = m_wlan.askModule(ihvRequest(IhvRequest::GetBssList), reply);
+    if (!withinMemory([&] { reply.reserve(kIhvReplySize); })) {
+        Log(3, "PrivateMemoryAlloc failed for out buffer.");
+        return kSuccess;
+    }
+    const DWORD result = m_wlan.askModule(std::move(request), reply);
     if (result != ERROR_SUCCESS) {
         Log(3, "WlanIhvControl failed with error code=%d", static_cast<int>(result));
         return kFailure;
@@ -38,7 +53,7 @@ ResultCode Supplicant::getHs20BssListFromIHV() {
     return kFailure;
 }
 
-ResultCode Supplicant::fetchBssAnqpInfo(Hs20Network& network) {
+ResultCode Supplicant::fetchBssAnqpInfo(Hs20Network& network) try {
     Log(3, "Fetching BSS with ssid=%s and mac address=%s  ANQP info from HS20 IHV...",
         network.ssidText().c_str(), toText(network.m_macAddress).c_str());
     std::vector<std::byte> reply;
@@ -65,6 +80,8 @@ ResultCode Supplicant::fetchBssAnqpInfo(Hs20Network& network) {
     network.m_anqpNaiRealm.assign(realms.begin(), realms.end());
     network.parseRealmList();
     return kSuccess;
+} catch (const std::bad_alloc&) {
+    return kFailure;
 }
 
 ResultCode Supplicant::queryHs20NetworkAnqpInfo() {

@@ -1,5 +1,6 @@
 #include <string>
 #include <string_view>
+#include <utility>
 
 #include "base/DiagnosticLog.h"
 #include "connection/Supplicant.h"
@@ -16,10 +17,11 @@ using platform::LockGuard;
 
 // Null: the operating system chooses the profile.
 DWORD Supplicant::requestConnection(std::string_view ssid, const NetworkProfile* profile) {
+    std::string connecting(ssid);  // before it is asked for: the connection must be known as own
     const DWORD result =
         profile == nullptr ? m_wlan.connectBySsid(ssid) : m_wlan.connectByProfile(profile->m_profileXml);
     if (result != ERROR_SUCCESS) return result;
-    m_connectingSsid = ssid;
+    m_connectingSsid = std::move(connecting);
     m_engine.m_bConnectionStarted = true;
     return result;
 }

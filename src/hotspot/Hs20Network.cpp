@@ -1,6 +1,7 @@
 #include "hotspot/Hs20Network.h"
 
 #include <algorithm>
+#include <new>
 
 #include "base/DiagnosticLog.h"
 
@@ -24,7 +25,8 @@ Hs20BssRecord Hs20Network::record() const {
     return {m_macAddress, std::string(ssid()), 1, m_networkType, m_internetAccess};
 }
 
-void Hs20Network::parseRealmList() {
+// Running out of memory is as good as bad data.
+void Hs20Network::parseRealmList() try {
     Log(3, "Parsing NAI Realm list from %s", toText(m_macAddress).c_str());
     if (!hasRealmData()) {
         Log(3, "The NAI realm buffer is empty, nothing will be parsed.");
@@ -37,6 +39,8 @@ void Hs20Network::parseRealmList() {
     Log(3, "\tWe have parsed %d realms:", static_cast<int>(m_realms.size()));
     for (const RealmInfo& realm : m_realms)
         Log(3, "\t\t%s %s", realm.m_realm.c_str(), realm.m_eapType == 2 ? "EAP-TTLS" : "EAP-TLS");
+} catch (const std::bad_alloc&) {
+    return;
 }
 
 }  // namespace vexa

@@ -10,6 +10,7 @@
 #include "base/DiagnosticLog.h"
 #include "hotspot/RealmCollection.h"
 #include "hotspot/ShownName.h"
+#include "text/OutOfMemory.h"
 
 namespace vexa {
 
@@ -76,6 +77,13 @@ std::string Hs20NetworkList::ssidShownAs(std::string_view name) const {
     return std::string(found == m_networks.end() ? name : (*found)->ssid());
 }
 
+Hs20NetworkList Hs20NetworkList::copy() const {
+    Hs20NetworkList copy;
+    for (const auto& network : m_networks)
+        copy.m_networks.push_back(std::make_unique<Hs20Network>(*network));
+    return copy;
+}
+
 std::vector<Hs20Network*> Hs20NetworkList::copyPointers() const {
     std::vector<Hs20Network*> pointers;
     pointers.reserve(m_networks.size());
@@ -101,7 +109,8 @@ Hs20NetworkList::Networks Hs20NetworkList::replace(const std::vector<Hs20BssReco
     for (const Hs20BssRecord& record : records) {
         const auto found = known.find(record.macAddress);
         if (found == known.end() || found->second.empty()) {
-            updated.push_back(buildNew(record));
+            if (!withinMemory([&] { updated.push_back(buildNew(record)); }))
+                Log(6, "ERROR: Invalid HS20 network pointer.");
             continue;
         }
         updated.push_back(std::move(found->second.front()));

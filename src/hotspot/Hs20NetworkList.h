@@ -28,6 +28,9 @@ public:
     std::size_t size() const REQUIRES(g_hs20Lock) { return m_networks.size(); }
     std::vector<MacAddress> macAddresses() const REQUIRES(g_hs20Lock);
 
+    /// To be worked on aside.
+    Hs20NetworkList copy() const REQUIRES(g_hs20Lock);
+
     /// Takes over a report: networks known by their MAC address stay, the others are new. Gives those that
     /// were not reported any more.
     Networks replace(const std::vector<Hs20BssRecord>& records) REQUIRES(g_hs20Lock);

@@ -4,11 +4,22 @@
 
 #include "base/DiagnosticLog.h"
 #include "channel/Envelope.h"
+#include "channel/JsonText.h"
 #include "connection/SupplicantMgr.h"
 #include "contract/Ports.h"
 #include "text/NeverDestroyed.h"
 
 namespace vexa {
+
+namespace {
+
+// An event for which there is no memory is lost; the engine goes on.
+template <class Send>
+void tell(Send send) {
+    if (!withinMemoryOfJson(send)) Log(6, "ERROR: Out of memory, an event was not sent to UI.");
+}
+
+}  // namespace
 
 SAHotSpotPortlink& SAHotSpotPortlink::instance() {
     static NeverDestroyed<SAHotSpotPortlink> server;
@@ -21,10 +32,10 @@ SAHotSpotPortlink::SAHotSpotPortlink() {
 
     const platform::LockGuard lock(g_hs20Lock);
     SupplicantMgr::instance().setClientEvents({
-        [this](Supplicant& supplicant) { SendNetworkList(&supplicant); },
-        [this] { SendDetectedHotspot(); },
-        [this](const ConnectionResult& result) { SendConnectionResult(result); },
-        [this] { SendInternetAccess(); },
+        [this](Supplicant& supplicant) { tell([&] { SendNetworkList(&supplicant); }); },
+        [this] { tell([this] { SendDetectedHotspot(); }); },
+        [this](const ConnectionResult& result) { tell([&] { SendConnectionResult(result); }); },
+        [this] { tell([this] { SendInternetAccess(); }); },
     });
 }
 

@@ -101,8 +101,11 @@ void logInvalidCommand(const std::string& id) {
 
 void SAHotSpotPortlink::OnIpcMessage(const char* bytes, std::uint32_t length, void* context) {
     if (context == nullptr || bytes == nullptr || length == 0) return;
-    if (const auto message = parseReceived({bytes, length}))
-        static_cast<Server*>(context)->HandleCommand(*message);
+    const bool isHandled = withinMemoryOfJson([&] {
+        if (const auto message = parseReceived({bytes, length}))
+            static_cast<Server*>(context)->HandleCommand(*message);
+    });
+    if (!isHandled) Log(6, "ERROR: Out of memory, a message from UI was not handled to its end.");
 }
 
 void SAHotSpotPortlink::HandleCommand(const Json::Value& root) {
@@ -111,9 +114,17 @@ void SAHotSpotPortlink::HandleCommand(const Json::Value& root) {
     const auto command = std::find_if(kCommands.begin(), kCommands.end(),
                                       [&](const Command& candidate) { return candidate.id == *id; });
     if (command == kCommands.end()) return logInvalidCommand(*id);
-    const auto dataText = readText(root, "Data");
-    if (dataText && command->act(*this, parseJsonText(*dataText))) return;
-    Log(6, "ERROR: Invalid data received from UI, command=%s", id->c_str());
+    std::optional<std::string> dataText;
+    bool isDone = false;
+    if (!withinMemoryOfJson([&] {
+            dataText = readText(root, "Data");
+            isDone = dataText && command->act(*this, parseJsonText(*dataText));
+        })) {
+        Log(6, "ERROR: Out of memory, command=%s was not carried out to its end.", id->c_str());
+        dataText.reset();
+    } else if (!isDone) {
+        Log(6, "ERROR: Invalid data received from UI, command=%s", id->c_str());
+    }
     if (!dataText && command->listsAlways) SendCredentialList();
 }
 

@@ -9,6 +9,7 @@
 #include <span>
 
 #include "base/DiagnosticLog.h"
+#include "channel/JsonText.h"
 #include "connection/Supplicant.h"
 #include "connection/SupplicantMgr.h"
 #include "contract/Ports.h"
@@ -174,13 +175,8 @@ void dispatchIhv(const Event& event) {
     }
 }
 
-}  // namespace
-
-void WINAPI onWlanNotification(PWLAN_NOTIFICATION_DATA pNotifData, PVOID pServer) {
-    if (pNotifData == nullptr) return Log(6, "ERROR: Invalid pNotifData.");
-    if (pServer == nullptr) return Log(6, "ERROR: Invalid SAPortlink.");
-    const Event event{*pNotifData, *static_cast<SAPortlink*>(pServer), SAHotSpotPortlink::instance()};
-    switch (pNotifData->NotificationSource) {
+void route(const Event& event) {
+    switch (event.notification.NotificationSource) {
         case WLAN_NOTIFICATION_SOURCE_ACM:
             return dispatch(kAcmRows, event);
         case WLAN_NOTIFICATION_SOURCE_MSM:
@@ -190,6 +186,16 @@ void WINAPI onWlanNotification(PWLAN_NOTIFICATION_DATA pNotifData, PVOID pServer
         default:
             return;
     }
+}
+
+}  // namespace
+
+void WINAPI onWlanNotification(PWLAN_NOTIFICATION_DATA pNotifData, PVOID pServer) {
+    if (pNotifData == nullptr) return Log(6, "ERROR: Invalid pNotifData.");
+    if (pServer == nullptr) return Log(6, "ERROR: Invalid SAPortlink.");
+    const Event event{*pNotifData, *static_cast<SAPortlink*>(pServer), SAHotSpotPortlink::instance()};
+    if (!withinMemoryOfJson([&] { route(event); }))
+        Log(6, "ERROR: Out of memory, a WLAN notification was not handled to its end.");
 }
 
 // Without a Supplicant no message of the hotspot module has any effect.

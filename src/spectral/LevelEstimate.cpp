@@ -18,9 +18,9 @@ constexpr int kLargestPower = 400;
 double floorShare(int power) {
     static const auto shares = [] {
         std::array<double, 2 * kLargestPower + 1> all{};
-        double power = -kLargestPower;
+        double of = -kLargestPower;
         for (double& share : all)
-            share = std::pow(10.0, (kLevelFloor - kLevelOfPowerZero - power++) / 10.0);
+            share = std::pow(10.0, (kLevelFloor - kLevelOfPowerZero - of++) / 10.0);
         return all;
     }();
     return shares[static_cast<std::size_t>(power + kLargestPower)];

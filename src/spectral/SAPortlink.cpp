@@ -5,6 +5,7 @@
 #include <chrono>
 #include <string_view>
 
+#include "base/DiagnosticLog.h"
 #include "base/NetworkListLock.h"
 #include "base/StandardOutput.h"
 #include "base/WlanMemory.h"
@@ -68,12 +69,15 @@ SAPortlink::~SAPortlink() {
 
 void SAPortlink::OnIpcMessage(const char* bytes, std::uint32_t length, void* context) {
     if (bytes == nullptr || length == 0 || context == nullptr) return;
-    const auto message = parseReceived({bytes, length});
-    if (!message) return;
-    const std::string id = readText(*message, "CommandId").value_or("");
-    printToStandardOutput("Service request from client : request id = %s\n", id.c_str());
-    for (const Command& command : kCommands)
-        if (command.id == id) return command.act(*static_cast<SAPortlink*>(context));
+    const bool isHandled = withinMemoryOfJson([&] {
+        const auto message = parseReceived({bytes, length});
+        if (!message) return;
+        const std::string id = readText(*message, "CommandId").value_or("");
+        printToStandardOutput("Service request from client : request id = %s\n", id.c_str());
+        for (const Command& command : kCommands)
+            if (command.id == id) return command.act(*static_cast<SAPortlink*>(context));
+    });
+    if (!isHandled) Log(6, "ERROR: Out of memory, a spectral command was not carried out to its end.");
 }
 
 std::vector<std::uint8_t> SAPortlink::HandleCommand(int code) {

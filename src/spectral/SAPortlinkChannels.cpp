@@ -1,4 +1,6 @@
 #include <algorithm>
+#include <array>
+#include <utility>
 
 #include "channel/Envelope.h"
 #include "channel/StyledText.h"
@@ -31,8 +33,13 @@ void SAPortlink::QueryChannelList() {
     buffer.resize(std::min<std::size_t>(returned, buffer.size()));
     const auto channels = parseChannelList(buffer);
     if (!channels) return;
-    m_channelOrder = orderChannels(*channels);
-    for (std::vector<int>* table : {&m_congestion, &m_noise, &m_lastCongestion, &m_lastNoise})
+    // The tables belong to the channels: room for all of them comes first.
+    ChannelOrder order = orderChannels(*channels);
+    const std::array tables = {&m_congestion, &m_noise, &m_lastCongestion, &m_lastNoise};
+    for (std::vector<int>* table : tables)
+        table->reserve(order.size());
+    m_channelOrder = std::move(order);
+    for (std::vector<int>* table : tables)
         table->assign(m_channelOrder.size(), 0);
 }
 

@@ -1,5 +1,7 @@
 #include <cstdio>
 
+#include "base/DiagnosticLog.h"
+#include "channel/JsonText.h"
 #include "contract/Ports.h"
 #include "platform/DebugOutput.h"
 #include "spectral/SAPortlink.h"
@@ -71,7 +73,8 @@ void SAPortlink::HandleFullScanIndication(Bytes message) {
 // The watchdog: it only comes to this when no scan has completed for a whole period.
 void SAPortlink::ScanTimerRoutine() {
     outputDebugString("spectral SAPortlink::ScanTimerRoutine");
-    RunPass();
+    if (!withinMemoryOfJson([this] { RunPass(); }))
+        Log(6, "ERROR: Out of memory, a spectral pass was not carried out to its end.");
 }
 
 void SAPortlink::RunPass() {

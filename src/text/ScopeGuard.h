@@ -1,20 +1,23 @@
 #pragma once
 
-#include <functional>
+#include <tuple>
 #include <utility>
+
+#include "text/OutOfMemory.h"
 
 namespace vexa {
 
-/// Runs a callable on every way out of a scope.
+/// Runs a callable on every way out of a scope, as far as memory allows.
+template <class OnExit>
 class ScopeGuard {
 public:
-    explicit ScopeGuard(std::function<void()> onExit) : m_onExit(std::move(onExit)) {}
-    ~ScopeGuard() { m_onExit(); }
+    explicit ScopeGuard(OnExit onExit) : m_onExit(std::move(onExit)) {}
+    ~ScopeGuard() { std::ignore = withinMemory(m_onExit); }
     ScopeGuard(const ScopeGuard&) = delete;
     ScopeGuard& operator=(const ScopeGuard&) = delete;
 
 private:
-    const std::function<void()> m_onExit;
+    const OnExit m_onExit;
 };
 
 }  // namespace vexa

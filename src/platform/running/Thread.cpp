@@ -1,12 +1,13 @@
 #include "platform/Thread.h"
 
 #include <atomic>
-#include <system_error>
+#include <exception>
 #include <thread>
 #include <utility>
 
 #include "platform/Event.h"
 #include "platform/running/Scheduler.h"
+#include "text/OutOfMemory.h"
 
 namespace vexa::platform {
 
@@ -33,7 +34,7 @@ Thread::~Thread() {
 }
 
 bool Thread::start(const std::string& /*name*/, std::function<void()> body) {
-    m_state = std::make_shared<State>();
+    if (!withinMemory([this] { m_state = std::make_shared<State>(); })) return false;
     Scheduler::get().beginWork();
     try {
         m_state->thread = std::thread([state = m_state, body = std::move(body)] {
@@ -42,7 +43,7 @@ bool Thread::start(const std::string& /*name*/, std::function<void()> body) {
             state->ended.set();
             Scheduler::get().endWork();
         });
-    } catch (const std::system_error&) {
+    } catch (const std::exception&) {  // no thread or no memory to be had
         Scheduler::get().endWork();
         m_state.reset();
         return false;

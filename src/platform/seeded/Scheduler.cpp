@@ -16,6 +16,10 @@ thread_local Task* t_current = nullptr;
 // How often, out of 256, an operation that could go on hands the turn to somebody else.
 constexpr std::uint64_t kHandOverOdds = 40;
 
+bool isReady(const std::shared_ptr<Task>& task) {
+    return task->phase == Task::Phase::Ready;
+}
+
 std::string describeWait(const Task& task) {
     std::string text;
     for (const Event::State* event : task.events)
@@ -57,9 +61,11 @@ std::shared_ptr<Task> Scheduler::start(std::string name, std::function<void()> b
     auto task = std::make_shared<Task>(m_nextId++, std::move(name));
     {
         const Lock lock(m_mutex);
-        m_tasks.push_back(task);
+        m_tasks.reserve(m_tasks.size() + 1);
     }
     task->thread = std::thread([this, task, body = std::move(body)] { runTask(task, body); });
+    const Lock lock(m_mutex);
+    m_tasks.push_back(task);
     return task;
 }
 
@@ -93,23 +99,23 @@ void Scheduler::giveTurn(Lock& lock) {
     self->turn.wait(lock, [&] { return m_turn == self; });
 }
 
+// Without memory of its own, so that a test can let that of the running task run short.
 Task* Scheduler::chooseNext() {
-    std::vector<Task*> ready = readyTasks();
-    while (ready.empty()) {
+    std::size_t ready = countReady();
+    for (; ready == 0; ready = countReady()) {
         const bool allEnded = std::all_of(m_tasks.begin(), m_tasks.end(),
                                           [](const auto& task) { return task->phase == Task::Phase::Ended; });
         if (allEnded) return nullptr;
         if (!releaseWhoWantsRest() && !jumpToNextDeadline()) reportDeadlock();
-        ready = readyTasks();
     }
-    return ready[m_random() % ready.size()];
+    auto left = m_random() % ready;
+    return std::find_if(m_tasks.begin(), m_tasks.end(),
+                        [&](const auto& task) { return isReady(task) && left-- == 0; })
+        ->get();
 }
 
-std::vector<Task*> Scheduler::readyTasks() const {
-    std::vector<Task*> ready;
-    for (const auto& task : m_tasks)
-        if (task->phase == Task::Phase::Ready) ready.push_back(task.get());
-    return ready;
+std::size_t Scheduler::countReady() const {
+    return static_cast<std::size_t>(std::count_if(m_tasks.begin(), m_tasks.end(), isReady));
 }
 
 bool Scheduler::releaseWhoWantsRest() {

@@ -74,7 +74,7 @@ private:
     void runTask(const std::shared_ptr<Task>& task, const std::function<void()>& body);
     void giveTurn(Lock& lock);
     Task* chooseNext();
-    std::vector<Task*> readyTasks() const;
+    std::size_t countReady() const;
     bool releaseWhoWantsRest();
     bool jumpToNextDeadline();
     void release(Task& task, int outcome);

@@ -3,6 +3,7 @@
 #include <utility>
 
 #include "platform/seeded/Scheduler.h"
+#include "text/OutOfMemory.h"
 
 namespace vexa::platform {
 
@@ -17,13 +18,16 @@ Thread::~Thread() {
 }
 
 bool Thread::start(const std::string& name, std::function<void()> body) {
-    m_state = std::make_shared<State>();
-    m_state->task = Scheduler::get().start(name, [state = m_state, body = std::move(body)] {
-        body();
-        state->ended.set();
+    const bool isStarted = withinMemory([&] {
+        m_state = std::make_shared<State>();
+        m_state->task = Scheduler::get().start(name, [state = m_state, body = std::move(body)] {
+            body();
+            state->ended.set();
+        });
     });
+    if (!isStarted) m_state.reset();
     Scheduler::get().handOver();
-    return true;
+    return isStarted;
 }
 
 bool Thread::isCurrent() const {

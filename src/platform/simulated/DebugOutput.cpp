@@ -5,11 +5,13 @@
 #include "platform/posix/MachineFolder.h"
 #include "platform/posix/OwnerFiles.h"
 #include "simulation/Machine.h"
+#include "simulation/parts/MachineCode.h"
 #include "text/TextConversion.h"
 
 namespace vexa::platform {
 
 void outputDebugString(std::string_view text) {
+    const simulation::MachineCode here;
     if (!text.empty() && text.back() == '\n') text.remove_suffix(1);
     const simulation::Machine* const machine = simulation::Machine::current();
     const auto folder = machine ? machine->folder() : posix::machineFolder();
@@ -17,6 +19,7 @@ void outputDebugString(std::string_view text) {
 }
 
 void outputDebugString(std::wstring_view text) {
+    const simulation::MachineCode here;
     outputDebugString(utf8FromWide(text));
 }
 

@@ -1,5 +1,6 @@
 #include "platform/Files.h"
 
+#include <dirent.h>
 #include <fcntl.h>
 #include <sys/file.h>
 #include <sys/stat.h>
@@ -29,6 +30,11 @@ constexpr mode_t kOwnerOnlyFolder = 0700;
 constexpr std::uint32_t kErrorSharingViolation = 32;
 constexpr int kRenameTries = 5;
 constexpr std::chrono::milliseconds kLockPause{1};
+
+// The library's own iterator ends the process if memory runs out.
+struct DirectoryCloser {
+    void operator()(DIR* directory) const { ::closedir(directory); }
+};
 
 Descriptor openFile(const fs::path& path, int flags) {
     if (fileFault("open", path)) return Descriptor();
@@ -85,10 +91,9 @@ bool createFolder(const std::wstring& path) {
 
 std::vector<std::wstring> filesIn(const std::wstring& folder) {
     std::vector<std::wstring> names;
-    std::error_code error;
-    for (fs::directory_iterator entry(hostPath(folder), error), end; !error && entry != end;
-         entry.increment(error))
-        names.push_back(wideFromUtf8(entry->path().filename().string()));
+    const std::unique_ptr<DIR, DirectoryCloser> directory(::opendir(hostPath(folder).c_str()));
+    while (const dirent* const entry = directory ? ::readdir(directory.get()) : nullptr)
+        names.push_back(wideFromUtf8(entry->d_name));
     return names;
 }
 

@@ -3,15 +3,20 @@
 #include <windows.h>
 
 #include <string>
+#include <tuple>
+
+#include "text/OutOfMemory.h"
 
 namespace vexa::platform {
 
+// What memory doesn't allow is not written.
+
 void outputDebugString(std::string_view text) {
-    OutputDebugStringA(std::string(text).c_str());
+    std::ignore = withinMemory([&] { OutputDebugStringA(std::string(text).c_str()); });
 }
 
 void outputDebugString(std::wstring_view text) {
-    OutputDebugStringW(std::wstring(text).c_str());
+    std::ignore = withinMemory([&] { OutputDebugStringW(std::wstring(text).c_str()); });
 }
 
 }  // namespace vexa::platform

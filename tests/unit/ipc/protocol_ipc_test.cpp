@@ -11,6 +11,7 @@
 #include "channel/Ipc.h"
 #include "channel/IpcWebSocketServer.h"
 #include "unit/ipc/TestClient.h"
+#include "unit/platform/ShortMemory.h"
 
 namespace vexa::test {
 namespace {
@@ -248,6 +249,40 @@ TEST(Ipc, SendersOnManyThreadsAndClientsThatComeAndGoDoNoHarm) {
     while (echo.server.ipc->sendToAll("anybody?") && std::chrono::steady_clock::now() < end)
         std::this_thread::yield();
     EXPECT_FALSE(echo.server.ipc->sendToAll("anybody?")) << "all have gone";
+}
+
+std::thread::id g_testThread;
+
+bool isServersThread() {
+    return std::this_thread::get_id() != g_testThread;
+}
+
+/// Nothing if the connection ended before.
+std::optional<std::string> answer(std::int32_t port, std::string_view message) {
+    try {
+        TestClient client(port);
+        client.send(message);
+        return client.receive();
+    } catch (const std::exception&) {
+        return std::nullopt;
+    }
+}
+
+TEST(Ipc, WhereMemoryRunsOutClientsAreDroppedAndMayComeBack) {
+    EchoServer echo;
+    g_testThread = std::this_thread::get_id();
+    bool wasShort = true;
+    for (int granted = 0; wasShort; ++granted) {
+        {
+            const ShortMemory memory(isServersThread, granted, false);
+            answer(echo.port, "while it is short");
+            wasShort = memory.hasRefused();
+        }
+        std::optional<std::string> later;
+        for (int tries = 0; !later && tries < 1000; ++tries)
+            later = answer(echo.port, "later");
+        ASSERT_EQ(later, "later") << granted;
+    }
 }
 
 }  // namespace
