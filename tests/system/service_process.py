@@ -212,16 +212,6 @@ class Stop(Story):
         for client in clients:
             self.assertIn(client.wait_closed(), (1001, 1006))
 
-    def test_the_hotspot_port_answers_until_the_connecting_thread_has_ended(self):
-        machine = self.start(speed=0)
-        sa, hs20 = machine.sa(), machine.hs20()
-        self.control.do("advance", ms=1)  # comes back when that thread sleeps
-        machine.parent.process.send_signal(signal.SIGTERM)
-        self.assertEqual(sa.wait_closed(), 1001)
-        hs20.ask("GET_IS_CARD_IN")
-        self.control.do("advance", ms=10000)
-        self.assertEqual((machine.parent.wait(), hs20.wait_closed()), (0, 1001))
-
     def test_its_own_signals_do_not_end_it(self):
         service = self.start().service_pid()
         for number in (signal.SIGINT, signal.SIGHUP, signal.SIGPIPE):
