@@ -32,6 +32,10 @@ struct Shortage {
     bool log = false;
 };
 
+void PrintTo(const Shortage& shortage, std::ostream* out) {
+    *out << shortage.name;
+}
+
 Deed playing(const std::vector<std::string>& deeds) {
     return [deeds](Story& story) { story.play(deeds); };
 }
@@ -115,7 +119,6 @@ void expectSurvival(Story& story, const Shortage& shortage) {
     story.expect("something is refused", refused > 1, true);
     if (__lsan_do_recoverable_leak_check != nullptr)
         story.expect("leaks", __lsan_do_recoverable_leak_check(), 0);
-    story.tell(std::to_string(refused) + " " + wanted + "\n");
 }
 
 const std::string kLongName = "a name of as many as 32 bytes...";
@@ -131,39 +134,34 @@ const Deed kNothing = playing({});
 const Deed kJoining = playing({connecting(kLongName), passing(2s)});
 const Deed kLeaving = playing({disconnecting(kLongName), passing(1s)});
 const std::string kHome = R"(,"profileName":"home","ssidHex":"686f6d65")";
-const std::string kAsLong = R"("ssid":")" + kLongName + "\"";
+const std::string kSaving = sending("SET_POSITION_CREDENTIAL", R"({"Id":1,"Order":0})");
 
 Deed editing(const std::string& name) {
     const std::string members = R"("Id":2,"AutoConnect":true,"CredentialName":")" + name + "\"";
     return playing({sending("EDIT_CREDENTIAL", ttlsData("a.example", members))});
 }
 
-void addNew(Story& story) {
+/// The credentials as they were at first: the next one is the third.
+void restore(Story& story) {
+    static const std::string first = story.config();
+    story.writeConfig(first);
+    story.order("READ_CREDENTIAL_FROM_FILE");
+}
+
+void add(Story& story) {
     story.order("ADD_CREDENTIAL", ttlsData("new.example"));
 }
 
-int g_added = 0;
-
-void findNew(Story& story) {
-    addNew(story);
-    for (const ClientEvent& event : story.hotspot().events())
-        for (const Json::Value& credential : event.data)
-            g_added = std::max(g_added, credential["Id"].asInt());
-}
-
-void deleteNew(Story& story) {
-    story.order("DELETE_CREDENTIAL", R"({"Id":)" + std::to_string(g_added) + "}");
-}
-
-void removeNew(Story& story) {
-    findNew(story);
-    deleteNew(story);
+void restoreAndAdd(Story& story) {
+    restore(story);
+    add(story);
 }
 
 /// How often this stands in the list, and in the file once it is saved again.
 Look counting(const std::string& text) {
     return [text](World& world) {
-        const std::string listed = list(world, "SET_POSITION_CREDENTIAL", R"({"Id":1,"Order":0})");
+        world.play({kSaving});
+        const std::string listed = list(world);
         return std::to_string(count(listed, text)) + " " + std::to_string(count(world.config(), text));
     };
 }
@@ -172,13 +170,12 @@ const Shortage kShortages[] = {
     {"List", kNotifications, playing({kOther}), playing({kReport}), askedList, true},
     {"Realms", kNotifications, kNothing, playing({sending("UPDATE_NETWORK_REALM"), passing(30s)}), sight},
     {"Reports", kNotifications, kNothing,
-     playing({doing("userDisconnect", kAsLong), doing("sessionChange", R"("eventType":1)"),
-              on("reportAnqp", 3), doing("roam"), doing("driverState", R"("current":1,"previous":2)")}),
+     playing({doing("userDisconnect", R"("ssid":")" + kLongName + "\""),
+              doing("sessionChange", R"("eventType":1)"), on("reportAnqp", 3), doing("roam"),
+              doing("driverState", R"("current":1,"previous":2)"), doing("connection", R"("code":9)" + kHome),
+              doing("connection", R"("code":10)" + kHome)}),
      heard},
     {"Outcome", kNotifications, kLeaving, kJoining, connectedTo},
-    {"Foreign", kNotifications, kNothing,
-     playing({doing("connection", R"("code":9)" + kHome), doing("connection", R"("code":10)" + kHome)}),
-     heard},
     {"Radio", kNotifications, kNothing, playing({kRadioOff, passing(1s), kRadioOn, passing(40s)}), sight},
     {"Adapter", kNotifications, kNothing,
      playing({doing("pullAdapter"), passing(1s), doing("insertAdapter"), passing(40s)}), sight},
@@ -194,10 +191,11 @@ const Shortage kShortages[] = {
      playing({sending("GET_ALL_CREDENTIAL_LIST"), sending("GET_ALL_NETWORK_LIST"), sending("GET_RADIO"),
               sending("GET_IS_CARD_IN"), sending("GET_IS_INTERNET_ACCESS")}),
      heard},
-    {"Adding", kCommands, removeNew, addNew, counting("new.example")},
-    {"Deleting", kCommands, findNew, deleteNew, counting("new.example")},
+    {"Adding", kCommands, restore, add, counting("new.example")},
+    {"Deleting", kCommands, restoreAndAdd, playing({sending("DELETE_CREDENTIAL", R"({"Id":3})")}),
+     counting("new.example")},
     {"Editing", kCommands, editing("one"), editing("another"), counting("another")},
-    {"Reloading", kCommands, kNothing, playing({sending("READ_CREDENTIAL_FROM_FILE")}), sight},
+    {"Reloading", kCommands, kNothing, playing({sending("READ_CREDENTIAL_FROM_FILE"), kSaving}), sight},
     {"Joining", kCommands, kLeaving, kJoining, connectedTo},
     {"Leaving", kCommands, kJoining, kLeaving, connectedTo},
     {"Switch", kCommands, kNothing, playing({kHs20Off, passing(1s), kHs20On, passing(40s)}), sight},
@@ -208,16 +206,13 @@ const Shortage kShortages[] = {
 class OutOfMemory : public testing::TestWithParam<Shortage> {};
 
 TEST_P(OutOfMemory, EndsWhatIsDoneAndNotTheService) {
-    const Ending ending = runStory({.log = GetParam().log}, kAir, [](Story& story) {
-        pugi::set_memory_management_functions([](std::size_t size) { return grantedMemory(size); },
-                                              std::free);
+    // XML has an allocator of its own.
+    EXPECT_STORY(test::Run{.log = GetParam().log}, kAir, [&](Story& story) {
+        pugi::set_memory_management_functions(grantedMemory, std::free);
         asking({"GET_CHANNEL_LIST"})(story);
         settle(story);
         expectSurvival(story, GetParam());
     });
-    EXPECT_EQ(ending.wrong, "");
-    RecordProperty("refused", ending.told);
-    std::printf("%s", ending.told.c_str());
 }
 
 INSTANTIATE_TEST_SUITE_P(In, OutOfMemory, testing::ValuesIn(kShortages),

@@ -93,7 +93,8 @@ std::vector<std::wstring> filesIn(const std::wstring& folder) {
     std::vector<std::wstring> names;
     const std::unique_ptr<DIR, DirectoryCloser> directory(::opendir(hostPath(folder).c_str()));
     while (const dirent* const entry = directory ? ::readdir(directory.get()) : nullptr)
-        names.push_back(wideFromUtf8(entry->d_name));
+        if (const std::string_view name = entry->d_name; name != "." && name != "..")
+            names.push_back(wideFromUtf8(name));
     return names;
 }
 
