@@ -13,7 +13,8 @@ using platform::LockGuard;
 
 }  // namespace
 
-// An adapter that is gone, a module that fails and an answer that is cut short leave the channels as they were known.
+// An adapter that is gone, a module that fails and an answer that is cut short leave the channels as they
+// were known.
 void SAPortlink::QueryChannelList() {
     const LockGuard lock(m_cs);
     updateCardState();
