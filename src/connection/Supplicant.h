@@ -149,8 +149,6 @@ private:
         REQUIRES(g_hs20Lock);
     ResultCode report(const WLAN_CONNECTION_NOTIFICATION_DATA& data, std::uint32_t outcome)
         REQUIRES(g_hs20Lock);
-    void clearNumRetriesOnConnSuccess(const std::wstring& profileName, std::string_view ssid)
-        REQUIRES(g_hs20Lock);
 
     ResultCode connectBssNow(const std::string& ssid) REQUIRES(g_hs20Lock);
     ResultCode connectPlainly(const std::string& ssid) REQUIRES(g_hs20Lock);

@@ -122,21 +122,15 @@ ResultCode Supplicant::onSuccess(const WLAN_CONNECTION_NOTIFICATION_DATA& data, 
     const std::string_view ssid = bytesOf(data.dot11Ssid);
     m_bHs20Connected = true;
     setState(SupplicantState::Connected);
-    clearNumRetriesOnConnSuccess(profile.m_name, ssid);
+    Log(3, ">>>>Clear cred num retries on conn success: profileName=%s",
+        narrowFromWide(profile.m_name).c_str());
     const Hs20Network* const network = m_engine.m_networkList.findBySsid(ssid);
     if (network == nullptr) return kFailure;
+    if (profile.m_credId >= 1) m_engine.m_retryHelper.setNumRetries(profile.m_credId, ssid, 0);
     if (m_history.addConnection(data.dot11Ssid, network->m_macAddress, m_engine.m_networkList) != kSuccess)
         Log(6, "ERROR: Create connection history failed.");
     eapMethod = static_cast<std::uint32_t>(profile.m_eapMethod);
     return endAttempt(data, ConnectionResult::kSucceeded);
-}
-
-void Supplicant::clearNumRetriesOnConnSuccess(const std::wstring& profileName, std::string_view ssid) {
-    Log(3, ">>>>Clear cred num retries on conn success: profileName=%s", narrowFromWide(profileName).c_str());
-    if (m_engine.m_networkList.findBySsid(ssid) == nullptr) return;
-    NetworkProfile* profile = nullptr;
-    if (m_engine.m_profileMgr.findProfileByName(profileName, profile) == kSuccess && profile->m_credId >= 1)
-        m_engine.m_retryHelper.setNumRetries(profile->m_credId, ssid, 0);
 }
 
 ResultCode Supplicant::onFailure(const WLAN_CONNECTION_NOTIFICATION_DATA& data,
