@@ -152,9 +152,16 @@ void add(Story& story) {
     story.order("ADD_CREDENTIAL", ttlsData("new.example"));
 }
 
+int g_addedId = 0;
+
 void restoreAndAdd(Story& story) {
     restore(story);
     add(story);
+    g_addedId = std::stoi(list(story));
+}
+
+void deleteAdded(Story& story) {
+    story.order("DELETE_CREDENTIAL", R"({"Id":)" + std::to_string(g_addedId) + "}");
 }
 
 /// How often this stands in the list, and in the file once it is saved again.
@@ -192,8 +199,7 @@ const Shortage kShortages[] = {
               sending("GET_IS_CARD_IN"), sending("GET_IS_INTERNET_ACCESS")}),
      heard},
     {"Adding", kCommands, restore, add, counting("new.example")},
-    {"Deleting", kCommands, restoreAndAdd, playing({sending("DELETE_CREDENTIAL", R"({"Id":3})")}),
-     counting("new.example")},
+    {"Deleting", kCommands, restoreAndAdd, deleteAdded, counting("new.example")},
     {"Editing", kCommands, editing("one"), editing("another"), counting("another")},
     {"Reloading", kCommands, kNothing, playing({sending("READ_CREDENTIAL_FROM_FILE"), kSaving}), sight},
     {"Joining", kCommands, kLeaving, kJoining, connectedTo},
