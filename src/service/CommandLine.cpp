@@ -50,11 +50,12 @@ std::uint16_t hostOrder(std::uint32_t networkPort) {
 bool readTcpTable(TcpTableBuffer& buffer) {
     std::uint32_t size = sizeof(TcpTable);
     if (!buffer.allocate(size)) return false;
-    const bool isTooSmall =
-        platform::getTcpTable(buffer.table(), size, true) == platform::kErrorInsufficientBuffer;
+    const std::uint32_t guess = platform::getTcpTable(buffer.table(), size, true);
+    const bool isTooSmall = guess == platform::kErrorInsufficientBuffer;
     if (isTooSmall && !buffer.allocate(size)) return false;
     std::uint32_t result = platform::getTcpTable(buffer.table(), size, true);
-    for (int i = 1; isTooSmall && i < kMaxTries && result == platform::kErrorInsufficientBuffer; ++i) {
+    const bool mayHaveGrown = isTooSmall || guess == platform::kNoError;
+    for (int i = 1; mayHaveGrown && i < kMaxTries && result == platform::kErrorInsufficientBuffer; ++i) {
         if (!buffer.allocate(size)) return false;
         result = platform::getTcpTable(buffer.table(), size, true);
     }

@@ -1,6 +1,7 @@
 #include <gtest/gtest.h>
 
 #include "engine/world/ConnectStory.h"
+#include "service/CommandLine.h"
 
 namespace vexa::test {
 namespace {
@@ -96,6 +97,14 @@ STORY(Routing, CommandsOfTheHotspotPortLeaveOneErrorLineWhenTheyCanNotBeRead, "{
         expectHeard(
             R"({"CommandId":"CONNECT_NETWORK","Data":"{\"NetWorkName\":)" + std::string(name) + "}\"}",
             "connectBss failed.\nSend connection result to vexa.\n", "CONNECT_DISCONNECT");
+}
+
+// The world's table is empty: the first guess of its size fits, and it has grown when the rows are asked for.
+STORY(PortCheck, AsksAgainForATableThatHasOutgrownAGuessThatFitted, "{}") {
+    story.act("fail", R"("call":"GetTcpTable","error":122,"skip":1)");
+    bool isFree = false;
+    story.expect("is told", isTcpPortFree(isFree, 8002), true);
+    story.expect("is free", isFree, true);
 }
 
 }  // namespace
