@@ -1,6 +1,7 @@
 #include "client/machine/ServiceParent.h"
 
 #include <algorithm>
+#include <filesystem>
 #include <iostream>
 
 #include "client/machine/ServiceHost.h"
@@ -184,12 +185,18 @@ void ServiceParent::giveUp() {
                       kExitNotStarted);
 }
 
+// The service says there what it could not ask about its ports.
+bool ServiceParent::isOutputEmpty() const {
+    std::error_code ec;
+    return std::filesystem::file_size(m_folder.outputFile(), ec) == 0 || ec;
+}
+
 void ServiceParent::reportEarlyEnd(int exitCode) const {
     if (exitCode == kScenarioRefused) return;  // it has said so itself
     std::cerr << "vexa: the service ended with exit code " << exitCode << " before it was ready: ";
     if (exitCode == 0) {
         std::cerr << "another one seems to run on the machine " << m_folder.path().string() << '\n';
-    } else if (exitCode == kServiceFailed && !portIsBusy()) {
+    } else if (exitCode == kServiceFailed && !portIsBusy() && isOutputEmpty()) {
         std::cerr << "its configuration file " << m_folder.configFile().string() << " cannot be read\n";
     } else {
         std::cerr << "one of the ports " << portNames(m_ports) << " may be busy; its output is in "

@@ -70,6 +70,7 @@ private:
     void start(const StartRequest& request);
     bool portsListen() const;
     bool portIsBusy() const;
+    bool isOutputEmpty() const;
     bool waitForExit(std::chrono::milliseconds limit);
     void letGo();
     [[noreturn]] void giveUp();

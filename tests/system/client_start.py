@@ -93,6 +93,13 @@ class ServiceThatDoesNotCome(Story):
             self.assert_ends(self.begin(), 1, f"{file} cannot be read")
             file.rmdir() if file.is_dir() else file.unlink()
 
+    def test_a_table_of_ports_that_cannot_be_read_gives_1_and_leads_to_what_the_service_says(self):
+        scenario = self.folder / "scenario.json"
+        scenario.write_text('{"timeline": [{"atMs": 0, "do": "fail", "call": "GetTcpTable", "error": 5, "skip": 1}]}')
+        output = self.folder / "machine" / "stdout.log"
+        self.assert_ends(self.begin("--scenario", scenario), 1, str(output))
+        self.assertIn("GetTcpTable failed with 5", output.read_text())
+
     def test_its_exit_code_is_passed_on(self):
         for code in (0, 1, 77):
             with self.subTest(code):

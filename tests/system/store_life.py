@@ -126,7 +126,8 @@ class Neighbour(threading.Thread):
         except Exception as problem:
             self.problem = problem
         finally:
-            self.machine.__exit__(type(self.problem) if self.problem else None)
+            if self.machine:
+                self.machine.__exit__(type(self.problem) if self.problem else None)
 
     def begin(self):
         self.machine = Machine({"user": self.user}, folder=self.folder, control=False).__enter__()
