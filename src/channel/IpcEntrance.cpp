@@ -171,6 +171,8 @@ void IpcEntrance::close() {
 }
 
 void IpcEntrance::resetAll() {
+    m_next.reset();
+    m_unjudged.clear();
     while (!m_connections.empty())
         m_connections.extract(m_connections.begin()).mapped()->reset();
 }
@@ -179,8 +181,6 @@ void IpcEntrance::acceptAnew() {
     error_code ignored;
     m_acceptor.cancel(ignored);
     m_pause.cancel();
-    m_next.reset();
-    m_unjudged.clear();
     m_owners.forget();
     m_isAccepting = false;
     accept();

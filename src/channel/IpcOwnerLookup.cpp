@@ -29,6 +29,7 @@ platform::PeerPorts portsOf(const tcp::socket& connection) {
 }  // namespace
 
 void IpcOwnerLookup::ask(const tcp::socket& connection, Answer answer) {
+    m_answers.reserve(m_answers.size() + 1);
     m_connections.push_back(portsOf(connection));
     m_answers.push_back(std::move(answer));
     if (!std::exchange(m_isAsking, true)) asio::post(m_strand, [this] { askAll(); });

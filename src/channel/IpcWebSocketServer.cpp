@@ -240,8 +240,11 @@ void IpcWebSocketServer::Impl::handle(const Incoming& incoming) {
 void IpcWebSocketServer::Impl::helpSlowHandler() {
     asio::post(m_inout, [this] {
         flushOutbox();
-        for (const auto& [id, session] : m_clients)
+        // Who reads his own goodbye leaves the map.
+        for (auto next = m_clients.begin(); next != m_clients.end();) {
+            const auto session = (next++)->second;
             session->readAhead();
+        }
     });
 }
 

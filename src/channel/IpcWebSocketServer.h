@@ -12,7 +12,7 @@ namespace vexa {
 
 /// A WebSocket server (RFC 6455) on one port of 127.0.0.1. One WebSocket message is one message: text or
 /// binary comes in, text goes out. Only processes of this account get in, with a loopback name in `Host` and
-/// without an `Origin`; everyone else gets HTTP 403.
+/// without an `Origin`; everyone else gets HTTP 403, or a reset in a crowd.
 ///
 /// One thread runs the input and output of all clients and the handler, so that an answer need not wait for
 /// another thread to wake up. Between two messages that are handled, what is queued for sending is written.

@@ -41,6 +41,9 @@ public:
     /// Locks the file, and brings into memory what others have changed in it since it was last read or saved.
     /// What memory has and could not be saved stays; so does all, where the file can't be read.
     [[nodiscard]] FileLock beginChange() REQUIRES(g_hs20Lock);
+    /// What the credential that a client knows by this id is called since beginChange: another may have been
+    /// given its id.
+    std::int32_t currentId(std::int32_t id) const REQUIRES(g_hs20Lock);
 
     /// Writes the next id, the credentials, and the user's list, up to the first that the file has no place
     /// for, in one save. That the file could not be written is no failure: memory and file then differ until
@@ -76,6 +79,7 @@ private:
         Trace trace;
         std::int32_t highestId = 0;                        // whoever's it is
         std::unordered_set<std::int32_t> foreignIds = {};  // of other users' private credentials
+        bool hasUser = false;                              // the user's own list is there
     };
 
     /// A credential as the file held it when it was last read or saved, its place as the user's list gave it,
@@ -88,7 +92,6 @@ private:
     ResultCode createDefaultFile(const std::wstring& path) REQUIRES(g_hs20Lock);
     ResultCode openDocument() REQUIRES(g_hs20Lock);
     bool saveDocument() REQUIRES(g_hs20Lock);
-    void forgetIfFileIsGone() REQUIRES(g_hs20Lock);
 
     void readGlobalSettings() REQUIRES(g_hs20Lock);
     bool readFlag(const char* xpath, bool missing) REQUIRES(g_hs20Lock);
@@ -104,7 +107,7 @@ private:
     static std::int32_t followingId(std::int32_t id);
     bool isForeign(std::int32_t access, const std::wstring& creator) const REQUIRES(g_hs20Lock);
     bool repairIds(const Reading& reading) REQUIRES(g_hs20Lock);
-    ResultCode readUsers(const Reading& reading, bool& isChanged) REQUIRES(g_hs20Lock);
+    ResultCode readUsers(Reading& reading, bool& isChanged) REQUIRES(g_hs20Lock);
     Node findCurrentUser(const std::vector<Node>& users, Trace trace) REQUIRES(g_hs20Lock);
     bool applyReferences(const std::vector<Node>& references, const Reading& reading) REQUIRES(g_hs20Lock);
 
@@ -138,6 +141,9 @@ private:
     std::wstring m_baseDir GUARDED_BY(g_hs20Lock);
     bool m_bUnsaved GUARDED_BY(g_hs20Lock) = false;  // the last save did not bring all into the file
     std::unordered_map<std::int32_t, Known> m_known GUARDED_BY(g_hs20Lock);
+    bool m_hadUser GUARDED_BY(g_hs20Lock) =
+        false;  // the file had the user's list when it was last read or saved
+    std::unordered_map<std::int32_t, std::int32_t> m_renamed GUARDED_BY(g_hs20Lock);  // since beginChange
     std::wstring m_configPath GUARDED_BY(g_hs20Lock);
 };
 

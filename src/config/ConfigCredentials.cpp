@@ -120,6 +120,7 @@ bool Config::repairIds(const Reading& reading) {
         if (taken.insert(credential->m_id).second || next == kLargest) continue;
         if (reading.trace == Trace::Yes)
             Log(6, "ERROR: Found duplicate credential id=%d, new id=%d", credential->m_id, next);
+        if (reading.foreignIds.contains(credential->m_id)) m_renamed[credential->m_id] = next;
         credential->m_id = next;
         next = followingId(next);
         isChanged = true;

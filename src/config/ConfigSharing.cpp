@@ -1,9 +1,9 @@
 #include <algorithm>
 #include <memory>
+#include <utility>
 
 #include "base/DiagnosticLog.h"
 #include "config/Config.h"
-#include "contract/Store.h"
 #include "text/ScopeGuard.h"
 #include "text/TextConversion.h"
 
@@ -17,6 +17,12 @@ constexpr std::chrono::milliseconds kLockPatience{2000};
 bool holdTheSame(Credential a, const Credential& b) {
     a.m_priority = b.m_priority;
     return a == b;
+}
+
+// Each save signs what all see.
+bool isTheSame(Credential a, const Credential& b) {
+    a.m_creator = b.m_creator;
+    return holdTheSame(std::move(a), b);
 }
 
 Credential* find(const std::unordered_map<std::int32_t, Credential*>& byId, std::int32_t id) {
@@ -36,19 +42,14 @@ Config::FileLock Config::beginChange() {
     const ScopeGuard release([this]() NO_THREAD_SAFETY_ANALYSIS { m_xmlDoc.release(); });
     CredentialTable table;
     Reading stored{.table = table, .trace = Trace::No};
-    if (openDocument() != kSuccess)
-        forgetIfFileIsGone();
-    else if (readSilently(stored))
-        takeOver(stored);
+    m_renamed.clear();
+    if (openDocument() == kSuccess && readSilently(stored)) takeOver(stored);
     return held;
 }
 
-// Nothing of what memory holds is in the file then, and a new one must not be taken for others' deletions.
-// One that merely can't be opened comes back as it was.
-void Config::forgetIfFileIsGone() {
-    const auto files = platform::filesIn(m_baseDir);
-    if (std::find(files.begin(), files.end(), wideFromNarrow(contract::kConfigFile)) == files.end())
-        m_known.clear();
+std::int32_t Config::currentId(std::int32_t id) const {
+    const auto renamed = m_renamed.find(id);
+    return renamed == m_renamed.end() ? id : renamed->second;
 }
 
 // The credentials of the open document in the places that the user's list gives them; what it doesn't list
@@ -63,16 +64,21 @@ void Config::remember() {
     CredentialTable stored;
     Reading reading{.table = stored, .trace = Trace::No};
     readSilently(reading);
-    m_known.clear();
     const auto inMemory = m_credentials.credentialsById();
-    for (const Credential* theirs : stored.copyCredentialPointers())
-        if (const Credential* const mine = find(inMemory, theirs->m_id))
-            m_known.try_emplace(theirs->m_id, Known{*theirs, *mine});
+    std::unordered_map<std::int32_t, Known> known;
+    for (const Credential* theirs : stored.copyCredentialPointers()) {
+        const Credential* const mine = find(inMemory, theirs->m_id);
+        known.try_emplace(theirs->m_id, Known{*theirs, mine == nullptr ? *theirs : *mine});
+    }
+    m_known.swap(known);
+    m_hadUser = reading.hasUser;
 }
 
 // What the file holds otherwise than before is what others changed; what memory holds otherwise is what could
 // not be saved. That has no id of its own until it is in the file.
 void Config::takeOver(const Reading& stored) {
+    // No service takes a list of a user away: this file has been made anew, and others have deleted nothing.
+    if (m_hadUser && !stored.hasUser) m_known.clear();
     takeOverDeletions(stored.table);
     for (Credential* mine : m_credentials.copyCredentialPointers())
         if (stored.foreignIds.contains(mine->m_id)) giveNewId(*mine);
@@ -87,6 +93,7 @@ void Config::takeOver(const Reading& stored) {
     }
     takeOverPlaces(stored.table);
     m_known = std::move(known);
+    m_hadUser = stored.hasUser;
 }
 
 void Config::takeOverDeletions(const CredentialTable& stored) {
@@ -102,6 +109,7 @@ void Config::takeOverDeletions(const CredentialTable& stored) {
 void Config::giveNewId(Credential& credential) {
     if (m_nextCredId == followingId(m_nextCredId)) return;
     Log(6, "ERROR: Found duplicate credential id=%d, new id=%d", credential.m_id, m_nextCredId);
+    m_renamed[credential.m_id] = m_nextCredId;
     credential.m_id = m_nextCredId;
     advanceNextCredId();
 }
@@ -110,15 +118,15 @@ void Config::giveNewId(Credential& credential) {
 Credential Config::takeOverKnown(const Credential& theirs, const Known& before, Credential* mine) {
     if (mine == nullptr || !holdTheSame(*mine, before.inMemory)) return before.inMemory;
     if (holdTheSame(theirs, before.inFile)) return *mine;
-    const std::int32_t place = mine->m_priority;
-    *mine = theirs;
-    mine->m_priority = place;
+    Credential now = theirs;
+    now.m_priority = mine->m_priority;
+    *mine = std::move(now);
     return theirs;
 }
 
 // One that could not be saved may have the id that another was given meanwhile.
 Credential Config::takeOverNew(const Credential& theirs, Credential* mine) {
-    if (mine != nullptr && mine->m_type == theirs.m_type && mine->m_realm == theirs.m_realm) return theirs;
+    if (mine != nullptr && isTheSame(*mine, theirs)) return theirs;
     if (mine != nullptr) giveNewId(*mine);
     m_credentials.appendUnplaced(std::make_unique<Credential>(theirs));
     return theirs;

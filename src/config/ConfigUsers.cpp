@@ -7,7 +7,7 @@
 
 namespace vexa {
 
-ResultCode Config::readUsers(const Reading& reading, bool& isChanged) {
+ResultCode Config::readUsers(Reading& reading, bool& isChanged) {
     const bool isTraced = reading.trace == Trace::Yes;
     if (isTraced) Log(2, "Reading all user info...");
     if (m_userName.empty()) return kFailure;
@@ -15,6 +15,7 @@ ResultCode Config::readUsers(const Reading& reading, bool& isChanged) {
     if (m_xmlDoc.selectNodes("/*/users/*", Node(), users) != kSuccess) return kFailure;
     if (isTraced) Log(2, "Retrieved total %d user info", static_cast<int>(users.size()));
     if (const Node user = findCurrentUser(users, reading.trace)) {
+        reading.hasUser = true;
         std::vector<Node> references;
         if (m_xmlDoc.selectNodes("credentials/*", user, references) != kSuccess) return kFailure;
         if (isTraced) Log(2, "\t\tcredential count=%d", static_cast<int>(references.size()));

@@ -104,7 +104,7 @@ public:
     /// refused change changes nothing.
     void addCredential(const CredentialInput& input);
     ResultCode deleteCredential(std::int32_t id);
-    ResultCode updateCredential(const CredentialInput& input);
+    ResultCode updateCredential(CredentialInput input);
     /// `position` counts from 1.
     void setCredentialPosition(std::int32_t id, std::int32_t position);
 
@@ -137,7 +137,7 @@ private:
         REQUIRES(g_hs20Lock);
     ResultCode onForeignResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data) REQUIRES(g_hs20Lock);
     /// Whether a connection is under way now.
-    bool carryOutPendingRequest() REQUIRES(g_hs20Lock);
+    bool carryOutPendingRequest(const std::wstring& finished) REQUIRES(g_hs20Lock);
     ResultCode onSuccess(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const NetworkProfile& profile,
                          std::uint32_t& eapMethod) REQUIRES(g_hs20Lock);
     ResultCode onFailure(const WLAN_CONNECTION_NOTIFICATION_DATA& data, const NetworkProfile& profile)

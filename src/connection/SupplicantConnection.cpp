@@ -1,4 +1,5 @@
 #include <cstddef>
+#include <optional>
 #include <string_view>
 #include <utility>
 
@@ -91,7 +92,7 @@ ResultCode Supplicant::onOwnResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data
     m_engine.m_bConnectionStarted = false;
     const std::wstring name = profileNameOf(data);
     LogWide(3, L"Connection result initiated by HS20, clearing the cache, profile name=%s.", name.c_str());
-    if (m_bManualConnectPending && carryOutPendingRequest()) return kSuccess;
+    if (m_bManualConnectPending && carryOutPendingRequest(name)) return kSuccess;
     m_engine.m_hConnectionCompletedEvent.set();
     NetworkProfile* profile = nullptr;
     if (m_engine.m_profileMgr.findProfileByName(name, profile) != kSuccess) {
@@ -103,15 +104,22 @@ ResultCode Supplicant::onOwnResult(const WLAN_CONNECTION_NOTIFICATION_DATA& data
 
 // Once a request is under way the finished attempt leaves no trace: what the client hears comes from the new
 // one. If none can be made the finished attempt is one like any other, and its walk goes on where it was.
-bool Supplicant::carryOutPendingRequest() {
+bool Supplicant::carryOutPendingRequest(const std::wstring& finished) {
     Log(3, "###User manual connecting request pending, we are going to connect now.###");
-    const bool wasManual = std::exchange(m_bManualConnectStarted, false);
+    NetworkProfile* profile = nullptr;
+    std::optional<NetworkProfile> used;
+    if (m_engine.m_profileMgr.findProfileByName(finished, profile) == kSuccess) used = *profile;
     const std::vector<std::int32_t> tried = m_triedCredentialIds;
+    const bool wasManual = std::exchange(m_bManualConnectStarted, false);
     m_bManualConnectPending = false;
     const bool isRefused = connectBssNow(m_pendingManualSsid) != kSuccess;
     if (m_engine.m_bConnectionStarted) return true;
     m_bManualConnectStarted = wasManual;
     m_triedCredentialIds = tried;
+    if (used && m_engine.m_profileMgr.findProfileByName(finished, profile) == kSuccess) {
+        used->m_priority = profile->m_priority;
+        *profile = *used;
+    }
     if (isRefused) sendConnectionResult(ConnectionResult::kFailed);
     return false;
 }

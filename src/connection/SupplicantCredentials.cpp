@@ -33,6 +33,7 @@ ResultCode Supplicant::deleteCredential(std::int32_t id) {
     Log(3, "Deleting the credential with id=%d", id);
     Config& config = m_engine.m_config;
     const auto file = config.beginChange();
+    id = config.currentId(id);
     if (!config.credentials().deleteCredential(id)) return kFailure;
     config.saveConfig(file);
     m_engine.m_retryHelper.removeAllCredNumRetryEntries(id);
@@ -41,11 +42,12 @@ ResultCode Supplicant::deleteCredential(std::int32_t id) {
     return kSuccess;
 }
 
-ResultCode Supplicant::updateCredential(const CredentialInput& input) {
+ResultCode Supplicant::updateCredential(CredentialInput input) {
     const LockGuard lock(g_hs20Lock);
     Log(3, "Updating the credential with id=%d", input.id);
     Config& config = m_engine.m_config;
     const auto file = config.beginChange();
+    input.id = config.currentId(input.id);
     const Credential* const credential = findCredential(input.id);
     if (credential == nullptr) {
         Log(6, "ERROR: Cannot find credential.");
@@ -66,7 +68,7 @@ void Supplicant::setCredentialPosition(std::int32_t id, std::int32_t position) {
     const LockGuard lock(g_hs20Lock);
     Config& config = m_engine.m_config;
     const auto file = config.beginChange();
-    config.credentials().setCredentialPosition(id, position);
+    config.credentials().setCredentialPosition(config.currentId(id), position);
     config.saveConfig(file);
 }
 

@@ -134,7 +134,7 @@ const Credential* Supplicant::nextUntried(const Hs20Network& network) {
     return nullptr;
 }
 
-// No request was made: what auto-connect goes by is the network's profile as it was, or none.
+// Where no request was needed, what auto-connect goes by is the network's profile as it was, or none.
 ResultCode Supplicant::connectFreshly(const Hs20Network& network, const Credential& credential) {
     NetworkProfileMgr& profiles = m_engine.m_profileMgr;
     NetworkProfile* profile = nullptr;
@@ -148,7 +148,7 @@ ResultCode Supplicant::connectFreshly(const Hs20Network& network, const Credenti
                                           profile) != kSuccess)
         return kFailure;
     const ResultCode result = connectToNetwork(network, *profile);
-    if (m_engine.m_bConnectionStarted) return result;
+    if (m_engine.m_bConnectionStarted || result != kSuccess) return result;
     if (!replaced) {
         profiles.deleteProfile(profile->m_id);
         return result;

@@ -157,7 +157,7 @@ Deed editing(int id, const std::string& realm) {
 
 Deed deleting(int id) {
     return [=](StoreMachine& store) {
-        store.change([&](CredentialTable& table) { table.deleteCredential(id); });
+        store.change([&](CredentialTable& table) { table.deleteCredential(store.config().currentId(id)); });
     };
 }
 
@@ -230,6 +230,9 @@ TEST(Sharing, WhatOthersChangedIsTakenOverAndWhatCouldNotBeSavedStays) {
          {adding("c"), deleting(3), writing(both, 1), kReading, adding("d")},
          "4:d 1:a 2:b",
          5},
+        {"and is deleted by the id that the client knows",
+         {writing(bobs(2) + both, 3), deleting(2)},
+         "2:x 1:a"},
         {"one for all was added", {writing(both + ttls(3, "y"), 4), moving(1, 3)}, "3:y 2:b 1:a"},
         {"one was deleted", {writing(ttls(2, "b"), 3), moving(2, 1)}, "2:b", 3},
         {"one was edited", {writing(one + ttls(2, "y"), 3), moving(2, 1)}, "2:y 1:a", 3},
@@ -242,6 +245,14 @@ TEST(Sharing, WhatOthersChangedIsTakenOverAndWhatCouldNotBeSavedStays) {
         {"unsaved: an addition, its id given to Bob",
          {inVain(adding("c")), writing(bobs(3) + both, 4), moving(2, 1)},
          "3:x 2:b 4:c 1:a",
+         5},
+        {"unsaved: an addition, its id given away, deleted",
+         {inVain(adding("c")), writing(both + ttls(3, "y"), 4), deleting(3)},
+         "3:y 1:a 2:b",
+         5},
+        {"unsaved: an addition, its id and realm Bob's",
+         {inVain(adding("c")), writing(both + ttls(3, "c", "PC\\bob"), 4), moving(1, 1)},
+         "1:a 3:c 4:c 2:b",
          5},
         {"unsaved: an edit", {inVain(editing(2, "z")), writing(both, 3), moving(2, 1)}, "2:z 1:a", 3},
         {"unsaved: an edit of what was edited",
@@ -265,6 +276,9 @@ TEST(Sharing, WhatOthersChangedIsTakenOverAndWhatCouldNotBeSavedStays) {
          {kRemoving, adding("c"), writing("", 1), adding("d")},
          "4:d 3:c 1:a 2:b",
          5},
+        {"removed, and made by another before anything else",
+         {kRemoving, writing("", 1), adding("d")},
+         "3:d 1:a 2:b"},
         {"removed, and an old one brought back",
          {kRemoving, deleting(2), writing(ttls(1, "a") + bobs(2), 3), adding("c")},
          "2:x 3:c 1:a"},

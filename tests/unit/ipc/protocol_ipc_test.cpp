@@ -118,6 +118,18 @@ TEST(Ipc, AClientFarAheadOfASlowHandlerWaitsInHisSocketAndGoesOnWhenItDoes) {
     server.ipc->stop();
 }
 
+TEST(Ipc, WhoSaysGoodbyeBehindACommandLeavesWhileItIsHandled) {
+    Gate gate;
+    Server server([&gate](ClientId, std::string_view) { EXPECT_TRUE(gate.wait()); });
+    RawClient hasty(server.port);
+    hasty.send(handshakeRequest("localhost"));
+    hasty.receiveHead();
+    hasty.send(std::string("\x81\x82\0\0\0\0go\x88\x80\0\0\0\0", 14));
+    EXPECT_EQ(hasty.receiveToEnd(), "\x88\x02\x03\xE8");
+    gate.open();
+    server.ipc->stop();
+}
+
 TEST(Ipc, ManyMessagesInOneRushAreHandledInOrderAndNoneIsLost) {
     constexpr int kCount = 20'000;
     EchoServer echo;
