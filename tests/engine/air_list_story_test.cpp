@@ -73,8 +73,7 @@ TEST(Air, RealmDataThatCanNotBeReadCountsAsFetchedAndLeavesTheRealms) {
 
 STORY(Air, WithTheFunctionOrTheRadioOffTheListIsNullAndWithoutAnAdapterThereIsNone,
       air({network(1, "Airport")})) {
-    settle(story);
-    story.play({kHs20Off});
+    settle(story, {kHs20Off});
     story.expect("switched off", heard(story), "networks null; SET_HOTSPOT_AUTO_CONNECT");
     walk(story, {{adding(network(2, "Cafe")), ""}, {kReport, "networks null"}});
     story.play({kHs20On});

@@ -139,8 +139,7 @@ STORY(AutoConnect, ComesBackAfterADropAndAfterTheNetworkWasAway, air({kCafe, kHo
 void triesAgain(const char* what, const std::string& requests, const std::vector<std::string>& deeds) {
     const std::string other = network(2, "other", ttls("other.example"));
     EXPECT_STORY(air({network(1, "cafe", ttls()), other}, storing({kPassword})), [&](Story& story) {
-        settle(story, 60s);
-        story.play(deeds);
+        settle(story, 60s, deeds);
         story.advance(60s);
         expectStanding(story, {.requests = requests});
     }) << what;
