@@ -45,8 +45,7 @@ TEST(Midway, EndsAsItShould) {
     comesBetween("the network goes from the list too", {"", "", "-", 0}, {on("hide", 1), kReport});
     comesBetween("the network goes from the list alone", {"", "", "cafe", 0},
                  {on("setNetwork", 1, R"("reported":false)"), kReport});
-    comesBetween("the adapter arrives once more: the result is the system's now", {"", "1 access", "cafe"},
-                 {insert});
+    comesBetween("the adapter arrives again: the result is the system's", {"", "1 access", "cafe"}, {insert});
 }
 
 STORY(Midway, AWalkByHandEndsWhereItsNetworkLeavesTheList,
