@@ -168,10 +168,9 @@ private:
         m_connected.clear();
         const std::string mode = profile.isForMachine ? " machine" : " machineOrUser";
         m_requests.push_back(network.ssid + (credential.isTls ? " tls ca" + id + mode : " ttls u" + id));
-        const bool isCertificateFine =
-            network.letsInUser || (network.letsInMachineOnly && profile.isForMachine);
+        const bool isTlsFine = network.letsInUser || (network.letsInMachineOnly && profile.isForMachine);
         const bool isPasswordFine = network.letsInPassword && credential.id == network.friendId;
-        if (network.isVisible && (credential.isTls ? isCertificateFine : isPasswordFine)) {
+        if (network.isVisible && (credential.isTls ? isTlsFine : isPasswordFine)) {
             m_connected = network.ssid;
             m_counts[{credential.id, network.ssid}] = 0;
             return true;

@@ -8,15 +8,12 @@ namespace {
 using namespace std::chrono_literals;
 
 /// An action, and what the client hears of it.
-struct Step {
-    std::string action;
-    std::string heard;
-};
+using Step = std::pair<std::string, std::string>;
 
 void walk(Story& story, const std::vector<Step>& steps) {
-    for (const Step& step : steps) {
-        story.perform(step.action);
-        story.expect(step.action, heard(story), step.heard);
+    for (const auto& [action, wanted] : steps) {
+        story.perform(action);
+        story.expect(action, heard(story), wanted);
     }
 }
 
@@ -73,8 +70,7 @@ TEST(Air, RealmDataThatCanNotBeReadCountsAsFetchedAndLeavesTheRealms) {
 
 STORY(Air, WithTheFunctionOrTheRadioOffTheListIsNullAndWithoutAnAdapterThereIsNone,
       air({network(1, "Airport")})) {
-    settle(story);
-    story.play({kHs20Off});
+    settle(story, {kHs20Off});
     story.expect("switched off", heard(story), "networks null; SET_HOTSPOT_AUTO_CONNECT");
     walk(story, {{adding(network(2, "Cafe")), ""}, {kReport, "networks null"}});
     story.play({kHs20On});

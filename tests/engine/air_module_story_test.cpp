@@ -72,8 +72,7 @@ STORY(AirModule, TheAnswerWithTheListIsReadByWholeRecords, air({network(1, "Airp
 
 STORY(AirModule, ARequestThatFailsLeavesItsLineAndChangesNothing,
       air({network(1, "Airport", tls()), network(2, "Cafe", ttls("c.example"))})) {
-    settle(story);
-    story.play({failing("WlanIhvControl", 31, R"("match":"bssList")"), moduleMessage(4, {})});
+    settle(story, {failing("WlanIhvControl", 31, R"("match":"bssList")"), moduleMessage(4, {})});
     story.expectOfLog("log", story.messages(),
                       "IHV reports HS20 network query ANQP info completed.\n"
                       "Get HS20 BSS list from IHV.\n"
@@ -180,8 +179,7 @@ STORY(AirModule, SubtypesThatNobodyKnowsAreIgnored, air({network(1, "Airport")})
 STORY(AirModule, AnUpdateRunsThroughItsStepsInOrder,
       air({network(1, "Airport"), network(2, "Airport", tls())})) {
     const std::string fetching = "Fetching BSS with ssid=Airport and mac address=02:aa:00:00:00:0";
-    settle(story);
-    story.perform(kReport);
+    settle(story, {kReport});
     story.expectLog(
         "IHV reports HS20 network list changed.",
         "There already exists a network with ssid=Airport, updating network info....",

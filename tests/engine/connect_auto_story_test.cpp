@@ -139,8 +139,7 @@ STORY(AutoConnect, ComesBackAfterADropAndAfterTheNetworkWasAway, air({kCafe, kHo
 void triesAgain(const char* what, const std::string& requests, const std::vector<std::string>& deeds) {
     const std::string other = network(2, "other", ttls("other.example"));
     EXPECT_STORY(air({network(1, "cafe", ttls()), other}, storing({kPassword})), [&](Story& story) {
-        settle(story, 60s);
-        story.play(deeds);
+        settle(story, 60s, deeds);
         story.advance(60s);
         expectStanding(story, {.requests = requests});
     }) << what;
@@ -150,9 +149,8 @@ TEST(AutoConnect, TriesAgainWhenSomethingHasChanged) {
     triesAgain("nothing", "", {});
     triesAgain("the session", kTwice, {doing("sessionChange", R"("eventType":8,"sessionId":1)")});
     triesAgain("the radio", kTwice, {kRadioOff, kRadioOn});
-    triesAgain(
-        "the credential", kTwice,
-        {sending("EDIT_CREDENTIAL", ttlsData("a.example", R"("Id":1,"AutoConnect":true,"Username":"u1")"))});
+    const std::string edited = ttlsData("a.example", R"("Id":1,"AutoConnect":true,"Username":"u1")");
+    triesAgain("the credential", kTwice, {sending("EDIT_CREDENTIAL", edited)});
     triesAgain("the adapter", kTwice, {doing("pullAdapter"), doing("insertAdapter")});
     triesAgain("an arrival of what is there", kTwice, {doing("insertAdapter")});
     triesAgain("a report that lacks the network, and one that has it", kTwice,
@@ -183,9 +181,8 @@ STORY(AutoConnect, SaysThatThereIsNoAccessWithoutANameServerOrAnAnswer, air({kCa
     expectAccess(failing("GetPerAdapterInfo", 111, R"("times":2)"), "access");
     expectAccess(failing("GetPerAdapterInfo", 111, R"("times":3)"), "no access");
     expectAccess(doing("setDns", R"("dns":[])"), "no access");
-    for (const char* const error : {"8", "111"})
-        story.expectOfLog(error, count(story.messages(), "GetPerAdapterInfo failed with error: "s + error),
-                          1);
+    for (const char* const code : {"8", "111"})
+        story.expectOfLog(code, count(story.messages(), "GetPerAdapterInfo failed with error: "s + code), 1);
 }
 
 STORY(AutoConnect, GivesTheHomeRealmAsTheDomainAndSoDoesTheUser,

@@ -18,55 +18,44 @@ const std::string kSlow = doing("set", R"("connectMs":5000)");
 
 /// The user asks for a network by its name.
 void asksFor(const std::string& what, const std::string& name, const std::vector<std::string>& networks,
-             const std::vector<StoredCredential>& credentials, const Standing& end) {
+             const Standing& end, const std::vector<StoredCredential>& credentials = {byHand(1)}) {
     EXPECT_STORY(air(networks, storing(credentials)), [&](Story& story) {
-        settle(story, kBehindStart);
-        story.play({connecting(name), passing(5s)});
+        settle(story, kBehindStart, {connecting(name), passing(5s)});
         expectStanding(story, end);
     }) << what;
 }
 
 TEST(ManualConnect, TriesWhatFitsInOrderAndTellsOneResult) {
     const std::string walk = "cafe ttls u1; cafe tls ca2 machineOrUser; cafe tls ca2 machine; cafe ttls u3";
-    asksFor("a network that lets the credential in", "cafe", {kCafe}, {byHand(1)},
-            {"cafe ttls u1", "1 access", "cafe", 2});
+    asksFor("a network that lets it in", "cafe", {kCafe}, {"cafe ttls u1", "1 access", "cafe", 2});
     asksFor("every credential in order, with one result for all", "cafe", {network(1, "cafe", both())},
-            {byHand(1), byHand(2, true), byHand(3)}, {walk, "0 no access", "-", 0});
+            {walk, "0 no access", "-", 0}, {byHand(1), byHand(2, true), byHand(3)});
     asksFor("the credential that is let in, behind others", "cafe",
             {network(1, "cafe", both() + "," + lettingIn(R"({"eapMethod":21,"username":"u3"})"))},
-            {byHand(1), byHand(2, true), byHand(3), byHand(4)}, {walk, "1 access", "cafe", 2});
+            {walk, "1 access", "cafe", 2}, {byHand(1), byHand(2, true), byHand(3), byHand(4)});
 }
 
 TEST(ManualConnect, AsksForNothingWhereThereIsNoSuchNetwork) {
     const std::string longName = "0123456789abcdef0123456789abcdef";
-    std::string longer;
-    while (longer.size() < 288)
-        longer += "cafe";
     const Standing failure{"", "0", "-", -1};
-    asksFor("a name that is in no list", "hotel", {kCafe}, {byHand(1)}, failure);
-    asksFor("33 bytes, however they begin", longName + "!", {open(1, longName, ttls())}, {byHand(1)},
-            failure);
-    asksFor("289 bytes, which would be 33", longer + "!", {kCafe}, {byHand(1)}, failure);
-    asksFor("a name that goes on behind a NUL", {"cafe\0x", 6}, {kCafe}, {byHand(1)}, failure);
-    asksFor("no name", "", {kCafe}, {byHand(1)}, {"", "", "-", -1});
-    asksFor("a network without realm data", "cafe", {open(1, "cafe", R"("anqp":"never")")}, {byHand(1)},
+    asksFor("a name that is in no list", "hotel", {kCafe}, failure);
+    asksFor("33 bytes, however they begin", longName + "!", {open(1, longName, ttls())}, failure);
+    asksFor("289 bytes, which would be 33", repeat("cafe", 72) + "!", {kCafe}, failure);
+    asksFor("a name that goes on behind a NUL", {"cafe\0x", 6}, {kCafe}, failure);
+    asksFor("no name", "", {kCafe}, {"", "", "-", -1});
+    asksFor("a network without realm data", "cafe", {open(1, "cafe", R"("anqp":"never")")},
             {"", "", "-", -1});
 }
 
 // Two of them are text: what the list shows for the first, and the mark for what is no text.
 TEST(ManualConnect, JoinsAndLeavesByTheNamesThatTheListShowsWhatHasNoTextForAName) {
-    const std::vector<std::pair<std::string, std::string>> names = {{"Caf\xE9", R"(Caf\xE9)"},
-                                                                    {"Caf\xE9s", R"(Caf\xE9s)"},
-                                                                    {"\xE9", R"(\xE9)"},
-                                                                    {"\xFF\\xFF", R"(\xFF\x5CxFF)"},
-                                                                    {R"(Caf\xE9)", R"(Caf\x5CxE9)"},
-                                                                    {"\xEF\xBF\xBD", "\uFFFD"},
-                                                                    {std::string(32, '\xE9'), [] {
-                                                                         std::string text;
-                                                                         for (int i = 0; i < 32; ++i)
-                                                                             text += R"(\xE9)";
-                                                                         return text;
-                                                                     }()}};
+    const std::pair<std::string, std::string> names[] = {{"Caf\xE9", R"(Caf\xE9)"},
+                                                         {"Caf\xE9s", R"(Caf\xE9s)"},
+                                                         {"\xE9", R"(\xE9)"},
+                                                         {"\xFF\\xFF", R"(\xFF\x5CxFF)"},
+                                                         {R"(Caf\xE9)", R"(Caf\x5CxE9)"},
+                                                         {"\xEF\xBF\xBD", "\uFFFD"},
+                                                         {repeat("\xE9", 32), repeat(R"(\xE9)", 32)}};
     std::vector<std::string> networks;
     for (const auto& [ssid, shown] : names)
         networks.push_back(R"({"bssid":"02:aa:00:00:00:0)" + std::to_string(networks.size()) +
@@ -87,15 +76,14 @@ TEST(ManualConnect, JoinsAndLeavesByTheNamesThatTheListShowsWhatHasNoTextForANam
 }
 
 TEST(ManualConnect, LeavesToTheSystemWhatNoCredentialFits) {
-    const std::string elsewhere = ttls("other.example");
-    asksFor("a network that it knows", "cafe", {network(1, "cafe", elsewhere + R"(,"osProfile":true)")},
-            {byHand(1)}, {"plain cafe", "", "cafe", 0});
-    asksFor("one that it doesn't know", "cafe", {network(1, "cafe", elsewhere)}, {byHand(1)},
-            {"plain cafe", "", "-", 0});
-    asksFor("no hotspot", "cafe", {network(1, "cafe", R"("hs20":false,"osProfile":true,)" + ttls())},
-            {byHand(1)}, {"plain cafe", "", "cafe", 0});
-    asksFor("the beginning of a name, as it was asked for", "caf", {network(1, "cafe", elsewhere)},
-            {byHand(1)}, {"plain caf", "", "-", 0});
+    const std::string elsewhere = network(1, "cafe", ttls("other.example"));
+    const std::string known = R"("osProfile":true,)";
+    asksFor("a network that it knows", "cafe", {network(1, "cafe", known + ttls("other.example"))},
+            {"plain cafe", "", "cafe", 0});
+    asksFor("one that it doesn't know", "cafe", {elsewhere}, {"plain cafe", "", "-", 0});
+    asksFor("no hotspot", "cafe", {network(1, "cafe", R"("hs20":false,)" + known + ttls())},
+            {"plain cafe", "", "cafe", 0});
+    asksFor("the beginning of a name, as it was asked for", "caf", {elsewhere}, {"plain caf", "", "-", 0});
 }
 
 STORY(ManualConnect, TellsInTheLogHowItWalksThroughTheCredentials,
@@ -103,8 +91,7 @@ STORY(ManualConnect, TellsInTheLogHowItWalksThroughTheCredentials,
     const std::string tries = "Try to connect to HS20 network using next credential.";
     const std::string fails = "Manual connection failed, we will try to use next credential.";
     const std::string skips = "We have tried credential with id=";
-    settle(story, kBehindStart);
-    story.play({connecting("cafe"), passing(5s)});
+    settle(story, kBehindStart, {connecting("cafe"), passing(5s)});
     story.expectLog(
         "###Manually connect to a BSS started.###",
         "###We are actually going to connect to HS20 network now.###",
@@ -120,8 +107,7 @@ STORY(ManualConnect, TellsInTheLogHowItWalksThroughTheCredentials,
 }
 
 STORY(ManualConnect, ARefusedRequestIsToldAtOnceAndLeavesNothingBehind, kOne) {
-    settle(story, kBehindStart);
-    story.play({failing("WlanConnect", 50), connecting("cafe")});
+    settle(story, kBehindStart, {failing("WlanConnect", 50), connecting("cafe")});
     expectStanding(story, {.requests = "cafe ttls u1 = 50", .outcomes = "0"});
     story.expectLog("WlanConnect call failed with error code=50.", "Try to connect to HS20 network failed.",
                     "connectBss failed.");
@@ -133,8 +119,7 @@ STORY(ManualConnect, ARefusedRequestIsToldAtOnceAndLeavesNothingBehind, kOne) {
 // Neither then nor later does a credential go out that waits for the user's hand.
 STORY(ManualConnect, OfWhatIsConnectedIsASuccessAndLeavesNothingBehind,
       air({kCafe}, storing({byHand(2), {.id = 1}}))) {
-    settle(story, kBehindStart);
-    story.play({connecting("cafe"), passing(5s)});
+    settle(story, kBehindStart, {connecting("cafe"), passing(5s)});
     expectStanding(story, {.requests = "", .connected = "cafe", .outcomes = "1"});
     story.expectLog("Selecting credential with id=2", "Connect to network cafe",
                     "Already in connected state while requesting to connect to the same network, skip "
@@ -147,9 +132,7 @@ STORY(ManualConnect, OfWhatIsConnectedIsASuccessAndLeavesNothingBehind,
 
 // The cached state follows the WLAN service, and what is connected is what the service says.
 TEST(ManualConnect, IsNeedlessOnlyWhereTheServiceSaysThatItIsConnected) {
-    const auto state = [](const char* value) {
-        return doing("interfaceState", R"("value":)" + std::string(value));
-    };
+    const auto state = [](std::string value) { return doing("interfaceState", R"("value":)" + value); };
     const std::string home = doing("osConnect", R"("ssid":"home")");
     const std::vector<std::string> cases[] = {
         {connecting("cafe"), passing(1s), state("5"), connecting("cafe")},
@@ -157,15 +140,13 @@ TEST(ManualConnect, IsNeedlessOnlyWhereTheServiceSaysThatItIsConnected) {
         {connecting("cafe"), passing(1s), home, passing(1s), connecting("cafe")}};
     for (const std::vector<std::string>& deeds : cases)
         EXPECT_STORY(kOne, [&](Story& story) {
-            settle(story, kBehindStart);
-            story.play(deeds);
+            settle(story, kBehindStart, deeds);
             expectStanding(story, {.requests = "cafe ttls u1; cafe ttls u1"});
         }) << joined(deeds);
 }
 
 STORY(ManualConnect, WhatIsBeingJoinedIsNotConnectedYetButCanBeLeft, kOne) {
-    settle(story, kBehindStart);
-    story.play({kSlow, connecting("cafe"), passing(1s), sending("GET_IS_INTERNET_ACCESS")});
+    settle(story, kBehindStart, {kSlow, connecting("cafe"), passing(1s), sending("GET_IS_INTERNET_ACCESS")});
     expectStanding(story, {.results = "no access"});
     story.expect("list", askedList(story), "cafe[a.example TTLS]");
     story.play({doing("interfaceState", R"("value":7)"), disconnecting("cafe")});
@@ -174,8 +155,7 @@ STORY(ManualConnect, WhatIsBeingJoinedIsNotConnectedYetButCanBeLeft, kOne) {
 
 STORY(ManualConnect, ANextCredentialThatCanNotStartEndsWithoutAWord,
       air({network(1, "cafe", ttls())}, storing({byHand(1), byHand(2)}))) {
-    settle(story, kBehindStart);
-    story.play({failing("WlanConnect", 50, R"("skip":1)"), connecting("cafe"), passing(5s)});
+    settle(story, kBehindStart, {failing("WlanConnect", 50, R"("skip":1)"), connecting("cafe"), passing(5s)});
     expectStanding(story, {.requests = "cafe ttls u1; cafe ttls u2 = 50", .outcomes = ""});
     story.expectLog("connResult=0 after invoking tryConnectHs20BssUsingNextCredential.",
                     "ERROR: Try to connect to HS20 network using next credential failed.");
@@ -184,14 +164,14 @@ STORY(ManualConnect, ANextCredentialThatCanNotStartEndsWithoutAWord,
 // The system's own connections carry nothing of this program, whatever their outcome.
 void isForeign(const std::string& succeeds, const std::string& result, const std::string& connected) {
     EXPECT_STORY(kOne, [&](Story& story) {
-        settle(story, kBehindStart);
-        story.play({doing("osConnect", R"("ssid":"home","succeeds":)" + succeeds), passing(1s)});
+        const std::string members = R"("ssid":"home","succeeds":)" + succeeds;
+        settle(story, kBehindStart, {doing("osConnect", members), passing(1s)});
         expectStanding(story, {.connected = connected, .eapMethod = 0, .outcomes = "1 no access"});
         story.expectLog("Connection start event: connection not initiated by HS20, profile name=home",
                         "Connection result not initiated by HS20, profile name=home, result=" + result,
                         "Send connection result to vexa.");
-        story.expectOfLog("results without a start",
-                          count(story.messages(), "m_bConnectionStartedByOs is not set"), 0);
+        const int withoutStart = count(story.messages(), "m_bConnectionStartedByOs is not set");
+        story.expectOfLog("results without a start", withoutStart, 0);
     });
 }
 
@@ -201,18 +181,17 @@ TEST(ForeignConnection, IsToldAsASuccessWhateverItsOutcome) {
 }
 
 STORY(ForeignConnection, ThatDisplacesOursEndsItAndIsToldApart, kOne) {
-    settle(story, kBehindStart);
-    story.play(
-        {kSlow, connecting("cafe"), passing(500ms), doing("osConnect", R"("ssid":"home")"), passing(8s)});
+    settle(story, kBehindStart,
+           {kSlow, connecting("cafe"), passing(500ms), doing("osConnect", R"("ssid":"home")"), passing(8s)});
     expectStanding(story, {.connected = "home", .eapMethod = 0, .outcomes = "0 no access 1 no access"});
 }
 
 // The result of another network whose name begins like the one asked for counts as its own.
 STORY(ForeignConnection, ALongerNameWithTheSameBeginningCountsAsOwn,
       air({kCafe, network(2, "cafeteria", ttls("x.example"))}, storing({byHand(1)}))) {
-    settle(story, kBehindStart);
-    story.play({kSlow, connecting("cafe"), passing(1s),
-                doing("connection", R"("code":10,"profileName":"cafe","ssidHex":"636166657465726961")")});
+    settle(story, kBehindStart,
+           {kSlow, connecting("cafe"), passing(1s),
+            doing("connection", R"("code":10,"profileName":"cafe","ssidHex":"636166657465726961")")});
     expectStanding(story, {.eapMethod = 2, .outcomes = "1 no access"});
     story.expectLog("Connection result initiated by HS20, clearing the cache, profile name=cafe.",
                     "Connection succeeded! profile name=cafe");
@@ -220,8 +199,7 @@ STORY(ForeignConnection, ALongerNameWithTheSameBeginningCountsAsOwn,
 
 void endsWithItsLine(const std::string& result, const char* line) {
     EXPECT_STORY(kOne, [&](Story& story) {
-        settle(story, kBehindStart);
-        story.play({kSlow, connecting("cafe"), result});
+        settle(story, kBehindStart, {kSlow, connecting("cafe"), result});
         expectStanding(story, {.eapMethod = 0, .outcomes = ""});
         story.expectLog(line);
     }) << line;

@@ -20,8 +20,7 @@ const std::string kDeletion = sending("DELETE_CREDENTIAL", R"({"Id":1})");
 void comesBetween(const std::string& what, const Standing& end, const std::vector<std::string>& deeds,
                   const std::string& cafe = open(1, "cafe", tls())) {
     EXPECT_STORY(air({cafe, kOther}, storing({{.isTls = true}}) + kSlow), [&](Story& story) {
-        settle(story, 1s);
-        story.play(deeds);
+        settle(story, 1s, deeds);
         story.advance(60s);
         expectStanding(story, end);
     }) << what;
@@ -46,8 +45,7 @@ TEST(Midway, EndsAsItShould) {
     comesBetween("the network goes from the list too", {"", "", "-", 0}, {on("hide", 1), kReport});
     comesBetween("the network goes from the list alone", {"", "", "cafe", 0},
                  {on("setNetwork", 1, R"("reported":false)"), kReport});
-    comesBetween("the adapter arrives once more: the result is the system's now", {"", "1 access", "cafe"},
-                 {insert});
+    comesBetween("the adapter arrives again: the result is the system's", {"", "1 access", "cafe"}, {insert});
 }
 
 STORY(Midway, AWalkByHandEndsWhereItsNetworkLeavesTheList,
@@ -110,8 +108,7 @@ STORY(RealmUpdate, LetsGoOfTheConnectionAsksAnewAndComesBack,
 }
 
 STORY(RealmUpdate, OfAConnectionThatIsNoHotspotLetsGoOfItToo, air({network(1, "cafe", ttls())})) {
-    settle(story, kBehindStart);
-    story.play({doing("osConnect", R"("ssid":"home")"), passing(5s)});
+    settle(story, kBehindStart, {doing("osConnect", R"("ssid":"home")"), passing(5s)});
     story.order("UPDATE_NETWORK_REALM");
     expectStanding(story, {.requests = "disconnect"});
     story.expect("queries", moduleRequests(story, 3), 1);
@@ -133,8 +130,7 @@ TEST(RealmUpdate, DoesNothingWithoutAnAdapter) {
     const std::string removal = doing("notify", R"("source":8,"code":14)");
     for (const auto& deeds : {std::vector{doing("pullAdapter")}, {failing("WlanEnumInterfaces", 8), removal}})
         EXPECT_STORY(air({network(1, "A")}), [&](Story& story) {
-            settle(story, kBehindStart);
-            story.play(deeds);
+            settle(story, kBehindStart, deeds);
             story.forget();
             story.order("UPDATE_NETWORK_REALM");
             story.expectOfLog("log", story.messages(), "UI requested to update HS20 network realm.\n");
@@ -143,8 +139,7 @@ TEST(RealmUpdate, DoesNothingWithoutAnAdapter) {
 }
 
 STORY(HotspotSwitch, OffWhileConnectedLeavesTheNetworkWithoutBlockingIt, air({kCafe}, storing({{}}))) {
-    settle(story, kBehindStart);
-    story.play({kHs20Off});
+    settle(story, kBehindStart, {kHs20Off});
     expectStanding(story, {.requests = "disconnect", .outcomes = "networks hs20 false networks"});
     story.advance(30s);
     expectStanding(story, {.connected = "-"});
@@ -163,16 +158,14 @@ STORY(HotspotSwitch, OffWhileConnectedLeavesTheNetworkWithoutBlockingIt, air({kC
 }
 
 STORY(HotspotSwitch, OffLeavesAConnectionOfTheSystemAlone, air({network(1, "cafe", ttls())}, storing({{}}))) {
-    settle(story, kBehindStart);
-    story.play({doing("osConnect", R"("ssid":"cafe")"), passing(5s)});
+    settle(story, kBehindStart, {doing("osConnect", R"("ssid":"cafe")"), passing(5s)});
     story.forget();
     story.play({kHs20Off, passing(5s)});
     expectStanding(story, {.requests = "", .connected = "cafe"});
 }
 
 STORY(HotspotSwitch, ToTheValueThatItHasOnlyAnswers, air({kCafe}, storing({{}}))) {
-    settle(story, kBehindStart);
-    story.play({kHs20On});
+    settle(story, kBehindStart, {kHs20On});
     expectStanding(story, {.requests = "", .connected = "cafe", .outcomes = "hs20 true"});
 }
 

@@ -101,8 +101,7 @@ public:
         }
         std::vector<std::string> done = requests(m_story);
         std::erase(done, "disconnect");
-        m_story.expect("what was asked for behind the steps\n" + m_told, joined(done),
-                       joined(m_model.requests()));
+        m_story.expect("asked for behind the steps\n" + m_told, joined(done), joined(m_model.requests()));
     }
 
 private:

@@ -41,8 +41,7 @@ std::string round(const std::string& gate) {
 void holds(const std::string& gate, const std::vector<std::string>& deeds,
            const std::string& scenario = air({kNetwork})) {
     EXPECT_STORY(scenario, [&](Story& story) {
-        settle(story);
-        story.play(deeds);
+        settle(story, deeds);
         story.advance(40s);
         story.expectOfLog("rounds", roundsIn(story, 30s), round(gate) + round(gate) + round(gate));
     }) << gate;
@@ -73,16 +72,14 @@ TEST(ConnectingThread, GoesOnOnlyWithASupplicantThatIsDisconnected) {
 }
 
 STORY(ConnectingThread, WithTheFunctionOffNoRoundAsksTheAdapterAnything, air({network(1, "A")})) {
-    settle(story);
-    story.play({kHs20Off, kRadioOff, passing(40s)});
+    settle(story, {kHs20Off, kRadioOff, passing(40s)});
     const std::string off = round("HS20 functionality not enabled, wait for user turning it on.");
     story.expectOfLog("rounds", roundsIn(story, 30s), off + off + off);
     story.expect("calls", story.perform(R"({"query":"calls","all":true})").size(), 0U);
 }
 
 STORY(ConnectingThread, AnUpdateWakesItTwiceOnceForTheListAndOnceForTheData, air({kNetwork})) {
-    settle(story);
-    story.play({kReport, passing(0ms)});
+    settle(story, {kReport, passing(0ms)});
     story.expectLog(kListChanged, kAnqpReady);
     for (const auto& [line, times] : {std::pair(kListChanged, 1), {kAnqpReady, 1}, {kNoCredential, 2}})
         story.expectOfLog(line, count(story.messages(), line), times);
@@ -90,8 +87,7 @@ STORY(ConnectingThread, AnUpdateWakesItTwiceOnceForTheListAndOnceForTheData, air
 
 // All of them are signalled while the thread sleeps after a radio event, which has the last place.
 STORY(ConnectingThread, TakesTheEventsThatWaitInTheirOrder, {.seed = 100, .seeds = 30}, air({kNetwork})) {
-    settle(story);
-    story.play({kRadioOff, passing(1s)});
+    settle(story, {kRadioOff, passing(1s)});
     story.forget();
     story.play({kRadioOn, kCredential, kReport, kHs20Off, passing(9s)});
     std::string wakes;
@@ -102,8 +98,7 @@ STORY(ConnectingThread, TakesTheEventsThatWaitInTheirOrder, {.seed = 100, .seeds
 }
 
 STORY(ConnectingThread, SleepsTenSecondsAfterARadioEventBeforeItsGates, "{}") {
-    settle(story);
-    story.play({kRadioOff, passing(0ms)});
+    settle(story, {kRadioOff, passing(0ms)});
     story.expectOfLog("before ten seconds", roundsIn(story, 9999ms), "");
     story.advance(1ms);
     story.expectLog("Radio turned off, wait it be turned on.");
@@ -127,16 +122,14 @@ STORY(ConnectingThread, AsksForMissingDataFirstAndWaitsForTheEndOfTheQuery,
 }
 
 STORY(ConnectingThread, AQueryThatWasRefusedIsAskedAgainInTheNextRound, air({kMute})) {
-    settle(story);
-    story.play({failing("WlanIhvControl", 31, R"("match":"anqpQuery","times":2)"), kCredential});
+    settle(story, {failing("WlanIhvControl", 31, R"("match":"anqpQuery","times":2)"), kCredential});
     story.expectLog("WlanIhvControl call failed in sendIhvCmd with result code=31");
     story.expectOfLog("waits", count(story.messages(), kQuerying), 0);
 }
 
 STORY(ConnectingThread, AnEndOfTheQueryThatBringsNoListLeavesTheQueryRunning,
       air({kMute}, R"("anqpMs":3000)")) {
-    settle(story);
-    story.play({failing("WlanIhvControl", 31, R"("match":"bssList")"), kCredential, passing(5s)});
+    settle(story, {failing("WlanIhvControl", 31, R"("match":"bssList")"), kCredential, passing(5s)});
     story.expectOfLog("rounds", roundsIn(story, 20s), round(kQuerying) + round(kQuerying));
     story.play({doing("completeAnqpQuery"), passing(0ms)});
     story.expectLog("ANQP querying finished.");
@@ -201,9 +194,8 @@ TEST(ConnectingThread, OneThatIsLateLeavesItsLineAndEndsByItself) {
     for (const int pauseMs : {0, 1})
         EXPECT_STORY({.seed = 300, .seeds = 30}, air({kNetwork}), [&](Story& story) {
             story.play({kCredential});
-            settle(story);
-            story.play({kRadioOff, passing(std::chrono::milliseconds(pauseMs)), doing("pullAdapter"),
-                        doing("insertAdapter"), passing(60s)});
+            settle(story, {kRadioOff, passing(std::chrono::milliseconds(pauseMs)), doing("pullAdapter"),
+                           doing("insertAdapter"), passing(60s)});
             story.expectOfLog("ends", count(story.messages(), kEnds), 1);
             story.expectOfLog(line, count(story.messages(), line), pauseMs == 0 ? 1 : 0);
         }) << pauseMs;
@@ -211,8 +203,7 @@ TEST(ConnectingThread, OneThatIsLateLeavesItsLineAndEndsByItself) {
 
 STORY(ConnectingThread, AServiceThatStopsWhileItSleepsStopsInOrder, {.seed = 400, .seeds = 20},
       air({kNetwork})) {
-    settle(story);
-    story.perform(kRadioOff);
+    settle(story, {kRadioOff});
 }
 
 }  // namespace

@@ -129,13 +129,6 @@ STORY(Credentials, MissingMembersAreEmpty, "{}") {
     }
 }
 
-std::string repeat(const std::string& text, std::size_t times) {
-    std::string all;
-    for (std::size_t i = 0; i < times; ++i)
-        all += text;
-    return all;
-}
-
 // Limits count UTF-16 units; a character of two units is kept whole or not at all.
 STORY(Credentials, TextIsCutAtItsLimit, "{}") {
     const std::string smile = "\xF0\x9F\x98\x80";

@@ -21,11 +21,8 @@ std::shared_ptr<Supplicant> supplicantOf(const GUID& guid) {
 
 void expectState(Story& story, const std::string& wanted, const GUID& guid = kFirst) {
     const auto supplicant = supplicantOf(guid);
-    story.expect("supplicant",
-                 !supplicant                   ? "none"
-                 : supplicant->isInitialized() ? "initialised"
-                                               : "not initialised",
-                 wanted);
+    const std::string state = supplicant && supplicant->isInitialized() ? "initialised" : "not initialised";
+    story.expect("supplicant", supplicant ? state : "none", wanted);
 }
 
 int handles(Story& story) {
@@ -95,21 +92,17 @@ STORY(SupplicantStory, ASecondAdapterTakesOverWhenItArrives, R"({"adapters":[{},
 }
 
 // What goes wrong so many times while the adapter comes back, and what the log has of it.
-void failsToInit(const char* call, int error, int times, const char* state, int moreHandles,
-                 int linesOfEach) {
-    EXPECT_STORY(
-        "{}",
-        [&](Story& story) {
-            const int before = handles(story);
-            story.play({doing("pullAdapter"), failing(call, error, R"("times":)" + std::to_string(times)),
-                        doing("insertAdapter")});
-            expectState(story, state);
-            story.expect("handles", handles(story), before + moreHandles);
-            for (const char* const line : {"Call to GetAdaptersAddresses failed with error: ",
-                                           "ERROR: Initiailize supplicant failed."})
-                story.expectOfLog(line, count(story.messages(), line), linesOfEach);
-        })
-        << call << " " << error << " " << times;
+void failsToInit(const char* call, int error, int times, const char* state, int moreHandles, int lines) {
+    const std::string failure = failing(call, error, R"("times":)" + std::to_string(times));
+    EXPECT_STORY("{}", [&](Story& story) {
+        const int before = handles(story);
+        story.play({doing("pullAdapter"), failure, doing("insertAdapter")});
+        expectState(story, state);
+        story.expect("handles", handles(story), before + moreHandles);
+        for (const char* const line :
+             {"Call to GetAdaptersAddresses failed with error: ", "ERROR: Initiailize supplicant failed."})
+            story.expectOfLog(line, count(story.messages(), line), lines);
+    }) << failure;
 }
 
 TEST(SupplicantStory, AnInitThatFailsIsTriedOnceMoreAndLeaksNothing) {

@@ -62,15 +62,10 @@ constexpr std::array kActions = {
     R"("accepts":[<|{"eapMethod":13},{"eapMethod":21}>]})",
 };
 
-struct Command {
-    std::string id;
-    std::string data;
-};
-
 const std::string kAutoConnect = R"("AutoConnect":<true|true|true|false>)";
 const std::string kNetworkName = R"({"NetWorkName":"<Airport|Cafe|Harbour|Air|Hotel>"})";
 
-const std::vector<Command> kHotspotCommands = {
+const std::vector<std::pair<std::string, std::string>> kHotspotCommands = {
     {"UPDATE_NETWORK_REALM", ""},
     {"GET_RADIO", ""},
     {"SET_HOTSPOT_AUTO_CONNECT", "<true|true|false>"},
@@ -164,8 +159,8 @@ std::string Storm::changeOfTheAir() {
 
 void Storm::sendCommands() {
     for (std::uint64_t left = m_random() % 3; left > 0; --left) {
-        const Command command = oneOf(m_random, kHotspotCommands);
-        m_world.hotspot().send(command.id, filled(m_random, command.data));
+        const auto [command, data] = oneOf(m_random, kHotspotCommands);
+        m_world.hotspot().send(command, filled(m_random, data));
     }
     if (m_random() % 2 == 0) return;
     m_world.spectral().send(oneOf(m_random, kSpectralCommands));

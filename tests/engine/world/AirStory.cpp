@@ -115,9 +115,10 @@ int count(std::string_view text, std::string_view part) {
     return found;
 }
 
-void settle(World& world, platform::Duration span) {
+void settle(World& world, platform::Duration span, const std::vector<std::string>& deeds) {
     world.advance(span);
     world.forget();
+    world.play(deeds);
 }
 
 int moduleRequests(World& world, unsigned subtype) {

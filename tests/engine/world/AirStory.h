@@ -49,9 +49,12 @@ std::string rounds(World& world);
 /// How often a text stands in another.
 int count(std::string_view text, std::string_view part);
 
-/// Lets this time pass and forgets all that was. After so long the connecting thread has had its first rounds
-/// and waits.
-void settle(World& world, platform::Duration span = std::chrono::seconds(25));
+/// Lets this time pass and forgets all that was. After 25 seconds the connecting thread has had its first
+/// rounds and waits. Then all these deeds happen.
+void settle(World& world, platform::Duration span, const std::vector<std::string>& deeds = {});
+inline void settle(World& world, const std::vector<std::string>& deeds = {}) {
+    settle(world, std::chrono::seconds(25), deeds);
+}
 
 /// How many requests of this subtype the hotspot module got since the last forget().
 int moduleRequests(World& world, unsigned subtype);

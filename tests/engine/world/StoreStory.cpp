@@ -65,6 +65,13 @@ std::string tlsData(const std::string& realm, const std::string& members) {
            "\"" + (members.empty() ? "" : ",") + members + "}";
 }
 
+std::string repeat(const std::string& text, std::size_t times) {
+    std::string all;
+    for (std::size_t i = 0; i < times; ++i)
+        all += text;
+    return all;
+}
+
 std::string list(World& world, const std::string& command, const std::string& data) {
     world.order(command, data);
     std::string text;

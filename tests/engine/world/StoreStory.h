@@ -29,6 +29,8 @@ std::string storing(const std::vector<StoredCredential>& credentials, const Stor
 std::string ttlsData(const std::string& realm, const std::string& members = "");
 std::string tlsData(const std::string& realm, const std::string& members = "");
 
+std::string repeat(const std::string& text, std::size_t times);
+
 /// Sends a command of the hotspot port and gives the events that answer it, the list of credentials by id and
 /// name: "2 b.example, 1 a.example", or its text if it is null.
 std::string list(World& world, const std::string& command = "GET_ALL_CREDENTIAL_LIST",

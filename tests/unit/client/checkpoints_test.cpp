@@ -7,14 +7,6 @@ namespace {
 
 /// What happens, a letter each: `b`egin, `a`sk; an answer while the adapter is `i`n or `o`ut; an adapter that
 /// `c`omes; another `e`vent. Behind it, for each event, whether it answered the current questions.
-struct Case {
-    const char* what;
-    const char* story;
-    const char* taken;
-    bool isAsked;
-    bool isPassed;
-};
-
 Event eventOf(char letter) {
     if (letter == 'e') return {"GET_RADIO", "true", "HotSpot20"};
     return {letter == 'o' ? "CARD_PLUG_OUT" : "CARD_PLUG_IN", "",
@@ -22,21 +14,22 @@ Event eventOf(char letter) {
 }
 
 TEST(Checkpoints, CountTheAnswersToTheirOwnQuestions) {
-    const Case cases[]{{"nothing asked", "bi", "-", false, false},
-                       {"asked", "ba", "", true, false},
-                       {"one answer may be another's", "bai", "+", true, false},
-                       {"the second one is not", "baiao", "++", true, true},
-                       {"both asked at once", "baaii", "++", true, true},
-                       {"more answers than questions", "baii", "+-", true, false},
-                       {"what only looks like an answer", "baceceio", "----+-", true, false},
-                       {"owed from before", "baabi", "-", false, false},
-                       {"owed from before, and asked", "babaioai", "-++", true, true},
-                       {"owed from before that", "babbaiiai", "-++", true, true},
-                       {"passed before", "baiaib", "++", false, false}};
-    for (const Case& example : cases) {
+    const std::tuple<const char*, const char*, const char*, bool, bool> cases[] = {
+        {"nothing asked", "bi", "-", false, false},
+        {"asked", "ba", "", true, false},
+        {"one answer may be another's", "bai", "+", true, false},
+        {"the second one is not", "baiao", "++", true, true},
+        {"both asked at once", "baaii", "++", true, true},
+        {"more answers than questions", "baii", "+-", true, false},
+        {"what only looks like an answer", "baceceio", "----+-", true, false},
+        {"owed from before", "baabi", "-", false, false},
+        {"owed from before, and asked", "babaioai", "-++", true, true},
+        {"owed from before that", "babbaiiai", "-++", true, true},
+        {"passed before", "baiaib", "++", false, false}};
+    for (const auto& [what, story, wanted, isAsked, isPassed] : cases) {
         Checkpoints checkpoints;
         std::string taken;
-        for (const char letter : std::string(example.story)) {
+        for (const char letter : std::string(story)) {
             if (letter == 'b')
                 checkpoints.begin();
             else if (letter == 'a')
@@ -44,9 +37,9 @@ TEST(Checkpoints, CountTheAnswersToTheirOwnQuestions) {
             else
                 taken += checkpoints.take(eventOf(letter)) ? '+' : '-';
         }
-        EXPECT_EQ(taken, example.taken) << example.what;
-        EXPECT_EQ(checkpoints.isAsked(), example.isAsked) << example.what;
-        EXPECT_EQ(checkpoints.isPassed(), example.isPassed) << example.what;
+        EXPECT_EQ(taken, wanted) << what;
+        EXPECT_EQ(checkpoints.isAsked(), isAsked) << what;
+        EXPECT_EQ(checkpoints.isPassed(), isPassed) << what;
     }
 }
 

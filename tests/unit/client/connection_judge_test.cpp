@@ -50,14 +50,8 @@ Outcome judged(ConnectionJudge& judge, const std::string& story) {
     return Outcome::Open;
 }
 
-struct Case {
-    const char* what;
-    const char* story;
-    Outcome outcome;
-};
-
 TEST(JoinJudge, BelievesTheListAndWhatComesBehindTheRequest) {
-    const Case cases[] = {
+    const std::tuple<const char*, const char*, Outcome> cases[] = {
         {"told and listed", "succeeded internet Cafe*", Outcome::Joined},
         {"told, but another is listed", "succeeded internet Hall*+Cafe", Outcome::Open},
         {"listed for a moment", "Cafe* 950 Cafe 1000 Cafe*", Outcome::Open},
@@ -80,27 +74,27 @@ TEST(JoinJudge, BelievesTheListAndWhatComesBehindTheRequest) {
         {"adapter out", "removal", Outcome::AdapterOut},
         {"nonsense", "nonsense anything Hall*+Cafe", Outcome::NotStarted},
     };
-    for (const Case& c : cases) {
+    for (const auto& [what, story, outcome] : cases) {
         JoinJudge judge("Cafe");
-        EXPECT_EQ(judged(judge, c.story), c.outcome) << c.what;
+        EXPECT_EQ(judged(judge, story), outcome) << what;
     }
 }
 
 TEST(LeaveJudge, NeedsAListWithoutTheConnection) {
-    const std::pair<bool, Case> cases[] = {
-        {true, {"still there", "Cafe* 5000 Cafe*", Outcome::Open}},
-        {true, {"left", "Cafe* Cafe", Outcome::Left}},
-        {true, {"gone over to another", "Hall*+Cafe", Outcome::Left}},
-        {true, {"not in the list", "nobody", Outcome::Left}},
-        {true, {"a result says nothing", "failed internet", Outcome::Open}},
-        {false, {"a list alone", "Cafe", Outcome::Open}},
-        {false, {"the attempt has ended", "failed internet Cafe", Outcome::Ended}},
-        {false, {"another's request", "failed Cafe", Outcome::Open}},
-        {false, {"joined and left", "succeeded internet Cafe* Cafe", Outcome::Left}},
+    const std::tuple<bool, const char*, const char*, Outcome> cases[] = {
+        {true, "still there", "Cafe* 5000 Cafe*", Outcome::Open},
+        {true, "left", "Cafe* Cafe", Outcome::Left},
+        {true, "gone over to another", "Hall*+Cafe", Outcome::Left},
+        {true, "not in the list", "nobody", Outcome::Left},
+        {true, "a result says nothing", "failed internet", Outcome::Open},
+        {false, "a list alone", "Cafe", Outcome::Open},
+        {false, "the attempt has ended", "failed internet Cafe", Outcome::Ended},
+        {false, "another's request", "failed Cafe", Outcome::Open},
+        {false, "joined and left", "succeeded internet Cafe* Cafe", Outcome::Left},
     };
-    for (const auto& [isConnected, c] : cases) {
+    for (const auto& [isConnected, what, story, outcome] : cases) {
         LeaveJudge judge("Cafe", isConnected);
-        EXPECT_EQ(judged(judge, c.story), c.outcome) << c.what;
+        EXPECT_EQ(judged(judge, story), outcome) << what;
     }
 }
 

@@ -41,12 +41,7 @@ TEST(Fitting, RealmAndMethodStandBesideEachOther) {
     const CredentialList all{stored("card", kMethodTls, "a"),  stored("phone", kMethodTtls, "a"),
                              stored("case", kMethodTtls, "A"), stored("half", kMethodTtls, "a", ""),
                              stored("late", kMethodTtls, "b"), stored("bare", kMethodTls, "b", "")};
-    struct Case {
-        std::vector<Network::Realm> realms;
-        std::optional<int> method;
-        const char* names;
-    };
-    const Case cases[] = {
+    const std::tuple<std::vector<Network::Realm>, std::optional<int>, const char*> cases[] = {
         {{}, {}, ""},
         {{{kMethodTls, "a"}}, {}, "card"},
         {{{kMethodTtls, "a"}}, {}, "phone"},
@@ -55,10 +50,10 @@ TEST(Fitting, RealmAndMethodStandBesideEachOther) {
         {{{kMethodTtls, "b"}, {kMethodTls, "b"}, {kMethodTtls, "a"}}, {}, "phone, late or bare"},
         {{{kMethodTls, "a"}}, 0, ""},
     };
-    for (const Case& c : cases) {
+    for (const auto& [realms, method, names] : cases) {
         Network network;
-        network.realms = c.realms;
-        EXPECT_EQ(alternatives(credentialsBehind(all, network, c.method)), c.names);
+        network.realms = realms;
+        EXPECT_EQ(alternatives(credentialsBehind(all, network, method)), names);
     }
 }
 

@@ -44,13 +44,8 @@ std::string values(const SpectralView& view) {
 }
 
 TEST(SpectralView, ValuesGoToTheChannelOfTheirOrder) {
-    struct Case {
-        const char* what;
-        std::vector<Event> events;
-        const char* values;
-    };
     const Event list = channelList(kTwoChannels);
-    const Case cases[] = {
+    const std::tuple<const char*, std::vector<Event>, const char*> cases[] = {
         {"one of each", {list, congestion(1, 70), interference(2, 55)}, "1:-/55 36:70/-"},
         {"a later one", {list, congestion(1, 70), congestion(1, 0)}, "1:-/- 36:0/-"},
         {"one before the list", {congestion(1, 70), list}, "1:-/- 36:70/-"},
@@ -59,8 +54,8 @@ TEST(SpectralView, ValuesGoToTheChannelOfTheirOrder) {
         {"another list", {list, congestion(1, 70), channelList(R"([{"Channel": 6, "Order": 1}])")}, "6:-/-"},
         {"a list that is null", {list, channelList("null\n")}, ""},
     };
-    for (const Case& c : cases)
-        EXPECT_EQ(values(viewOf(c.events)), c.values) << c.what;
+    for (const auto& [what, events, wanted] : cases)
+        EXPECT_EQ(values(viewOf(events)), wanted) << what;
     EXPECT_FALSE(viewOf({congestion(1, 70)}).hasChannelList());
     EXPECT_TRUE(viewOf({channelList("null\n")}).hasChannelList());
 }

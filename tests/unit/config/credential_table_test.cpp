@@ -85,13 +85,7 @@ const Change kPlacing = [](CredentialTable& table) { return table.placeUnplacedC
 
 TEST(CredentialTable, KeepsItsPlacesDenseThroughEveryChange) {
     const char* const four = "1:1 2:2 3:3 4:4";
-    struct Case {
-        const char* before;
-        Change change;
-        bool isDone;
-        const char* after;
-    };
-    const Case cases[] = {
+    const std::tuple<const char*, Change, bool, const char*> cases[] = {
         {four, moving(4, 2), true, "1:1 4:2 2:3 3:4"},
         {four, moving(1, 3), true, "2:1 3:2 1:3 4:4"},
         {four, moving(4, 1), true, "4:1 1:2 2:3 3:4"},
@@ -116,10 +110,10 @@ TEST(CredentialTable, KeepsItsPlacesDenseThroughEveryChange) {
         {"1:0 2:1 3:9999", kPlacing, true, "1:0 3:1 2:2"},
         {"1:3 2:9999 3:2147483647", kPlacing, false, "1:4 2:9999 3:2147483647"},
     };
-    for (const Case& c : cases) {
-        CredentialTable table = tableOf(c.before);
-        EXPECT_EQ(c.change(table), c.isDone) << c.before << ", which should give " << c.after;
-        EXPECT_EQ(places(table), c.after) << c.before;
+    for (const auto& [before, change, isDone, after] : cases) {
+        CredentialTable table = tableOf(before);
+        EXPECT_EQ(change(table), isDone) << before << ", which should give " << after;
+        EXPECT_EQ(places(table), after) << before;
     }
 }
 

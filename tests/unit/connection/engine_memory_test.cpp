@@ -74,39 +74,31 @@ TEST_F(EngineMemory, ACredentialThatIsNewOrMayConnectNowOpensWhatItFits) {
         ResultCode (BlockedNetworkList::*)(std::int32_t, const CredentialTable&, const Hs20NetworkList&);
     const Change added = &BlockedNetworkList::onCredentialAdded;
     const Change changed = &BlockedNetworkList::onCredentialAutoConnectChanged;
-    struct Case {
-        Change change;
-        std::int32_t id;
-        ResultCode result;
-        const char* blocked;
-        const char* line;
-    };
+    const char* const all = "cafe gone hotel caf";
     // The beginning of a name counts for the network that has it, but not where networks are gone through.
-    const Case cases[] = {
+    const std::tuple<Change, std::int32_t, ResultCode, const char*, const char*> cases[] = {
         {added, 3, kSuccess, "gone hotel", "ERROR: Invalid BSS.\n"},
-        {added, 4, kSuccess, "cafe gone hotel caf",
-         "Credential is not auto-connected, don't unblock any network.\n"},
-        {added, 0, kFailure, "cafe gone hotel caf", "ERROR: Cannot get credential.\n"},
-        {added, 5, kFailure, "cafe gone hotel caf", "ERROR: Cannot get credential.\n"},
-        {added, -1, kInvalidArgument, "cafe gone hotel caf", "Newly added credential with id=-1.\n"},
+        {added, 4, kSuccess, all, "Credential is not auto-connected, don't unblock any network.\n"},
+        {added, 0, kFailure, all, "ERROR: Cannot get credential.\n"},
+        {added, 5, kFailure, all, "ERROR: Cannot get credential.\n"},
+        {added, -1, kInvalidArgument, all, "Newly added credential with id=-1.\n"},
         {changed, 4, kSuccess, "gone hotel caf",
          "Unblock network with ssid=cafe and mac address=01:02:03:04:05:00 due to corresponding credential "
          "changed from 'manual connect' to 'auto connect'\n"},
-        {changed, 5, kFailure, "cafe gone hotel caf", "ERROR: Cannot get credential.\n"},
-        {changed, -1, kInvalidArgument, "cafe gone hotel caf",
-         "Credential with id=-1 has auto connect property changed.\n"},
+        {changed, 5, kFailure, all, "ERROR: Cannot get credential.\n"},
+        {changed, -1, kInvalidArgument, all, "Credential with id=-1 has auto connect property changed.\n"},
     };
     inRange({"cafe", "hotel"});
     store(3, true);
     store(4, false);
     LogCapture log;
-    for (const Case& c : cases) {
+    for (const auto& [change, id, result, left, line] : cases) {
         for (const char* ssid : {"cafe", "gone", "hotel", "caf"})
             m_blocked.blockNetwork(ssid, true);
         log.lines();
-        EXPECT_EQ((m_blocked.*c.change)(c.id, m_table, m_networks), c.result) << c.line;
-        EXPECT_NE(log.text().find(c.line), std::string::npos) << c.line;
-        EXPECT_EQ(blocked({"cafe", "gone", "hotel", "caf"}), c.blocked) << c.line;
+        EXPECT_EQ((m_blocked.*change)(id, m_table, m_networks), result) << line;
+        EXPECT_NE(log.text().find(line), std::string::npos) << line;
+        EXPECT_EQ(blocked({"cafe", "gone", "hotel", "caf"}), left) << line;
     }
 }
 

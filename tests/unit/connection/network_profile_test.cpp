@@ -119,8 +119,7 @@ TEST_F(Profiles, HaveTheirTextToTheLastCharacter) {
         {"a password is never for the machine", kTtls, "cafe", kTtlsProfile, true},
         {"text that means something to XML and to printf", odd, "<&>%s", with(oddly), false, L"%s"},
         {"a certificate", kTls, "cafe", tlsProfile(), false, L"home.example"},
-        {"the machine's certificate", kTls, "cafe", with({{L">machineOrUser<", L">machine<"}}, tlsProfile()),
-         true},
+        {"the machine's own", kTls, "cafe", with({{L">machineOrUser<", L">machine<"}}, tlsProfile()), true},
         {"bytes that are no ASCII", kTtls, "caf\xC3\xFF",
          with({{L"cafe", L"caf\u00C3\u00FF"}, {L"63616665", L"636166c3ff"}})},
     };
@@ -148,25 +147,19 @@ TEST_F(Profiles, AreCutWhereALimitIsTheirOwnOrThatOfTheirInnerText) {
 }
 
 TEST_F(Profiles, RefuseACredentialOrANetworkThatGivesNone) {
-    struct Case {
-        Credential credential;
-        std::string ssid;
-        std::string log;
-    };
-    Credential nameless = kTtls;
-    nameless.m_username.clear();
-    const std::string failed = "Add network profile from credential failed.\n";
-    const Case cases[] = {
+    Credential unnamed = kTtls;
+    unnamed.m_username.clear();
+    const std::string fails = "Add network profile from credential failed.\n";
+    const std::tuple<Credential, std::string, std::string> cases[] = {
         {credential(kEapMethodTtls, 0), "cafe", "ERROR: Invalid credential id=0\n"},
         {kTtls, "", "ERROR: Invalid BSS.\n"},
-        {credential(3), "cafe", "Unexpected EAP method.\n" + failed},
-        {nameless, "cafe",
-         "Adding a new EAP-TTLS network profile...\n\tUsername=, password=secret\n" + failed},
+        {credential(3), "cafe", "Unexpected EAP method.\n" + fails},
+        {unnamed, "cafe", "Adding a new EAP-TTLS network profile...\n\tUsername=, password=secret\n" + fails},
     };
     LogCapture log;
-    for (const Case& c : cases) {
-        EXPECT_EQ(add(c.credential, c.ssid), nullptr) << c.log;
-        EXPECT_EQ(log.text(), c.log);
+    for (const auto& [refused, ssid, lines] : cases) {
+        EXPECT_EQ(add(refused, ssid), nullptr) << lines;
+        EXPECT_EQ(log.text(), lines);
     }
 }
 

@@ -102,12 +102,7 @@ TEST_F(Matching, AHomeProviderIsFoundInTheDomainListWhateverItsCase) {
     store(2, L"b").m_homeSpFqdn = L"second.example";
     store(3, L"c").m_homeSpFqdn = std::wstring(255, L'a');
     store(4, L"d").m_homeSpFqdn = std::wstring(256, L'b');
-    struct Case {
-        const char* what;
-        Block list;
-        bool isHome;
-    };
-    const Case cases[] = {
+    const std::tuple<const char*, Block, bool> cases[] = {
         {"only", duple("home.example"), true},
         {"behind another", duple("x") + duple("HOME.EXAMPLE"), true},
         {"of the second credential", duple("second.example"), true},
@@ -122,8 +117,8 @@ TEST_F(Matching, AHomeProviderIsFoundInTheDomainListWhateverItsCase) {
         {"255 characters", duple(std::string(255, 'A')), true},
         {"the first 255 of 256 characters", duple(std::string(255, 'b')), false},
     };
-    for (const Case& c : cases)
-        EXPECT_EQ(isHomeSpNetwork(m_table, c.list), c.isHome) << c.what;
+    for (const auto& [what, list, isHome] : cases)
+        EXPECT_EQ(isHomeSpNetwork(m_table, list), isHome) << what;
 }
 
 TEST_F(Matching, TheSearchForAHomeProviderLeavesItsLines) {
@@ -157,13 +152,7 @@ TEST(RoamingConsortiumElement, HasThreeOrganisationsAndEachNeedsItsOwnLength) {
 
 TEST_F(Matching, AConsortiumIsLookedForInTheBeaconAndInTheAnqpList) {
     store(1, L"a").m_roamingConsortium = L"abc";
-    struct Case {
-        const char* what;
-        const char* elements;
-        const char* anqp;
-        std::int32_t found;
-    };
-    const Case cases[] = {
+    const std::tuple<const char*, const char*, const char*, std::int32_t> cases[] = {
         {"nothing", "", "", 0},
         {"the second duple", "", "02 6162 03 616263", 1},
         {"a duple that is cut short", "", "05 616263", 0},
@@ -173,10 +162,10 @@ TEST_F(Matching, AConsortiumIsLookedForInTheBeaconAndInTheAnqpList) {
         {"half a head", "6f", "", 0},
         {"digits are no bytes", "", "06 363136323633", 0},
     };
-    for (const Case& c : cases) {
-        m_network.m_ies = bytesOfHex(c.elements);
-        m_network.m_anqpRoamingConsortium = bytesOfHex(c.anqp);
-        EXPECT_EQ(byConsortium(), c.found) << c.what;
+    for (const auto& [what, elements, anqp, found] : cases) {
+        m_network.m_ies = bytesOfHex(elements);
+        m_network.m_anqpRoamingConsortium = bytesOfHex(anqp);
+        EXPECT_EQ(byConsortium(), found) << what;
     }
 }
 

@@ -41,12 +41,7 @@ TEST(NaiRealms, EachBoundIsCheckedInItsOrderAndKeepsTheOldList) {
     const auto method = [&](const std::string& numbers) {
         return named + "\t\tEAP Method: " + numbers + "\n";
     };
-    struct Case {
-        const char* what;
-        const char* hex;
-        std::string log;
-    };
-    const Case cases[] = {
+    const std::tuple<const char*, const char*, std::string> cases[] = {
         {"half a count", "01", kHead},
         {"a count of none", "0000", counted(0)},
         {"three entries in 14 bytes", "0300 0300000000 0300000000 03000000",
@@ -69,9 +64,9 @@ TEST(NaiRealms, EachBoundIsCheckedInItsOrderAndKeepsTheOldList) {
          method("len=4 method=21 auth_count=1") + "No room for Authentication Parameter subfield\n"},
     };
     LogCapture log;
-    for (const Case& c : cases) {
-        EXPECT_EQ(realmsAfter(bytesOfHex(c.hex)), kKept) << c.what;
-        EXPECT_EQ(log.text(), c.log) << c.what;
+    for (const auto& [what, hex, lines] : cases) {
+        EXPECT_EQ(realmsAfter(bytesOfHex(hex)), kKept) << what;
+        EXPECT_EQ(log.text(), lines) << what;
     }
 }
 
@@ -123,25 +118,19 @@ TEST(NaiRealms, ReplaceTheOldOnesByAllOfAGoodListAndByNothingOfABadOne) {
     const Block b = realmData("b", {eapMethod(21)});
     // Five bytes of padding behind the only parameter of the first method, which would read as methods.
     const Block padded = bytesOfHex("08 0d 01 02 01 04 ff ff ff");
-    struct Case {
-        const char* what;
-        Block list;
-        const char* realms;
-    };
-    const Case cases[] = {
+    const std::tuple<const char*, Block, const char*> cases[] = {
         {"a repeated entry", realmList({b, a, b}), "b TTLS, a TLS, b TTLS"},
         {"other methods", realmList({realmData("sim.example", {eapMethod(18), eapMethod(50)})}), ""},
         {"no methods", realmList({realmData("bare.example", {})}), ""},
         {"a bad second entry", realmList({a, bytesOfHex("0200 00 00 00")}), kKept},
         {"bytes behind", realmList({a}) + bytesOfHex("ffffff"), "a TLS"},
         {"padding", realmList({realmData("a", {padded, eapMethod(21)})}), "a TLS, a TTLS"},
-        {"a parameter that takes the next method", bytesOfHex("0100 0a00 00 01 61 02 02 15 01 02 01 00"),
-         "a TTLS"},
+        {"a parameter with the next method", bytesOfHex("0100 0a00 00 01 61 02 02 15 01 02 01 00"), "a TTLS"},
         {"one that takes all of it", bytesOfHex("0100 0c00 00 01 61 02 02 15 01 02 0d 00 00 00"), kKept},
         {"a next method with 13 parameters", bytesOfHex("0100 0a00 00 01 61 02 02 15 01 02 00 0d"), kKept},
     };
-    for (const Case& c : cases)
-        EXPECT_EQ(realmsAfter(c.list), c.realms) << c.what;
+    for (const auto& [what, list, realms] : cases)
+        EXPECT_EQ(realmsAfter(list), realms) << what;
 }
 
 TEST(NaiRealms, OfTooManyTheFirstAreKeptAndOneLineTellsIt) {
@@ -149,13 +138,7 @@ TEST(NaiRealms, OfTooManyTheFirstAreKeptAndOneLineTellsIt) {
         return std::vector<Block>(count, eapMethod(method));
     };
     const auto invalid = methods(150, 18);
-    struct Case {
-        std::vector<Block> entries;
-        int kept;
-        int lines;
-        int complaints;
-    };
-    const Case cases[] = {
+    const std::tuple<std::vector<Block>, int, int, int> cases[] = {
         {{realmData("a;b", methods(128, 13))}, 256, 0, 0},
         {{realmData("a;b", methods(128, 13)), realmData("c", methods(1, 13))}, 256, 1, 0},
         {std::vector<Block>(13, realmData(std::string(253, ';'), methods(167, 21))), 256, 1, 0},
@@ -163,13 +146,13 @@ TEST(NaiRealms, OfTooManyTheFirstAreKeptAndOneLineTellsIt) {
         {{realmData(";;;a", invalid), realmData("b", methods(2, 13))}, 2, 0, 256},
         {{realmData(std::string(253, ';'), invalid)}, 0, 0, 256},
     };
-    for (const Case& c : cases) {
+    for (const auto& [entries, kept, lines, complaints] : cases) {
         LogCapture log;
-        const std::string realms = realmsAfter(realmList(c.entries));
+        const std::string realms = realmsAfter(realmList(entries));
         const std::string text = log.text();
-        EXPECT_EQ(countOf(realms, "TLS"), c.kept);
-        EXPECT_EQ(countOf(text, "too many realms, only the first"), c.lines);
-        EXPECT_EQ(countOf(text, "ERROR: Invalid EAP type."), c.complaints);
+        EXPECT_EQ(countOf(realms, "TLS"), kept);
+        EXPECT_EQ(countOf(text, "too many realms, only the first"), lines);
+        EXPECT_EQ(countOf(text, "ERROR: Invalid EAP type."), complaints);
     }
 }
 

@@ -52,28 +52,21 @@ TEST(NetworkList, ANewAddressIsANewNetworkWhateverItsName) {
 }
 
 TEST(NetworkList, OfOneNameTheFirstKnownNetworkStaysOrElseTheFirst) {
-    struct Case {
-        std::vector<Hs20BssRecord> known;
-        std::vector<Hs20BssRecord> reported;
-        const char* left;
-    };
-    const Case cases[] = {
+    const std::tuple<std::vector<Hs20BssRecord>, std::vector<Hs20BssRecord>, const char*> cases[] = {
         {{bss(5, "x")}, {bss(6, "x"), bss(7, "y"), bss(5, "x"), bss(8, "x")}, "y/7 x/5"},
         {{bss(1, "x"), bss(2, "x"), bss(3, "x")}, {bss(9, "x"), bss(3, "x"), bss(1, "x")}, "x/3"},
         {{}, {bss(1, "x"), bss(2, "x")}, "x/1"},
         {{}, {bss(1, "x"), bss(1, "x"), bss(2, "y"), bss(1, "x")}, "x/1 y/2"},
         {{bss(1, "x")}, {}, ""},
-        {{},
-         {bss(1, "abc"), bss(2, "abcd"), bss(3, "ABC"), bss(4, ""), bss(5, "ab")},
-         "abc/1 abcd/2 ABC/3 /4 ab/5"},
+        {{}, {bss(1, "bc"), bss(2, "bcd"), bss(3, "BC"), bss(4, ""), bss(5, "b")}, "bc/1 bcd/2 BC/3 /4 b/5"},
     };
-    for (const Case& c : cases) {
+    for (const auto& [known, reported, left] : cases) {
         Hs20NetworkList list;
-        list.replace(c.known);
+        list.replace(known);
         const auto oldMacs = list.macAddresses();
-        list.replace(c.reported);
+        list.replace(reported);
         list.processDuplicatedHs20Networks(oldMacs);
-        EXPECT_EQ(shown(list), c.left);
+        EXPECT_EQ(shown(list), left);
     }
 }
 

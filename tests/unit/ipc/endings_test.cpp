@@ -41,18 +41,13 @@ RawClient shakenHands(std::int32_t port) {
 }
 
 bool becomesTrue(const std::function<bool()>& condition) {
-    for (const auto end = Clock::now() + kPatience; Clock::now() < end;
-         std::this_thread::sleep_for(std::chrono::milliseconds(1)))
+    constexpr std::chrono::milliseconds kPause(1);
+    for (const auto end = Clock::now() + kPatience; Clock::now() < end; std::this_thread::sleep_for(kPause))
         if (condition()) return true;
     return false;
 }
 
-struct Ending {
-    const char* name;
-    std::string frame;
-};
-
-const Ending kEndings[] = {
+const std::pair<const char*, std::string> kEndings[] = {
     {"a close frame", masked(0x88, "\x03\xE8")},
     {"a close frame without a code", masked(0x88, "")},
     {"a close frame with half a code", masked(0x88, "\x03")},
@@ -64,11 +59,11 @@ const Ending kEndings[] = {
 TEST(IpcEndings, WhoHasEndedForWebSocketIsNoClientAnyMoreAndSoonNoConnection) {
     const std::int32_t port = freePort();
     const auto server = IpcWebSocketServer::create(port, [](ClientId, std::string_view) {});
-    for (const Ending& ending : kEndings) {
-        SCOPED_TRACE(ending.name);
+    for (const auto& [name, frame] : kEndings) {
+        SCOPED_TRACE(name);
         RawClient client = shakenHands(port);
         ASSERT_TRUE(server->sendToAll("anybody?"));
-        client.send(ending.frame);
+        client.send(frame);
         EXPECT_NE(client.receiveToEnd().find('\x88'), std::string::npos) << "no goodbye";
         EXPECT_FALSE(server->sendToAll("anybody?"));
         EXPECT_FALSE(client.send("x")) << "only half of the connection has ended";
@@ -79,11 +74,11 @@ TEST(IpcEndings, WhoDoesNotEvenReadHisGoodbyeGoesAsWell) {
     const std::string large(kMoreThanSockets, 'x');
     const std::int32_t port = freePort();
     const auto server = IpcWebSocketServer::create(port, [](ClientId, std::string_view) {});
-    for (const Ending& ending : kEndings) {
-        SCOPED_TRACE(ending.name);
+    for (const auto& [name, frame] : kEndings) {
+        SCOPED_TRACE(name);
         RawClient client = shakenHands(port);
         ASSERT_TRUE(server->sendToAll(large));
-        client.send(ending.frame);
+        client.send(frame);
         EXPECT_TRUE(becomesTrue([&] { return !server->sendToAll("anybody?"); }));
         EXPECT_TRUE(becomesTrue([&] { return !client.send("x"); })) << "still there";
     }
@@ -101,9 +96,7 @@ TEST(IpcEndings, OneMessageAloneCostsNobodyHisPlaceAndPingsDoNotPileUpBehindIt) 
     client.send(masked(0x89, "1") + masked(0x89, "2") + masked(0x81, "that was all"));
     ASSERT_EQ(handled.get_future().wait_for(kPatience), std::future_status::ready);
     EXPECT_EQ(client.receive(10 + large.size()).substr(10), large);
-    EXPECT_EQ(client.receive(4),
-              "\x8A\x01"
-              "2\x81");
+    EXPECT_EQ(client.receive(4), "\x8A\x01\x32\x81");
 }
 
 // An event that was sent while clients ask and ask counts how many of their messages are handled before it is

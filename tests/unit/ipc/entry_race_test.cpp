@@ -92,12 +92,7 @@ private:
 };
 
 TEST(IpcEntry, OnlyALiveSocketHasAnOwner) {
-    const struct {
-        const char* name;
-        int family;
-        void (*change)(Descriptor&);
-        bool isOwned;
-    } cases[] = {
+    const std::tuple<const char*, int, void (*)(Descriptor&), bool> cases[] = {
         {"alive", AF_INET, [](Descriptor&) {}, true},
         {"alive, of the other family", AF_INET6, [](Descriptor&) {}, true},
         {"left by its process", AF_INET, [](Descriptor& peer) { peer.reset(); }, false},

@@ -9,10 +9,7 @@ namespace {
 
 TEST(Actions, WhatIsNotUnderstoodIsRefusedWithAReason) {
     TestMachine machine("{'networks': [{'bssid': '02:00:00:00:00:01', 'ssid': 'Cafe'}]}");
-    const struct {
-        std::string message;
-        const char* error;
-    } cases[] = {
+    const std::pair<std::string, const char*> cases[] = {
         {"[]", "not an object"},
         {"{}", "do: missing"},
         {"{'do': 5}", "do: not a text"},

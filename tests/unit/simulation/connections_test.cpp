@@ -50,20 +50,15 @@ void bring(Station& station, const std::string& state) {
 
 TEST(Connections, WhateverIsDoneHasItsCourse) {
     const Texts cancelled = {"8/10 disconnected 0 00038003"};
+    const Texts failed = {"8/9 associating 0", "8/10 disconnected 0 00038002"};
     const Texts lost = {"8/21 disconnected 0 00028003"};
-    const struct {
-        std::string before;
-        std::string act;
-        Texts told;
-    } cases[] = {
+    const std::tuple<std::string, std::string, Texts> cases[] = {
         {"idle", "connect Cafe", kBegun + joined("11")},
         {"idle", "connect Far", kBegun + refused("00038002")},
         {"idle", "discover Own", kBegun + joined("36")},
         {"idle", "discover Cafe", kBegun + refused("00050007")},
         {"idle", "{'do': 'osConnect', 'ssid': 'Cafe'}", joinedBySystem("11")},
-        {"idle",
-         "{'do': 'osConnect', 'ssid': 'Nowhere', 'succeeds': false}",
-         {"8/9 associating 0", "8/10 disconnected 0 00038002"}},
+        {"idle", "{'do': 'osConnect', 'ssid': 'Nowhere', 'succeeds': false}", failed},
         {"idle", "disconnect", {}},
         {"idle", "{'do': 'dropConnection'}", {}},
         {"{'do': 'pullAdapter'}", "{'do': 'insertAdapter'}", {"8/13 disconnected 0"}},
@@ -76,8 +71,7 @@ TEST(Connections, WhateverIsDoneHasItsCourse) {
         {"joined", "{'do': 'dropConnection'}", dropped("00028003")},
         {"joined", "{'do': 'dropConnection', 'reason': 5}", dropped("00000005")},
         {"joined", kHideCafe, dropped("00028003")},
-        {"joined", "{'do': 'setNetwork', 'bssid': '02:00:00:00:00:01', 'visible': false}",
-         dropped("00028003")},
+        {"joined", "{'do':'setNetwork', 'bssid':'02:00:00:00:00:01', 'visible':false}", dropped("00028003")},
         {"joined", "{'do': 'hide', 'bssid': '02:00:00:00:00:02'}", {}},
         {"joined", kRadioOff, Texts{"16/7 connected 11"} + lost},
         {"joined", "{'do': 'radio', 'hardware': 'off'}", Texts{"16/7 connected 11"} + lost},
@@ -136,11 +130,7 @@ TEST(Connections, TheServerLetsInWhatItAccepts) {
     const std::string machineMode = tlsProfile("Cafe", "43616665", "ab cd", "machine");
     const std::string userMode = tlsProfile("Cafe", "43616665", "ab cd", "machineOrUser");
     const std::string ttls = ttlsProfile("Cafe", "43616665", "ann", " s&lt;cret ");
-    const struct {
-        std::string accepts;
-        std::string profile;
-        bool isLetIn;
-    } cases[] = {
+    const std::tuple<std::string, std::string, bool> cases[] = {
         {"", ttls, false},
         {"{'eapMethod': 13}", ttls, false},
         {"{'eapMethod': 13}, {'eapMethod': 21}", ttls, true},

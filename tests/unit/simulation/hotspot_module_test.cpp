@@ -71,10 +71,7 @@ TEST(HotspotModule, RequestsOfAnotherFormOrToAnotherAdapterAreRefused) {
 }
 
 TEST(HotspotModule, TheRealmListIsBuiltAsTheNetworkGivesItLast) {
-    const struct {
-        std::string member;
-        std::string info;
-    } cases[] = {
+    const std::pair<std::string, std::string> cases[] = {
         {"'visible': true", "00000000"},
         {"'realms': []", "02000000 0000"},
         {"'naiRealmHex': 'FfEe01'", "03000000 ffee01"},
@@ -145,10 +142,7 @@ TEST(HotspotModule, EachQueryHasItsOwnCompletion) {
 
 TEST(HotspotModule, AUserWhoLeavesIsToldWithTheNetworkAsItIsKnown) {
     Air air(network("01", ""));
-    const struct {
-        const char* members;
-        std::string record;
-    } cases[] = {
+    const std::pair<const char*, std::string> cases[] = {
         {"'ssid': 'Cafe'", kCafe},
         {"'ssid': 'Cafe', 'isHs20': 2", record("020000000001", "43616665", "02000000 02000000 01000000")},
         {"'ssid': 'Other'", record(zeros(6), "4f74686572", "01000000 00000000 00000000")},

@@ -34,10 +34,8 @@ std::string entry(const std::string& members) {
 
 TEST(Scenario, AFaultNamesTheMember) {
     const std::string x128(128, 'x');
-    const struct {
-        std::string text;
-        const char* fault;
-    } cases[] = {
+    const auto named = [](const std::string& more) { return network("'ssid': 'a', " + more); };
+    const std::pair<std::string, const char*> cases[] = {
         {"[]", "scenario: not an object"},
         {"{'foo': 1}", "foo: unknown member"},
         {"{'speed': 'fast'}", "speed: not a number"},
@@ -48,10 +46,8 @@ TEST(Scenario, AFaultNamesTheMember) {
         {"{'connectMs': -5}", "connectMs: negative"},
         {"{'adapters': {}}", "adapters: not an array"},
         {"{'adapters': [{'guid': 'x'}]}", "adapters[0].guid: not a GUID"},
-        {"{'adapters': [{'guid': '{6B1E8A4C 5D2F-4E0B-9C37-1F5D00000001}'}]}",
-         "adapters[0].guid: not a GUID"},
-        {"{'adapters': [{'guid': '{6B1E8A4C-5D2F-4E0B-9C37-1F5D0000000g}'}]}",
-         "adapters[0].guid: not a GUID"},
+        {"{'adapters':[{'guid':'{6B1E8A4C 5D2F-4E0B-9C37-1F5D00000001}'}]}", "adapters[0].guid: not a GUID"},
+        {"{'adapters':[{'guid':'{6B1E8A4C-5D2F-4E0B-9C37-1F5D0000000g}'}]}", "adapters[0].guid: not a GUID"},
         {"{'adapters': [{}, {'mac': '02:1f:5d'}]}", "adapters[1].mac: not a MAC address"},
         {"{'adapters': [{'mac': '02:1f:5d:00-00:01'}]}", "adapters[0].mac: not a MAC address"},
         {"{'adapters': [{'dns': ['192.0.2.1', 2]}]}", "adapters[0].dns[1]: not a text"},
@@ -60,25 +56,21 @@ TEST(Scenario, AFaultNamesTheMember) {
         {"{'networks': [{'ssid': 'a'}]}", "networks[0].bssid: missing"},
         {"{'networks': [{'bssid': '02:00:00:00:00:01'}]}", "networks[0].ssid: missing"},
         {network("'ssid': ''"), "networks[0].ssid: not 1 to 32 bytes"},
-        {network("'ssid': 'a', 'ssidHex': '61'"), "networks[0].ssidHex: not together with ssid"},
-        {network("'ssid': 'a', 'realms': [], 'naiRealmHex': ''"),
-         "networks[0].naiRealmHex: not together with realms"},
+        {named("'ssidHex': '61'"), "networks[0].ssidHex: not together with ssid"},
+        {named("'realms': [], 'naiRealmHex': ''"), "networks[0].naiRealmHex: not together with realms"},
         {network("'ssidHex': '0'"), "networks[0].ssidHex: not hex"},
         {network("'ssidHex': '0g'"), "networks[0].ssidHex: not hex"},
-        {network("'ssid': 'a', 'realms': [{}, {'eapMethods': 13}]"),
-         "networks[0].realms[1].eapMethods: not an array"},
-        {network("'ssid': 'a', 'realms': [{'names': ['" + x128 + "', '" + x128.substr(1) + "']}]"),
+        {named("'realms': [{}, {'eapMethods': 13}]"), "networks[0].realms[1].eapMethods: not an array"},
+        {named("'realms': [{'names': ['" + x128 + "', '" + x128.substr(1) + "']}]"),
          "networks[0].realms[0].names: more than 255 bytes"},
-        {network("'ssid': 'a', 'accepts': [{'eapMethod': 25}]"),
-         "networks[0].accepts[0].eapMethod: not one of 13, 21"},
-        {network("'ssid': 'a', 'accepts': [{}]"), "networks[0].accepts[0].eapMethod: missing"},
+        {named("'accepts': [{'eapMethod': 25}]"), "networks[0].accepts[0].eapMethod: not one of 13, 21"},
+        {named("'accepts': [{}]"), "networks[0].accepts[0].eapMethod: missing"},
         {"{'spectrum': {'channels': [1, 256]}}", "spectrum.channels[1]: not from 0 to 255"},
         {"{'spectrum': {'levels': {'one': {}}}}", "spectrum.levels.one: not a channel number"},
         {"{'spectrum': {'scans': [[{'bins': [1, 2]}]]}}", "spectrum.scans[0][0].bins: not 56 bins"},
         {entry("'do': 'roam'"), "timeline[0].atMs: missing"},
         {entry("'atMs': 1, 'do': 'hide', 'bssid': 7"), "timeline[0].bssid: not a text"},
-        {entry("'atMs': 1, 'do': 'addNetwork', 'network': {'ssid': 'a'}"),
-         "timeline[0].network.bssid: missing"},
+        {entry("'atMs':1, 'do':'addNetwork', 'network':{'ssid':'a'}"), "timeline[0].network.bssid: missing"},
     };
     for (const auto& [text, fault] : cases)
         EXPECT_EQ(faultOf(text), fault) << text;

@@ -77,15 +77,10 @@ TEST_F(WlanCalls, CanAllBeMadeToFail) {
 
 TEST_F(WlanCalls, AnAdapterIsServedWhileItIsInsertedAndItsModulesOnTheFirstAlone) {
     const Bytes bssList = *bytesFromHex(hex("005ec403 00000000 05000000") + zeros(8));
-    const struct {
-        std::size_t adapter;
-        DWORD query;
-        DWORD control;
-        DWORD connect;
-        DWORD disconnect;
-    } cases[] = {{2, ERROR_NOT_FOUND, ERROR_NOT_FOUND, ERROR_NOT_FOUND, ERROR_NOT_FOUND},
-                 {1, ERROR_SUCCESS, ERROR_INVALID_PARAMETER, ERROR_INVALID_STATE, ERROR_SUCCESS},
-                 {0, ERROR_SUCCESS, ERROR_SUCCESS, ERROR_SUCCESS, ERROR_SUCCESS}};
+    const std::tuple<std::size_t, DWORD, DWORD, DWORD, DWORD> cases[] = {
+        {2, ERROR_NOT_FOUND, ERROR_NOT_FOUND, ERROR_NOT_FOUND, ERROR_NOT_FOUND},
+        {1, ERROR_SUCCESS, ERROR_INVALID_PARAMETER, ERROR_INVALID_STATE, ERROR_SUCCESS},
+        {0, ERROR_SUCCESS, ERROR_SUCCESS, ERROR_SUCCESS, ERROR_SUCCESS}};
     for (const auto& [adapter, asked, controlled, connected, disconnected] : cases) {
         on(adapter);
         EXPECT_EQ(query(wlan_intf_opcode_radio_state), asked) << adapter;
@@ -125,10 +120,7 @@ TEST_F(WlanCalls, ParametersThatMakeNoSenseAreRefused) {
     DOT11_SSID tooLong{33, {}};
     DOT11_SSID empty{};
     DOT11_SSID good{1, {'a'}};
-    const struct {
-        WLAN_CONNECTION_MODE mode;
-        DOT11_SSID* ssid;
-    } cases[] = {
+    const std::pair<WLAN_CONNECTION_MODE, DOT11_SSID*> cases[] = {
         {wlan_connection_mode_temporary_profile, &good},
         {wlan_connection_mode_discovery_secure, nullptr},
         {wlan_connection_mode_discovery_secure, &empty},
@@ -226,11 +218,7 @@ TEST_F(WlanCalls, AreKeptWithWhatTheyAskedFor) {
 }
 
 TEST_F(WlanCalls, ReasonsHaveTextsThatAreCutToTheBuffer) {
-    const struct {
-        DWORD reason;
-        DWORD size;
-        std::u16string text;
-    } cases[] = {
+    const std::tuple<DWORD, DWORD, std::u16string> cases[] = {
         {0x00028003, 256, u"The connection was lost."},
         {0x00050007, 64, u"The user name or password is not correct, or the certificate wa"},
         {1, 256, u"The reason is unknown."},

@@ -41,13 +41,10 @@ TEST(ChannelStatistics, ALevelNextToAWholeOneIsThatOfTheExactOrder) {
 }
 
 TEST(ChannelStatistics, CongestionIsSmoothedUnlessNothingWasPublished) {
-    struct Case {
-        int published;
-        int computed;
-        int next;
-    };
-    for (const Case& c : {Case{0, 50, 50}, {50, 20, 32}, {50, 0, 20}, {1, 0, 0}, {100, 99, 99}, {0, 0, 0}})
-        EXPECT_EQ(smoothCongestion(c.published, c.computed), c.next);
+    const std::tuple<int, int, int> cases[] = {{0, 50, 50}, {50, 20, 32},  {50, 0, 20},
+                                               {1, 0, 0},   {100, 99, 99}, {0, 0, 0}};
+    for (const auto& [published, computed, next] : cases)
+        EXPECT_EQ(smoothCongestion(published, computed), next);
     for (int value = 0; value <= 100; ++value)
         EXPECT_EQ(smoothCongestion(value, value), value);
 }
