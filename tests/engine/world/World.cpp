@@ -177,6 +177,8 @@ void World::writeConfig(const std::string& text) {
 int World::stop() {
     m_stopMutex->release();
     m_service.join();
+    if (InProcessClient::connect(kSaPort) || !InProcessClient::connect(kHs20Port))
+        throw std::runtime_error("the spectral port ends with the service, the other behind it");
     SAHotSpotPortlink::instance().close();
     m_machine.stop();
     return m_exitCode;
