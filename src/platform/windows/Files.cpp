@@ -196,9 +196,14 @@ std::optional<std::size_t> appendToFile(const std::string& narrowPath, std::stri
     Handle handle = openOwnersFile(narrowPath);
     if (!handle) return std::nullopt;
     const int descriptor =
-        _open_osfhandle(reinterpret_cast<std::intptr_t>(handle.release()), _O_APPEND | _O_TEXT);
+        _open_osfhandle(reinterpret_cast<std::intptr_t>(handle.get()), _O_APPEND | _O_TEXT);
+    if (descriptor == -1) return std::nullopt;
+    handle.release();
     const std::unique_ptr<std::FILE, CloseFile> file(_fdopen(descriptor, "a"));
-    if (!file) return std::nullopt;
+    if (!file) {
+        _close(descriptor);
+        return std::nullopt;
+    }
     const std::size_t taken = std::fwrite(text.data(), 1, text.size(), file.get());
     return std::fflush(file.get()) == 0 ? taken : 0;
 }
