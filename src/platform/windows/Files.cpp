@@ -18,15 +18,18 @@
 
 namespace vexa::platform {
 
-// The store keeps the access rights that it inherits from its folder, which all users share: the
-// configuration is one file for all of them, and whichever user saves it replaces the file of another. A log
-// is of one user and can hold his passwords: it is for him alone, and for those who own the machine.
+// The configuration is one file for all users of the machine, and whichever of them saves it replaces the
+// file of another: it is for whoever logs on here, and for nobody from elsewhere. A log is of one user and
+// can hold his passwords: it is for him alone, and for those who own the machine.
 
 namespace {
 
 constexpr int kRenameTries = 5;
 constexpr DWORD kRenamePauseMs = 50;
 constexpr DWORD kLockPauseMs = 2;
+
+// Reading, writing, replacing.
+constexpr const wchar_t* kModifyForWhoeverLogsOn = L"(A;;0x1301bf;;;IU)";
 
 constexpr DWORD kShareAll = FILE_SHARE_READ | FILE_SHARE_WRITE | FILE_SHARE_DELETE;
 
@@ -68,14 +71,15 @@ struct CloseFile {
 
 using SecurityDescriptor = Owned<PSECURITY_DESCRIPTOR, &::LocalFree>;
 
-// All rights for the system, the administrators and the user of this process, and nothing inherited. Empty if
-// the user can't be told.
-SecurityDescriptor ownerOnly() {
+// All rights for the system, the administrators and the user of this process, those besides for `others`, and
+// nothing inherited. Empty if the user can't be told.
+SecurityDescriptor rightsOf(const wchar_t* others) {
     SecurityDescriptor descriptor;
     const Storage user = userOf(GetCurrentProcess());
     Owned<LPWSTR, &::LocalFree> sid;
     if (user.empty() || ConvertSidToStringSidW(sidOf(user), sid.receive()) == 0) return descriptor;
-    const std::wstring rights = L"D:P(A;;FA;;;SY)(A;;FA;;;BA)(A;;FA;;;" + std::wstring(sid.get()) + L")";
+    const std::wstring rights =
+        L"D:P(A;;FA;;;SY)(A;;FA;;;BA)(A;;FA;;;" + std::wstring(sid.get()) + L")" + others;
     ConvertStringSecurityDescriptorToSecurityDescriptorW(rights.c_str(), SDDL_REVISION_1,
                                                          descriptor.receive(), nullptr);
     return descriptor;
@@ -83,7 +87,7 @@ SecurityDescriptor ownerOnly() {
 
 // The rights of a file that exists stay what they are.
 Handle openOwnersFile(const std::string& narrowPath) {
-    const SecurityDescriptor descriptor = ownerOnly();
+    const SecurityDescriptor descriptor = rightsOf(L"");
     if (!descriptor) return {};
     SECURITY_ATTRIBUTES attributes{sizeof attributes, descriptor.get(), FALSE};
     return Handle(CreateFileA(narrowPath.c_str(), FILE_APPEND_DATA | SYNCHRONIZE, kShareAll, &attributes,
@@ -132,7 +136,11 @@ struct NewFile::State {
 };
 
 std::optional<NewFile> NewFile::create(const std::wstring& path) {
-    Handle file = open(path, GENERIC_WRITE, kShareWhileHeld, CREATE_NEW, FILE_ATTRIBUTE_NORMAL);
+    const SecurityDescriptor descriptor = rightsOf(kModifyForWhoeverLogsOn);
+    if (!descriptor) return std::nullopt;
+    SECURITY_ATTRIBUTES attributes{sizeof attributes, descriptor.get(), FALSE};
+    Handle file(CreateFileW(path.c_str(), GENERIC_WRITE, kShareWhileHeld, &attributes, CREATE_NEW,
+                            FILE_ATTRIBUTE_NORMAL, nullptr));
     if (!file) return std::nullopt;
     return NewFile(std::make_unique<State>(State{path, std::move(file)}));
 }

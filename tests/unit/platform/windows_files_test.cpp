@@ -43,26 +43,31 @@ TEST(WindowsFiles, AFileThatIsHeldCanBeReadByOthersAndWrittenByNone) {
     EXPECT_FALSE(openSharing(path, GENERIC_WRITE, kAll));
 }
 
-TEST(WindowsFiles, ALogIsForItsOwnerAndThoseWhoOwnTheMachine) {
+TEST(WindowsFiles, ALogIsForItsOwnerAndTheStoreForWhoeverLogsOn) {
     const test::MachineWorld world;
-    const std::wstring path = world.folder() + L"\\log.txt";
-    ASSERT_TRUE(appendToFile(narrowFromWide(path), "line\n"));
-    Owned<PSECURITY_DESCRIPTOR, &::LocalFree> descriptor;
-    PACL list = nullptr;
-    ASSERT_EQ(GetNamedSecurityInfoW(path.c_str(), SE_FILE_OBJECT, DACL_SECURITY_INFORMATION, nullptr, nullptr,
-                                    &list, nullptr, descriptor.receive()),
-              DWORD{ERROR_SUCCESS});
-    ASSERT_NE(list, nullptr);
+    const std::wstring log = world.folder() + L"\\log.txt";
+    const std::wstring store = world.folder() + L"\\store";
+    ASSERT_TRUE(appendToFile(narrowFromWide(log), "line\n"));
+    ASSERT_TRUE(NewFile::create(store));
     const Storage user = userOf(GetCurrentProcess());
-    for (DWORD i = 0; i < list->AceCount; ++i) {
-        ACCESS_ALLOWED_ACE* entry = nullptr;
-        ASSERT_NE(GetAce(list, i, reinterpret_cast<void**>(&entry)), 0);
-        PSID const who = &entry->SidStart;
-        EXPECT_TRUE(EqualSid(who, sidOf(user)) || IsWellKnownSid(who, WinLocalSystemSid) ||
-                    IsWellKnownSid(who, WinBuiltinAdministratorsSid))
-            << "entry " << i;
+    for (const std::wstring& path : {log, store}) {
+        Owned<PSECURITY_DESCRIPTOR, &::LocalFree> descriptor;
+        PACL list = nullptr;
+        ASSERT_EQ(GetNamedSecurityInfoW(path.c_str(), SE_FILE_OBJECT, DACL_SECURITY_INFORMATION, nullptr,
+                                        nullptr, &list, nullptr, descriptor.receive()),
+                  DWORD{ERROR_SUCCESS});
+        ASSERT_NE(list, nullptr);
+        for (DWORD i = 0; i < list->AceCount; ++i) {
+            ACCESS_ALLOWED_ACE* entry = nullptr;
+            ASSERT_NE(GetAce(list, i, reinterpret_cast<void**>(&entry)), 0);
+            PSID const who = &entry->SidStart;
+            EXPECT_TRUE(EqualSid(who, sidOf(user)) || IsWellKnownSid(who, WinLocalSystemSid) ||
+                        IsWellKnownSid(who, WinBuiltinAdministratorsSid) ||
+                        (path == store && IsWellKnownSid(who, WinInteractiveSid)))
+                << "entry " << i;
+        }
     }
-    EXPECT_EQ(readFile(path), "line\r\n");
+    EXPECT_EQ(readFile(log), "line\r\n");
 }
 
 }  // namespace
