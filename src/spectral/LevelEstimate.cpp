@@ -23,7 +23,8 @@ double floorShare(int power) {
             share = std::pow(10.0, (kLevelFloor - kLevelOfPowerZero - of++) / 10.0);
         return all;
     }();
-    return shares[static_cast<std::size_t>(power + kLargestPower)];
+    const int index = power + kLargestPower;
+    return shares[static_cast<std::size_t>(index)];
 }
 
 double magnitude(std::byte bin, double least) {
