@@ -16,7 +16,7 @@ constexpr std::chrono::milliseconds kLockPatience{2000};
 // Each save signs what all see.
 bool isTheSame(Credential a, const Credential& b) {
     a.m_creator = b.m_creator;
-    return holdTheSame(std::move(a), b);
+    return holdTheSame(a, b);
 }
 
 Credential* find(const std::unordered_map<std::int32_t, Credential*>& byId, std::int32_t id) {
