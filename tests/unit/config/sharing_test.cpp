@@ -319,9 +319,9 @@ void changeAtRandom(Config& config, unsigned kind, std::int32_t id, const std::w
     if (kind < 3 && table.addCredential(input, config.nextCredId(), config.userName(), added) == kSuccess)
         config.advanceNextCredId();
     if (kind == 3 && one != nullptr) {
-        if (!text.empty()) one->m_credName = one->m_realm = text;
-        (id % 2 == 0 ? one->m_username : one->m_password) = text;
-        one->m_bAutoConnect = !one->m_bAutoConnect;
+        if (!text.empty() && id % 3 == 0) one->m_credName = one->m_realm = text;
+        if (id % 3 == 1) one->m_password = text;
+        if (id % 3 == 2) one->m_bAutoConnect = !one->m_bAutoConnect;
     }
     if (kind == 4) table.deleteCredential(config.currentId(id));
     if (kind == 5) table.setCredentialPosition(config.currentId(id), id);
