@@ -62,6 +62,11 @@ std::string reasonAgainst(const CredentialList& list, const Credential& wanted) 
 
 }  // namespace
 
+CredentialStore::CredentialStore(HotspotPort& port, const std::optional<MachineFolder>& machine)
+    : m_port(port) {
+    if (machine) m_file.emplace(*machine);
+}
+
 const CredentialList& CredentialStore::read() {
     const auto answer = m_port.question(contract::kGetAllCredentialList, acceptsAny);
     if (!answer.payload) throw ClientError(kNoList);
@@ -74,6 +79,8 @@ const CredentialList& CredentialStore::reload() {
     const auto answer = m_port.ask(contract::kGetAllCredentialList, std::nullopt,
                                    contract::kGetAllCredentialList, [](const Json::Value&) { return false; });
     if (!answer.payload) throw ClientError(kNoList);
+    if (const auto objection = m_file ? m_file->objection() : std::nullopt)
+        throw ClientError("not read again: " + *objection + "; the service goes on with what it has");
     return m_list = credentialList(*answer.payload);
 }
 
@@ -117,6 +124,7 @@ std::size_t CredentialStore::move(int id, std::size_t position) {
 }
 
 bool CredentialStore::change(const std::string& command, const std::string& data, const Shows& shows) {
+    if (m_file) m_file->look();
     try {
         const auto answer =
             m_port.ask(command, data, contract::kGetAllCredentialList, [&](const Json::Value& payload) {
@@ -124,6 +132,7 @@ bool CredentialStore::change(const std::string& command, const std::string& data
                 return shows(m_list);
             });
         if (!answer.payload) throw ClientError(kNoList);
+        if (answer.isAccepted && m_file && !m_file->isWritten()) m_whyUnsaved = m_file->whyNotWritten();
         return answer.isAccepted;
     } catch (const StoppedByUser& error) {
         throw StoppedByUser(error.what() + std::string(kNotKnown));

@@ -171,6 +171,33 @@ class Changing(CredentialStory):
         self.done("credential", "edit", "C", "--name", "3")
         self.assertIn('credential 3 "B"', self.done("credential", "delete", "3"), "an id goes before a name")
 
+    def test_what_does_not_get_into_the_file_is_told(self):
+        path, good = self.machine.config(), self.machine.config().read_bytes()
+
+        def cannot_write():
+            path.write_bytes(good)
+            self.control.do("fail", call="rename", error=112)
+
+        for why, spoil in (
+            ("could not be written", cannot_write),
+            ("is not well-formed XML", lambda: path.write_bytes(good[:-1])),
+            ("cannot be opened", path.unlink),
+        ):
+            for verb, name, *arguments in (
+                ("edited", "B", "edit", "B", "--no-auto-connect"), ("moved", "A", "move", "A", 3),
+                ("deleted", "C", "delete", "C"), ("added", "D", "add", *Adding.TLS[2:], "D"),
+            ):  # fmt: skip
+                with self.subTest((why, verb)):
+                    spoil() if path.exists() else None
+                    told = self.refused(1, "credential", *arguments, "--json")
+                    expected = rf'vexa: kept in memory only: credential \d "{name}" was {verb}, but {path} {why}'
+                    self.assertRegex(told, expected)
+            if spoil != cannot_write:
+                told = f"vexa: not read again: {path} {why}; the service goes on with what it has"
+                self.assertEqual(self.refused(1, "reload"), told)
+            path.write_bytes(good)
+            self.assertEqual(self.done("reload"), "The configuration was read again: 3 credentials.\n")
+
     def test_reload_takes_what_was_edited_by_hand(self):
         path = self.machine.config()
         path.write_text(path.read_text("utf-8-sig").replace(">A<", ">By hand<"), encoding="utf-8-sig")
