@@ -47,8 +47,10 @@ class Listing(CredentialStory):
 
     def test_passwords_show_only_when_asked_for(self):
         self.add_user("Lounge", password="gEh31m")
-        for command in ("credentials", "credentials --json", "credential edit Lounge --name B --json"):
+        asked = f"send {self.machine.hs20_port} GET_ALL_CREDENTIAL_LIST --wait 500"
+        for command in ("credentials", "credentials --json", "credential edit Lounge --name B --json", asked):
             self.assertNotIn("gEh31m", self.done(*command.split()))
+        self.assertIn("gEh31m", self.done(*asked.split(), "--show-passwords"))
         self.assertIn("gEh31m", self.done("credentials", "--show-passwords"))
         self.assertEqual(self.list("--show-passwords")[0]["password"], "gEh31m")
 
