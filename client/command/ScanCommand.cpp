@@ -38,10 +38,11 @@ public:
 
     /// To be called when the view has changed.
     void update(const SpectralView& view) {
-        const std::size_t known = view.knownChannels();
-        if (known == m_known) return;
-        m_known = known;
-        const bool all = view.hasChannelList() && known == view.channels().size();
+        const std::size_t current = view.currentChannels();
+        const std::size_t told = view.knownChannels() + current;
+        if (told == m_told) return;
+        m_told = told;
+        const bool all = view.hasChannelList() && current == view.channels().size();
         m_end = std::min(m_limit, Deadline::in(all ? kRestOfBurst : kQuietLimit));
     }
 
@@ -51,7 +52,7 @@ public:
 private:
     Deadline m_limit;
     Deadline m_end;
-    std::size_t m_known = 0;
+    std::size_t m_told = 0;
 };
 
 void scanOnce(SpectralScan& scan, Signals& signals, seconds limit) {
@@ -59,7 +60,8 @@ void scanOnce(SpectralScan& scan, Signals& signals, seconds limit) {
     Completeness completeness(limit);
     scan.start();
     while (!completeness.end().isOver()) {
-        if (!loop.wait(scan.polled(), completeness.end())) break;
+        if (!loop.wait(scan.polled(), std::min(completeness.end(), scan.wake()))) break;
+        scan.renew();
         if (!scan.process().empty()) completeness.update(scan.view());
     }
     scan.stop();

@@ -6,7 +6,7 @@ import signal
 import socket
 import threading
 
-from harness import TEXT, Story, accepted, frame, read_frame, read_head, run_client, wait_until
+from harness import CHANNEL_LIST, TEXT, Story, accepted, frame, read_frame, read_head, run_client, wait_until
 
 ADD = ["credential", "add", "--method", "tls", "--client-cert", "c", "--realm"]
 UNKNOWN = "whether the change was made is not known"
@@ -150,6 +150,14 @@ class InAnyOrder(Story):
             with self.subTest(told):
                 result, _ = self.add(*events)
                 self.assertEqual((result.returncode, result.stdout, result.stderr), (1, "", f"vexa: {told}\n"))
+
+    def test_a_scan_tells_no_0_of_what_was_told_before_its_list(self):
+        before = "SPECTRAL_ANALYSER_SAMPLE_DATA_INTERFERENCE", {"order": 1, "noise_value": 42}
+        listed = [before, (CHANNEL_LIST, [{"Channel": 36, "Order": 1}])]
+        peer = self.enterContext(Peer(lambda command: listed if command["CommandId"] == "GET_CHANNEL_LIST" else []))
+        told = self.done("scan", "--json", "--timeout", 1, "--sa-port", peer.port, VEXA_MACHINE=None)
+        channel = {"channel": 36, "order": 1, "congestion": None, "interference": 42}
+        self.assertEqual(json.loads(told), {"channels": [channel]})
 
     def test_a_service_that_has_just_started_is_asked_again(self):
         def answer(command):
