@@ -47,17 +47,20 @@ const Credential* findAdded(const CredentialList& before, const CredentialList& 
     return found == after.end() ? nullptr : &*found;
 }
 
-/// Why the service does not take another one like this.
-std::string reasonAgainst(const CredentialList& list, const Credential& wanted) {
-    const std::string& name = wanted.name.empty() ? wanted.realm : wanted.name;
+/// Which other one has the realm for its method, or the name; `before`: what it was, and may stay.
+std::optional<std::string> clash(const CredentialList& list, const Credential& wanted,
+                                 const Credential& before = {}) {
+    const auto isOther = [&](const Credential& other) { return other.id != wanted.id; };
     for (const auto& other : list) {
-        if (other.type == wanted.type && other.realm == wanted.realm)
+        if (isOther(other) && other.type == wanted.type && other.realm == wanted.realm &&
+            wanted.realm != before.realm)
             return nameOf(other) + " is for " + methodName(other) + " and this realm already";
     }
     for (const auto& other : list) {
-        if (other.name == name) return "the name is taken by " + nameOf(other);
+        if (isOther(other) && other.name == wanted.name && wanted.name != before.name)
+            return "the name is taken by " + nameOf(other);
     }
-    return kUnknownReason;
+    return std::nullopt;
 }
 
 }  // namespace
@@ -89,11 +92,16 @@ const Credential& CredentialStore::add(const Credential& wanted) {
     const bool isMade =
         change(contract::kAddCredential, credentialData(wanted),
                [&](const CredentialList& after) { return findAdded(before, after, wanted) != nullptr; });
-    if (!isMade) throw ClientError("not stored: " + reasonAgainst(m_list, wanted));
+    if (!isMade)
+        throw ClientError("not stored: " + clash(m_list, asStored(wanted, {})).value_or(kUnknownReason));
     return *findAdded(before, m_list, wanted);
 }
 
+// The service would take it, and refuse the like when it is added.
 void CredentialStore::edit(const Credential& wanted) {
+    const Credential* const before = findById(m_list, wanted.id);
+    if (const auto reason = clash(m_list, wanted, before == nullptr ? wanted : *before))
+        throw ClientError("not changed: " + *reason);
     const bool isMade =
         change(contract::kEditCredential, credentialData(wanted), [&](const CredentialList& after) {
             const Credential* now = findById(after, wanted.id);

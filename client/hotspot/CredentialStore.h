@@ -37,7 +37,7 @@ public:
     /// Gives what was stored, with its id.
     const Credential& add(const Credential& wanted);
 
-    /// The credential with this id becomes like this.
+    /// The credential with this id becomes like this. Throws ClientError if it would clash with another.
     void edit(const Credential& wanted);
 
     void erase(int id);
