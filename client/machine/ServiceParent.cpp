@@ -26,6 +26,8 @@ constexpr seconds kGiveUpLimit{2};
 // Its ports or its configuration: it does not say which.
 constexpr int kServiceFailed = 1;
 constexpr int kScenarioRefused = 2;
+constexpr int kSignalBase = 128;
+constexpr int kLastSignal = 64;
 
 fs::path servicePath(const std::string& given) {
     return given.empty() ? serviceBesideThis() : fs::absolute(given);
@@ -35,6 +37,21 @@ std::set<std::uint16_t> wantedPorts(const ServicePorts& ports) {
     std::set<std::uint16_t> wanted{ports.sa, ports.hs20, ports.control};
     wanted.erase(0);
     return wanted;
+}
+
+void requireDifferentPorts(const StartRequest& request) {
+    std::set<std::uint16_t> seen;
+    for (const std::uint16_t port : {request.saPort, request.hs20Port, request.controlPort.value_or(0)}) {
+        if (port != 0 && !seen.insert(port).second)
+            throw ClientError("the port " + std::to_string(port) + " is given twice", kExitWrongUse);
+    }
+}
+
+// As the exit code tells it, see ServiceProcess::exitCode().
+std::string endOf(int exitCode) {
+    const int signal = exitCode - kSignalBase;
+    return signal > 0 && signal <= kLastSignal ? "was killed by signal " + std::to_string(signal)
+                                               : "ended with exit code " + std::to_string(exitCode);
 }
 
 std::string portNames(const ServicePorts& ports) {
@@ -48,6 +65,7 @@ std::string portNames(const ServicePorts& ports) {
 
 ServiceParent::ServiceParent(const StartRequest& request, StopSource& stop)
     : m_stop(stop), m_folder(request.machine) {
+    requireDifferentPorts(request);
     m_folder.create();
     takeMutex();
     choosePorts(request);
@@ -120,14 +138,21 @@ ServiceParent::State ServiceParent::waitForEnd() {
     while (!m_process->exitCode()) {
         if (!m_stop.wait(Deadline::never())) return State::StopRequested;
     }
+    std::cerr << "vexa: the service " << endOf(*m_process->exitCode()) << ", without being asked to stop\n";
     return State::Ended;
 }
 
 int ServiceParent::stop() {
+    if (const auto code = m_process->exitCode()) {
+        letGo();
+        return *code;
+    }
     letGo();
     if (!waitForExit(kStopLimit)) {
         std::cerr << "vexa: the service did not stop within " << kStopLimit.count() << " s and was killed\n";
         m_process->kill();
+    } else if (const int code = *m_process->exitCode(); code != 0) {
+        std::cerr << "vexa: the service " << endOf(code) << " when it was asked to stop\n";
     }
     return m_process->exitCode().value_or(kExitFailed);
 }
@@ -193,8 +218,10 @@ bool ServiceParent::isOutputEmpty() const {
 
 void ServiceParent::reportEarlyEnd(int exitCode) const {
     if (exitCode == kScenarioRefused) return;  // it has said so itself
-    std::cerr << "vexa: the service ended with exit code " << exitCode << " before it was ready: ";
-    if (exitCode == 0) {
+    std::cerr << "vexa: the service " << endOf(exitCode) << " before it was ready: ";
+    if (exitCode > kSignalBase) {
+        std::cerr << "its output is in " << m_folder.outputFile().string() << '\n';
+    } else if (exitCode == 0) {
         std::cerr << "another one seems to run on the machine " << m_folder.path().string() << '\n';
     } else if (exitCode == kServiceFailed && !portIsBusy() && isOutputEmpty()) {
         std::cerr << "its configuration file " << m_folder.configFile().string() << " cannot be read\n";
