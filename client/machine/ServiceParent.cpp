@@ -143,11 +143,9 @@ ServiceParent::State ServiceParent::waitForEnd() {
 }
 
 int ServiceParent::stop() {
-    if (const auto code = m_process->exitCode()) {
-        letGo();
-        return *code;
-    }
+    const auto before = m_process->exitCode();
     letGo();
+    if (before) return *before;
     if (!waitForExit(kStopLimit)) {
         std::cerr << "vexa: the service did not stop within " << kStopLimit.count() << " s and was killed\n";
         m_process->kill();
