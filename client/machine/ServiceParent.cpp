@@ -7,6 +7,7 @@
 #include "client/machine/ServiceHost.h"
 #include "client/machine/ServiceProcess.h"
 #include "client/terminal/ClientError.h"
+#include "client/terminal/WaitNotice.h"
 #include "contract/Process.h"
 
 namespace vexa::client {
@@ -118,6 +119,7 @@ void ServiceParent::start(const StartRequest& request) {
 
 ServiceParent::State ServiceParent::waitUntilReady() {
     const Deadline deadline = Deadline::in(kReadyLimit);
+    WaitNotice notice("the service to listen on its ports");
     for (milliseconds pause = kFirstCheck;; pause = std::min(pause + milliseconds(1), kLongestCheck)) {
         if (const auto code = m_process->exitCode()) {
             reportEarlyEnd(*code);
@@ -125,6 +127,7 @@ ServiceParent::State ServiceParent::waitUntilReady() {
         }
         if (portsListen()) break;
         if (deadline.isOver()) giveUp();
+        notice.tick();
         if (!m_stop.wait(Deadline::in(pause))) return State::StopRequested;
     }
     m_reserved.clear();

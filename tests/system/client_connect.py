@@ -32,9 +32,9 @@ class ConnectStory(NetworkStory):
     def slowly(self):
         self.control.do("set", connectMs=SLOW_MS)
 
-    def attempt(self):
-        """`vexa connect` in the middle of an attempt that does not end by itself."""
-        self.control.do("set", connectMs=3600000)
+    def attempt(self, milliseconds=3600000):
+        """`vexa connect` in the middle of an attempt that does not end by itself, or takes so long."""
+        self.control.do("set", connectMs=milliseconds)
         before = self.requests()
         joining = self.running("connect", "Café", "--machine", self.machine.folder)
         wait_until(lambda: self.requests() > before, f"the attempt; {joining.lines} {joining.errors}")
@@ -153,6 +153,23 @@ class NotJoining(ConnectStory):
                 joining = self.attempt()
                 end(joining)
                 self.assertEqual((joining.wait(), joining.lines, joining.errors), (1, [], [told]))
+
+    def test_another_request_takes_its_place(self):
+        self.pocket(MANUAL)
+        self.add_user("Hall", MANUAL, realm="hall.example")
+        joining = self.attempt(SLOW_MS)
+        self.control.do("set", connectMs=100)
+        self.done("connect", "Hall", "--no-wait")
+        self.assertEqual((joining.wait(), joining.lines), (1, []))
+        self.assertEqual(joining.errors, ['vexa: "Café": another network was joined instead'])
+
+    def test_who_looks_on_is_told_what_is_waited_for(self):
+        self.pocket(MANUAL)
+        self.control.do("set", connectMs=3600000)
+        terminal = self.terminal("connect", "Café", "--machine", self.machine.folder)
+        terminal.read_until('vexa: waiting for "Café" to be joined; Ctrl-C ends it'.encode())
+        terminal.press(b"\x03")
+        self.assertEqual(terminal.finish(), 1)
 
     def test_too_slow(self):
         self.pocket(MANUAL)

@@ -96,7 +96,7 @@ class WithService(Story):
 
     def test_without_an_adapter_each_command_says_so_at_once(self):
         self.control.do("pullAdapter")
-        for command in ("credentials", "reload", "credential delete A", "networks", "enable", "disable", "refresh",
+        for command in ("scan", "credentials", "reload", "credential delete A", "networks", "enable", "disable", "refresh",
                         "credential add --realm r --method tls --client-cert c"):  # fmt: skip
             with self.subTest(command):
                 self.assertIn("no adapter", self.refused(1, *command.split(), "--timeout", "3600"))
