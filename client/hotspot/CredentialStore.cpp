@@ -120,6 +120,7 @@ void CredentialStore::erase(int id) {
 }
 
 std::size_t CredentialStore::move(int id, std::size_t position) {
+    if (positionOf(m_list, id) == std::min(position, m_list.size())) return positionOf(m_list, id);
     const bool isMade = change(contract::kSetPositionCredential, positionData(id, position),
                                [&](const CredentialList& after) {
                                    return findById(after, id) != nullptr &&
@@ -132,6 +133,7 @@ std::size_t CredentialStore::move(int id, std::size_t position) {
 }
 
 bool CredentialStore::change(const std::string& command, const std::string& data, const Shows& shows) {
+    m_whyUnsaved.reset();
     if (m_file) m_file->look();
     try {
         const auto answer =

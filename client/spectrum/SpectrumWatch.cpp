@@ -25,7 +25,7 @@ void watchSpectrum(SpectralScan& scan, Signals& signals, SpectrumOutput& output,
         if (!loop.wait(polled, std::min({end, redraw, wake, scan.wake()}))) break;
         scan.renew();
         output.show(scan.process(), scan.view());
-        if (scan.hasResumed()) output.note(kResumed);
+        if (side == nullptr && scan.hasResumed()) output.note(kResumed);
         if (side != nullptr) output.showSide(side->process());
     }
     scan.stop();
