@@ -40,12 +40,15 @@ std::set<std::uint16_t> wantedPorts(const ServicePorts& ports) {
     return wanted;
 }
 
-void requireDifferentPorts(const StartRequest& request) {
-    std::set<std::uint16_t> seen;
-    for (const std::uint16_t port : {request.saPort, request.hs20Port, request.controlPort.value_or(0)}) {
-        if (port != 0 && !seen.insert(port).second)
-            throw ClientError("the port " + std::to_string(port) + " is given twice", kExitWrongUse);
-    }
+// The service takes one port for both of its halves, and one of them has none then.
+void checkPorts(const StartRequest& request) {
+    const std::uint16_t control = request.controlPort.value_or(0);
+    if (control != 0 && (control == request.saPort || control == request.hs20Port))
+        throw ClientError("the control channel needs a port of its own, not " + std::to_string(control),
+                          kExitWrongUse);
+    if (request.saPort != 0 && request.saPort == request.hs20Port)
+        std::cerr << "vexa: both halves have the port " << request.saPort
+                  << ": the spectral analyser cannot be reached\n";
 }
 
 // As the exit code tells it, see ServiceProcess::exitCode().
@@ -66,7 +69,7 @@ std::string portNames(const ServicePorts& ports) {
 
 ServiceParent::ServiceParent(const StartRequest& request, StopSource& stop)
     : m_stop(stop), m_folder(request.machine) {
-    requireDifferentPorts(request);
+    checkPorts(request);
     m_folder.create();
     takeMutex();
     choosePorts(request);

@@ -37,8 +37,8 @@ class ServiceParent {
 public:
     enum class State { Ready, StopRequested, Ended };
 
-    /// Takes the mutex and starts the service. Throws ClientError, also for a port that is given twice.
-    /// `stop` must outlive it.
+    /// Takes the mutex and starts the service. Throws ClientError; warns of one port for both halves. `stop`
+    /// must outlive it.
     ServiceParent(const StartRequest& request, StopSource& stop);
 
     /// Stops a service that still runs.

@@ -152,7 +152,7 @@ class Use(Story):
         for command in (
             "", "nonsense", "start --sa-port 70000", "start --sa-port -1", "start --hs20-port abc",
             "start --control-port", "start extra", "demo --seconds 0", "scan --port 0", "scan --timeout no", "send",
-            *(f"start --{a}-port 9 --{b}-port 9" for a, b in (("sa", "hs20"), ("sa", "control"), ("hs20", "control"))),
+            *(f"start --{half}-port 9 --control-port 9" for half in ("sa", "hs20")),
             "send 80", "send 0 GET_RADIO", "listen", "listen 65536", "log -n", "log -n x", "log -n -1",
             "log --nonsense", "log more",
         ):  # fmt: skip
