@@ -56,6 +56,7 @@ TEST(JoinJudge, BelievesTheListAndWhatComesBehindTheRequest) {
         {"told, but another is listed", "succeeded internet Hall*+Cafe", Outcome::Open},
         {"another joined instead", "checked checked succeeded internet Hall*+Cafe 950 Hall*+Cafe",
          Outcome::Overtaken},
+        {"another before ours", "succeeded internet Hall*+Cafe 950 Hall*+Cafe", Outcome::Open},
         {"another for a moment", "checked checked succeeded Hall*+Cafe 500 Hall*+Cafe 950 Cafe",
          Outcome::Open},
         {"another, then ours", "checked checked succeeded Hall*+Cafe 500 succeeded Cafe*", Outcome::Joined},
