@@ -177,7 +177,8 @@ class Changing(CredentialStory):
             self.assertIn(told, line)
         self.assertIn("Changed", self.done("credential", "edit", "A", "--name", "A", "--realm", "a2"))
         client = self.machine.hs20()
-        client.credentials("EDIT_CREDENTIAL", {**client.credentials()[0], "CredentialName": "B"})
+        client.credentials("EDIT_CREDENTIAL", {**client.credentials()[0], "CredentialName": "B", "RealName": "b"})
+        self.done("credential", "edit", "--id", "3", "--no-auto-connect")
         for arguments in (["delete", "B"], ["delete", "--name", "B"], ["move", "--name", "B", "1"]):
             self.assertIn("several", self.refused(1, "credential", *arguments))
         self.done("credential", "edit", "--id", "1", "--name", "3")

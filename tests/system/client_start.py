@@ -111,7 +111,8 @@ class ServiceThatDoesNotCome(Story):
         for code in (0, 1, 77):
             with self.subTest(code):
                 self.assert_ends(self.begin(*self.stand_in(f"exit {code}\n")), code, "vexa: ")
-        self.assert_ends(self.begin(*self.stand_in("kill -9 $$\n")), 128 + 9, "killed by signal 9 before it was ready")
+        told = "killed by signal 9 before it was ready: its output is in"
+        self.assert_ends(self.begin(*self.stand_in("kill -9 $$\n")), 128 + 9, told)
         refusing = self.stand_in("echo speed: negative >&2\nexit 2\n")
         self.assert_ends(self.begin(*refusing), 2, "speed: negative")
         self.assert_ends(self.begin("--service", self.folder / "none"), 3, "vexa: ")
