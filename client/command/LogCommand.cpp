@@ -9,6 +9,7 @@
 #include "client/machine/ServiceHost.h"
 #include "client/terminal/ClientError.h"
 #include "client/terminal/EventLoop.h"
+#include "client/terminal/Terminal.h"
 #include "client/terminal/Text.h"
 
 namespace vexa::client {
@@ -22,6 +23,7 @@ struct LogOptions {
     std::size_t lines = 0;
     bool follow = false;
     bool json = false;
+    bool redact = false;
 };
 
 /// Why there may be nothing to read, in one line; empty if the log is on.
@@ -37,9 +39,11 @@ std::string whyOff(const MachineFolder& machine) {
            " and start the service again";
 }
 
-void print(const std::vector<LogFiles::Line>& lines, std::size_t from, bool json) {
+void print(std::vector<LogFiles::Line> lines, std::size_t from, const LogOptions& options) {
     for (std::size_t i = from; i < lines.size(); ++i) {
-        std::cout << (json ? jsonOf(lines[i]) : printable(lines[i].text, Tabs::Kept)) << '\n';
+        LogFiles::Line& line = lines[i];
+        if (options.redact) line.text = withoutPassword(std::move(line.text));
+        std::cout << (options.json ? jsonOf(line) : printable(line.text, Tabs::Kept)) << '\n';
     }
     std::cout << std::flush;
 }
@@ -48,7 +52,7 @@ void follow(LogFiles& files, const LogOptions& options) {
     Signals signals;
     EventLoop loop(signals);
     while (std::cout && loop.wait(Deadline::in(kBetweenLooks)))
-        print(files.takeLines(), 0, options.json);
+        print(files.takeLines(), 0, options);
 }
 
 void explainSilence(const std::string& reason, bool hasFile, bool goesOn) {
@@ -69,7 +73,7 @@ int runLog(const LogOptions& options, bool isLimited) {
         lines.insert(lines.end(), rest.begin(), rest.end());
     }
     const bool isCut = isLimited && lines.size() > options.lines;
-    print(lines, isCut ? lines.size() - options.lines : 0, options.json);
+    print(lines, isCut ? lines.size() - options.lines : 0, options);
     if (options.follow) follow(files, options);
     return kExitOk;
 }
@@ -86,7 +90,12 @@ void addLogCommand(CLI::App& app, int& exitCode) {
     lines->type_name("LINES")->check(CLI::NonNegativeNumber);
     command->add_flag("-f,--follow", options->follow, "Go on with what is written, until Ctrl-C");
     command->add_flag("--json", options->json, "Print JSON, an object a line");
-    command->callback([options, lines, &exitCode] { exitCode = runLog(*options, lines->count() > 0); });
+    CLI::Option* redact =
+        command->add_flag("--redact,!--no-redact", options->redact, "Hide passwords; default: on a terminal");
+    command->callback([options, lines, redact, &exitCode] {
+        if (redact->count() == 0) options->redact = isOutputTerminal();
+        exitCode = runLog(*options, lines->count() > 0);
+    });
 }
 
 }  // namespace vexa::client

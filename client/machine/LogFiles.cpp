@@ -3,10 +3,12 @@
 #include <algorithm>
 #include <fstream>
 #include <iterator>
+#include <string_view>
 #include <tuple>
 #include <utility>
 
 #include "client/port/JsonLine.h"
+#include "client/port/Passwords.h"
 #include "client/terminal/Text.h"
 
 namespace vexa::client {
@@ -88,6 +90,14 @@ std::vector<fs::path> LogFiles::filesByTime() const {
     for (Found& file : found)
         paths.push_back(std::move(file.path));
     return paths;
+}
+
+// The password stands last, and may hold anything.
+std::string withoutPassword(std::string line) {
+    constexpr std::string_view kBefore = ", password=";
+    const std::size_t found = line.find(kBefore);
+    if (found == std::string::npos) return line;
+    return line.replace(found + kBefore.size(), std::string::npos, kHiddenPassword);
 }
 
 std::string jsonOf(const LogFiles::Line& line) {

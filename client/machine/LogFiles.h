@@ -40,6 +40,9 @@ private:
     std::map<std::string, Place> m_places;
 };
 
+/// The line without the password that it may tell.
+std::string withoutPassword(std::string line);
+
 /// The line as a JSON object on one line.
 std::string jsonOf(const LogFiles::Line& line);
 
