@@ -34,6 +34,7 @@ void addStatusCommand(CLI::App& app, int& exitCode);
 void addConnectCommand(CLI::App& app, int& exitCode);
 void addDisconnectCommand(CLI::App& app, int& exitCode);
 void addNetworksCommand(CLI::App& app, int& exitCode);
+void addDoctorCommand(CLI::App& app, int& exitCode);
 void addEnableCommand(CLI::App& app, int& exitCode);
 void addDisableCommand(CLI::App& app, int& exitCode);
 void addRefreshCommand(CLI::App& app, int& exitCode);
