@@ -159,7 +159,10 @@ private:
         }
         for (const auto& [name, reason] : m_skipped) {
             lines.push_back("Skipped " + inQuotes(name) + ": " + reason + ".");
-            object["skipped"].append(name + ": " + reason);
+            Json::Value entry(Json::objectValue);
+            entry["name"] = name;
+            entry["reason"] = reason;
+            object["skipped"].append(entry);
         }
         for (const std::string& note : m_file.notes) {
             lines.push_back("Not kept: " + note);
