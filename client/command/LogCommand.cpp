@@ -1,10 +1,10 @@
 #include <CLI/CLI.hpp>
 #include <iostream>
 #include <memory>
-#include <pugixml.hpp>
 
 #include "client/command/Commands.h"
 #include "client/machine/LogFiles.h"
+#include "client/machine/LogSwitch.h"
 #include "client/machine/MachineFolder.h"
 #include "client/machine/ServiceHost.h"
 #include "client/terminal/ClientError.h"
@@ -25,19 +25,6 @@ struct LogOptions {
     bool json = false;
     bool redact = false;
 };
-
-/// Why there may be nothing to read, in one line; empty if the log is on.
-std::string whyOff(const MachineFolder& machine) {
-    pugi::xml_document document;
-    const auto result = document.load_file(machine.configFile().c_str());
-    if (result.status == pugi::status_file_not_found)
-        return "no service has run on the machine " + machine.path().string() + " yet";
-    if (result.status != pugi::status_ok) return machine.configFile().string() + " cannot be read";
-    const std::string enabled = document.select_node("/*/global/enabledump").node().text().get();
-    if (enabled == "true") return "";
-    return "the log is off: set enabledump to true in " + machine.configFile().string() +
-           " and start the service again";
-}
 
 void print(std::vector<LogFiles::Line> lines, std::size_t from, const LogOptions& options) {
     for (std::size_t i = from; i < lines.size(); ++i) {
@@ -66,7 +53,7 @@ void explainSilence(const std::string& reason, bool hasFile, bool goesOn) {
 int runLog(const LogOptions& options, bool isLimited) {
     const MachineFolder machine(options.machine);
     LogFiles files(machine.dumpFolder());
-    explainSilence(whyOff(machine), files.any(), options.follow);
+    explainSilence(whyLogIsOff(machine), files.any(), options.follow);
     auto lines = files.takeLines();
     if (!options.follow) {
         const auto rest = files.takeRest();

@@ -28,6 +28,9 @@ public:
     /// What the files end with and no line end follows yet.
     std::vector<Line> takeRest();
 
+    /// The whole lines in the last bytes of the file that was written last; none if that was before `since`.
+    std::vector<std::string> lastLines(std::uintmax_t bytes, std::filesystem::file_time_type since) const;
+
 private:
     struct Place {
         std::uintmax_t offset = 0;

@@ -81,12 +81,15 @@ void addCredentialMove(CLI::App& parent, int& exitCode) {
 }
 
 void addCredentialCommand(CLI::App& app, int& exitCode) {
-    CLI::App* command = app.add_subcommand("credential", "Add, edit, delete or move a credential");
+    CLI::App* command =
+        app.add_subcommand("credential", "Add, edit, delete or move a credential, or keep them in a file");
     command->require_subcommand(1);
     addCredentialAdd(*command, exitCode);
     addCredentialEdit(*command, exitCode);
     addCredentialDelete(*command, exitCode);
     addCredentialMove(*command, exitCode);
+    addCredentialExport(*command, exitCode);
+    addCredentialImport(*command, exitCode);
 }
 
 }  // namespace vexa::client
