@@ -1,6 +1,7 @@
 #include <CLI/CLI.hpp>
 #include <algorithm>
 #include <memory>
+#include <utility>
 
 #include "client/command/Commands.h"
 #include "client/command/ConnectionOptions.h"
@@ -28,10 +29,10 @@ std::vector<std::string> quotedNames(const CredentialList& credentials) {
 
 class Joining {
 public:
-    explicit Joining(const ConnectionOptions& options)
-        : m_options(options),
-          m_port(options.hotspot.port.find(), m_signals, options.answerLimit()),
-          m_name(inQuotes(options.network)) {}
+    explicit Joining(ConnectionOptions options)
+        : m_options(std::move(options)),
+          m_port(m_options.hotspot.port.find(), m_signals, m_options.answerLimit()),
+          m_name(inQuotes(m_options.network)) {}
 
     int run() {
         requireRadio(m_port);
@@ -52,8 +53,10 @@ public:
 private:
     Network wantedNetwork() {
         const NetworkList list = askNetworks(m_port).value_or(NetworkList());
-        if (const Network* const network = findNetwork(list, m_options.network)) return *network;
-        throw ClientError(whyNotFound(list));
+        const Network* const network = networkMeant(list, m_options.network);
+        if (network == nullptr) throw ClientError(whyNotFound(list));
+        m_options.network = network->name;
+        return *network;
     }
 
     std::string whyNotFound(const NetworkList& list) const {
@@ -98,7 +101,7 @@ private:
         return m_name + " was not joined within " + std::to_string(m_options.hotspot.timeout) + " s";
     }
 
-    const ConnectionOptions& m_options;
+    ConnectionOptions m_options;
     Signals m_signals;
     HotspotPort m_port;
     std::string m_name;

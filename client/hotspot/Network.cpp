@@ -84,6 +84,13 @@ const Network* findNetwork(const NetworkList& list, const std::string& name) {
     return found == list.end() ? nullptr : &*found;
 }
 
+const Network* networkMeant(const NetworkList& list, const std::string& given) {
+    if (const Network* const named = findNetwork(list, given)) return named;
+    const auto found = std::find_if(list.begin(), list.end(),
+                                    [&](const Network& network) { return printable(network.name) == given; });
+    return found == list.end() ? nullptr : &*found;
+}
+
 std::string namesOf(const NetworkList& list) {
     std::string names;
     for (const Network& network : list)

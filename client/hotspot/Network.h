@@ -39,6 +39,10 @@ const Network* connectedNetwork(const NetworkList& list);
 /// Nothing if none has the name.
 const Network* findNetwork(const NetworkList& list, const std::string& name);
 
+/// The one that a user means by what he gives: its name, else the name as it is shown to him. Nothing if
+/// there is none.
+const Network* networkMeant(const NetworkList& list, const std::string& given);
+
 /// Their names in quotes; empty for none.
 std::string namesOf(const NetworkList& list);
 

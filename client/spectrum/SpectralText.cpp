@@ -57,7 +57,7 @@ std::string describeEvent(const Event& event, const SpectralView::Update& update
     }
     if (event.id == contract::kCurrentChannelData)
         return event.data == "0" ? "connected on no channel" : "connected on channel " + event.data;
-    return event.data.empty() ? event.id : event.id + " " + event.data;
+    return printable(event.data.empty() ? event.id : event.id + " " + event.data);
 }
 
 std::vector<std::string> spectrumTable(const SpectralView& view) {

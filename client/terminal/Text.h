@@ -15,8 +15,12 @@ std::string asUtf8(std::string_view text);
 
 enum class Tabs { Escaped, Kept };
 
-/// UTF-8 text that a terminal shows and that does nothing to it: control characters are written as \xNN.
+/// UTF-8 text that a terminal shows and that does nothing to it: hidden characters are written as \xNN,
+/// \uNNNN or \UNNNNNNNN.
 std::string printable(std::string_view text, Tabs tabs = Tabs::Escaped);
+
+/// The same JSON text on one line, its hidden characters in JSON's own notation.
+std::string withoutHidden(std::string_view json);
 
 /// How many columns of a terminal printable UTF-8 text takes.
 int columnsOf(std::string_view text);

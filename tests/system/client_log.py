@@ -4,6 +4,7 @@ import json
 import os
 import re
 import signal
+import unicodedata
 
 from harness import STORE, Story, run_client, wait_until
 
@@ -79,8 +80,15 @@ class OfFiles(Story):
     def test_bytes_of_any_kind_become_text(self):
         self.set_config("true")
         self.write("a.txt", b"caf\xe9\nsnow \xe2\x98\x83\nred \x1b[31m\ttab\n")
-        self.assertEqual(self.lines(), ["café", "snow ☃", "red \\x1b[31m\ttab"])
-        self.assertEqual(json.loads(self.lines("--json")[2])["line"], "red \x1b[31m\ttab")
+        hidden = [c for c in map(chr, range(127, 0x110000)) if unicodedata.category(c) in ("Cc", "Cf", "Zl", "Zp")]
+        self.write("a.txt", "".join(c + "\n" for c in hidden))
+        told = self.vexa("log").stdout.split("\n")[:-1]
+        self.assertEqual(told[:3], ["café", "snow ☃", "red \\x1b[31m\ttab"])
+        escapes = [repr(c)[1:-1] for c in hidden]
+        self.assertEqual((told[3:], escapes[-1]), (escapes, "\\U000e007f"))
+        told = self.vexa("log", "--json").stdout.split("\n")[2:-1]
+        self.assertEqual([json.loads(line)["line"] for line in told], ["red \x1b[31m\ttab", *hidden])
+        self.assertTrue(all(map(str.isascii, told)), told)
 
     def test_files_of_a_log_that_is_off_now_are_shown_with_a_word(self):
         self.set_config("false")

@@ -127,6 +127,7 @@ STORIES = {
          '"C" is in range; realms: x (TLS)', f'joined "B"{NONE_OF_OURS}'),
         (networks(), 'the connection to "B" has ended', '"B" is out of range', '"C" is out of range'),
     ],
+    "what is hidden in a name": [(networks("\u202e", "\u200b"), 'hotspots in range: "\\u202e", "\\u200b"')],
     "a connection that was there is not joined": [
         ((LIST, TWO), "2 credentials stored"),
         (networks("A*:r"), 'hotspots in range: "A"', 'connected to "A" with the credential "One" or "Two"'),
