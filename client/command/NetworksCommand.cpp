@@ -55,7 +55,7 @@ int runNetworks(const NetworksOptions& options) {
     const auto list = askNetworks(port);
     if (!list && !options.watch) throw ClientError(kNoAdapter);
     if (!list) std::cerr << "vexa: " << kNoAdapter << '\n';
-    if (list) show(*list, json);
+    if (list && !show(*list, json)) return kExitOk;
     if (list && list->empty() && !json) explain(port, options.hotspot);
     if (!options.watch) return kExitOk;
     std::optional<TerminalKeys> keys;

@@ -9,6 +9,10 @@ bool isOutputTerminal() {
     return GetConsoleMode(GetStdHandle(STD_OUTPUT_HANDLE), &mode) != 0;
 }
 
+bool isOutputPipe() {
+    return GetFileType(GetStdHandle(STD_OUTPUT_HANDLE)) == FILE_TYPE_PIPE;
+}
+
 // The entry has asked for it.
 bool canPlaceCursor() {
     DWORD mode = 0;

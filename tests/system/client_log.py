@@ -28,7 +28,7 @@ class OfService(Story):
         machine.hs20().send("ANOTHER_COMMAND")
         follower.wait_line("ANOTHER_COMMAND")
         self.assertIn("ANOTHER_COMMAND", self.done("log"))
-        self.assertEqual(follower.stop(signal.SIGINT), 0)
+        self.assertEqual(follower.stop(signal.SIGINT), 130)
 
     def test_a_log_that_is_off_is_told(self):
         self.start(config=config("false"))
@@ -107,7 +107,7 @@ class OfFiles(Story):
         follower.wait_line("", count=3)
         told = [json.loads(line)["line"] for line in follower.lines]
         self.assertEqual((told[0], sorted(told[1:])), ("one", ["three", "two"]))
-        self.assertEqual(follower.stop(signal.SIGTERM), 0)
+        self.assertEqual(follower.stop(signal.SIGTERM), 143)
 
     def test_following_begins_with_the_last_lines(self):
         self.set_config("true")

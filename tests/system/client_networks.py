@@ -75,7 +75,7 @@ class Looking(NetworkStory):
         watch.wait_line("", count=2)
         names = [[n["name"] for n in json.loads(line)] for line in watch.lines]
         self.assertEqual(names, [["Airport Free", "Café", "Later"], ["Airport Free", "Later"]])
-        self.assertEqual((watch.stop(signal.SIGINT), watch.errors), (0, []))
+        self.assertEqual((watch.stop(signal.SIGINT), watch.errors), (130, []))
 
     def test_watching_waits_for_an_adapter(self):
         self.control.do("pullAdapter")
@@ -83,7 +83,7 @@ class Looking(NetworkStory):
         wait_until(lambda: watch.errors, "a word about the adapter")
         self.control.do("insertAdapter")
         wait_until(lambda: self.control.do("reportNetworks") or watch.lines, "a list")
-        self.assertEqual(watch.stop(signal.SIGTERM), 0)
+        self.assertEqual(watch.stop(signal.SIGTERM), 143)
 
     def test_why_there_are_none(self):
         def none_listed():

@@ -3,8 +3,9 @@
 import json
 import re
 import signal
+import subprocess
 
-from harness import Machine, Story, wait_until
+from harness import Machine, Story, clean_environment, program, wait_until
 
 LEVELS = {
     "1": {"congestion": 30, "power": 60, "spread": 0},
@@ -42,7 +43,7 @@ class WithService(Story):
         watch.wait_line("channel 36: congestion 70")
         self.control.do("levels", levels={"36": {"congestion": 0, "power": 96, "spread": 0}})
         watch.wait_line("channel 36: congestion 28")
-        self.assertEqual(watch.stop(signal.SIGINT), 0)
+        self.assertEqual(watch.stop(signal.SIGINT), 130)
         wait_until(lambda: self.scan_requests(0), "a stop request")
 
     def test_the_port_can_come_from_option_environment_and_machine(self):
@@ -66,6 +67,15 @@ class WithService(Story):
         self.assertEqual(self.done("send", self.machine.sa_port, "FULL_SCAN", "--wait", 0), "")
         wait_until(lambda: self.scan_requests(1), "a scan request")
 
+    def test_what_can_not_be_printed_has_failed(self):
+        environment = clean_environment(VEXA_MACHINE=str(self.machine.folder))
+        for command in ("status", "scan", "scan --watch", "channels --json", "networks", "networks --watch", "watch",
+                        "credentials", f"send {self.machine.sa_port} GET_CHANNEL_LIST", "--version", "scan --help"):
+            with self.subTest(command), open("/dev/full", "w") as full:
+                arguments = [program("vexa"), *command.split()]
+                told = subprocess.run(arguments, env=environment, stdout=full, stderr=subprocess.PIPE, text=True, timeout=60)
+                self.assertEqual((told.returncode, told.stderr), (1, "vexa: standard output cannot be written\n"))
+
     def listener(self, *command):
         """It has heard something."""
         listener = self.running(*command, self.machine.sa_port)
@@ -75,7 +85,7 @@ class WithService(Story):
     def test_listening_shows_events_as_they_come(self):
         listener = self.listener("listen")
         self.assertEqual(json.loads(listener.lines[0])["EventId"], "CARD_PLUG_OUT")
-        self.assertEqual(listener.stop(signal.SIGINT), 0)
+        self.assertEqual(listener.stop(signal.SIGINT), 130)
 
     def test_a_service_that_goes_is_told(self):
         listeners = [self.listener("listen"), self.listener("scan", "--watch", "--sa-port")]

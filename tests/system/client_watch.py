@@ -30,7 +30,7 @@ class WatchStory(NetworkStory):
         return watch
 
     def assert_quiet_end(self, watch, number=signal.SIGINT):
-        self.assertEqual((watch.stop(number), watch.errors), (0, []))
+        self.assertEqual((watch.stop(number), watch.errors), (128 + number, []))
         self.assertTrue(all(map(LINE.fullmatch, watch.lines)), watch.lines)
 
 
@@ -80,7 +80,7 @@ class Telling(WatchStory):
             return {json.loads(line)["Source"] for line in list(watch.lines)}
 
         wait_until(lambda: sources() == {"HotSpot20", "SpectralAnalyser"}, "both")
-        self.assertEqual((watch.stop(signal.SIGINT), watch.errors), (0, []))
+        self.assertEqual((watch.stop(signal.SIGINT), watch.errors), (130, []))
 
 
 class Ending(WatchStory):
@@ -187,6 +187,6 @@ class Sentences(Story):
                 watch = self.running("watch", "--hs20-port", peer.port, "--sa-port", silent.port)
                 watch.wait_line(sentences[-1], count=sentences.count(sentences[-1]))
                 wait_until(lambda: len(peer.commands) >= 5 + len(asked), "the questions")
-                self.assertEqual((watch.stop(signal.SIGINT), watch.errors), (0, []))
+                self.assertEqual((watch.stop(signal.SIGINT), watch.errors), (130, []))
                 self.assertEqual([line[20:] for line in watch.lines], sentences)
                 self.assertEqual(peer.commands[5:], asked)
