@@ -3,6 +3,7 @@
 import json
 import os
 import re
+import resource
 import signal
 import unicodedata
 
@@ -71,11 +72,21 @@ class OfFiles(Story):
         self.write("hs20log_user_1.txt", "first\n", age=9)
         (self.folder / STORE / "Dump" / "folder").mkdir()
         self.assertEqual(self.lines(), ["first", "second", "third", "fourth", "last, without an end"])
-        self.assertEqual(self.lines("-n", "2"), ["fourth", "last, without an end"])
-        self.assertEqual(self.lines("-n", "99"), self.lines())
-        self.assertEqual(self.lines("--lines", "0"), [])
-        entries = list(map(json.loads, self.lines("--json", "-n", "3")))
+        self.write("hs20log_user_2.txt", "x" * 70000 + "\n", age=20)
+        self.write("hs20log_user_3.txt", "rest", age=30)
+        lines = self.lines()
+        for count in range(len(lines) + 2):
+            self.assertEqual(self.lines("--lines", str(count)), lines[-count:] if count else [], count)
+        entries = list(map(json.loads, self.lines("--json", "-n", "4")))
         self.assertEqual(entries[0], {"file": "hs20log_user_10.txt", "line": "third"})
+
+    def test_of_a_long_log_its_end_alone_is_read(self):
+        self.set_config("true")
+        self.write("a.txt", "")
+        os.truncate(self.folder / STORE / "Dump" / "a.txt", 1 << 28)
+        self.write("a.txt", "\none\ntwo\n")
+        self.assertEqual(self.lines("-n", "2"), ["one", "two"])
+        self.assertLess(resource.getrusage(resource.RUSAGE_CHILDREN).ru_maxrss, 1 << 18, "KiB, as much as it holds")
 
     def test_bytes_of_any_kind_become_text(self):
         self.set_config("true")
