@@ -25,6 +25,7 @@ void addCredentialCommand(CLI::App& app, int& exitCode);
 void addCredentialAdd(CLI::App& parent, int& exitCode);
 void addCredentialEdit(CLI::App& parent, int& exitCode);
 void addCredentialDelete(CLI::App& parent, int& exitCode);
+void addCredentialList(CLI::App& parent, int& exitCode);
 void addCredentialMove(CLI::App& parent, int& exitCode);
 void addReloadCommand(CLI::App& app, int& exitCode);
 void addLogCommand(CLI::App& app, int& exitCode);

@@ -62,7 +62,8 @@ private:
     std::string whyNotFound(const NetworkList& list) const {
         if (list.empty() && !hotspotSwitch(m_options.hotspot.port.machine()).value_or(true))
             return "hotspot networks are disabled: `vexa enable` enables them";
-        return "no network " + m_name + " is in range" + (list.empty() ? "" : "; there is " + namesOf(list));
+        return "no network " + m_name + " is in range" +
+               (list.empty() ? "" : "; there is " + namesLike(list, m_options.network));
     }
 
     std::chrono::seconds limit() const {

@@ -1,8 +1,11 @@
 #include <CLI/CLI.hpp>
+#include <algorithm>
 #include <array>
 #include <iostream>
 #include <string>
+#include <utility>
 
+#include "client/command/CommandWords.h"
 #include "client/command/Commands.h"
 #include "client/command/Program.h"
 #include "client/terminal/ClientError.h"
@@ -41,12 +44,15 @@ bool isParent(const CLI::App& app) {
 int run(int argc, char** argv) {
     CLI::App app("The Vexa wireless service: start it, look at the air, keep its credentials.", "vexa");
     app.set_version_flag("--version", std::string("vexa ") + vexa::contract::version());
+    app.add_subcommand("help", "Tell how to use a command");
     app.require_subcommand(1);
     int exitCode = kExitOk;
     for (const auto add : kCommands)
         add(app, exitCode);
     try {
-        app.parse(argc, argv);
+        auto words = commandWords(app, {argv + 1, argv + argc});
+        std::reverse(words.begin(), words.end());  // so the parser takes them
+        app.parse(std::move(words));
     } catch (const CLI::Success& help) {
         return app.exit(help);
     } catch (const ClientError& error) {

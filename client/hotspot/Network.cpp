@@ -2,9 +2,11 @@
 
 #include <algorithm>
 #include <array>
+#include <utility>
 
 #include "client/hotspot/Credential.h"
 #include "client/port/JsonLine.h"
+#include "client/terminal/Nearest.h"
 #include "client/terminal/Text.h"
 
 namespace vexa::client {
@@ -96,6 +98,13 @@ std::string namesOf(const NetworkList& list) {
     for (const Network& network : list)
         names += (names.empty() ? "" : ", ") + inQuotes(network.name);
     return names;
+}
+
+std::string namesLike(const NetworkList& list, const std::string& given) {
+    std::vector<std::string> names;
+    for (const Network& network : list)
+        names.push_back(network.name);
+    return namesLike(std::move(names), given);
 }
 
 std::string networkData(const std::string& name) {

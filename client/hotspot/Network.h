@@ -46,6 +46,9 @@ const Network* networkMeant(const NetworkList& list, const std::string& given);
 /// Their names in quotes; empty for none.
 std::string namesOf(const NetworkList& list);
 
+/// The three that look most like the given one, and how many more there are.
+std::string namesLike(const NetworkList& list, const std::string& given);
+
 /// The data of a command for the network of this name.
 std::string networkData(const std::string& name);
 

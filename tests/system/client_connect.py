@@ -107,7 +107,7 @@ class Joining(ConnectStory):
 class NotJoining(ConnectStory):
     def test_the_network_or_the_credential(self):
         self.assertEqual(
-            self.refused(1, "connect", "Hell"), 'vexa: no network "Hell" is in range; there is "Café", "Hall"'
+            self.refused(1, "connect", "Hell"), 'vexa: no network "Hell" is in range; there is "Hall", "Café"'
         )
         self.pocket(MANUAL, realm="other.example")
         self.assertIn('no stored credential fits "Hall"', self.refused(1, "connect", "Hall", "--timeout", "2"))

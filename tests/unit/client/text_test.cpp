@@ -1,5 +1,6 @@
 #include <gtest/gtest.h>
 
+#include "client/terminal/Nearest.h"
 #include "client/terminal/Text.h"
 #include "text/Utf8.h"
 
@@ -22,6 +23,16 @@ TEST(Text, ColumnsFollowTheWidthOfCharacters) {
     EXPECT_EQ(cutToColumns("abc", 9), "abc");
     EXPECT_EQ(cutToColumns("空港", 3), "空");
     EXPECT_EQ(cutToColumns("abc", 0), "");
+}
+
+TEST(Text, NamesThatLookAlikeComeFirst) {
+    const std::tuple<const char*, const char*, std::size_t> distances[] = {
+        {"", "", 0},         {"", "ab", 2},          {"ab", "", 2},           {"Gate", "gate", 0},
+        {"café", "cafe", 1}, {"stauts", "stats", 1}, {"stauts", "status", 1}, {"sitting", "kitten", 3}};
+    for (const auto& [a, b, distance] : distances)
+        EXPECT_EQ(editDistance(a, b), distance) << a << " " << b;
+    EXPECT_EQ(namesLike({"Hall", "Café", "Hell", "Hill", "Bar"}, "hell"),
+              R"("Hell", "Hall", "Hill" and 2 more)");
 }
 
 TEST(Text, RowsAreAlignedByColumns) {
