@@ -91,14 +91,16 @@ int columnsOf(std::string_view text) {
     return columns;
 }
 
-std::string cutToColumns(std::string_view text, int columns) {
+std::string cutToColumns(std::string_view text, int columns, const std::string& ellipsis) {
+    if (columnsOf(text) <= columns) return std::string(text);
+    columns = std::max(columns - columnsOf(ellipsis), 0);
     std::string cut;
     while (const auto character = takeCharacter(text)) {
         columns -= characterWidth(character->codePoint);
         if (columns < 0) break;
         appendUtf8(cut, character->codePoint);
     }
-    return cut;
+    return cut + ellipsis;
 }
 
 std::string inQuotes(std::string_view text) {

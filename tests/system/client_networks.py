@@ -1,6 +1,7 @@
 """`vexa networks`, `status`, `enable`, `disable` and `refresh` on a running service."""
 
 import json
+import re
 import signal
 
 from client_credentials import CredentialStory
@@ -76,6 +77,20 @@ class Looking(NetworkStory):
         names = [[n["name"] for n in json.loads(line)] for line in watch.lines]
         self.assertEqual(names, [["Airport Free", "Café", "Later"], ["Airport Free", "Later"]])
         self.assertEqual((watch.stop(signal.SIGINT), watch.errors), (130, []))
+
+    def test_in_a_terminal_the_list_is_drawn_anew(self):
+        for locale, rest in (("C.UTF-8", "…"), ("C", "...")):
+            command = "networks", "--watch", "--machine", self.machine.folder
+            terminal = self.terminal(*command, columns=99, rows=4, LC_ALL=locale)
+            terminal.read_until(rb"(?s)3 networks .*Airport Free.*2 more; enlarge the window\x1b")
+            terminal.resize(28, 6)
+            terminal.read_until(f"(?s)Airport Free +no +[a-z]*{re.escape(rest)}\x1b.*Later".encode())
+            self.hide(NETWORKS[1]["bssid"])
+            terminal.read_until(b"2 networks")
+            terminal.press(b"q")
+            self.assertEqual((terminal.finish(), terminal.last_line().split()[0]), (0, "Later"))
+            self.control.do("show", bssid=NETWORKS[1]["bssid"])
+            self.all_reported()
 
     def test_watching_waits_for_an_adapter(self):
         self.control.do("pullAdapter")

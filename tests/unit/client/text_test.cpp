@@ -19,10 +19,10 @@ TEST(Text, ColumnsFollowTheWidthOfCharacters) {
     EXPECT_EQ(columnsOf("abc"), 3);
     EXPECT_EQ(columnsOf("空港"), 4);
     EXPECT_EQ(columnsOf("e\xCC\x81"), 1) << "an accent of its own takes no column";
-    EXPECT_EQ(cutToColumns("abc", 2), "ab");
-    EXPECT_EQ(cutToColumns("abc", 9), "abc");
-    EXPECT_EQ(cutToColumns("空港", 3), "空");
-    EXPECT_EQ(cutToColumns("abc", 0), "");
+    EXPECT_EQ(cutToColumns("abcd", 3, "…"), "ab…");
+    EXPECT_EQ(cutToColumns("abcd", 4, "…"), "abcd");
+    EXPECT_EQ(cutToColumns("空港空港", 4, "…"), "空…");
+    EXPECT_EQ(cutToColumns("abcde", 4, "..."), "a...");
 }
 
 TEST(Text, NamesThatLookAlikeComeFirst) {
