@@ -122,10 +122,10 @@ std::string realmsText(const Network& network) {
 }
 
 std::vector<std::string> networkTable(const NetworkList& list) {
-    std::vector<std::vector<std::string>> rows{{"Network", "Connected", "Internet", "Realms"}};
+    std::vector<std::vector<std::string>> rows{{" ", "Network", "Connected", "Internet", "Realms"}};
     for (const auto& network : list)
-        rows.push_back({network.name, network.isConnected ? "yes" : "no", internetName(network.internet),
-                        realmsText(network)});
+        rows.push_back({network.isConnected ? "*" : "", network.name, network.isConnected ? "yes" : "no",
+                        internetName(network.internet), realmsText(network)});
     return alignedLines(rows);
 }
 

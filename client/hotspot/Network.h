@@ -55,7 +55,7 @@ std::string networkData(const std::string& name);
 /// Its realms with their methods, in words.
 std::string realmsText(const Network& network);
 
-/// One row per network; a heading first. Lines have no line end.
+/// One row per network, the connected one behind a star; a heading first. Lines have no line end.
 std::vector<std::string> networkTable(const NetworkList& list);
 
 Json::Value networksJson(const NetworkList& list);

@@ -51,9 +51,9 @@ class Looking(NetworkStory):
         self.assertFalse(any(n["connected"] for n in networks))
         heading, first, second, third = self.done("networks").splitlines()
         self.assertEqual(heading.split(), ["Network", "Connected", "Internet", "Realms"])
-        self.assertRegex(first, r"^Airport Free  no +offered +.*roam\.example \(TTLS\)")
-        self.assertRegex(second, r"^Café +no +none +none$")
-        self.assertRegex(third, r"^Later +no +offered +not known yet$")
+        self.assertRegex(first, r"^   Airport Free  no +offered +.*roam\.example \(TTLS\)")
+        self.assertRegex(second, r"^   Café +no +none +none$")
+        self.assertRegex(third, r"^   Later +no +offered +not known yet$")
 
     def test_a_connection_shows(self):
         self.hide(NETWORKS[2]["bssid"])  # one that never tells its realms keeps the service from joining any
@@ -61,9 +61,10 @@ class Looking(NetworkStory):
         wait_until(lambda: self.status()["credential"] == "Roam", "the connection with the credential's name")
         shown = [(n["name"], n["internet"]) for n in self.networks() if n["connected"]]
         self.assertEqual(shown, [("Airport Free", "reached")])
-        self.assertRegex(self.done("status"), r"Credential +Roam\n")
+        self.assertRegex(self.done("status"), r"Credential +Roam\n(.*\n)*Channel +36\n")
+        self.assertRegex(self.done("networks"), r"\n\*  Airport Free  yes .*\n   ")
         status = self.status()
-        self.assertEqual((status["connection"], status["internet"]), ("Airport Free", True))
+        self.assertEqual([status[k] for k in ("connection", "internet", "channel")], ["Airport Free", True, 36])
         self.control.do("setDns", dns=[])
         self.assertFalse(self.status()["internet"])
         self.assertEqual([n["internet"] for n in self.networks() if n["connected"]], ["missing"])
@@ -122,11 +123,14 @@ class Status(NetworkStory):
     def test_it_follows_what_happens(self):
         self.all_reported()
         expected = {"adapter": True, "radio": True, "hotspot": True, "networks": 3, "connection": None}
-        expected |= {"internet": False, "credential": None, "possibleCredentials": []}
+        expected |= {"internet": False, "credential": None, "possibleCredentials": [], "channel": 0}
+        expected |= {"ports": {"sa": self.machine.sa_port, "hs20": self.machine.hs20_port}}
+        expected |= {"machine": str(self.machine.folder), "version": self.done("--version").split()[1]}
         self.assertEqual(self.status(), expected)
         port = self.machine.hs20_port
         elsewhere = json.loads(self.done("status", "--json", "--hs20-port", port, VEXA_MACHINE="/nonexistent"))
-        self.assertIsNone(elsewhere["hotspot"], "the switch of a machine that is not known")
+        told = [elsewhere[k] for k in ("hotspot", "channel", "machine", "ports")]
+        self.assertEqual(told, [None, None, None, {"sa": None, "hs20": port}], "of a machine that is not known")
         self.control.do("radio", software="off")
         expected |= {"radio": False, "networks": 0}
         self.assertEqual(self.status(), expected)
@@ -136,7 +140,8 @@ class Status(NetworkStory):
     def test_in_words(self):
         words = [line.split()[:2] for line in self.done("status").splitlines()]
         self.assertEqual(words[:3], [["Adapter", "in"], ["Radio", "on"], ["Hotspot", "enabled"]])
-        self.assertEqual([name for name, _ in words[3:]], ["Networks", "Connection", "Credential", "Internet"])
+        names = ["Networks", "Connection", "Credential", "Internet", "Channel", "Ports", "Machine", "Version"]
+        self.assertEqual([name for name, _ in words[3:]], names)
 
 
 class Switching(NetworkStory):
