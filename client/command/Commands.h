@@ -27,6 +27,7 @@ void addCredentialEdit(CLI::App& parent, int& exitCode);
 void addCredentialDelete(CLI::App& parent, int& exitCode);
 void addCredentialExport(CLI::App& parent, int& exitCode);
 void addCredentialImport(CLI::App& parent, int& exitCode);
+void addCredentialList(CLI::App& parent, int& exitCode);
 void addCredentialMove(CLI::App& parent, int& exitCode);
 void addReloadCommand(CLI::App& app, int& exitCode);
 void addLogCommand(CLI::App& app, int& exitCode);

@@ -1,6 +1,7 @@
 #include <CLI/CLI.hpp>
 #include <algorithm>
 #include <memory>
+#include <utility>
 
 #include "client/command/Commands.h"
 #include "client/command/ConnectionOptions.h"
@@ -32,10 +33,10 @@ std::vector<std::string> quotedNames(const CredentialList& credentials) {
 
 class Joining {
 public:
-    explicit Joining(const JoinOptions& options)
-        : m_options(options),
-          m_port(options.hotspot.port.find(), m_signals, options.answerLimit()),
-          m_name(inQuotes(options.network)) {}
+    explicit Joining(JoinOptions options)
+        : m_options(std::move(options)),
+          m_port(m_options.hotspot.port.find(), m_signals, m_options.answerLimit()),
+          m_name(inQuotes(m_options.network)) {}
 
     int run() {
         requireRadio(m_port);
@@ -58,14 +59,17 @@ private:
     Network wantedNetwork() {
         const NetworkList list = askNetworks(m_port).value_or(NetworkList());
         if (const Network* const connected = connectedNetwork(list)) m_connectedBefore = connected->name;
-        if (const Network* const network = findNetwork(list, m_options.network)) return *network;
-        throw ClientError(whyNotFound(list));
+        const Network* const network = networkMeant(list, m_options.network);
+        if (network == nullptr) throw ClientError(whyNotFound(list));
+        m_options.network = network->name;
+        return *network;
     }
 
     std::string whyNotFound(const NetworkList& list) const {
         if (list.empty() && !hotspotSwitch(m_options.hotspot.port.machine()).value_or(true))
             return "hotspot networks are disabled: `vexa enable` enables them";
-        return "no network " + m_name + " is in range" + (list.empty() ? "" : "; there is " + namesOf(list));
+        return "no network " + m_name + " is in range" +
+               (list.empty() ? "" : "; there is " + namesLike(list, m_options.network));
     }
 
     // Without one that fits the service leaves it to the system, which ends the connection that there is
@@ -120,7 +124,7 @@ private:
         return "; the connection to " + inQuotes(m_connectedBefore) + " has ended";
     }
 
-    const JoinOptions& m_options;
+    JoinOptions m_options;
     Signals m_signals;
     HotspotPort m_port;
     std::string m_name;

@@ -54,6 +54,7 @@ int runLog(const LogOptions& options, bool isLimited) {
     const MachineFolder machine(options.machine);
     LogFiles files(machine.dumpFolder());
     explainSilence(whyLogIsOff(machine), files.any(), options.follow);
+    if (isLimited) files.skipToLast(options.lines);
     auto lines = files.takeLines();
     if (!options.follow) {
         const auto rest = files.takeRest();

@@ -3,9 +3,11 @@
 #include <algorithm>
 #include <array>
 #include <charconv>
+#include <utility>
 
 #include "client/port/JsonLine.h"
 #include "client/terminal/ClientError.h"
+#include "client/terminal/Nearest.h"
 #include "client/terminal/Text.h"
 #include "text/Utf8.h"
 
@@ -63,6 +65,14 @@ std::optional<int> asId(const std::string& text) {
     return id;
 }
 
+std::string whyNotFound(const CredentialList& list, const std::string& given) {
+    std::vector<std::string> names;
+    for (const Credential& credential : list)
+        names.push_back(credential.name);
+    return "there is no credential " + inQuotes(given) +
+           (names.empty() ? "" : "; there is " + namesLike(std::move(names), given));
+}
+
 bool isControl(char character) {
     const auto byte = static_cast<unsigned char>(character);
     return byte < 0x20 || byte == 0x7F;
@@ -111,7 +121,7 @@ const Credential& findCredential(const CredentialList& list, const std::string& 
 const Credential& findNamed(const CredentialList& list, const std::string& name) {
     const auto hasName = [&](const Credential& credential) { return credential.name == name; };
     const auto first = std::find_if(list.begin(), list.end(), hasName);
-    if (first == list.end()) throw ClientError("there is no credential " + inQuotes(name));
+    if (first == list.end()) throw ClientError(whyNotFound(list, name));
     if (std::find_if(first + 1, list.end(), hasName) != list.end())
         throw ClientError("several credentials are named " + inQuotes(name) + ": give an id");
     return *first;

@@ -17,6 +17,8 @@ namespace fs = std::filesystem;
 
 namespace {
 
+constexpr std::uintmax_t kBlock = 65536;
+
 struct Found {
     fs::file_time_type time;
     fs::path path;
@@ -34,6 +36,33 @@ std::string readFrom(const fs::path& path, std::uintmax_t offset) {
     return {std::istreambuf_iterator<char>(file), std::istreambuf_iterator<char>()};
 }
 
+/// Where the last lines of a file begin, so many of them at most, and how many these are. Reads from its end.
+struct LastLines {
+    std::uintmax_t begin = 0;
+    std::size_t count = 0;
+};
+
+LastLines findLastLines(const fs::path& path, std::size_t wanted) {
+    std::error_code error;
+    std::ifstream file(path, std::ios::binary);
+    std::uintmax_t left = fs::file_size(path, error);
+    if (error || !file) return {};
+    LastLines found;
+    std::string block;
+    while (left > 0) {
+        block.resize(static_cast<std::size_t>(std::min<std::uintmax_t>(left, kBlock)));
+        left -= block.size();
+        file.seekg(static_cast<std::streamoff>(left));
+        if (!file.read(block.data(), static_cast<std::streamsize>(block.size()))) return {};
+        std::string_view before = block;
+        for (std::size_t end = 0; (end = before.rfind('\n')) != before.npos; before = before.substr(0, end)) {
+            if (found.count == wanted) return {left + end + 1, wanted};
+            ++found.count;
+        }
+    }
+    return found;
+}
+
 /// Windows ends a line with two characters.
 std::string withoutCarriageReturn(std::string line) {
     if (line.ends_with('\r')) line.pop_back();
@@ -44,6 +73,15 @@ std::string withoutCarriageReturn(std::string line) {
 
 bool LogFiles::any() const {
     return !filesByTime().empty();
+}
+
+void LogFiles::skipToLast(std::size_t lines) {
+    const auto files = filesByTime();
+    for (auto path = files.rbegin(); path != files.rend(); ++path) {
+        const LastLines last = findLastLines(*path, lines);
+        m_places[path->filename().string()] = {last.begin, ""};
+        lines -= last.count;
+    }
 }
 
 std::vector<LogFiles::Line> LogFiles::takeLines() {

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
 #include <filesystem>
 #include <map>
@@ -21,6 +22,10 @@ public:
 
     /// Whether there is any file.
     bool any() const;
+
+    /// Passes over what is there now but for so many whole lines at its end, which are read next with what
+    /// has no line end yet. What is passed over is not read.
+    void skipToLast(std::size_t lines);
 
     /// The whole lines that are new: file by file, the one that was written last at the end.
     std::vector<Line> takeLines();

@@ -59,16 +59,15 @@ std::string describeEvent(const Event& event, const SpectralView::Update& update
     }
     if (event.id == contract::kCurrentChannelData)
         return event.data == "0" ? "connected on no channel" : "connected on channel " + event.data;
-    return event.data.empty() ? event.id : event.id + " " + event.data;
+    return printable(event.data.empty() ? event.id : event.id + " " + event.data);
 }
 
 std::vector<std::string> spectrumTable(const SpectralView& view) {
-    std::vector<std::string> lines{"Channel  Order  Congestion  Interference"};
+    std::vector<std::string> lines{"Channel  Congestion  Interference"};
     for (const auto& channel : view.channels()) {
         std::ostringstream line;
-        line << std::setw(7) << channel.number << std::setw(7) << channel.order << std::setw(12)
-             << valueText(channel, channel.congestion) << std::setw(14)
-             << valueText(channel, channel.interference);
+        line << std::setw(7) << channel.number << std::setw(12) << valueText(channel, channel.congestion)
+             << std::setw(14) << valueText(channel, channel.interference);
         lines.push_back(line.str());
     }
     return lines;

@@ -10,7 +10,10 @@ bool isOutputTerminal();
 /// Standard error does.
 bool isErrorTerminal();
 
-/// Standard output goes to one that can place a cursor.
+/// Standard output goes to another process, which may read no more.
+bool isOutputPipe();
+
+/// Standard output goes to a terminal that can place a cursor.
 bool canPlaceCursor();
 
 /// It shows more than ASCII.

@@ -29,7 +29,7 @@ class CredentialStory(Story):
 
 class Listing(CredentialStory):
     def test_the_table_is_in_the_order_of_priority(self):
-        self.assertEqual(self.done("credentials"), "No credentials are stored.\n")
+        self.assertEqual(self.done("credential", "list"), "No credentials are stored.\n")
         self.add_user("Lounge", "--no-auto-connect")
         self.add_certificate("Work", "--per-user", "--ca-cert", "Root", "--creator", "IT")
         heading, *rows = self.done("credentials").splitlines()

@@ -182,7 +182,7 @@ class InAnyOrder(Story):
         peer = self.enterContext(Peer(lambda command: [(LIST, None)] if command["CommandId"] == LIST else []))
         adding = self.running(*ADD, "new", "--hs20-port", peer.port)
         wait_until(lambda: "ADD_CREDENTIAL" in peer.commands, "the command")
-        self.assertEqual(adding.stop(signal.SIGINT), 1)
+        self.assertEqual(adding.stop(signal.SIGINT), 130)
         self.assertEqual(adding.errors, [f"vexa: stopped before the service had answered; {UNKNOWN}"])
 
     def test_a_connection_that_nothing_tells_of_is_believed_when_it_lasts(self):

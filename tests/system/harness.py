@@ -399,7 +399,7 @@ class Terminal:
     def __init__(self, arguments, environment, columns=100, rows=40):
         self.screen = b""
         self.ours, self._theirs = pty.openpty()
-        fcntl.ioctl(self.ours, termios.TIOCSWINSZ, struct.pack("HHHH", rows, columns, 0, 0))
+        self.resize(columns, rows)
         self.before = self.settings()
         self.process = subprocess.Popen(
             arguments,
@@ -410,6 +410,9 @@ class Terminal:
             start_new_session=True,
             preexec_fn=lambda: fcntl.ioctl(0, termios.TIOCSCTTY, 0),
         )
+
+    def resize(self, columns, rows):
+        fcntl.ioctl(self.ours, termios.TIOCSWINSZ, struct.pack("HHHH", rows, columns, 0, 0))
 
     def read_until(self, pattern):
         self._read(lambda: re.search(pattern, self.screen))

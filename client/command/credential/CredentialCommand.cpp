@@ -81,9 +81,10 @@ void addCredentialMove(CLI::App& parent, int& exitCode) {
 }
 
 void addCredentialCommand(CLI::App& app, int& exitCode) {
-    CLI::App* command =
-        app.add_subcommand("credential", "Add, edit, delete or move a credential, or keep them in a file");
+    CLI::App* command = app.add_subcommand(
+        "credential", "List credentials; add, edit, delete or move one; keep them in a file");
     command->require_subcommand(1);
+    addCredentialList(*command, exitCode);
     addCredentialAdd(*command, exitCode);
     addCredentialEdit(*command, exitCode);
     addCredentialDelete(*command, exitCode);
