@@ -13,6 +13,7 @@ namespace {
 struct ListenOptions {
     std::uint16_t port = 0;
     bool json = false;
+    bool showPasswords = false;
 };
 
 int runListen(const ListenOptions& options) {
@@ -21,7 +22,7 @@ int runListen(const ListenOptions& options) {
     EventLoop loop(signals);
     while (loop.wait(client.polled(), Deadline::never())) {
         client.process();
-        if (!printEvents(client)) break;
+        if (!printEvents(client, options.showPasswords ? Passwords::Shown : Passwords::Hidden)) break;
         client.requireOpen();
     }
     return kExitOk;
@@ -36,6 +37,7 @@ void addListenCommand(CLI::App& app, int& exitCode) {
         ->required()
         ->check(CLI::Range(1, 65535));
     command->add_flag("--json", options->json, "Print JSON, as always: an event a line");
+    command->add_flag("--show-passwords", options->showPasswords, "Show the passwords too");
     command->callback([options, &exitCode] { exitCode = runListen(*options); });
 }
 

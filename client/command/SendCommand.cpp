@@ -22,14 +22,15 @@ struct SendOptions {
     std::string data;
     int waitMs = kDefaultWaitMs;
     bool json = false;
+    bool showPasswords = false;
 };
 
-void printAnswers(WebSocketClient& client, Signals& signals, milliseconds wait) {
+void printAnswers(WebSocketClient& client, Signals& signals, milliseconds wait, Passwords passwords) {
     EventLoop loop(signals);
     const Deadline deadline = Deadline::in(wait);
     while (!deadline.isOver() && loop.wait(client.polled(), deadline)) {
         client.process();
-        if (!printEvents(client)) return;
+        if (!printEvents(client, passwords)) return;
         client.requireOpen();
     }
 }
@@ -38,7 +39,8 @@ int runSend(const SendOptions& options, bool hasData) {
     Signals signals;
     WebSocketClient client(options.port);
     client.send(commandText(options.command, hasData ? std::optional(options.data) : std::nullopt));
-    printAnswers(client, signals, milliseconds(options.waitMs));
+    printAnswers(client, signals, milliseconds(options.waitMs),
+                 options.showPasswords ? Passwords::Shown : Passwords::Hidden);
     client.close(kGoodbyeLimit);
     return kExitOk;
 }
@@ -61,6 +63,7 @@ void addSendCommand(CLI::App& app, int& exitCode) {
         ->type_name("MS")
         ->check(CLI::Range(0, 3600000));
     command->add_flag("--json", options->json, "Print JSON, as always: an event a line");
+    command->add_flag("--show-passwords", options->showPasswords, "Show the passwords too");
     command->callback([options, data, &exitCode] { exitCode = runSend(*options, data->count() > 0); });
 }
 

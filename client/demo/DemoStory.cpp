@@ -69,10 +69,12 @@ void append(std::vector<std::string>& lines, const std::vector<std::string>& blo
 
 }  // namespace
 
-DemoStory::DemoStory(std::uint16_t port, const MachineFolder& machine, CredentialList stored)
+DemoStory::DemoStory(std::uint16_t port, const MachineFolder& machine, CredentialList stored,
+                     Passwords passwords)
     : m_client(port),
       m_narrator([machine] { return readConnectionMethod(machine); }),
       m_stored(std::move(stored)),
+      m_passwords(passwords),
       m_log(machine.dumpFolder()) {
     ask(HotspotNarrator::firstQuestions());
 }
@@ -96,7 +98,7 @@ void DemoStory::takeEvents(std::vector<Item>& items) {
         isAnything = true;
         const auto event = parseEvent(*text);
         if (!event) continue;
-        items.push_back({eventLine(*text), ""});
+        items.push_back({eventLine(*text, m_passwords), ""});
         tell(items, *event);
     }
     if (!isAnything) m_client.requireOpen();
@@ -153,7 +155,7 @@ void DemoStory::ask(const std::vector<const char*>& questions) {
 std::vector<std::string> DemoStory::opening(bool json) const {
     if (json) {
         Json::Value object(Json::objectValue);
-        object["credentials"] = credentialsJson(m_stored, Passwords::Hidden);
+        object["credentials"] = credentialsJson(m_stored, m_passwords);
         return {jsonLine(object)};
     }
     auto lines = credentialTable(m_stored, Passwords::Hidden);

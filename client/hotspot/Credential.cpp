@@ -96,14 +96,24 @@ std::string methodName(const Credential& credential) {
 }
 
 const Credential& findCredential(const CredentialList& list, const std::string& idOrName) {
-    if (const auto id = asId(idOrName)) {
-        if (const auto* credential = findById(list, *id)) return *credential;
+    const auto id = asId(idOrName);
+    const Credential* const byId = id ? findById(list, *id) : nullptr;
+    if (byId == nullptr) return findNamed(list, idOrName);
+    for (const Credential& other : list) {
+        if (other.name == idOrName && other.id != byId->id)
+            throw ClientError(inQuotes(idOrName) + " is the id of credential " + inQuotes(byId->name) +
+                              " and the name of credential " + std::to_string(other.id) + ": give --id " +
+                              std::to_string(byId->id) + " or --id " + std::to_string(other.id));
     }
-    const auto hasName = [&](const Credential& credential) { return credential.name == idOrName; };
+    return *byId;
+}
+
+const Credential& findNamed(const CredentialList& list, const std::string& name) {
+    const auto hasName = [&](const Credential& credential) { return credential.name == name; };
     const auto first = std::find_if(list.begin(), list.end(), hasName);
-    if (first == list.end()) throw ClientError("there is no credential " + inQuotes(idOrName));
+    if (first == list.end()) throw ClientError("there is no credential " + inQuotes(name));
     if (std::find_if(first + 1, list.end(), hasName) != list.end())
-        throw ClientError("several credentials are named " + inQuotes(idOrName) + ": give an id");
+        throw ClientError("several credentials are named " + inQuotes(name) + ": give an id");
     return *first;
 }
 

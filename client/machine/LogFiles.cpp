@@ -3,10 +3,12 @@
 #include <algorithm>
 #include <fstream>
 #include <iterator>
+#include <string_view>
 #include <tuple>
 #include <utility>
 
 #include "client/port/JsonLine.h"
+#include "client/port/Passwords.h"
 #include "client/terminal/Text.h"
 
 namespace vexa::client {
@@ -72,6 +74,20 @@ std::vector<LogFiles::Line> LogFiles::takeRest() {
     return lines;
 }
 
+std::vector<std::string> LogFiles::lastLines(std::uintmax_t bytes, fs::file_time_type since) const {
+    std::vector<std::string> lines;
+    const auto paths = filesByTime();
+    std::error_code error;
+    if (paths.empty() || fs::last_write_time(paths.back(), error) < since) return lines;
+    const std::uintmax_t size = fs::file_size(paths.back(), error);
+    if (error) return lines;
+    const std::string text = readFrom(paths.back(), size > bytes ? size - bytes : 0);
+    std::size_t begin = size > bytes ? text.find('\n') + 1 : 0;
+    for (std::size_t end = 0; (end = text.find('\n', begin)) != std::string::npos; begin = end + 1)
+        lines.push_back(withoutCarriageReturn(text.substr(begin, end - begin)));
+    return lines;
+}
+
 std::vector<fs::path> LogFiles::filesByTime() const {
     std::vector<Found> found;
     std::error_code error;
@@ -88,6 +104,14 @@ std::vector<fs::path> LogFiles::filesByTime() const {
     for (Found& file : found)
         paths.push_back(std::move(file.path));
     return paths;
+}
+
+// The password stands last, and may hold anything.
+std::string withoutPassword(std::string line) {
+    constexpr std::string_view kBefore = ", password=";
+    const std::size_t found = line.find(kBefore);
+    if (found == std::string::npos) return line;
+    return line.replace(found + kBefore.size(), std::string::npos, kHiddenPassword);
 }
 
 std::string jsonOf(const LogFiles::Line& line) {

@@ -28,6 +28,9 @@ public:
     /// What the files end with and no line end follows yet.
     std::vector<Line> takeRest();
 
+    /// The whole lines in the last bytes of the file that was written last; none if that was before `since`.
+    std::vector<std::string> lastLines(std::uintmax_t bytes, std::filesystem::file_time_type since) const;
+
 private:
     struct Place {
         std::uintmax_t offset = 0;
@@ -39,6 +42,9 @@ private:
     std::filesystem::path m_folder;
     std::map<std::string, Place> m_places;
 };
+
+/// The line without the password that it may tell.
+std::string withoutPassword(std::string line);
 
 /// The line as a JSON object on one line.
 std::string jsonOf(const LogFiles::Line& line);

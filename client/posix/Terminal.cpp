@@ -24,6 +24,10 @@ bool isOutputTerminal() {
     return ::isatty(STDOUT_FILENO) != 0;
 }
 
+bool isErrorTerminal() {
+    return ::isatty(STDERR_FILENO) != 0;
+}
+
 bool canPlaceCursor() {
     const std::string_view terminal = variable("TERM");
     return isOutputTerminal() && !terminal.empty() && terminal != "dumb";

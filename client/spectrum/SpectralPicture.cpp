@@ -74,8 +74,8 @@ std::string bar(int value, const Scale& scale, const PictureStyle& style) {
 
 std::string quantity(const SpectralView::Channel& channel, std::optional<int> value, const Scale& scale,
                      const PictureStyle& style) {
-    const int shown = value.value_or(0);
-    return bar(shown, scale, style) + rightAligned(channel.isKnown() ? std::to_string(shown) : "-", 4);
+    const auto certain = channel.certain(value);
+    return bar(certain.value_or(0), scale, style) + rightAligned(certain ? std::to_string(*certain) : "-", 4);
 }
 
 std::string heading(const PictureStyle& style) {

@@ -31,11 +31,13 @@ std::string describeChannels(const SpectralView& view) {
 }
 
 std::string valueText(const SpectralView::Channel& channel, std::optional<int> value) {
-    return channel.isKnown() ? std::to_string(value.value_or(0)) : "-";
+    const auto certain = channel.certain(value);
+    return certain ? std::to_string(*certain) : "-";
 }
 
 Json::Value valueJson(const SpectralView::Channel& channel, std::optional<int> value) {
-    return channel.isKnown() ? Json::Value(value.value_or(0)) : Json::Value();
+    const auto certain = channel.certain(value);
+    return certain ? Json::Value(*certain) : Json::Value();
 }
 
 }  // namespace

@@ -7,7 +7,10 @@ namespace vexa::client {
 /// Standard output goes to a terminal, of whatever kind.
 bool isOutputTerminal();
 
-/// It goes to one that can place a cursor.
+/// Standard error does.
+bool isErrorTerminal();
+
+/// Standard output goes to one that can place a cursor.
 bool canPlaceCursor();
 
 /// It shows more than ASCII.

@@ -4,9 +4,21 @@
 
 namespace vexa::client {
 
-bool isOutputTerminal() {
+namespace {
+
+bool isConsole(DWORD stream) {
     DWORD mode = 0;
-    return GetConsoleMode(GetStdHandle(STD_OUTPUT_HANDLE), &mode) != 0;
+    return GetConsoleMode(GetStdHandle(stream), &mode) != 0;
+}
+
+}  // namespace
+
+bool isOutputTerminal() {
+    return isConsole(STD_OUTPUT_HANDLE);
+}
+
+bool isErrorTerminal() {
+    return isConsole(STD_ERROR_HANDLE);
 }
 
 // The entry has asked for it.

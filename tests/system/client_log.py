@@ -82,6 +82,20 @@ class OfFiles(Story):
         self.assertEqual(self.lines(), ["café", "snow ☃", "red \\x1b[31m\ttab"])
         self.assertEqual(json.loads(self.lines("--json")[2])["line"], "red \x1b[31m\ttab")
 
+    def test_passwords_show_where_nobody_looks_on_or_when_asked_for(self):
+        self.set_config("true")
+        self.write("a.txt", "[7] 05/17 06:32:17  \tUsername=anna, password=gEh31m, 1\n")
+        hidden, shown = "anna, password=********", "anna, password=gEh31m, 1"
+        for runs in (lambda *options: self.lines(*options)[0], self.in_terminal):
+            for options, told in ((["--redact"], hidden), (["--redact", "--json"], hidden), (["--no-redact"], shown),
+                                  ([], hidden if runs == self.in_terminal else shown)):  # fmt: skip
+                self.assertRegex(runs(*options), re.escape(told) + r'"?}?\s*$', options)
+
+    def in_terminal(self, *options):
+        terminal = self.terminal("log", *options, "--machine", self.folder)
+        terminal.finish()
+        return terminal.screen.decode()
+
     def test_files_of_a_log_that_is_off_now_are_shown_with_a_word(self):
         self.set_config("false")
         self.write("a.txt", "from before\n")

@@ -45,6 +45,16 @@ class WithService(Story):
         self.assertEqual(watch.stop(signal.SIGINT), 0)
         wait_until(lambda: self.scan_requests(0), "a stop request")
 
+    def test_a_scan_that_another_client_has_stopped_is_asked_for_again(self):
+        watch = self.running("scan", "--watch", "--machine", self.machine.folder)
+        watch.wait_line("channel 36: congestion 70")
+        self.machine.sa().send("STOP_SCAN")
+        wait_until(lambda: self.scan_requests(0), "a stop request")
+        self.control.do("levels", levels={"36": {"congestion": 0, "power": 96, "spread": 0}})
+        watch.wait_line("channel 36: congestion 28")
+        (told,) = wait_until(lambda: watch.errors, "a word about it")
+        self.assertRegex(told, "another client may have stopped the scan")
+
     def test_the_port_can_come_from_option_environment_and_machine(self):
         port = str(self.machine.sa_port)
         expected = [{"channel": row["channel"], "order": row["order"]} for row in EXPECTED]
@@ -86,7 +96,7 @@ class WithService(Story):
 
     def test_without_an_adapter_each_command_says_so_at_once(self):
         self.control.do("pullAdapter")
-        for command in ("credentials", "reload", "credential delete A", "networks", "enable", "disable", "refresh",
+        for command in ("scan", "credentials", "reload", "credential delete A", "networks", "enable", "disable", "refresh",
                         "credential add --realm r --method tls --client-cert c"):  # fmt: skip
             with self.subTest(command):
                 self.assertIn("no adapter", self.refused(1, *command.split(), "--timeout", "3600"))

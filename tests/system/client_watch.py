@@ -74,13 +74,15 @@ class Telling(WatchStory):
         self.assert_quiet_end(watch, signal.SIGTERM)
 
     def test_json_is_each_event_of_both_ports(self):
-        watch = self.watch("--json")
-
         def sources():
             return {json.loads(line)["Source"] for line in list(watch.lines)}
 
-        wait_until(lambda: sources() == {"HotSpot20", "SpectralAnalyser"}, "both")
-        self.assertEqual((watch.stop(signal.SIGINT), watch.errors), (0, []))
+        self.add_user("Roam", password="gEh31m")
+        for options, told in (((), "********"), (("--show-passwords",), "gEh31m")):
+            watch = self.watch("--json", *options)
+            wait_until(lambda: sources() == {"HotSpot20", "SpectralAnalyser"}, "both")
+            self.assertIn(f'\\"Password\\":\\"{told}\\"', watch.wait_line(LIST).replace(" : ", ":"))
+            self.assertEqual((watch.stop(signal.SIGINT), watch.errors), (0, []))
 
 
 class Ending(WatchStory):

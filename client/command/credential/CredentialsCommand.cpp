@@ -33,7 +33,7 @@ int runCredentials(const CredentialsOptions& options) {
 int runReload(const HotspotOptions& options) {
     Signals signals;
     HotspotPort port(options.port.find(), signals, options.limit());
-    CredentialStore store(port);
+    CredentialStore store(port, options.port.machine());
     const std::size_t count = store.reload().size();
     Json::Value object(Json::objectValue);
     object["credentials"] = static_cast<Json::UInt64>(count);

@@ -105,14 +105,16 @@ TEST(SpectralText, EveryEventIsALine) {
     }
 }
 
-TEST(SpectralText, AValueThatDidNotChangeIs0AndASilentChannelHasNone) {
-    const SpectralView view = viewOf({channelList(kTwoChannels), interference(1, 42)});
+TEST(SpectralText, AValueThatDidNotChangeSinceTheListIs0AndAnyOtherThatWasNotToldIsNone) {
+    const SpectralView view = viewOf({interference(2, 7), channelList(kTwoChannels), interference(1, 42)});
     EXPECT_EQ(spectrumTable(view), (std::vector<std::string>{"Channel  Order  Congestion  Interference",
-                                                             "      1      2           -             -",
+                                                             "      1      2           -             7",
                                                              "     36      1           0            42"}));
     EXPECT_EQ(spectrumJson(view),
-              R"({"channels":[{"channel":1,"congestion":null,"interference":null,"order":2},)"
+              R"({"channels":[{"channel":1,"congestion":null,"interference":7,"order":2},)"
               R"({"channel":36,"congestion":0,"interference":42,"order":1}]})");
+    EXPECT_EQ(spectrumTable(viewOf({channelList(kTwoChannels)}))[1],
+              "      1      2           -             -");
 }
 
 TEST(SpectralText, TheSummaryNamesTheBusiestChannel) {
