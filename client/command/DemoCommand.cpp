@@ -84,7 +84,7 @@ void addDemoCommand(CLI::App& app, int& exitCode) {
         ->check(CLI::Range(1, 86400));
     command
         ->add_option("--service", options->service,
-                     "The service's executable; default: the one beside this program")
+                     "The service's executable; default: the one that came with this program")
         ->type_name("PATH");
     command->add_flag("--json", options->json, "An event a line, as JSON, and a JSON object at the end");
     command->add_flag("--show-passwords", options->showPasswords, "Show the passwords too, in JSON");
