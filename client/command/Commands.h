@@ -26,6 +26,7 @@ void addCredentialAdd(CLI::App& parent, int& exitCode);
 void addCredentialEdit(CLI::App& parent, int& exitCode);
 void addCredentialDelete(CLI::App& parent, int& exitCode);
 void addCredentialMove(CLI::App& parent, int& exitCode);
+void addRecordCommand(CLI::App& app, int& exitCode);
 void addReloadCommand(CLI::App& app, int& exitCode);
 void addLogCommand(CLI::App& app, int& exitCode);
 void addStatusCommand(CLI::App& app, int& exitCode);

@@ -17,7 +17,8 @@ constexpr std::array kCommands{&addStartCommand,      &addHostCommands,      &ad
                                &addConnectCommand,    &addDisconnectCommand, &addEnableCommand,
                                &addDisableCommand,    &addRefreshCommand,    &addCredentialsCommand,
                                &addCredentialCommand, &addReloadCommand,     &addWatchCommand,
-                               &addLogCommand,        &addSendCommand,       &addListenCommand};
+                               &addLogCommand,        &addSendCommand,       &addListenCommand,
+                               &addRecordCommand};
 
 int report(const std::exception& error, int exitCode) {
     std::cerr << "vexa: " << error.what() << '\n';
