@@ -18,7 +18,7 @@ constexpr std::array kCommands{&addStartCommand,      &addHostCommands,      &ad
                                &addDisableCommand,    &addRefreshCommand,    &addCredentialsCommand,
                                &addCredentialCommand, &addReloadCommand,     &addWatchCommand,
                                &addLogCommand,        &addSendCommand,       &addListenCommand,
-                               &addRecordCommand};
+                               &addRecordCommand,     &addStatsCommand};
 
 int report(const std::exception& error, int exitCode) {
     std::cerr << "vexa: " << error.what() << '\n';

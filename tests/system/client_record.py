@@ -5,7 +5,7 @@ import signal
 import zlib
 
 from client_credentials import CredentialStory
-from harness import network, wait_until
+from harness import Story, network, wait_until
 
 NETWORKS = [
     network(1, "Airport", {"roam.example": [21], "corp.example": [13]}),
@@ -16,6 +16,28 @@ NETWORKS = [
 CHANNELS = {"channels": [36, 6], "levels": {"6": {"congestion": 30, "power": 30}, "36": {"congestion": 60, "power": 60}}}
 LIST = "GET_ALL_NETWORK_LIST"
 SPEED = 20
+
+
+def event(ms, name, data, port="sa"):
+    envelope = {"EventId": name, "Source": "SpectralAnalyser" if port == "sa" else "HotSpot20", "Timestamp": ""}
+    return {"ms": ms, "port": port, "event": {**envelope, "Data": json.dumps(data)}}
+
+
+def sample(ms, kind, **value):
+    return event(ms, f"SPECTRAL_ANALYSER_SAMPLE_DATA_{kind}", {"order": 1, **value})
+
+
+HEADER = {"recording": "vexa", "format": 1, "version": "0", "started": "2026-01-02T03:04:05Z"}
+WRITTEN = [
+    HEADER,
+    event(0, "SPECTRAL_ANALYSER_CHANNEL_LIST_DATA_2G5G", [{"Channel": 6, "Order": 1}]),
+    sample(1000, "CONGESTION", congestion_value=20), sample(1000, "INTERFERENCE", noise_value=60),
+    sample(7000, "CONGESTION", congestion_value=80), {"ms": 11000, "end": True},
+]  # fmt: skip
+
+
+def text_of(lines):
+    return "".join(json.dumps(line) + "\n" for line in lines)
 
 
 class RecordStory(CredentialStory):
@@ -59,6 +81,8 @@ class Recording(RecordStory):
                 self.assertIn("********", str(lines))
                 self.assertNotIn("secret", str(lines))
                 self.assertEqual(self.file.stat().st_mode & 0o777, 0o600)
+                told = json.loads(self.done("stats", self.file, "--json"))["channels"]
+                self.assertEqual([(c["channel"], c["congestion"]["max"]) for c in told], [(6, 30), (36, 60)])
 
     def test_the_time_the_service_or_a_full_disk_ends_it(self):
         self.add_user("Roam", realm="roam.example")
@@ -76,3 +100,34 @@ class Recording(RecordStory):
         self.machine.stop()
         self.assertEqual((recorder.wait(), recorder.errors), (0, []))
         self.assertRegex(recorder.lines[0], r" s; the service has ended\.\Z")
+
+
+class Statistics(Story):
+    def stats(self, *options, lines=WRITTEN, cut=0, code=0):
+        text = text_of(lines)
+        result = self.vexa("stats", "-", *options, stdin=text[: len(text) - cut], VEXA_MACHINE="/nonexistent")
+        self.assertEqual(result.returncode, code, result.stderr)
+        return result.stdout if code == 0 else result.stderr
+
+    def test_a_table_json_or_csv(self):
+        heading, congestion, interference = self.stats().splitlines()
+        self.assertRegex(heading, r"^Channel +Quantity +Seconds +Min +Mean +P50 +P95 +Max +Above 50$")
+        self.assertEqual(congestion.split(), ["6", "congestion", "10", "20", "44", "20", "80", "80", "40", "%"])
+        self.assertEqual(interference.split(), ["6", "interference", "10", *["60"] * 5, "100", "%"])
+        _, first, _ = self.stats("--csv", "--above", "80").splitlines()
+        self.assertEqual(first, "6,congestion,10,20,44,20,80,80,0")
+        (told,) = json.loads(self.stats("--json"))["channels"]
+        self.assertEqual((told["channel"], told["congestion"]["mean"], told["interference"]["p95"]), (6, 44, 60))
+
+    def test_what_is_cut_off_is_read_and_what_is_no_recording_is_told(self):
+        for cut in (5, 30, 60):  # within the end, before it, within the last value
+            self.assertIn(",congestion,", self.stats("--csv", cut=cut))
+        cases = [
+            ([{"a": 1}], "the recording is no recording of `vexa record`"),
+            ([], "the recording is no recording of `vexa record`"),
+            ([HEADER | {"format": 2}], "the recording has the format 2, which only a later vexa reads"),
+            ([HEADER, 7, *WRITTEN[1:]], "line 2 of the recording is no line of a recording"),
+            ([HEADER], "the recording tells no value of any channel: was a scan running?"),
+        ]
+        for lines, message in cases:
+            self.assertEqual(self.stats(lines=lines, code=1), f"vexa: {message}\n")
