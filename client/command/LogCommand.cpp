@@ -1,14 +1,15 @@
 #include <CLI/CLI.hpp>
 #include <iostream>
 #include <memory>
-#include <pugixml.hpp>
 
 #include "client/command/Commands.h"
 #include "client/machine/LogFiles.h"
+#include "client/machine/LogSwitch.h"
 #include "client/machine/MachineFolder.h"
 #include "client/machine/ServiceHost.h"
 #include "client/terminal/ClientError.h"
 #include "client/terminal/EventLoop.h"
+#include "client/terminal/Terminal.h"
 #include "client/terminal/Text.h"
 
 namespace vexa::client {
@@ -22,24 +23,14 @@ struct LogOptions {
     std::size_t lines = 0;
     bool follow = false;
     bool json = false;
+    bool redact = false;
 };
 
-/// Why there may be nothing to read, in one line; empty if the log is on.
-std::string whyOff(const MachineFolder& machine) {
-    pugi::xml_document document;
-    const auto result = document.load_file(machine.configFile().c_str());
-    if (result.status == pugi::status_file_not_found)
-        return "no service has run on the machine " + machine.path().string() + " yet";
-    if (result.status != pugi::status_ok) return machine.configFile().string() + " cannot be read";
-    const std::string enabled = document.select_node("/*/global/enabledump").node().text().get();
-    if (enabled == "true") return "";
-    return "the log is off: set enabledump to true in " + machine.configFile().string() +
-           " and start the service again";
-}
-
-void print(const std::vector<LogFiles::Line>& lines, std::size_t from, bool json) {
+void print(std::vector<LogFiles::Line> lines, std::size_t from, const LogOptions& options) {
     for (std::size_t i = from; i < lines.size(); ++i) {
-        std::cout << (json ? jsonOf(lines[i]) : printable(lines[i].text, Tabs::Kept)) << '\n';
+        LogFiles::Line& line = lines[i];
+        if (options.redact) line.text = withoutPassword(std::move(line.text));
+        std::cout << (options.json ? jsonOf(line) : printable(line.text, Tabs::Kept)) << '\n';
     }
     std::cout << std::flush;
 }
@@ -48,7 +39,7 @@ void follow(LogFiles& files, const LogOptions& options) {
     Signals signals;
     EventLoop loop(signals);
     while (std::cout && loop.wait(Deadline::in(kBetweenLooks)))
-        print(files.takeLines(), 0, options.json);
+        print(files.takeLines(), 0, options);
 }
 
 void explainSilence(const std::string& reason, bool hasFile, bool goesOn) {
@@ -62,14 +53,15 @@ void explainSilence(const std::string& reason, bool hasFile, bool goesOn) {
 int runLog(const LogOptions& options, bool isLimited) {
     const MachineFolder machine(options.machine);
     LogFiles files(machine.dumpFolder());
-    explainSilence(whyOff(machine), files.any(), options.follow);
+    explainSilence(whyLogIsOff(machine), files.any(), options.follow);
+    if (isLimited) files.skipToLast(options.lines);
     auto lines = files.takeLines();
     if (!options.follow) {
         const auto rest = files.takeRest();
         lines.insert(lines.end(), rest.begin(), rest.end());
     }
     const bool isCut = isLimited && lines.size() > options.lines;
-    print(lines, isCut ? lines.size() - options.lines : 0, options.json);
+    print(lines, isCut ? lines.size() - options.lines : 0, options);
     if (options.follow) follow(files, options);
     return kExitOk;
 }
@@ -86,7 +78,12 @@ void addLogCommand(CLI::App& app, int& exitCode) {
     lines->type_name("LINES")->check(CLI::NonNegativeNumber);
     command->add_flag("-f,--follow", options->follow, "Go on with what is written, until Ctrl-C");
     command->add_flag("--json", options->json, "Print JSON, an object a line");
-    command->callback([options, lines, &exitCode] { exitCode = runLog(*options, lines->count() > 0); });
+    CLI::Option* redact =
+        command->add_flag("--redact,!--no-redact", options->redact, "Hide passwords; default: on a terminal");
+    command->callback([options, lines, redact, &exitCode] {
+        if (redact->count() == 0) options->redact = isOutputTerminal();
+        exitCode = runLog(*options, lines->count() > 0);
+    });
 }
 
 }  // namespace vexa::client

@@ -5,6 +5,8 @@
 
 #include <memory>
 
+#include "client/terminal/Text.h"
+
 namespace vexa::client {
 
 std::string jsonLine(const Json::Value& value) {
@@ -12,7 +14,7 @@ std::string jsonLine(const Json::Value& value) {
     builder["indentation"] = "";
     builder["emitUTF8"] = true;
     builder["precision"] = 15;  // what a double keeps of a decimal: 0.1 is no 0.10000000000000001
-    return Json::writeString(builder, value);
+    return withoutHidden(Json::writeString(builder, value));
 }
 
 std::optional<Json::Value> parseJson(std::string_view text) {

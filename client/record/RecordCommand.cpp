@@ -47,11 +47,14 @@ public:
     std::array<Polled, 2> polled() const { return {m_hotspot.polled(), m_spectral.polled()}; }
 
     /// When it has something to ask although nothing has arrived.
-    Deadline wake() const { return isWaiting() ? m_nextQuestion : Deadline::never(); }
+    Deadline wake() const {
+        return std::min(m_spectral.wake(), isWaiting() ? m_nextQuestion : Deadline::never());
+    }
 
     /// Writes down what has come. Throws NoAnswer when the service has gone.
     void take(RecordingWriter& writer) {
         takeHotspot(writer);
+        m_spectral.renew();
         for (const auto& told : m_spectral.process())
             writer.add(RecordedPort::Spectral, told.text);
         m_hotspot.requireOpen();

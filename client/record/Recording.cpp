@@ -3,14 +3,13 @@
 #include <json/value.h>
 
 #include "client/port/JsonLine.h"
+#include "client/port/Passwords.h"
 
 namespace vexa::client {
 
 namespace {
 
 constexpr const char* kPassword = "Password";
-// Of one length, so that the length of a password is no news either.
-constexpr const char* kMask = "********";
 constexpr const char* kSpectralName = "sa";
 constexpr const char* kHotspotName = "hs20";
 
@@ -20,7 +19,7 @@ void maskPasswords(Json::Value& value) {
         maskPasswords(member);
     if (!value.isObject() || !value.isMember(kPassword)) return;
     Json::Value& password = value[kPassword];
-    if (!password.isString() || !password.asString().empty()) password = kMask;
+    if (!password.isString() || !password.asString().empty()) password = kHiddenPassword;
 }
 
 // Data that can't be looked through is left out.

@@ -7,6 +7,7 @@
 #include "config/SafeSave.h"
 #include "platform/Files.h"
 #include "text/TextConversion.h"
+#include "text/XmlText.h"
 #include "text/XmlWellFormed.h"
 
 namespace vexa {
@@ -16,56 +17,22 @@ namespace {
 constexpr unsigned kParse = (pugi::parse_full | pugi::parse_ws_pcdata) & ~pugi::parse_trim_pcdata;
 constexpr unsigned kFormat = pugi::format_raw | pugi::format_write_bom | pugi::format_no_empty_element_tags;
 constexpr std::size_t kUsualGrowth = 4096;
-constexpr std::string_view kUtf8Mark = "\xEF\xBB\xBF";
 
-bool arePaired(std::u16string_view units) {
-    for (std::size_t i = 0; i < units.size(); ++i) {
-        const bool isHigh = (units[i] & 0xFC00) == 0xD800;
-        if (isHigh && (i + 1 == units.size() || (units[i + 1] & 0xFC00) != 0xDC00)) return false;
-        if (isHigh)
-            ++i;
-        else if ((units[i] & 0xFC00) == 0xDC00)
-            return false;
-    }
-    return true;
+// A comment that holds nothing but a control character of those that no document that was read can hold.
+constexpr std::string_view kHoleBeginning = "<!--";
+constexpr std::string_view kHoleEnd = "-->";
+constexpr std::size_t kHoleLength = kHoleBeginning.size() + 1 + kHoleEnd.size();
+
+bool isHole(std::string_view text) {
+    return text.size() >= kHoleLength && static_cast<unsigned char>(text[kHoleBeginning.size()]) < '\t' &&
+           text.substr(kHoleBeginning.size() + 1).starts_with(kHoleEnd);
 }
 
-// Empty if it is no valid UTF-16.
-std::string decodeUtf16(std::string_view bytes, bool isBigEndian) {
-    std::u16string units;
-    for (std::size_t i = 2; i + 1 < bytes.size(); i += 2) {
-        const auto high = static_cast<unsigned char>(bytes[isBigEndian ? i : i + 1]);
-        const auto low = static_cast<unsigned char>(bytes[isBigEndian ? i + 1 : i]);
-        units += static_cast<char16_t>(high << 8 | low);
-    }
-    return bytes.size() % 2 == 0 && arePaired(units) ? utf8FromUtf16(units) : std::string();
-}
-
-struct EncodedText {
-    std::string utf8;
-    XmlEncoding encoding;
-};
-
-EncodedText decode(const std::string& content) {
-    if (content.starts_with("\xFF\xFE")) return {decodeUtf16(content, false), XmlEncoding::Utf16};
-    if (content.starts_with("\xFE\xFF")) return {decodeUtf16(content, true), XmlEncoding::Utf16};
-    if (content.starts_with(kUtf8Mark)) return {content.substr(kUtf8Mark.size()), XmlEncoding::Utf8};
-    const XmlEncoding declared = declaredXmlEncoding(content);
-    if (declared == XmlEncoding::Latin1) return {utf8FromWide(wideFromNarrow(content)), declared};
-    return {content, declared == XmlEncoding::Ascii ? declared : XmlEncoding::Utf8};
-}
-
-// A line end is one line feed, in whatever form it was written. After this a carriage return is one that was
-// meant.
-std::string withPlainLineEnds(std::string text) {
-    if (text.find('\r') == text.npos) return text;
-    std::string plain;
-    plain.reserve(text.size());
-    for (std::size_t i = 0; i < text.size(); ++i) {
-        if (text[i] == '\r' && i + 1 < text.size() && text[i + 1] == '\n') continue;
-        plain += text[i] == '\r' ? '\n' : text[i];
-    }
-    return plain;
+std::size_t findHole(std::string_view text) {
+    std::size_t at = text.find(kHoleBeginning);
+    while (at != text.npos && !isHole(text.substr(at)))
+        at = text.find(kHoleBeginning, at + 1);
+    return at;
 }
 
 // Processing instructions have names too.
@@ -108,10 +75,14 @@ void XmlDocument::create() {
 ResultCode XmlDocument::load(const std::wstring& path) {
     if (!m_document) return kNoDocument;
     const auto content = platform::readFile(path);
-    if (!content) return kFailure;
-    auto [utf8, encoding] = decode(*content);
-    m_text = withPlainLineEnds(std::move(utf8));
-    if (!isWellFormedXml(m_text, encoding)) return kFailure;
+    return content ? parse(*content) : kFailure;
+}
+
+ResultCode XmlDocument::parse(const std::string& content) {
+    if (!m_document) return kNoDocument;
+    auto text = xmlText(content);
+    if (!text) return kFailure;
+    m_text = std::move(*text);
     const auto result =
         m_document->load_buffer_inplace(m_text.data(), m_text.size(), kParse, pugi::encoding_utf8);
     return result ? kSuccess : kFailure;
@@ -119,14 +90,36 @@ ResultCode XmlDocument::load(const std::wstring& path) {
 
 ResultCode XmlDocument::save(const std::wstring& path) const {
     if (!m_document) return kNoDocument;
-    const Node first = m_document->first_child();
+    const auto content = text();
+    return content && saveSafely(path, *content) ? kSuccess : kFailure;
+}
+
+std::optional<std::string> XmlDocument::text() const {
+    const Node first = root().first_child();
     if (first.type() == pugi::node_declaration && first.attribute("encoding") &&
         !first.attribute("encoding").set_value("UTF-8"))
-        return kFailure;
+        return std::nullopt;
     StringWriter writer;
     writer.text.reserve(m_text.size() + kUsualGrowth);
     m_document->save(writer, "", kFormat, pugi::encoding_utf8);
-    return saveSafely(path, writer.text) ? kSuccess : kFailure;
+    return std::move(writer.text);
+}
+
+bool XmlDocument::addHole(Node parent, char mark) {
+    return parent.append_child(pugi::node_comment).set_value(std::string(1, mark).c_str());
+}
+
+std::vector<XmlDocument::Piece> XmlDocument::textAroundHoles() const {
+    std::vector<Piece> pieces;
+    const auto whole = text();
+    if (!whole) return pieces;
+    std::string_view rest = *whole;
+    for (std::size_t at = findHole(rest); at != rest.npos; at = findHole(rest)) {
+        pieces.push_back({std::string(rest.substr(0, at)), rest[at + kHoleBeginning.size()]});
+        rest.remove_prefix(at + kHoleLength);
+    }
+    pieces.push_back({std::string(rest), 0});
+    return pieces;
 }
 
 XmlDocument::Node XmlDocument::root() const {

@@ -69,7 +69,7 @@ class Recording(RecordStory):
                 self.wait_events("SPECTRAL_ANALYSER_SAMPLE_DATA_INTERFERENCE", 2)
                 self.add_user(name, realm=name)
                 wait_until(lambda: any(name in found["Data"] for found in self.events("GET_ALL_CREDENTIAL_LIST")), name)
-                self.assertEqual((recorder.stop(number), recorder.errors), (-9 if is_killed else 0, []))
+                self.assertEqual((recorder.stop(number), recorder.errors), (-9 if is_killed else 130, []))
                 if not is_killed:
                     self.assertRegex(recorder.lines[0], r"\ARecorded \d+ events in \d+\.\d s\.\Z")
                 lines = self.recorded()

@@ -1,7 +1,10 @@
 #include <gtest/gtest.h>
 
 #include <functional>
+#include <iterator>
+#include <random>
 #include <regex>
+#include <utility>
 #include <vector>
 
 #include "text/TextConversion.h"
@@ -237,6 +240,9 @@ TEST(Sharing, WhatOthersChangedIsTakenOverAndWhatCouldNotBeSavedStays) {
         {"one was deleted", {writing(ttls(2, "b"), 3), moving(2, 1)}, "2:b", 3},
         {"one was edited", {writing(one + ttls(2, "y"), 3), moving(2, 1)}, "2:y 1:a", 3},
         {"the order was changed", {listed("2:1 1:2"), adding("c")}, "3:c 2:b 1:a"},
+        {"the order was changed back",
+         {moving(1, 1), moving(2, 1), listed("1:1 2:2"), adding("c")},
+         "3:c 1:a 2:b"},
         {"unsaved: an addition", {inVain(adding("c")), adding("d")}, "4:d 3:c 1:a 2:b", 5},
         {"unsaved: an addition, its id given to another",
          {inVain(adding("c")), writing(both + ttls(3, "y"), 4), moving(1, 1)},
@@ -298,6 +304,59 @@ TEST(Sharing, WhatOthersChangedIsTakenOverAndWhatCouldNotBeSavedStays) {
         Config reader;
         ASSERT_EQ(open(reader, &isChanged), kSuccess);
         EXPECT_FALSE(isChanged) << c.story << settled;
+    }
+}
+
+/// A change of the kind that the number tells, of or beside the credential with this id.
+void changeAtRandom(Config& config, unsigned kind, std::int32_t id, const std::wstring& text) {
+    const auto held = config.beginChange();
+    CredentialTable& table = config.credentials();
+    Credential* const one = table.findCredentialById(config.currentId(id));
+    CredentialInput input;
+    input.type = kind % 2 == 0 ? CRED_TYPE_EAP_TTLS : CRED_TYPE_EAP_TLS;
+    input.realm = input.username = input.caCert = text;
+    std::int32_t added = 0;
+    if (kind < 3 && table.addCredential(input, config.nextCredId(), config.userName(), added) == kSuccess)
+        config.advanceNextCredId();
+    if (kind == 3 && one != nullptr) {
+        if (!text.empty() && id % 3 == 0) one->m_credName = one->m_realm = text;
+        if (id % 3 == 1) one->m_password = text;
+        if (id % 3 == 2) one->m_bAutoConnect = !one->m_bAutoConnect;
+    }
+    if (kind == 4) table.deleteCredential(config.currentId(id));
+    if (kind == 5) table.setCredentialPosition(config.currentId(id), id);
+    config.saveConfig(held);
+}
+
+// What a service knows of the file that it saved itself is what one that has just started reads there.
+TEST(Sharing, AServiceOfLongStandingSavesWhatOneThatJustStartedSaves) {
+    const std::wstring texts[] = {L"a", L"", L"<b>&c;]]>", L"\r\n d\t", L"\u00e4\u20ac", L"'\"&#13;"};
+    for (unsigned seed = 1; seed <= 8; ++seed) {
+        std::mt19937 random(seed);
+        StoreMachine store;
+        const std::string others = ttls(2, "x", "PC\\bob", "peruser") + element("<id>0</id>") + ttls(1, "a");
+        ASSERT_EQ(store.openWith(document(others, user("PC\\bob", "2:1"))), kSuccess);
+        std::vector<std::function<void(Config&)>> unsaved;
+        for (int step = 0; step < 40; ++step) {
+            const bool isInVain = random() % 8 == 0;
+            if (isInVain) store.fail("rename");
+            if (random() % 8 == 0) store.write("config.xml", store.file() + "<!-- by hand -->");
+            const std::string before = store.file();
+            unsaved.push_back([kind = static_cast<unsigned>(random() % 6),
+                               id = static_cast<std::int32_t>(random() % 16),
+                               text = texts[random() % std::size(texts)]](Config& config) {
+                changeAtRandom(config, kind, id, text);
+            });
+            unsaved.back()(store.config());
+            if (isInVain) continue;
+            const std::string after = store.file();
+            store.write("config.xml", before);
+            Config fresh;
+            ASSERT_EQ(open(fresh), kSuccess);
+            for (const auto& change : std::exchange(unsaved, {}))
+                change(fresh);
+            ASSERT_EQ(store.file(), after) << "seed " << seed << ", step " << step;
+        }
     }
 }
 
