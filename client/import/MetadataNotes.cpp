@@ -60,9 +60,8 @@ bool isContainer(const std::string& name) {
 }
 
 std::string shortened(const std::string& text) {
-    const std::string whole = printable(text);
-    const std::string cut = cutToColumns(whole, kWidest);
-    return '"' + cut + (cut == whole ? "" : "...") + '"';
+    constexpr const char* kEllipsis = "...";
+    return '"' + cutToColumns(printable(text), kWidest + 3, kEllipsis) + '"';
 }
 
 }  // namespace
