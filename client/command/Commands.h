@@ -11,6 +11,7 @@ namespace vexa::client {
 
 void addStartCommand(CLI::App& app, int& exitCode);
 void addDemoCommand(CLI::App& app, int& exitCode);
+void addReplayCommand(CLI::App& app, int& exitCode);
 
 /// What there is on this kind of machine alone.
 void addHostCommands(CLI::App& app, int& exitCode);

@@ -131,3 +131,55 @@ class Statistics(Story):
         ]
         for lines, message in cases:
             self.assertEqual(self.stats(lines=lines, code=1), f"vexa: {message}\n")
+
+
+REALMS = {"RealmFetched": True, "SupportRealmList": [{"CredentialEapMethod": 2, "RealmName": "roam.example"}]}
+AIRPORT = {"NetWorkName": "Airport", "NetworkType": 2, "IsConnected": False, "IsInternetAccess": 2, **REALMS}
+AIR = [
+    *WRITTEN[:2],
+    event(1, "CARD_PLUG_IN", None, "hs20"),
+    event(2, "GET_RADIO", True, "hs20"),
+    event(3, "GET_ALL_CREDENTIAL_LIST", None, "hs20"),
+    event(4, LIST, [AIRPORT], "hs20"),
+    event(5, "GET_IS_INTERNET_ACCESS", False, "hs20"),
+    *WRITTEN[2:4],
+    event(1500, LIST, [{**AIRPORT, "IsConnected": True, "IsInternetAccess": 0}], "hs20"),
+    {"ms": 1600, "end": True},
+]
+
+
+class Replay(Story):
+    def replay(self, *options):
+        file = self.new_folder() / "air.rec"
+        file.write_text(text_of(AIR))
+        replay = self.running("replay", file, *options)
+        words = replay.wait_line("vexa watch").split()
+        return replay, words[words.index("--sa-port") + 1], words[words.index("--hs20-port") + 1]
+
+    def at(self, *command):
+        return self.vexa(*command, VEXA_MACHINE="/nonexistent")
+
+    def test_other_commands_see_what_was_recorded_and_change_nothing(self):
+        replay, sa, hs20 = self.replay()
+        watch = self.running("watch", "--sa-port", sa, "--hs20-port", hs20)
+        for told in ('hotspots in range: "Airport"', "the adapter is in", "spectrum  channel 6: interference 60",
+                     'hotspot   joined "Airport"'):  # fmt: skip
+            watch.wait_line(told)
+        replay.wait_line("The recording has ended: 9 events.")
+        late = json.loads(self.at("scan", "--json", "--port", sa).stdout)["channels"]
+        self.assertEqual(late, [{"channel": 6, "order": 1, "congestion": 20, "interference": 60}])
+        (airport,) = json.loads(self.at("networks", "--json", "--hs20-port", hs20).stdout)
+        self.assertEqual((airport["name"], airport["connected"], airport["internet"]), ("Airport", True, "reached"))
+        for command, asked in (("disable", "SET_HOTSPOT_AUTO_CONNECT"),
+                               ("credential add --realm r --method tls --client-cert c", "ADD_CREDENTIAL")):  # fmt: skip
+            self.assertEqual(self.at(*command.split(), "--hs20-port", hs20).returncode, 1)
+            replay.wait_line(f"{asked} changes nothing: this is a recording.")
+        self.assertEqual(watch.stop(signal.SIGINT), 130)
+        self.assertEqual((replay.wait(), replay.errors), (0, []))
+
+    def test_in_a_loop_and_faster(self):
+        replay, _, hs20 = self.replay("--loop", "--speed", "100")
+        networks = self.running("networks", "--watch", "--json", "--hs20-port", hs20)
+        networks.wait_line('"connected":true', count=3)
+        networks.wait_line('"connected":false', count=3)
+        self.assertEqual((replay.stop(signal.SIGINT), networks.wait()), (130, 1))
