@@ -33,6 +33,7 @@ void addCredentialMove(CLI::App& parent, int& exitCode);
 void addRecordCommand(CLI::App& app, int& exitCode);
 void addReloadCommand(CLI::App& app, int& exitCode);
 void addLogCommand(CLI::App& app, int& exitCode);
+void addScenarioCommand(CLI::App& app, int& exitCode);
 void addStatsCommand(CLI::App& app, int& exitCode);
 void addStatusCommand(CLI::App& app, int& exitCode);
 void addConnectCommand(CLI::App& app, int& exitCode);

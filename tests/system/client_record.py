@@ -5,7 +5,7 @@ import signal
 import zlib
 
 from client_credentials import CredentialStory
-from harness import Story, network, wait_until
+from harness import CHANNEL_LIST, Story, network, wait_until
 
 NETWORKS = [
     network(1, "Airport", {"roam.example": [21], "corp.example": [13]}),
@@ -183,3 +183,97 @@ class Replay(Story):
         networks.wait_line('"connected":true', count=3)
         networks.wait_line('"connected":false', count=3)
         self.assertEqual((replay.stop(signal.SIGINT), networks.wait()), (130, 1))
+
+
+class Scenario(RecordStory):
+    def wait_list(self, *names, **members):
+        """The last list is of these networks, and the first of them has these members."""
+
+        def is_there():
+            lists = [json.loads(found["Data"]) or [] for found in self.events(LIST)][-1:]
+            return lists and [n["NetWorkName"] for n in lists[0]] == list(names) and (
+                not members or members.items() <= lists[0][0].items())
+
+        wait_until(is_there, f"a list of {names}, {members}")
+        self.control.wait_passed(100)  # what comes next has a moment of its own
+
+    def live(self):
+        """What happens on the first machine, each step once the last one is recorded. At its start, and behind a change
+        of the radio, the service rests for 10 s, which an adapter that is pulled has to wait for."""
+        do = self.control.do
+        self.wait_events("SPECTRAL_ANALYSER_SAMPLE_DATA_INTERFERENCE", 2)
+        self.wait_list("Airport", "Café", IsConnected=False)
+        do("show", bssid=NETWORKS[2]["bssid"])
+        do("reportNetworks")
+        self.wait_list("Airport", "Café", "Later")
+        do("setNetwork", bssid=NETWORKS[2]["bssid"], anqp="ready")
+        do("setNetwork", bssid=NETWORKS[0]["bssid"], internetAccess=0)
+        do("reportNetworks")
+        self.wait_list("Airport", "Café", "Later", IsInternetAccess=0)
+        do("setDns", dns=[])
+        do("osConnect", ssid="Airport")
+        self.wait_list("Airport", "Café", "Later", IsConnected=True, IsInternetAccess=1)
+        do("hide", bssid=NETWORKS[1]["bssid"])
+        do("show", bssid="02:aa:00:00:00:04")
+        do("reportNetworks")
+        self.wait_list("Airport", "Later", r"\xC9\xE9", IsConnected=True)
+        do("dropConnection")
+        self.wait_list("Airport", "Later", r"\xC9\xE9", IsConnected=False)
+        do("levels", levels={"6": {"congestion": 75, "power": 50}})
+        wait_until(lambda: self.values(self.events)[(2, "congestion_value")] >= 74, "the level")
+        self.control.wait_passed(10000)
+        do("pullAdapter")
+        do("hide", bssid=NETWORKS[2]["bssid"])
+        self.wait_events("CARD_PLUG_OUT", 2)
+        do("insertAdapter")
+        self.wait_list("Airport", r"\xC9\xE9", IsConnected=False)
+        do("radio", software="off")
+        self.wait_list()
+        do("radio", software="on")
+        self.wait_list("Airport", r"\xC9\xE9")
+        self.done("disable")
+        self.wait_list()
+        self.done("enable")
+        self.wait_list("Airport", r"\xC9\xE9")
+
+    @staticmethod
+    def values(events):
+        """The last one of each kind and order."""
+        names = [f"SPECTRAL_ANALYSER_SAMPLE_DATA_{kind}" for kind in ("CONGESTION", "INTERFERENCE")]
+        told = [json.loads(found["Data"]) for name in names for found in events(name)]
+        return {(data["order"], key): data[key] for data in told for key in data if key != "order"}
+
+    def test_a_simulated_machine_tells_the_same_lists_at_the_same_moments(self):
+        recorder = self.record("case.rec")
+        self.live()
+        recorder.stop(signal.SIGINT)
+        lists = [line for line in self.recorded() if line.get("event", {}).get("EventId") == LIST]
+        recorded = {line["ms"]: json.loads(line["event"]["Data"]) for line in lists}  # of a moment the last one
+        channels = self.events(CHANNEL_LIST)[-1]["Data"]
+        file = self.new_folder() / "case.json"
+        made = self.vexa("scenario", "from", self.file, "--output", file)
+        self.assertEqual((made.returncode, made.stdout), (0, ""))
+        for note in ("an address made up", "the channel of 4 networks", "1 connection as one of", "hotspot function",
+                     "by flat samples"):  # fmt: skip
+            self.assertIn(note, made.stderr)
+        case = json.loads(file.read_text())
+        for action in case["timeline"]:
+            action["atMs"] *= SPEED
+        self.start(**case | {"speed": 0})
+        now, sa = 0, None
+        for moment, networks in recorded.items():
+            self.control.do("advance", ms=(moment - now) * SPEED)
+            now = moment
+            answer = self.machine.hs20().ask(LIST)  # to one who has heard of none before
+            self.assertEqual(json.loads(answer["Data"]), networks, moment)
+            if not sa:
+                sa = self.machine.sa()
+                self.assertEqual(sa.ask("GET_CHANNEL_LIST")["Data"], channels)
+                sa.send("FULL_SCAN")
+        self.control.do("advance", ms=60000)
+        sa.send("GET_CHANNEL_LIST")
+        told = []
+        while (heard := sa.next_event())["EventId"] != CHANNEL_LIST:
+            told.append(heard)
+        told_now = self.values(lambda name: [heard for heard in told if heard["EventId"] == name])
+        self.assertEqual(told_now, self.values(self.events))

@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include "client/record/Gzip.h"
+#include "client/record/NetworkName.h"
 
 namespace vexa::client {
 namespace {
@@ -46,6 +47,14 @@ TEST(Gzip, WhatWasFlushedCanBeRead) {
     EXPECT_EQ(text, "first\n" + large);
     EXPECT_TRUE(reader.isFinished());
     EXPECT_FALSE(GzipReader().add("no gzip", text));
+}
+
+TEST(NetworkName, IsTakenBackForItsBytes) {
+    EXPECT_EQ(ssidOfName(R"(Caf\xE9 \x5Cx41\xe9\x)"), "Caf\xE9 \\x41\\xe9\\x");
+    EXPECT_EQ(ssidOfName(""), std::string(1, '\0'));
+    EXPECT_TRUE(isTextSsid("Café"));
+    EXPECT_FALSE(isTextSsid("Caf\xE9"));
+    EXPECT_EQ(hexOf("\xE9\x0A"), "e90a");
 }
 
 }  // namespace
