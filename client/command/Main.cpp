@@ -22,7 +22,8 @@ constexpr std::array kCommands{
     &addChannelsCommand,   &addNetworksCommand, &addConnectCommand, &addDisconnectCommand,
     &addEnableCommand,     &addDisableCommand,  &addRefreshCommand, &addCredentialsCommand,
     &addCredentialCommand, &addReloadCommand,   &addWatchCommand,   &addLogCommand,
-    &addDoctorCommand,     &addSendCommand,     &addListenCommand};
+    &addDoctorCommand,     &addSendCommand,     &addListenCommand,  &addRecordCommand,
+    &addStatsCommand,      &addScenarioCommand};
 
 int report(const std::exception& error, int exitCode) {
     std::cerr << "vexa: " << error.what() << '\n';
