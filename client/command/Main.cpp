@@ -12,12 +12,12 @@ namespace {
 
 using namespace vexa::client;
 
-constexpr std::array kCommands{&addStartCommand,      &addHostCommands,      &addStatusCommand,
-                               &addScanCommand,       &addChannelsCommand,   &addNetworksCommand,
-                               &addConnectCommand,    &addDisconnectCommand, &addEnableCommand,
-                               &addDisableCommand,    &addRefreshCommand,    &addCredentialsCommand,
-                               &addCredentialCommand, &addReloadCommand,     &addWatchCommand,
-                               &addLogCommand,        &addSendCommand,       &addListenCommand};
+constexpr std::array kCommands{
+    &addStartCommand,      &addHostCommands,    &addStatusCommand,  &addScanCommand,
+    &addChannelsCommand,   &addNetworksCommand, &addConnectCommand, &addDisconnectCommand,
+    &addEnableCommand,     &addDisableCommand,  &addRefreshCommand, &addCredentialsCommand,
+    &addCredentialCommand, &addReloadCommand,   &addWatchCommand,   &addLogCommand,
+    &addSendCommand,       &addListenCommand,   &addShellCommands};
 
 int report(const std::exception& error, int exitCode) {
     std::cerr << "vexa: " << error.what() << '\n';
