@@ -7,6 +7,7 @@
 #include "client/machine/LogFiles.h"
 #include "client/machine/MachineFolder.h"
 #include "client/machine/ServiceHost.h"
+#include "client/output/Records.h"
 #include "client/terminal/ClientError.h"
 #include "client/terminal/EventLoop.h"
 #include "client/terminal/Text.h"
@@ -21,7 +22,7 @@ struct LogOptions {
     std::string machine;
     std::size_t lines = 0;
     bool follow = false;
-    bool json = false;
+    OutputOptions output;
 };
 
 /// Why there may be nothing to read, in one line; empty if the log is on.
@@ -37,10 +38,15 @@ std::string whyOff(const MachineFolder& machine) {
            " and start the service again";
 }
 
-void print(const std::vector<LogFiles::Line>& lines, std::size_t from, bool json) {
-    for (std::size_t i = from; i < lines.size(); ++i) {
-        std::cout << (json ? jsonOf(lines[i]) : printable(lines[i].text, Tabs::Kept)) << '\n';
-    }
+std::string shown(const LogFiles::Line& line, const OutputOptions& options) {
+    if (options.json) return recordsJson(options, lineJson(line));
+    if (options.terse || !options.chosen.empty()) return terseLines(options, lineJson(line)).front();
+    return printable(line.text, Tabs::Kept);
+}
+
+void print(const std::vector<LogFiles::Line>& lines, std::size_t from, const OutputOptions& options) {
+    for (std::size_t i = from; i < lines.size(); ++i)
+        std::cout << shown(lines[i], options) << '\n';
     std::cout << std::flush;
 }
 
@@ -48,7 +54,7 @@ void follow(LogFiles& files, const LogOptions& options) {
     Signals signals;
     EventLoop loop(signals);
     while (std::cout && loop.wait(Deadline::in(kBetweenLooks)))
-        print(files.takeLines(), 0, options.json);
+        print(files.takeLines(), 0, options.output);
 }
 
 void explainSilence(const std::string& reason, bool hasFile, bool goesOn) {
@@ -69,7 +75,7 @@ int runLog(const LogOptions& options, bool isLimited) {
         lines.insert(lines.end(), rest.begin(), rest.end());
     }
     const bool isCut = isLimited && lines.size() > options.lines;
-    print(lines, isCut ? lines.size() - options.lines : 0, options.json);
+    print(lines, isCut ? lines.size() - options.lines : 0, options.output);
     if (options.follow) follow(files, options);
     return kExitOk;
 }
@@ -85,7 +91,7 @@ void addLogCommand(CLI::App& app, int& exitCode) {
         command->add_option("-n,--lines", options->lines, "The last lines alone; default: all");
     lines->type_name("LINES")->check(CLI::NonNegativeNumber);
     command->add_flag("-f,--follow", options->follow, "Go on with what is written, until Ctrl-C");
-    command->add_flag("--json", options->json, "Print JSON, an object a line");
+    options->output.addTo(*command, {{{"file", "File"}, {"line", "Line"}}}, "Print JSON, an object a line");
     command->callback([options, lines, &exitCode] { exitCode = runLog(*options, lines->count() > 0); });
 }
 

@@ -85,7 +85,7 @@ int runStatus(const HotspotOptions& options) {
     Signals signals;
     HotspotPort port(options.port.find(), signals, options.limit());
     const Status status = askStatus(port, options);
-    print(options.json, statusJson(status), statusLines(status));
+    print(options, statusJson(status), statusLines(status));
     return kExitOk;
 }
 
@@ -95,7 +95,14 @@ void addStatusCommand(CLI::App& app, int& exitCode) {
     auto options = std::make_shared<HotspotOptions>();
     CLI::App* command =
         app.add_subcommand("status", "Tell of the adapter, its radio, the hotspot switch and the connection");
-    options->addTo(*command);
+    options->addTo(*command, {{{"adapter", "Adapter"},
+                               {"radio", "Radio"},
+                               {"hotspot", "Hotspot"},
+                               {"networks", "Networks"},
+                               {"connection", "Connection"},
+                               {"credential", "Credential"},
+                               {"possibleCredentials", "Possible credentials"},
+                               {"internet", "Internet"}}});
     command->callback([options, &exitCode] { exitCode = runStatus(*options); });
 }
 

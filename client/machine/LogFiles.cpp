@@ -6,7 +6,6 @@
 #include <tuple>
 #include <utility>
 
-#include "client/port/JsonLine.h"
 #include "client/terminal/Text.h"
 
 namespace vexa::client {
@@ -90,11 +89,11 @@ std::vector<fs::path> LogFiles::filesByTime() const {
     return paths;
 }
 
-std::string jsonOf(const LogFiles::Line& line) {
+Json::Value lineJson(const LogFiles::Line& line) {
     Json::Value object(Json::objectValue);
     object["file"] = line.file;
     object["line"] = asUtf8(line.text);
-    return jsonLine(object);
+    return object;
 }
 
 }  // namespace vexa::client

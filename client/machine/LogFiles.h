@@ -1,5 +1,7 @@
 #pragma once
 
+#include <json/value.h>
+
 #include <cstdint>
 #include <filesystem>
 #include <map>
@@ -40,7 +42,7 @@ private:
     std::map<std::string, Place> m_places;
 };
 
-/// The line as a JSON object on one line.
-std::string jsonOf(const LogFiles::Line& line);
+/// The line as a JSON object.
+Json::Value lineJson(const LogFiles::Line& line);
 
 }  // namespace vexa::client

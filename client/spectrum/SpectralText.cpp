@@ -72,7 +72,7 @@ std::vector<std::string> spectrumTable(const SpectralView& view) {
     return lines;
 }
 
-std::string spectrumJson(const SpectralView& view) {
+Json::Value spectrumJson(const SpectralView& view) {
     Json::Value channels(Json::arrayValue);
     for (const auto& channel : view.channels()) {
         Json::Value entry(Json::objectValue);
@@ -84,7 +84,7 @@ std::string spectrumJson(const SpectralView& view) {
     }
     Json::Value object(Json::objectValue);
     object["channels"] = channels;
-    return jsonLine(object);
+    return object;
 }
 
 std::string summaryText(const SpectralView& view) {

@@ -2,6 +2,7 @@
 #include <memory>
 
 #include "client/command/Commands.h"
+#include "client/command/credential/CredentialOutput.h"
 #include "client/command/credential/CredentialSession.h"
 #include "client/terminal/ClientError.h"
 
@@ -46,7 +47,7 @@ void addCredentialDelete(CLI::App& parent, int& exitCode) {
     auto options = std::make_shared<PlaceOptions>();
     CLI::App* command = parent.add_subcommand("delete", "Delete a credential");
     command->add_option("WHICH", options->which, "Its id, or its name")->required();
-    options->hotspot.addTo(*command);
+    options->hotspot.addTo(*command, credentialChangeFields());
     command->callback([options, &exitCode] { exitCode = runDelete(*options); });
 }
 
@@ -57,7 +58,7 @@ void addCredentialMove(CLI::App& parent, int& exitCode) {
     command->add_option("POSITION", options->position, "Its place in the order of priority; 1 is the first")
         ->required()
         ->check(CLI::Range(1, 9999));
-    options->hotspot.addTo(*command);
+    options->hotspot.addTo(*command, credentialChangeFields());
     command->callback([options, &exitCode] { exitCode = runMove(*options); });
 }
 

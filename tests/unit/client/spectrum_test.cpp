@@ -110,7 +110,7 @@ TEST(SpectralText, AValueThatDidNotChangeIs0AndASilentChannelHasNone) {
     EXPECT_EQ(spectrumTable(view), (std::vector<std::string>{"Channel  Order  Congestion  Interference",
                                                              "      1      2           -             -",
                                                              "     36      1           0            42"}));
-    EXPECT_EQ(spectrumJson(view),
+    EXPECT_EQ(jsonLine(spectrumJson(view)),
               R"({"channels":[{"channel":1,"congestion":null,"interference":null,"order":2},)"
               R"({"channel":36,"congestion":0,"interference":42,"order":1}]})");
 }
