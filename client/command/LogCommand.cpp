@@ -4,6 +4,7 @@
 #include <pugixml.hpp>
 
 #include "client/command/Commands.h"
+#include "client/log/LogFilter.h"
 #include "client/machine/LogFiles.h"
 #include "client/machine/MachineFolder.h"
 #include "client/machine/ServiceHost.h"
@@ -23,6 +24,7 @@ struct LogOptions {
     std::size_t lines = 0;
     bool follow = false;
     OutputOptions output;
+    LogWish wish;
 };
 
 /// Why there may be nothing to read, in one line; empty if the log is on.
@@ -50,11 +52,11 @@ void print(const std::vector<LogFiles::Line>& lines, std::size_t from, const Out
     std::cout << std::flush;
 }
 
-void follow(LogFiles& files, const LogOptions& options) {
+void follow(LogFiles& files, LogFilter& filter, const LogOptions& options) {
     Signals signals;
     EventLoop loop(signals);
     while (std::cout && loop.wait(Deadline::in(kBetweenLooks)))
-        print(files.takeLines(), 0, options.output);
+        print(filter.take(files.takeLines()), 0, options.output);
 }
 
 void explainSilence(const std::string& reason, bool hasFile, bool goesOn) {
@@ -65,18 +67,23 @@ void explainSilence(const std::string& reason, bool hasFile, bool goesOn) {
     std::cerr << "vexa: " << line << '\n';
 }
 
+void append(LogFilter::Lines& lines, const LogFilter::Lines& more) {
+    lines.insert(lines.end(), more.begin(), more.end());
+}
+
 int runLog(const LogOptions& options, bool isLimited) {
     const MachineFolder machine(options.machine);
     LogFiles files(machine.dumpFolder());
     explainSilence(whyOff(machine), files.any(), options.follow);
-    auto lines = files.takeLines();
+    LogFilter filter(options.wish, std::time(nullptr));
+    auto lines = filter.take(files.takeLines());
     if (!options.follow) {
-        const auto rest = files.takeRest();
-        lines.insert(lines.end(), rest.begin(), rest.end());
+        append(lines, filter.take(files.takeRest()));
+        append(lines, filter.takeRest());
     }
     const bool isCut = isLimited && lines.size() > options.lines;
     print(lines, isCut ? lines.size() - options.lines : 0, options.output);
-    if (options.follow) follow(files, options);
+    if (options.follow) follow(files, filter, options);
     return kExitOk;
 }
 
@@ -91,6 +98,7 @@ void addLogCommand(CLI::App& app, int& exitCode) {
         command->add_option("-n,--lines", options->lines, "The last lines alone; default: all");
     lines->type_name("LINES")->check(CLI::NonNegativeNumber);
     command->add_flag("-f,--follow", options->follow, "Go on with what is written, until Ctrl-C");
+    options->wish.addTo(*command);
     options->output.addTo(*command, {{{"file", "File"}, {"line", "Line"}}}, "Print JSON, an object a line");
     command->callback([options, lines, &exitCode] { exitCode = runLog(*options, lines->count() > 0); });
 }
