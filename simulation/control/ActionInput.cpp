@@ -27,9 +27,9 @@ std::size_t existingAdapterOf(Machine& machine, const Json::Value& action) {
 
 Network existingNetworkOf(Machine& machine, const Json::Value& action) {
     const JsonPlace bssid = memberOf(action, "bssid");
-    auto network = machine.airspace().find(bssid.macAddress());
+    const auto network = machine.airspace().find(bssid.macAddress());
     if (!network) bssid.fail("no such network");
-    return *std::move(network);
+    return *network;
 }
 
 GUID usualGuid(Machine& machine) {

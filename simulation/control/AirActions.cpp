@@ -57,7 +57,7 @@ Ticket runCompleteAnqpQuery(Machine& machine, const Json::Value& /*action*/, Ask
 
 Ticket runUserDisconnect(Machine& machine, const Json::Value& action, Asker /*asker*/) {
     const Bytes ssid = bytesOfText(action, "ssid");
-    auto network = machine.airspace().findVisible(ssid);
+    const auto network = machine.airspace().findVisible(ssid);
     Bytes record = network ? bssRecord(*network) : bssRecordOfSsid(ssid);
     setIsHs20(record, unsignedOf(action, "isHs20", kYes));
     return postHotspotMessage(machine, hotspotMessage(HotspotEvent::UserDisconnected, record));

@@ -86,11 +86,11 @@ void setIsHs20(std::span<std::uint8_t> record, std::uint32_t value) {
     storeU32(record, kIsHs20At, value);
 }
 
-Bytes bssRecords(const std::vector<Network>& networks) {
+Bytes bssRecords(const std::vector<std::shared_ptr<const Network>>& networks) {
     Bytes records;
     records.reserve(networks.size() * kBssRecordSize);
-    for (const Network& network : networks) {
-        const Bytes record = bssRecord(network);
+    for (const auto& network : networks) {
+        const Bytes record = bssRecord(*network);
         records.insert(records.end(), record.begin(), record.end());
     }
     return records;

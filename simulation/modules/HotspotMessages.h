@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <memory>
 #include <span>
 #include <vector>
 
@@ -34,7 +35,7 @@ Bytes bssRecord(const Network& network);
 Bytes bssRecordOfSsid(std::span<const std::uint8_t> ssid);
 void setIsHs20(std::span<std::uint8_t> record, std::uint32_t value);
 
-Bytes bssRecords(const std::vector<Network>& networks);
+Bytes bssRecords(const std::vector<std::shared_ptr<const Network>>& networks);
 
 /// What a network answers to an ANQP query, as the module hands it on.
 Bytes anqpInfo(const Network& network);

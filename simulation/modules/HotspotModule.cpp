@@ -53,9 +53,9 @@ void HotspotModule::abandonQueries() {
     m_running.clear();
 }
 
-std::vector<Network> HotspotModule::reportedNetworks() const {
-    std::vector<Network> networks = m_airspace.visible();
-    std::erase_if(networks, [](const Network& network) { return !network.reported; });
+std::vector<Airspace::Found> HotspotModule::reportedNetworks() const {
+    auto networks = m_airspace.visible();
+    std::erase_if(networks, [](const Airspace::Found& network) { return !network->reported; });
     return networks;
 }
 

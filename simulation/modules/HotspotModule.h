@@ -45,7 +45,7 @@ public:
 private:
     using Query = std::pair<platform::Duration, std::uint64_t>;  // when it is due, and its number
 
-    std::vector<Network> reportedNetworks() const;
+    std::vector<Airspace::Found> reportedNetworks() const;
     void startQuery(const GUID& guid);
     void finishQuery(const Query& query, const GUID& guid);
     Ticket tellCompletion(const GUID& guid);

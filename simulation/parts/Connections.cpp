@@ -141,7 +141,7 @@ void Connections::finish(std::uint64_t attempt) {
     const LockGuard<Mutex> lock(m_mutex);
     if (attempt != m_attempts || m_link.state != wlan_interface_state_associating) return;
     const auto network = m_airspace.findVisible(m_wish.ssid);
-    const DWORD reason = judge(network);
+    const DWORD reason = judge(network.get());
     if (reason == kSucceeded) {
         m_link.bssid = network ? network->bssid : Link{}.bssid;
         m_link.channel = network ? network->channel : 0;
@@ -149,7 +149,7 @@ void Connections::finish(std::uint64_t attempt) {
     take(reason == kSucceeded ? m_course->accept : m_course->refuse, reason);
 }
 
-DWORD Connections::judge(const std::optional<Network>& network) const {
+DWORD Connections::judge(const Network* network) const {
     if (m_wish.succeeds) return *m_wish.succeeds ? kSucceeded : kNotAvailable;
     if (!network) return kNotAvailable;
     const bool isWelcome = m_wish.profile ? letsIn(*network, *m_wish.profile) : network->osProfile;

@@ -73,7 +73,7 @@ private:
     DWORD check(std::size_t adapter) const REQUIRES(m_mutex);
     Ticket begin(std::size_t adapter, ConnectionWish wish, const ConnectionCourse& course) REQUIRES(m_mutex);
     void finish(std::uint64_t attempt);
-    DWORD judge(const std::optional<Network>& network) const REQUIRES(m_mutex);
+    DWORD judge(const Network* network) const REQUIRES(m_mutex);
     Ticket end(ConnectionSteps ofConnection, DWORD reason, ConnectionSteps ofAttempt) REQUIRES(m_mutex);
     Ticket lose(std::size_t adapter) REQUIRES(m_mutex);
     Ticket take(ConnectionSteps steps, DWORD reason) REQUIRES(m_mutex);

@@ -14,7 +14,6 @@
 #include "platform/Files.h"
 #include "platform/KnownFolders.h"
 #include "platform/Registry.h"
-#include "text/OutOfMemory.h"
 #include "text/ScopeGuard.h"
 #include "text/TextConversion.h"
 
@@ -66,27 +65,35 @@ ResultCode Config::createDefaultFile(const std::wstring& path) {
     return saveSafely(path, contract::kDefaultDocument, platform::Existing::Keep) ? kSuccess : kFailure;
 }
 
-ResultCode Config::openDocument() {
-    if (!platform::canOpenFile(m_configPath)) return kNotFound;
-    m_xmlDoc.create();
-    return m_xmlDoc.load(m_configPath) == kSuccess ? kSuccess : kFailure;
+// Nothing: it can't be opened, or not be read.
+std::optional<std::string> Config::readFile(ResultCode& result) const {
+    result = platform::canOpenFile(m_configPath) ? kSuccess : kNotFound;
+    if (result != kSuccess) return std::nullopt;
+    auto content = platform::readFile(m_configPath);
+    if (!content) result = kFailure;
+    return content;
 }
 
-bool Config::saveDocument() {
-    if (m_xmlDoc.save(m_configPath) != kSuccess) return false;
-    remember();
-    return true;
+ResultCode Config::openDocument(const std::string& content) {
+    m_xmlDoc.create();
+    return m_xmlDoc.parse(content) == kSuccess ? kSuccess : kFailure;
 }
 
 ResultCode Config::readConfig(bool* configChanged) {
     if (configChanged != nullptr) *configChanged = false;
     const ScopeGuard release([this]() NO_THREAD_SAFETY_ANALYSIS { m_xmlDoc.release(); });
-    if (const ResultCode result = openDocument(); result != kSuccess) return result;
+    m_content.clear();
+    m_frame.reset();
+    ResultCode result = kFailure;
+    auto content = readFile(result);
+    if (!content) return result;
+    if (openDocument(*content) != kSuccess) return kFailure;
     readGlobalSettings();
     bool isChanged = false;
     Reading reading{.table = m_credentials, .trace = Trace::Yes};
     if (readTable(reading, isChanged) != kSuccess) return kFailure;
     remember();
+    m_content = std::move(*content);
     m_bUnsaved = false;
     if (configChanged != nullptr) *configChanged = isChanged;
     return kSuccess;
@@ -164,40 +171,6 @@ void Config::readAutoConnectFromRegistry() {
     const auto key = platform::RegistryKey::open(platform::RegistryRoot::CurrentUser, contract::kProductKey);
     const auto text = key ? key->wideValue(contract::kHotspotSwitchValue, kMaxRegistryBytes) : std::nullopt;
     m_bHotSpotAutoConnect = !text || compareNoCase(*text, L"false") != 0;
-}
-
-// However little is lost, as with a full disk, one line tells of it.
-ResultCode Config::saveConfig(const FileLock& held) {
-    const ScopeGuard release([this]() NO_THREAD_SAFETY_ANALYSIS { m_xmlDoc.release(); });
-    ResultCode result = kFailure;
-    bool isSaved = false;
-    const bool isWithinMemory = withinMemory([&]() NO_THREAD_SAFETY_ANALYSIS {
-        bool isWritten = false;
-        if (held) result = openDocument();
-        for (const auto section :
-             {&Config::writeNextCredId, &Config::writeCredentials, &Config::writeUsers}) {
-            if (result == kSuccess) result = (this->*section)();
-            isWritten = isWritten || result == kSuccess;
-        }
-        isSaved = isWritten && saveDocument();
-    });
-    if (!isWithinMemory) result = kFailure;
-    m_bUnsaved = result != kSuccess || !isSaved;
-    if (m_bUnsaved) Log(6, "ERROR: Saving the configuration file failed.");
-    return result == kSuccess ? kSuccess : kFailure;
-}
-
-// A file that has lost the element gets it back: otherwise nothing could be saved any more.
-ResultCode Config::writeNextCredId() {
-    const std::wstring number = std::to_wstring(m_nextCredId);
-    Node node;
-    m_xmlDoc.selectSingleNode("/*/global/nextcredid", Node(), node);
-    if (node) return XmlDocument::setText(node, number);
-    Log(6, "ERROR: No nextcredid node in the config xml file.");
-    Node global;
-    m_xmlDoc.selectSingleNode("/*/global", Node(), global);
-    if (!global && m_xmlDoc.setChild("global", L"", Node(), true, &global) != kSuccess) return kFailure;
-    return m_xmlDoc.setChild("nextcredid", number, global, true);
 }
 
 }  // namespace vexa

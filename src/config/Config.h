@@ -87,11 +87,31 @@ private:
     struct Known {
         Credential inFile;
         Credential inMemory;
+        std::size_t at = 0;  // its text in a file that this process saved: where, and how long
+        std::size_t length = 0;
+    };
+
+    /// The file without what a save writes, up to the first that it has no place for.
+    struct Frame {
+        std::vector<XmlDocument::Piece> pieces;
+        bool hasCredentials = false;
+        bool isEnough = false;                        // for all that there is to write
+        std::vector<std::int32_t> invalidIds;         // of what stays among the credentials
+        std::unordered_set<std::int32_t> foreignIds;  // of other users' private credentials
+
+        bool isWhole() const { return hasCredentials && isEnough; }
+    };
+
+    /// A credential in the text of a save.
+    struct Written {
+        const Credential* credential;
+        std::size_t at;
+        std::size_t length;
     };
 
     ResultCode createDefaultFile(const std::wstring& path) REQUIRES(g_hs20Lock);
-    ResultCode openDocument() REQUIRES(g_hs20Lock);
-    bool saveDocument() REQUIRES(g_hs20Lock);
+    ResultCode openDocument(const std::string& content) REQUIRES(g_hs20Lock);
+    std::optional<std::string> readFile(ResultCode& result) const REQUIRES(g_hs20Lock);
 
     void readGlobalSettings() REQUIRES(g_hs20Lock);
     bool readFlag(const char* xpath, bool missing) REQUIRES(g_hs20Lock);
@@ -105,7 +125,7 @@ private:
     ResultCode readCredentials(Reading& reading, bool& isChanged) REQUIRES(g_hs20Lock);
     void readCredential(Node node, Reading& reading) REQUIRES(g_hs20Lock);
     static std::int32_t followingId(std::int32_t id);
-    bool isForeign(std::int32_t access, const std::wstring& creator) const REQUIRES(g_hs20Lock);
+    bool isForeign(Node node) REQUIRES(g_hs20Lock);
     bool repairIds(const Reading& reading) REQUIRES(g_hs20Lock);
     ResultCode readUsers(Reading& reading, bool& isChanged) REQUIRES(g_hs20Lock);
     Node findCurrentUser(const std::vector<Node>& users, Trace trace) REQUIRES(g_hs20Lock);
@@ -121,12 +141,22 @@ private:
     Credential takeOverNew(const Credential& theirs, Credential* mine) REQUIRES(g_hs20Lock);
     void takeOverPlaces(const CredentialTable& stored) REQUIRES(g_hs20Lock);
 
-    ResultCode writeNextCredId() REQUIRES(g_hs20Lock);
-    ResultCode writeCredentials() REQUIRES(g_hs20Lock);
-    bool mustRemove(Node node) REQUIRES(g_hs20Lock);
-    ResultCode writeCredential(const Credential& credential, Node section) REQUIRES(g_hs20Lock);
-    ResultCode writeUsers() REQUIRES(g_hs20Lock);
-    ResultCode writeReferences(Node list) REQUIRES(g_hs20Lock);
+    ResultCode saveInto(const std::string& content, bool& isSaved) REQUIRES(g_hs20Lock);
+    bool areCredentialsWritable() const REQUIRES(g_hs20Lock);
+    bool isUserWritable() const REQUIRES(g_hs20Lock);
+    std::optional<Frame> frameOf(const std::string& content) REQUIRES(g_hs20Lock);
+    bool cutOutNextCredId() REQUIRES(g_hs20Lock);
+    bool cutOutCredentials(Frame& frame) REQUIRES(g_hs20Lock);
+    bool cutOutUser() REQUIRES(g_hs20Lock);
+    bool mustRemove(Node node, Frame& frame) REQUIRES(g_hs20Lock);
+    std::string fill(const Frame& frame, bool isKnownFile, std::vector<Written>& written)
+        REQUIRES(g_hs20Lock);
+    void appendCredentials(std::string& text, bool isKnownFile, std::vector<Written>& written)
+        REQUIRES(g_hs20Lock);
+    void rememberSaved(const std::string& text, const Frame& frame, bool isKnownFile,
+                       const std::vector<Written>& written) REQUIRES(g_hs20Lock);
+    void rememberWritten(const Written& written, const std::string& text) REQUIRES(g_hs20Lock);
+    std::optional<Credential> asRead(const std::string& text) REQUIRES(g_hs20Lock);
 
     std::wstring m_userName GUARDED_BY(g_hs20Lock);
     CredentialTable m_credentials GUARDED_BY(g_hs20Lock);
@@ -139,7 +169,9 @@ private:
     std::atomic<bool> m_bAutoConnect{true};
     std::wstring m_homeRealm GUARDED_BY(g_hs20Lock);
     std::wstring m_baseDir GUARDED_BY(g_hs20Lock);
-    bool m_bUnsaved GUARDED_BY(g_hs20Lock) = false;  // the last save did not bring all into the file
+    bool m_bUnsaved GUARDED_BY(g_hs20Lock) = false;       // the last save did not bring all into the file
+    std::string m_content GUARDED_BY(g_hs20Lock);         // the file when it was last read or saved
+    std::optional<Frame> m_frame GUARDED_BY(g_hs20Lock);  // of this content, if it was saved
     std::unordered_map<std::int32_t, Known> m_known GUARDED_BY(g_hs20Lock);
     bool m_hadUser GUARDED_BY(g_hs20Lock) =
         false;  // the file had the user's list when it was last read or saved

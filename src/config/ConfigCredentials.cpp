@@ -19,34 +19,10 @@ std::int32_t typeFromText(const std::wstring& text) {
     return 0;
 }
 
-const wchar_t* textOfType(std::int32_t type) {
-    switch (type) {
-        case CRED_TYPE_EAP_TTLS:
-            return L"eapttls";
-        case CRED_TYPE_EAP_SIM:
-            return L"eapsim";
-        case CRED_TYPE_EAP_TLS:
-            return L"eaptls";
-        default:
-            return L"invalid";
-    }
-}
-
 std::int32_t accessFromText(const std::wstring& text) {
     if (text == L"alluser") return CRED_ACCESS_ALL_USER;
     if (text == L"peruser") return CRED_ACCESS_PER_USER;
     return 0;
-}
-
-const wchar_t* textOfAccess(std::int32_t accessType) {
-    switch (accessType) {
-        case CRED_ACCESS_ALL_USER:
-            return L"alluser";
-        case CRED_ACCESS_PER_USER:
-            return L"peruser";
-        default:
-            return L"invalid";
-    }
 }
 
 }  // namespace
@@ -71,8 +47,9 @@ ResultCode Config::readCredentials(Reading& reading, bool& isChanged) {
 }
 
 // Seen by its creator alone, who is somebody else.
-bool Config::isForeign(std::int32_t access, const std::wstring& creator) const {
-    return access == CRED_ACCESS_PER_USER && creator != m_userName;
+bool Config::isForeign(Node node) {
+    return accessFromText(textOf(node, "accesstype", kInvalid)) == CRED_ACCESS_PER_USER &&
+           textOf(node, "creator", kInvalid) != m_userName;
 }
 
 void Config::readCredential(Node node, Reading& reading) {
@@ -85,8 +62,9 @@ void Config::readCredential(Node node, Reading& reading) {
     const std::int32_t type = typeFromText(textOf(node, "type", kInvalid));
     const std::int32_t access = accessFromText(textOf(node, "accesstype", kInvalid));
     const std::wstring creator = textOf(node, "creator", kInvalid);
-    if (isForeign(access, creator)) reading.foreignIds.insert(id);
-    if (type == 0 || access == 0 || isForeign(access, creator)) return;
+    const bool isOthers = isForeign(node);
+    if (isOthers) reading.foreignIds.insert(id);
+    if (type == 0 || access == 0 || isOthers) return;
 
     auto credential = std::make_unique<Credential>(id, creator, type, access);
     credential->m_bAutoConnect = textOf(node, "autoconnect", L"true") == L"true";
@@ -127,61 +105,6 @@ bool Config::repairIds(const Reading& reading) {
     }
     m_nextCredId = std::max(m_nextCredId, next);
     return isChanged;
-}
-
-// What was there is taken out last, so that a failure changes nothing.
-ResultCode Config::writeCredentials() {
-    Node section;
-    std::vector<Node> nodes;
-    if (m_xmlDoc.selectSingleNode("/*/credentials", Node(), section) != kSuccess ||
-        m_xmlDoc.selectNodes("/*/credentials/*", Node(), nodes) != kSuccess)
-        return kFailure;
-    std::erase_if(nodes, [this](Node node) NO_THREAD_SAFETY_ANALYSIS { return !mustRemove(node); });
-    const Node last = section.last_child();
-    ResultCode result = kSuccess;
-    for (const Credential* credential : m_credentials.copyCredentialPointers())
-        if (result == kSuccess) result = section ? writeCredential(*credential, section) : kFailure;
-    while (result != kSuccess && section.last_child() != last)
-        XmlDocument::remove(section.last_child());
-    if (result != kSuccess) return result;
-    for (const Node node : nodes)
-        XmlDocument::remove(node);
-    Log(2, "Saving credentials to xml file...");
-    return kSuccess;
-}
-
-// Only what this process never loaded stays: other users' private credentials, and what has no valid id.
-// Whatever the ids of those are, they are no reason to take them for the user's own.
-bool Config::mustRemove(Node node) {
-    const std::int32_t id = numberOf(node, "id");
-    if (id <= 0) Log(2, "Invalid credential id=%d", id);
-    const std::int32_t access = accessFromText(textOf(node, "accesstype", kInvalid));
-    return id > 0 && !isForeign(access, textOf(node, "creator", kInvalid));
-}
-
-ResultCode Config::writeCredential(const Credential& credential, Node section) {
-    Node node;
-    if (m_xmlDoc.setChild("credential", L"", section, true, &node) != kSuccess) return kFailure;
-    ResultCode result = kSuccess;
-    const auto write = [&](const char* tag, const std::wstring& text) NO_THREAD_SAFETY_ANALYSIS {
-        if (m_xmlDoc.setChild(tag, text, node, true) != kSuccess) result = kFailure;
-    };
-    write("id", std::to_wstring(credential.m_id));
-    write("type", textOfType(credential.m_type));
-    write("accesstype", textOfAccess(credential.m_accessType));
-    write("creator", m_userName);
-    write("eap", std::to_wstring(credential.m_eapMethod));
-    write("autoconnect", credential.m_bAutoConnect ? L"true" : L"false");
-    const bool isTtls = credential.m_type == CRED_TYPE_EAP_TTLS;
-    if (!isTtls && credential.m_type != CRED_TYPE_EAP_TLS) {
-        Log(2, "Invalid credential type.");
-        return result;
-    }
-    write("credname", credential.m_credName);
-    write("realm", credential.m_realm);
-    write(isTtls ? "username" : "cacert", isTtls ? credential.m_username : credential.m_caCert);
-    write(isTtls ? "password" : "clientcert", isTtls ? credential.m_password : credential.m_clientCert);
-    return result;
 }
 
 }  // namespace vexa

@@ -13,16 +13,10 @@ namespace {
 
 constexpr std::chrono::milliseconds kLockPatience{2000};
 
-// But for the place, which is not of the credential but of the user's list.
-bool holdTheSame(Credential a, const Credential& b) {
-    a.m_priority = b.m_priority;
-    return a == b;
-}
-
 // Each save signs what all see.
 bool isTheSame(Credential a, const Credential& b) {
     a.m_creator = b.m_creator;
-    return holdTheSame(std::move(a), b);
+    return holdTheSame(a, b);
 }
 
 Credential* find(const std::unordered_map<std::int32_t, Credential*>& byId, std::int32_t id) {
@@ -40,10 +34,17 @@ Config::FileLock Config::lockFile() const {
 Config::FileLock Config::beginChange() {
     FileLock held = lockFile();
     const ScopeGuard release([this]() NO_THREAD_SAFETY_ANALYSIS { m_xmlDoc.release(); });
+    m_renamed.clear();
+    ResultCode result = kFailure;
+    auto content = readFile(result);
+    const bool isAsKnown = content == m_content && !m_bUnsaved;
+    if (!content || isAsKnown || openDocument(*content) != kSuccess) return held;
     CredentialTable table;
     Reading stored{.table = table, .trace = Trace::No};
-    m_renamed.clear();
-    if (openDocument() == kSuccess && readSilently(stored)) takeOver(stored);
+    if (!readSilently(stored)) return held;
+    takeOver(stored);
+    m_content = std::move(*content);
+    m_frame.reset();
     return held;
 }
 

@@ -68,37 +68,4 @@ bool Config::applyReferences(const std::vector<Node>& references, const Reading&
            });
 }
 
-// What was there is taken out last, so that a failure changes nothing.
-ResultCode Config::writeUsers() {
-    Node section;
-    std::vector<Node> users;
-    if (m_userName.empty() || m_xmlDoc.selectSingleNode("/*/users", Node(), section) != kSuccess ||
-        !section || m_xmlDoc.selectNodes("/*/users/*", Node(), users) != kSuccess)
-        return kFailure;
-    Node user;
-    Node list;
-    if (m_xmlDoc.setChild("user", L"", section, true, &user) != kSuccess ||
-        m_xmlDoc.setChild("username", m_userName, user, true) != kSuccess ||
-        m_xmlDoc.setChild("credentials", L"", user, true, &list) != kSuccess ||
-        writeReferences(list) != kSuccess) {
-        XmlDocument::remove(user);
-        return kFailure;
-    }
-    for (const Node old : users)
-        if (textOf(old, "username", kInvalid) == m_userName) XmlDocument::remove(old);
-    return kSuccess;
-}
-
-ResultCode Config::writeReferences(Node list) {
-    for (const Credential* credential : m_credentials.copyCredentialPointers()) {
-        Node reference;
-        if (m_xmlDoc.setChild("credential", L"", list, true, &reference) != kSuccess ||
-            m_xmlDoc.setChild("id", std::to_wstring(credential->m_id), reference, true) != kSuccess ||
-            m_xmlDoc.setChild("priority", std::to_wstring(credential->m_priority), reference, true) !=
-                kSuccess)
-            return kFailure;
-    }
-    return kSuccess;
-}
-
 }  // namespace vexa

@@ -24,7 +24,6 @@ inline constexpr std::int32_t CRED_PRIORITY_LOWEST = 9999;  // not yet placed
 /// One stored credential, as the current user sees it.
 struct Credential {
     Credential(std::int32_t id, std::wstring creator, std::int32_t type, std::int32_t accessType);
-    bool operator==(const Credential&) const = default;
 
     std::int32_t m_id;
     std::int32_t m_priority = CRED_PRIORITY_LOWEST;  // 1 is first; 0: none, left alone by all shifting
@@ -42,6 +41,9 @@ struct Credential {
     std::wstring m_clientCert;
     std::wstring m_homeSpFqdn;  // nothing fills it yet
 };
+
+/// Whether they are equal but for the place, which is not of the credential but of the user's list.
+bool holdTheSame(const Credential& a, const Credential& b);
 
 /// What the client wants to be stored. Text is empty where he gave none.
 struct CredentialInput {

@@ -18,6 +18,23 @@ constexpr unsigned kFormat = pugi::format_raw | pugi::format_write_bom | pugi::f
 constexpr std::size_t kUsualGrowth = 4096;
 constexpr std::string_view kUtf8Mark = "\xEF\xBB\xBF";
 
+// A comment that holds nothing but a control character of those that no document that was read can hold.
+constexpr std::string_view kHoleBeginning = "<!--";
+constexpr std::string_view kHoleEnd = "-->";
+constexpr std::size_t kHoleLength = kHoleBeginning.size() + 1 + kHoleEnd.size();
+
+bool isHole(std::string_view text) {
+    return text.size() >= kHoleLength && static_cast<unsigned char>(text[kHoleBeginning.size()]) < '\t' &&
+           text.substr(kHoleBeginning.size() + 1).starts_with(kHoleEnd);
+}
+
+std::size_t findHole(std::string_view text) {
+    std::size_t at = text.find(kHoleBeginning);
+    while (at != text.npos && !isHole(text.substr(at)))
+        at = text.find(kHoleBeginning, at + 1);
+    return at;
+}
+
 bool arePaired(std::u16string_view units) {
     for (std::size_t i = 0; i < units.size(); ++i) {
         const bool isHigh = (units[i] & 0xFC00) == 0xD800;
@@ -108,8 +125,12 @@ void XmlDocument::create() {
 ResultCode XmlDocument::load(const std::wstring& path) {
     if (!m_document) return kNoDocument;
     const auto content = platform::readFile(path);
-    if (!content) return kFailure;
-    auto [utf8, encoding] = decode(*content);
+    return content ? parse(*content) : kFailure;
+}
+
+ResultCode XmlDocument::parse(const std::string& content) {
+    if (!m_document) return kNoDocument;
+    auto [utf8, encoding] = decode(content);
     m_text = withPlainLineEnds(std::move(utf8));
     if (!isWellFormedXml(m_text, encoding)) return kFailure;
     const auto result =
@@ -119,14 +140,36 @@ ResultCode XmlDocument::load(const std::wstring& path) {
 
 ResultCode XmlDocument::save(const std::wstring& path) const {
     if (!m_document) return kNoDocument;
-    const Node first = m_document->first_child();
+    const auto content = text();
+    return content && saveSafely(path, *content) ? kSuccess : kFailure;
+}
+
+std::optional<std::string> XmlDocument::text() const {
+    const Node first = root().first_child();
     if (first.type() == pugi::node_declaration && first.attribute("encoding") &&
         !first.attribute("encoding").set_value("UTF-8"))
-        return kFailure;
+        return std::nullopt;
     StringWriter writer;
     writer.text.reserve(m_text.size() + kUsualGrowth);
     m_document->save(writer, "", kFormat, pugi::encoding_utf8);
-    return saveSafely(path, writer.text) ? kSuccess : kFailure;
+    return std::move(writer.text);
+}
+
+bool XmlDocument::addHole(Node parent, char mark) {
+    return parent.append_child(pugi::node_comment).set_value(std::string(1, mark).c_str());
+}
+
+std::vector<XmlDocument::Piece> XmlDocument::textAroundHoles() const {
+    std::vector<Piece> pieces;
+    const auto whole = text();
+    if (!whole) return pieces;
+    std::string_view rest = *whole;
+    for (std::size_t at = findHole(rest); at != rest.npos; at = findHole(rest)) {
+        pieces.push_back({std::string(rest.substr(0, at)), rest[at + kHoleBeginning.size()]});
+        rest.remove_prefix(at + kHoleLength);
+    }
+    pieces.push_back({std::string(rest), 0});
+    return pieces;
 }
 
 XmlDocument::Node XmlDocument::root() const {

@@ -21,9 +21,22 @@ public:
     /// kFailure: the file can't be read, or is no well-formed XML 1.0 in an encoding that we know: UTF-8,
     /// UTF-16 with its mark, ISO-8859-1, US-ASCII.
     ResultCode load(const std::wstring& path);
+    /// The same of a file's content.
+    ResultCode parse(const std::string& content);
 
     /// Replaces the file, safely: a failure leaves the old one whole. UTF-8, beginning with EF BB BF.
     ResultCode save(const std::wstring& path) const;
+
+    /// Leaves a hole in the text, as the last that the node holds. `mark`: a control character, by which it
+    /// is told from others. False: memory ran out.
+    static bool addHole(Node parent, char mark);
+
+    struct Piece {
+        std::string text;
+        char hole;  // the mark of the hole behind it; 0: the end
+    };
+    /// What a save would write, around the holes. Empty: memory ran out.
+    std::vector<Piece> textAroundHoles() const;
 
     /// Relative to `parent`, or to the document if that is null.
     ResultCode selectNodes(const char* xpath, Node parent, std::vector<Node>& list) const;
@@ -49,6 +62,7 @@ public:
 
 private:
     Node root() const;
+    std::optional<std::string> text() const;
 
     std::string m_text;  // what the document's nodes point into
     std::optional<pugi::xml_document> m_document;

@@ -76,9 +76,7 @@ ResultCode Supplicant::fetchBssAnqpInfo(Hs20Network& network) try {
         Log(3, "No ANQP NAI realm info.");
         return kSuccess;
     }
-    const Bytes realms = Bytes(reply).subspan(kRealmLengthSize, realmLength);
-    network.m_anqpNaiRealm.assign(realms.begin(), realms.end());
-    network.parseRealmList();
+    network.takeRealmList(Bytes(reply).subspan(kRealmLengthSize, realmLength));
     return kSuccess;
 } catch (const std::bad_alloc&) {
     return kFailure;

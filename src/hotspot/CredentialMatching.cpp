@@ -1,7 +1,8 @@
 #include "hotspot/CredentialMatching.h"
 
 #include <algorithm>
-#include <unordered_map>
+#include <optional>
+#include <utility>
 
 #include "base/DiagnosticLog.h"
 #include "text/TextConversion.h"
@@ -23,7 +24,9 @@ std::optional<std::string> narrowForMatch(const std::wstring& text) {
 // A realm that can't be told is not empty: an access point of anybody's may announce an empty one, and would
 // be given the password.
 std::optional<std::string> narrowRealm(const std::wstring& realm) {
-    return narrowByLocale(realm).isComplete ? narrowForMatch(realm) : std::nullopt;
+    NarrowText narrow = narrowByLocale(realm);
+    if (!narrow.isComplete || narrow.text.size() > kMaxNarrow) return std::nullopt;
+    return std::move(narrow.text);
 }
 
 std::string_view textOf(Bytes bytes) {
@@ -63,36 +66,44 @@ bool isComplete(const Credential& credential) {
 }  // namespace
 
 CredentialMatcher::CredentialMatcher(const CredentialTable& table) {
-    for (Credential* credential : table.copyCredentialPointers())
-        if (!credential->m_realm.empty())
-            m_candidates.push_back({credential, narrowRealm(credential->m_realm)});
+    for (Credential* credential : table.copyCredentialPointers()) {
+        auto realm = credential->m_realm.empty() ? std::nullopt : narrowRealm(credential->m_realm);
+        if (realm) m_candidates.push_back({credential, std::move(*realm)});
+    }
+    for (std::size_t i = 0; i < m_candidates.size(); ++i)
+        m_byRealm[m_candidates[i].realm].push_back(i);
 }
 
 std::vector<Credential*> CredentialMatcher::findCredentialsForNetwork(const Hs20Network& network) const {
     std::vector<Credential*> found;
-    std::unordered_map<std::string_view, std::vector<const RealmInfo*>> offers;
-    for (const RealmInfo& realm : network.m_realms)
-        offers[realm.m_realm].push_back(&realm);
-    for (const Candidate& candidate : m_candidates) {
-        if (!candidate.realm) continue;
-        const auto offered = offers.find(*candidate.realm);
-        if (offered != offers.end() && fits(candidate, offered->second))
-            found.push_back(candidate.credential);
+    for (const Offer& offer : offersOf(network)) {
+        Credential* const credential = m_candidates[offer.candidate].credential;
+        if (fits(offer) && (found.empty() || found.back() != credential)) found.push_back(credential);
     }
     std::stable_sort(found.begin(), found.end(),
                      [](const Credential* a, const Credential* b) { return a->m_priority < b->m_priority; });
     return found;
 }
 
-bool CredentialMatcher::fits(const Candidate& candidate, const std::vector<const RealmInfo*>& offers) {
-    bool isHit = false;
-    for (const RealmInfo* offer : offers) {
-        if (static_cast<std::uint32_t>(candidate.credential->m_eapMethod) != offer->m_eapType)
-            Log(3, "\t###Realm match, but EAP method doesn't match.###");
-        else if (isComplete(*candidate.credential))
-            isHit = true;
-    }
-    return isHit;
+// Candidate by candidate, and those of one in the order of the network's realms. There are many realms in the
+// air and few that a credential is for.
+std::vector<CredentialMatcher::Offer> CredentialMatcher::offersOf(const Hs20Network& network) const {
+    std::vector<Offer> offers;
+    for (const RealmInfo& realm : network.m_realms)
+        if (const auto candidates = m_byRealm.find(realm.m_realm); candidates != m_byRealm.end())
+            for (const std::size_t candidate : candidates->second)
+                offers.push_back({candidate, &realm});
+    std::stable_sort(offers.begin(), offers.end(),
+                     [](const Offer& a, const Offer& b) { return a.candidate < b.candidate; });
+    return offers;
+}
+
+bool CredentialMatcher::fits(const Offer& offer) const {
+    const Credential& credential = *m_candidates[offer.candidate].credential;
+    if (static_cast<std::uint32_t>(credential.m_eapMethod) == offer.realm->m_eapType)
+        return isComplete(credential);
+    Log(3, "\t###Realm match, but EAP method doesn't match.###");
+    return false;
 }
 
 bool isHomeSpNetwork(const CredentialTable& table, const ByteBuffer& domainNames) {

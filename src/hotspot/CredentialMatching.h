@@ -1,10 +1,9 @@
 #pragma once
 
 #include <cstddef>
-#include <map>
-#include <optional>
 #include <string>
 #include <string_view>
+#include <unordered_map>
 #include <vector>
 
 #include "base/NetworkListLock.h"
@@ -18,6 +17,8 @@ namespace vexa {
 class CredentialMatcher {
 public:
     explicit CredentialMatcher(const CredentialTable& table) REQUIRES(g_hs20Lock);
+    CredentialMatcher(const CredentialMatcher&) = delete;
+    CredentialMatcher& operator=(const CredentialMatcher&) = delete;
 
     /// By ascending priority, table order among equals.
     std::vector<Credential*> findCredentialsForNetwork(const Hs20Network& network) const REQUIRES(g_hs20Lock);
@@ -25,11 +26,18 @@ public:
 private:
     struct Candidate {
         Credential* credential;
-        std::optional<std::string> realm;
+        std::string realm;
     };
-    static bool fits(const Candidate& candidate, const std::vector<const RealmInfo*>& offers);
+    /// A realm of a network, and the place of a candidate for it.
+    struct Offer {
+        std::size_t candidate;
+        const RealmInfo* realm;
+    };
+    std::vector<Offer> offersOf(const Hs20Network& network) const;
+    bool fits(const Offer& offer) const;
 
-    std::vector<Candidate> m_candidates;
+    std::vector<Candidate> m_candidates;  // in the order of the table
+    std::unordered_map<std::string_view, std::vector<std::size_t>> m_byRealm;
 };
 
 /// Whether a list of domain names of a network holds the home service provider of any stored credential.

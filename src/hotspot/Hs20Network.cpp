@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <new>
+#include <utility>
 
 #include "base/DiagnosticLog.h"
 
@@ -36,11 +37,25 @@ void Hs20Network::parseRealmList() try {
     const auto realms = parseNaiRealmList(m_anqpNaiRealm);
     if (!realms) return;
     m_realms = flattenRealms(*realms);
+    m_isParsed = true;
     Log(3, "\tWe have parsed %d realms:", static_cast<int>(m_realms.size()));
     for (const RealmInfo& realm : m_realms)
         Log(3, "\t\t%s %s", realm.m_realm.c_str(), realm.m_eapType == 2 ? "EAP-TTLS" : "EAP-TLS");
 } catch (const std::bad_alloc&) {
     return;
+}
+
+void Hs20Network::takeRealmList(Bytes data) {
+    const bool isKnown = std::equal(data.begin(), data.end(), m_anqpNaiRealm.begin(), m_anqpNaiRealm.end());
+    if (isKnown && m_isParsed && !DiagnosticLog::isEnabled()) return;
+    m_isParsed = false;
+    m_anqpNaiRealm.assign(data.begin(), data.end());
+    parseRealmList();
+}
+
+void Hs20Network::takeRealmsOfAll(std::vector<RealmInfo> realms) {
+    m_isParsed = false;
+    m_realms = std::move(realms);
 }
 
 }  // namespace vexa

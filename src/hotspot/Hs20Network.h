@@ -36,6 +36,11 @@ public:
     /// Turns m_anqpNaiRealm into m_realms. Data that can't be parsed leaves the realms as they were.
     void parseRealmList() REQUIRES(g_hs20Lock);
 
+    /// Stores the data and parses it. What is known already is only parsed to be told to the log.
+    void takeRealmList(Bytes data) REQUIRES(g_hs20Lock);
+    /// Those of all networks that share the SSID.
+    void takeRealmsOfAll(std::vector<RealmInfo> realms) REQUIRES(g_hs20Lock);
+
     bool m_bHs20;
     MacAddress m_macAddress;
     std::uint8_t m_ssidLength;
@@ -49,6 +54,9 @@ public:
     ByteBuffer m_ies;
     ByteBuffer m_anqpRoamingConsortium;
     ByteBuffer m_anqpDomainName;
+
+private:
+    bool m_isParsed = false;  // the realms are those of the data, no more and no less
 };
 
 }  // namespace vexa

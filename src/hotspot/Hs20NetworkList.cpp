@@ -141,7 +141,7 @@ void Hs20NetworkList::processDuplicatedHs20Networks(const std::vector<MacAddress
     std::set<const Hs20Network*> dropped;
     for (const auto& [ssid, group] : groups) {
         Hs20Network* const kept = networkToKeep(group, known);
-        kept->m_realms = std::move(realms[kept]);
+        kept->takeRealmsOfAll(std::move(realms[kept]));
         for (std::size_t index = 0; index < group.size(); ++index)
             if (group[index] == kept)
                 Log(3, "This network with index=%d and mac address%s exists before, thus we will keep it.",

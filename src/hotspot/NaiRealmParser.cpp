@@ -135,36 +135,38 @@ bool parseNaiRealm(NaiRealm& realm, Reader& reader) {
     return parseMethods(realm, entry);
 }
 
-// A ";" that ends the text is followed by no name.
-std::vector<std::string> splitNames(std::string_view realm) {
-    std::vector<std::string> names;
-    for (;;) {
-        const std::size_t end = realm.find(';');
-        names.emplace_back(realm.substr(0, end));
-        if (end == std::string_view::npos || end + 1 == realm.size()) return names;
-        realm.remove_prefix(end + 1);
-    }
-}
-
 // 0: a method that this client has no credentials for.
 std::uint32_t eapTypeOf(const NaiRealmEap& eap) {
     return eap.method == kEapTtls ? 2 : eap.method == kEapTls ? 1 : 0;
 }
 
-// Names and methods multiply, so nothing here may take as long as there are pairs of them.
+// False: there is no room for more.
+bool keep(std::string_view name, const std::vector<NaiRealmEap>& methods, RealmCollection& kept,
+          std::size_t& complaints) {
+    for (const NaiRealmEap& eap : methods) {
+        if (const std::uint32_t type = eapTypeOf(eap)) {
+            if (!kept.add({type, std::string(name)})) return false;
+        } else if (complaints < kMaxComplaints) {
+            ++complaints;
+            Log(6, "ERROR: Invalid EAP type.");
+        }
+    }
+    return true;
+}
+
+// Names and methods multiply, so nothing here may take as long as there are pairs of them. A ";" that ends the
+// text is followed by no name.
 void flatten(const NaiRealm& realm, RealmCollection& kept, std::size_t& complaints) {
     std::vector<NaiRealmEap> usable;
     std::copy_if(realm.eap.begin(), realm.eap.end(), std::back_inserter(usable), eapTypeOf);
     if (usable.empty() && complaints == kMaxComplaints) return;
-    for (const std::string& name : splitNames(realm.realm))
-        for (const NaiRealmEap& eap : complaints < kMaxComplaints ? realm.eap : usable) {
-            if (const std::uint32_t type = eapTypeOf(eap)) {
-                if (!kept.add({type, name})) return;
-            } else if (complaints < kMaxComplaints) {
-                ++complaints;
-                Log(6, "ERROR: Invalid EAP type.");
-            }
-        }
+    for (std::string_view rest = realm.realm;;) {
+        const std::size_t end = rest.find(';');
+        if (!keep(rest.substr(0, end), complaints < kMaxComplaints ? realm.eap : usable, kept, complaints))
+            return;
+        if (end == rest.npos || end + 1 == rest.size()) return;
+        rest.remove_prefix(end + 1);
+    }
 }
 
 }  // namespace

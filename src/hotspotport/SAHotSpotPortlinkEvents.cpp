@@ -14,23 +14,6 @@ namespace {
 
 constexpr std::size_t kSupplicantStateSize = 8;
 
-Json::Value asJson(const Credential& credential) {
-    Json::Value object;
-    object["Id"] = credential.m_id;
-    object["Type"] = credential.m_type;
-    object["AccessType"] = credential.m_accessType;
-    object["CredentialEapMethod"] = credential.m_eapMethod;
-    object["AutoConnect"] = credential.m_bAutoConnect;
-    object["CredentialName"] = utf8FromWide(credential.m_credName);
-    object["RealName"] = utf8FromWide(credential.m_realm);
-    object["Creator"] = utf8FromWide(credential.m_creator);
-    object["CaCert"] = utf8FromWide(credential.m_caCert);
-    object["ClientCert"] = utf8FromWide(credential.m_clientCert);
-    object["Username"] = utf8FromWide(credential.m_username);
-    object["Password"] = utf8FromWide(credential.m_password);
-    return object;
-}
-
 }  // namespace
 
 void SAHotSpotPortlink::SendRadioState() {
@@ -40,17 +23,6 @@ void SAHotSpotPortlink::SendRadioState() {
 
 void SAHotSpotPortlink::SendCardState() {
     SendData("", m_bCardIn ? contract::kCardPlugIn : contract::kCardPlugOut);
-}
-
-void SAHotSpotPortlink::SendCredentialList() {
-    Log(3, "Send all credentials to vexa.");
-    const auto supplicant = hotspotSupplicant(*this);
-    if (!supplicant) return;
-    const platform::LockGuard lock(g_hs20Lock);
-    Json::Value credentials;
-    for (const Credential* credential : supplicant->credentials().copyCredentialPointers())
-        credentials.append(asJson(*credential));
-    SendData(toStyledText(credentials), contract::kGetAllCredentialList);
 }
 
 void SAHotSpotPortlink::SendInternetAccess() {

@@ -1,4 +1,5 @@
 #include <utility>
+#include <vector>
 
 #include "base/DiagnosticLog.h"
 #include "base/NetworkListLock.h"
@@ -21,6 +22,10 @@ int internetAccessCode(const Supplicant& supplicant, const Hs20Network& network,
     if (!isConnected) return network.m_internetAccess != 0 ? kAccessOffered : kNoWarning;
     return supplicant.hasInternetAccess() ? kNoWarning : kConnectedWithoutAccess;
 }
+
+// What they take in the list, with names of usual length.
+constexpr std::size_t kNetworkTextSize = 256;
+constexpr std::size_t kRealmTextSize = 128;
 
 // A list can have some 50,000 realms, each of which would be a dozen allocations as a Json::Value: it is
 // written straight away, in the styled form.
@@ -57,6 +62,13 @@ void appendNetwork(std::string& json, const Supplicant& supplicant, const Hs20Ne
     json += "\n   }";
 }
 
+std::size_t usualSize(const std::vector<Hs20Network*>& networks) {
+    std::size_t size = 0;
+    for (const Hs20Network* network : networks)
+        size += kNetworkTextSize + network->m_realms.size() * kRealmTextSize;
+    return size;
+}
+
 }  // namespace
 
 void SAHotSpotPortlink::SendNetworkList(Supplicant* supplicant) {
@@ -70,6 +82,7 @@ void SAHotSpotPortlink::SendNetworkList(Supplicant* supplicant) {
     const Hs20Network* const connected = supplicant->getConnectedBss(false);
     if (!listed) return;
     std::string text;
+    text.reserve(usualSize(listed->networks().copyPointers()));
     if (supplicant->isRadioOnCached() && isEnabled)
         for (const Hs20Network* network : listed->networks().copyPointers()) {
             text += text.empty() ? "[\n" : ",\n";

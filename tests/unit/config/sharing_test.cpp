@@ -1,7 +1,10 @@
 #include <gtest/gtest.h>
 
 #include <functional>
+#include <iterator>
+#include <random>
 #include <regex>
+#include <utility>
 #include <vector>
 
 #include "text/TextConversion.h"
@@ -298,6 +301,55 @@ TEST(Sharing, WhatOthersChangedIsTakenOverAndWhatCouldNotBeSavedStays) {
         Config reader;
         ASSERT_EQ(open(reader, &isChanged), kSuccess);
         EXPECT_FALSE(isChanged) << c.story << settled;
+    }
+}
+
+/// A change of the kind that the number tells, of or beside the credential with this id.
+void changeAtRandom(Config& config, unsigned kind, std::int32_t id, const std::wstring& text) {
+    const auto held = config.beginChange();
+    CredentialTable& table = config.credentials();
+    Credential* const one = table.findCredentialById(config.currentId(id));
+    CredentialInput input;
+    input.type = kind % 2 == 0 ? CRED_TYPE_EAP_TTLS : CRED_TYPE_EAP_TLS;
+    input.realm = input.username = input.caCert = text;
+    std::int32_t added = 0;
+    if (kind < 3 && table.addCredential(input, config.nextCredId(), config.userName(), added) == kSuccess)
+        config.advanceNextCredId();
+    if (kind == 3 && one != nullptr) one->m_credName = one->m_realm = text;
+    if (kind == 4) table.deleteCredential(config.currentId(id));
+    if (kind == 5) table.setCredentialPosition(config.currentId(id), id);
+    config.saveConfig(held);
+}
+
+// What a service knows of the file that it saved itself is what one that has just started reads there.
+TEST(Sharing, AServiceOfLongStandingSavesWhatOneThatJustStartedSaves) {
+    const std::wstring texts[] = {L"a", L"", L"<b>&c;]]>", L"\r\n d\t", L"\u00e4\u20ac", L"'\"&#13;"};
+    for (unsigned seed = 1; seed <= 8; ++seed) {
+        std::mt19937 random(seed);
+        StoreMachine store;
+        const std::string others = ttls(2, "x", "PC\\bob", "peruser") + element("<id>0</id>") + ttls(1, "a");
+        ASSERT_EQ(store.openWith(document(others, user("PC\\bob", "2:1"))), kSuccess);
+        std::vector<std::function<void(Config&)>> unsaved;
+        for (int step = 0; step < 40; ++step) {
+            const bool isInVain = random() % 8 == 0;
+            if (isInVain) store.fail("rename");
+            if (random() % 8 == 0) store.write("config.xml", store.file() + "<!-- by hand -->");
+            const std::string before = store.file();
+            unsaved.push_back([kind = static_cast<unsigned>(random() % 6),
+                               id = static_cast<std::int32_t>(random() % 16),
+                               text = texts[random() % std::size(texts)]](Config& config) {
+                changeAtRandom(config, kind, id, text);
+            });
+            unsaved.back()(store.config());
+            if (isInVain) continue;
+            const std::string after = store.file();
+            store.write("config.xml", before);
+            Config fresh;
+            ASSERT_EQ(open(fresh), kSuccess);
+            for (const auto& change : std::exchange(unsaved, {}))
+                change(fresh);
+            ASSERT_EQ(store.file(), after) << "seed " << seed << ", step " << step;
+        }
     }
 }
 

@@ -1,0 +1,209 @@
+#include <algorithm>
+#include <utility>
+
+#include "base/DiagnosticLog.h"
+#include "config/Config.h"
+#include "config/SafeSave.h"
+#include "config/StoreText.h"
+#include "text/OutOfMemory.h"
+#include "text/ScopeGuard.h"
+#include "text/XmlWellFormed.h"
+
+namespace vexa {
+
+namespace {
+
+constexpr std::size_t kUsualGrowth = 4096;
+
+// Marks of the holes.
+constexpr char kNextId = 1;
+constexpr char kCredentials = 2;
+constexpr char kUser = 3;
+
+}  // namespace
+
+// However little is lost, as with a full disk, one line tells of it.
+ResultCode Config::saveConfig(const FileLock& held) {
+    const ScopeGuard release([this]() NO_THREAD_SAFETY_ANALYSIS { m_xmlDoc.release(); });
+    ResultCode result = kFailure;
+    bool isSaved = false;
+    const bool isWithinMemory = withinMemory([&]() NO_THREAD_SAFETY_ANALYSIS {
+        const auto content = held ? readFile(result) : std::nullopt;
+        if (content) result = saveInto(*content, isSaved);
+    });
+    if (!isWithinMemory) result = kFailure;
+    m_bUnsaved = result != kSuccess || !isSaved;
+    if (m_bUnsaved) Log(6, "ERROR: Saving the configuration file failed.");
+    return result == kSuccess ? kSuccess : kFailure;
+}
+
+// A file that is as this process left it needs no reading: what is not the user's is known, and so is the
+// text of each credential that has not changed.
+ResultCode Config::saveInto(const std::string& content, bool& isSaved) {
+    const bool isKnownFile = m_frame && content == m_content && areCredentialsWritable() && isUserWritable();
+    auto frame = isKnownFile ? std::exchange(m_frame, std::nullopt) : frameOf(content);
+    if (!frame) return kFailure;
+    const ResultCode result = frame->isEnough ? kSuccess : kFailure;
+    std::vector<Written> written;
+    std::string text = fill(*frame, isKnownFile, written);
+    isSaved = saveSafely(m_configPath, text);
+    if (isSaved) {
+        rememberSaved(text, *frame, isKnownFile, written);
+        m_content = std::move(text);
+    }
+    if (frame->isWhole() && (isSaved || isKnownFile)) m_frame = std::move(frame);
+    return result;
+}
+
+bool Config::areCredentialsWritable() const {
+    const auto all = m_credentials.copyCredentialPointers();
+    return std::all_of(all.begin(), all.end(), [](const Credential* one) { return canBeWritten(*one); }) &&
+           (all.empty() || canStandInXml(m_userName));
+}
+
+bool Config::isUserWritable() const {
+    return !m_userName.empty() && canStandInXml(m_userName);
+}
+
+// Up to the first section that the file has no place for. Nothing: that is the next id's.
+std::optional<Config::Frame> Config::frameOf(const std::string& content) {
+    if (openDocument(content) != kSuccess || !cutOutNextCredId()) return std::nullopt;
+    Frame frame;
+    frame.isEnough = cutOutCredentials(frame) && isUserWritable() && cutOutUser();
+    frame.pieces = m_xmlDoc.textAroundHoles();
+    return frame.pieces.empty() ? std::nullopt : std::optional(std::move(frame));
+}
+
+// A file that has lost the element gets it back: otherwise nothing could be saved any more.
+bool Config::cutOutNextCredId() {
+    Node node;
+    m_xmlDoc.selectSingleNode("/*/global/nextcredid", Node(), node);
+    if (!node) {
+        Log(6, "ERROR: No nextcredid node in the config xml file.");
+        Node global;
+        m_xmlDoc.selectSingleNode("/*/global", Node(), global);
+        if (!global && m_xmlDoc.setChild("global", L"", Node(), true, &global) != kSuccess) return false;
+        if (m_xmlDoc.setChild("nextcredid", L"", global, true, &node) != kSuccess) return false;
+    }
+    while (const Node child = node.last_child())
+        XmlDocument::remove(child);
+    return XmlDocument::addHole(node, kNextId);
+}
+
+// What goes is taken out last, so that a failure changes nothing. Where there is no credential, there need be
+// no place for any.
+bool Config::cutOutCredentials(Frame& frame) {
+    Node section;
+    std::vector<Node> nodes;
+    if (m_xmlDoc.selectSingleNode("/*/credentials", Node(), section) != kSuccess ||
+        m_xmlDoc.selectNodes("/*/credentials/*", Node(), nodes) != kSuccess)
+        return false;
+    std::erase_if(nodes, [&](Node node) NO_THREAD_SAFETY_ANALYSIS { return !mustRemove(node, frame); });
+    if (!section) return m_credentials.size() == 0;
+    if (!areCredentialsWritable() || !XmlDocument::addHole(section, kCredentials)) return false;
+    frame.hasCredentials = true;
+    for (const Node node : nodes)
+        XmlDocument::remove(node);
+    return true;
+}
+
+// Only what this process never loaded stays: other users' private credentials, and what has no valid id.
+// Whatever the ids of those are, they are no reason to take them for the user's own.
+bool Config::mustRemove(Node node, Frame& frame) {
+    const std::int32_t id = numberOf(node, "id");
+    if (id <= 0) {
+        frame.invalidIds.push_back(id);
+        return false;
+    }
+    if (!isForeign(node)) return true;
+    frame.foreignIds.insert(id);
+    return false;
+}
+
+bool Config::cutOutUser() {
+    Node section;
+    std::vector<Node> users;
+    if (m_xmlDoc.selectSingleNode("/*/users", Node(), section) != kSuccess || !section ||
+        m_xmlDoc.selectNodes("/*/users/*", Node(), users) != kSuccess ||
+        !XmlDocument::addHole(section, kUser))
+        return false;
+    for (const Node user : users)
+        if (textOf(user, "username", kInvalid) == m_userName) XmlDocument::remove(user);
+    return true;
+}
+
+// What the file will hold.
+std::string Config::fill(const Frame& frame, bool isKnownFile, std::vector<Written>& written) {
+    std::string text;
+    text.reserve(m_content.size() + kUsualGrowth);
+    for (const std::int32_t id : frame.invalidIds)
+        Log(2, "Invalid credential id=%d", id);
+    for (const auto& [piece, hole] : frame.pieces) {
+        text.append(piece);
+        if (hole == kNextId) text.append(std::to_string(m_nextCredId));
+        if (hole == kCredentials) appendCredentials(text, isKnownFile, written);
+        if (hole == kUser) appendUserText(text, m_userName, m_credentials.copyCredentialPointers());
+    }
+    if (frame.hasCredentials || frame.isEnough) Log(2, "Saving credentials to xml file...");
+    return text;
+}
+
+void Config::appendCredentials(std::string& text, bool isKnownFile, std::vector<Written>& written) {
+    for (const Credential* mine : m_credentials.copyCredentialPointers()) {
+        const auto known = m_known.find(mine->m_id);
+        const bool isAsKnown = isKnownFile && known != m_known.end() && known->second.length > 0 &&
+                               holdTheSame(*mine, known->second.inMemory);
+        const std::size_t at = text.size();
+        if (isAsKnown)
+            text.append(m_content, known->second.at, known->second.length);
+        else
+            appendCredentialText(text, *mine, m_userName);
+        written.push_back({mine, at, text.size() - at});
+    }
+}
+
+// Memory and file hold the same now, each in its way.
+void Config::rememberSaved(const std::string& text, const Frame& frame, bool isKnownFile,
+                           const std::vector<Written>& written) {
+    std::unordered_set<std::int32_t> ids;
+    for (const Written& one : written)
+        if (!frame.foreignIds.contains(one.credential->m_id)) ids.insert(one.credential->m_id);
+    const bool areIdsPlain = frame.isWhole() && ids.size() == written.size();
+    if (!isKnownFile || !areIdsPlain) {
+        m_xmlDoc.release();
+        if (openDocument(text) == kSuccess) remember();
+    }
+    if (!areIdsPlain) return;
+    for (const Written& one : written)
+        rememberWritten(one, text);
+    std::erase_if(m_known, [&](const auto& known) { return !ids.contains(known.first); });
+}
+
+void Config::rememberWritten(const Written& written, const std::string& text) {
+    const Credential& mine = *written.credential;
+    auto known = m_known.find(mine.m_id);
+    if (known == m_known.end() || !holdTheSame(mine, known->second.inMemory)) {
+        auto read = asRead(text.substr(written.at, written.length));
+        if (!read) return;
+        known = m_known.insert_or_assign(mine.m_id, Known{std::move(*read), mine}).first;
+    }
+    known->second.inFile.m_priority = mine.m_priority < 0 ? CRED_PRIORITY_LOWEST : mine.m_priority;
+    known->second.inMemory.m_priority = mine.m_priority;
+    known->second.at = written.at;
+    known->second.length = written.length;
+}
+
+// The credential that the next reading finds in this text.
+std::optional<Credential> Config::asRead(const std::string& text) {
+    m_xmlDoc.release();
+    Node node;
+    CredentialTable table;
+    Reading reading{.table = table, .trace = Trace::No};
+    if (openDocument(text) != kSuccess || m_xmlDoc.selectSingleNode("/*", Node(), node) != kSuccess)
+        return std::nullopt;
+    readCredential(node, reading);
+    const auto all = table.copyCredentialPointers();
+    return all.empty() ? std::nullopt : std::optional(*all.front());
+}
+
+}  // namespace vexa
