@@ -21,7 +21,7 @@ struct Field {
 struct FieldList {
     std::vector<Field> fields;
     /// The member of the JSON object that holds the things; empty if the value holds them itself.
-    std::string listedIn = "";
+    std::string listedIn = {};
 };
 
 /// How the user wants to be told: in words, as JSON, or as a line of fields for each thing.

@@ -26,7 +26,7 @@ std::vector<Field> fieldsShown(const OutputOptions& options) {
 /// What lies in an object is not missed in one that has not got it.
 Json::Value member(const Json::Value& object, const std::string& name) {
     const auto dot = name.find('.');
-    const Json::Value inner = object.get(name.substr(0, dot), Json::Value());
+    Json::Value inner = object.get(name.substr(0, dot), Json::Value());
     if (dot == std::string::npos || !inner.isObject()) return inner;
     return member(inner, name.substr(dot + 1));
 }

@@ -57,11 +57,13 @@ std::string action(const OptionText& option) {
 void appendOption(std::ostream& out, const OptionText& option) {
     const std::string exclusion = option.names.size() > 1 ? "(" + joined(option.names, " ") + ")" : "";
     const std::string value = option.value.empty() ? "" : ":" + option.value + ":" + action(option);
+    const std::string description = "[" + escapedText(option.description, "[]:\\") + "]";
     for (const std::string& name : option.names) {
-        const bool takesEqualSign = !option.value.empty() && name.starts_with("--");
-        out << " \\\n        "
-            << quoted(exclusion + name + (takesEqualSign ? "=" : "") + "[" +
-                      escapedText(option.description, "[]:\\") + "]" + value);
+        std::string spec = exclusion + name;
+        if (!option.value.empty() && name.starts_with("--")) spec += '=';
+        spec += description;
+        spec += value;
+        out << " \\\n        " << quoted(spec);
     }
 }
 
