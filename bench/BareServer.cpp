@@ -3,7 +3,6 @@
 #include <boost/asio/io_context.hpp>
 #include <boost/asio/ip/tcp.hpp>
 #include <boost/asio/post.hpp>
-#include <boost/beast/core/buffers_to_string.hpp>
 #include <boost/beast/core/flat_buffer.hpp>
 #include <boost/beast/core/tcp_stream.hpp>
 #include <boost/beast/websocket.hpp>
@@ -25,8 +24,7 @@ const tcp::endpoint kAnyPort{asio::ip::address_v4::loopback(), 0};
 
 class EchoSession : public std::enable_shared_from_this<EchoSession> {
 public:
-    EchoSession(tcp::socket socket, const BareEchoServer::Answer& answer)
-        : m_answer(answer), m_stream(std::move(socket)) {}
+    explicit EchoSession(tcp::socket socket) : m_stream(std::move(socket)) {}
 
     void start() {
         beast::get_lowest_layer(m_stream).socket().set_option(tcp::no_delay(true));
@@ -44,11 +42,6 @@ private:
     }
 
     void write() {
-        if (m_answer) {
-            const std::string text = m_answer(beast::buffers_to_string(m_buffer.data()));
-            m_buffer.clear();
-            m_buffer.commit(asio::buffer_copy(m_buffer.prepare(text.size()), asio::buffer(text)));
-        }
         m_stream.async_write(m_buffer.data(), [self = shared_from_this()](error_code ec, std::size_t) {
             if (ec) return;
             self->m_buffer.clear();
@@ -56,7 +49,6 @@ private:
         });
     }
 
-    const BareEchoServer::Answer& m_answer;
     websocket::stream<beast::tcp_stream> m_stream;
     beast::flat_buffer m_buffer;
 };
@@ -65,7 +57,7 @@ private:
 
 class BareEchoServer::Impl {
 public:
-    explicit Impl(Answer answer) : m_answer(std::move(answer)) {
+    Impl() {
         accept();
         m_thread = std::thread([this] { m_io.run(); });
     }
@@ -81,18 +73,17 @@ private:
     void accept() {
         m_acceptor.async_accept([this](error_code ec, tcp::socket socket) {
             if (ec) return;
-            std::make_shared<EchoSession>(std::move(socket), m_answer)->start();
+            std::make_shared<EchoSession>(std::move(socket))->start();
             accept();
         });
     }
 
-    const Answer m_answer;
     asio::io_context m_io{1};
     tcp::acceptor m_acceptor{m_io, kAnyPort};
     std::thread m_thread;
 };
 
-BareEchoServer::BareEchoServer(Answer answer) : m_impl(std::make_unique<Impl>(std::move(answer))) {}
+BareEchoServer::BareEchoServer() : m_impl(std::make_unique<Impl>()) {}
 BareEchoServer::~BareEchoServer() = default;
 
 std::uint16_t BareEchoServer::port() const {

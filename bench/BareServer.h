@@ -1,22 +1,16 @@
 #pragma once
 
-#include <cstddef>
 #include <cstdint>
-#include <functional>
 #include <memory>
 #include <string>
-#include <string_view>
 
 namespace vexa::bench {
 
 /// A WebSocket server on a free port of 127.0.0.1 with one thread and no promises: what the library alone
-/// costs. Every message is answered to whom it came from.
+/// costs. Every message goes back to whom it came from.
 class BareEchoServer {
 public:
-    /// What to answer; without it the message itself goes back.
-    using Answer = std::function<std::string(std::string_view message)>;
-
-    explicit BareEchoServer(Answer answer = nullptr);
+    BareEchoServer();
     ~BareEchoServer();
     BareEchoServer(const BareEchoServer&) = delete;
     BareEchoServer& operator=(const BareEchoServer&) = delete;

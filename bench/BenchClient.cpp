@@ -2,8 +2,10 @@
 
 #include <boost/asio/io_context.hpp>
 #include <boost/asio/ip/tcp.hpp>
+#include <boost/asio/write.hpp>
 #include <boost/beast/core/flat_buffer.hpp>
 #include <boost/beast/websocket.hpp>
+#include <string>
 
 namespace vexa::bench {
 
@@ -30,6 +32,16 @@ BenchClient::BenchClient(BenchClient&&) noexcept = default;
 
 void BenchClient::send(std::string_view message) {
     m_connection->stream.write(asio::buffer(message));
+}
+
+// A mask of zeros leaves the text as it is.
+void BenchClient::sendTogether(std::string_view message, std::size_t count) {
+    const char length = static_cast<char>(0x80 | message.size());
+    const std::string frame = std::string{'\x81', length, 0, 0, 0, 0}.append(message);
+    std::string all;
+    for (std::size_t i = 0; i < count; ++i)
+        all += frame;
+    asio::write(m_connection->stream.next_layer(), asio::buffer(all));
 }
 
 std::size_t BenchClient::receive() {

@@ -15,6 +15,8 @@ public:
     BenchClient(BenchClient&&) noexcept;
 
     void send(std::string_view message);
+    /// Sends a message of less than 126 bytes so many times, in one write.
+    void sendTogether(std::string_view message, std::size_t count);
     /// Waits for one message and gives its size.
     std::size_t receive();
 

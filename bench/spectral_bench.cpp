@@ -13,7 +13,7 @@ namespace {
 
 using vexa::SampleRecord;
 
-constexpr std::size_t kRecords = 10'000;
+constexpr std::int64_t kRecords = 10'000;
 constexpr std::array<std::uint16_t, 8> kFrequencies = {2412, 2437, 2462, 2484, 5180, 5260, 5500, 5825};
 
 SampleRecord randomRecord(std::mt19937& random) {
@@ -27,23 +27,18 @@ SampleRecord randomRecord(std::mt19937& random) {
     return SampleRecord(bytes);
 }
 
-std::vector<SampleRecord> randomRecords() {
+std::vector<SampleRecord> randomRecords(std::int64_t count) {
     std::mt19937 random(1);
     std::vector<SampleRecord> records;
-    for (std::size_t i = 0; i < kRecords; ++i)
+    for (std::int64_t i = 0; i < count; ++i)
         records.push_back(randomRecord(random));
     return records;
 }
 
-const std::vector<SampleRecord>& records() {
-    static const std::vector<SampleRecord> all = randomRecords();
-    return all;
-}
-
 // Two loops that differ in what they give would not be comparable.
-bool areEqual() {
-    const auto ours = vexa::computeChannelValues(records());
-    const auto bare = vexa::bench::bareChannelValues(records());
+bool areEqual(const std::vector<SampleRecord>& records) {
+    const auto ours = vexa::computeChannelValues(records);
+    const auto bare = vexa::bench::bareChannelValues(records);
     return ours.size() == bare.size() &&
            std::equal(ours.begin(), ours.end(), bare.begin(), [](const auto& a, const auto& b) {
                return a.first == b.first && a.second.congestion == b.second.congestion &&
@@ -53,14 +48,16 @@ bool areEqual() {
 
 template <auto Compute>
 void pass(benchmark::State& state) {
-    if (!areEqual()) return state.SkipWithError("the two passes disagree");
+    const std::vector<SampleRecord> records = randomRecords(state.range(0));
+    if (!areEqual(records)) return state.SkipWithError("the two passes disagree");
     for (auto _ : state)
-        benchmark::DoNotOptimize(Compute(records()));
+        benchmark::DoNotOptimize(Compute(records));
     state.counters["per_second"] =
         benchmark::Counter(static_cast<double>(state.iterations()), benchmark::Counter::kIsRate);
 }
 
-BENCHMARK(pass<vexa::computeChannelValues>)->Name("spectral_pass/ours")->Unit(benchmark::kMillisecond);
-BENCHMARK(pass<vexa::bench::bareChannelValues>)->Name("spectral_pass/bare")->Unit(benchmark::kMillisecond);
+BENCHMARK(pass<vexa::computeChannelValues>)->Name("spectral_pass/ours")->Arg(kRecords);
+BENCHMARK(pass<vexa::bench::bareChannelValues>)->Name("spectral_pass/bare")->Arg(kRecords);
+BENCHMARK(pass<vexa::computeChannelValues>)->Name("growth/records")->RangeMultiplier(10)->Range(1, 1000);
 
 }  // namespace

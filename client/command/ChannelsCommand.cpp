@@ -36,10 +36,10 @@ bool waitForList(SpectralScan& scan, Signals& signals) {
 }
 
 std::vector<std::string> channelTable(const SpectralView& view) {
-    std::vector<std::string> lines{"Channel  Order"};
+    std::vector<std::string> lines{"Channel"};
     for (const auto& channel : view.channels()) {
         std::ostringstream line;
-        line << std::setw(7) << channel.number << std::setw(7) << channel.order;
+        line << std::setw(7) << channel.number;
         lines.push_back(line.str());
     }
     return lines;

@@ -27,6 +27,7 @@ struct DemoOptions {
     int seconds = kDefaultSeconds;
     std::string service;
     bool json = false;
+    bool showPasswords = false;
 };
 
 SpectrumOutput::Form formOf(const DemoOptions& options) {
@@ -42,7 +43,8 @@ CredentialList storedCredentials(const ServicePorts& ports, Signals& signals) {
 bool showAll(const DemoOptions& options, const ServicePorts& ports, const MachineFolder& machine,
              Signals& signals) try {
     const Deadline end = Deadline::in(std::chrono::seconds(options.seconds));
-    DemoStory story(ports.hs20, machine, storedCredentials(ports, signals));
+    DemoStory story(ports.hs20, machine, storedCredentials(ports, signals),
+                    options.showPasswords ? Passwords::Shown : Passwords::Hidden);
     SpectrumOutput output(formOf(options), &story);
     SpectralScan scan(ports.sa);
     watchSpectrum(scan, signals, output, end, &story);
@@ -82,9 +84,10 @@ void addDemoCommand(CLI::App& app, int& exitCode) {
         ->check(CLI::Range(1, 86400));
     command
         ->add_option("--service", options->service,
-                     "The service's executable; default: the one beside this program")
+                     "The service's executable; default: the one that came with this program")
         ->type_name("PATH");
     command->add_flag("--json", options->json, "An event a line, as JSON, and a JSON object at the end");
+    command->add_flag("--show-passwords", options->showPasswords, "Show the passwords too, in JSON");
     command->callback([options, &exitCode] { exitCode = runDemo(*options); });
 }
 

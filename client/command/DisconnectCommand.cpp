@@ -20,10 +20,12 @@ constexpr std::chrono::seconds kAttemptLimit{3};
 constexpr const char* kStaysAway = "; the service stays away from it until you connect to it.";
 
 /// The network that is meant; without a name the connected one.
-std::string networkToLeave(const ConnectionOptions& options, const Network* connected) {
-    if (!options.network.empty()) return options.network;
-    if (connected == nullptr) throw ClientError("no hotspot network is connected");
-    return connected->name;
+std::string networkToLeave(const ConnectionOptions& options, const NetworkList& list) {
+    const Network* const network =
+        options.network.empty() ? connectedNetwork(list) : networkMeant(list, options.network);
+    if (network != nullptr) return network->name;
+    if (options.network.empty()) throw ClientError("no hotspot network is connected");
+    return options.network;
 }
 
 std::string notLeft(Outcome outcome, bool wasConnected, const ConnectionOptions& options,
@@ -41,7 +43,7 @@ int runDisconnect(ConnectionOptions& options) {
     requireRadio(port);
     const NetworkList list = askNetworks(port).value_or(NetworkList());
     const Network* const connected = connectedNetwork(list);
-    options.network = networkToLeave(options, connected);
+    options.network = networkToLeave(options, list);
     const bool isConnected = connected != nullptr && connected->name == options.network;
     // What was told until now says nothing of what comes.
     port.waitUntilHandled();

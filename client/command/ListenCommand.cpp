@@ -2,6 +2,7 @@
 #include <memory>
 
 #include "client/command/Commands.h"
+#include "client/command/PortOption.h"
 #include "client/port/EventLines.h"
 #include "client/terminal/ClientError.h"
 #include "client/terminal/EventLoop.h"
@@ -11,17 +12,18 @@ namespace vexa::client {
 namespace {
 
 struct ListenOptions {
-    std::uint16_t port = 0;
+    PortArgument port;
     bool json = false;
+    bool showPasswords = false;
 };
 
 int runListen(const ListenOptions& options) {
     Signals signals;
-    WebSocketClient client(options.port);
+    WebSocketClient client(options.port.find());
     EventLoop loop(signals);
     while (loop.wait(client.polled(), Deadline::never())) {
         client.process();
-        if (!printEvents(client)) break;
+        if (!printEvents(client, options.showPasswords ? Passwords::Shown : Passwords::Hidden)) break;
         client.requireOpen();
     }
     return kExitOk;
@@ -32,10 +34,9 @@ int runListen(const ListenOptions& options) {
 void addListenCommand(CLI::App& app, int& exitCode) {
     auto options = std::make_shared<ListenOptions>();
     CLI::App* command = app.add_subcommand("listen", "Print the events of a port as they come, until Ctrl-C");
-    command->add_option("PORT", options->port, "Port of the spectral analyser or of the hotspot half")
-        ->required()
-        ->check(CLI::Range(1, 65535));
+    options->port.addTo(*command);
     command->add_flag("--json", options->json, "Print JSON, as always: an event a line");
+    command->add_flag("--show-passwords", options->showPasswords, "Show the passwords too");
     command->callback([options, &exitCode] { exitCode = runListen(*options); });
 }
 

@@ -1,16 +1,17 @@
 #include <CLI/CLI.hpp>
 #include <iostream>
 #include <memory>
-#include <pugixml.hpp>
 
 #include "client/command/Commands.h"
 #include "client/log/LogFilter.h"
 #include "client/machine/LogFiles.h"
+#include "client/machine/LogSwitch.h"
 #include "client/machine/MachineFolder.h"
 #include "client/machine/ServiceHost.h"
 #include "client/output/Records.h"
 #include "client/terminal/ClientError.h"
 #include "client/terminal/EventLoop.h"
+#include "client/terminal/Terminal.h"
 #include "client/terminal/Text.h"
 
 namespace vexa::client {
@@ -23,22 +24,10 @@ struct LogOptions {
     std::string machine;
     std::size_t lines = 0;
     bool follow = false;
+    bool redact = false;
     OutputOptions output;
     LogWish wish;
 };
-
-/// Why there may be nothing to read, in one line; empty if the log is on.
-std::string whyOff(const MachineFolder& machine) {
-    pugi::xml_document document;
-    const auto result = document.load_file(machine.configFile().c_str());
-    if (result.status == pugi::status_file_not_found)
-        return "no service has run on the machine " + machine.path().string() + " yet";
-    if (result.status != pugi::status_ok) return machine.configFile().string() + " cannot be read";
-    const std::string enabled = document.select_node("/*/global/enabledump").node().text().get();
-    if (enabled == "true") return "";
-    return "the log is off: set enabledump to true in " + machine.configFile().string() +
-           " and start the service again";
-}
 
 std::string shown(const LogFiles::Line& line, const OutputOptions& options) {
     if (options.json) return recordsJson(options, lineJson(line));
@@ -46,9 +35,12 @@ std::string shown(const LogFiles::Line& line, const OutputOptions& options) {
     return printable(line.text, Tabs::Kept);
 }
 
-void print(const std::vector<LogFiles::Line>& lines, std::size_t from, const OutputOptions& options) {
-    for (std::size_t i = from; i < lines.size(); ++i)
-        std::cout << shown(lines[i], options) << '\n';
+void print(std::vector<LogFiles::Line> lines, std::size_t from, const LogOptions& options) {
+    for (std::size_t i = from; i < lines.size(); ++i) {
+        LogFiles::Line& line = lines[i];
+        if (options.redact) line.text = withoutPassword(std::move(line.text));
+        std::cout << shown(line, options.output) << '\n';
+    }
     std::cout << std::flush;
 }
 
@@ -56,7 +48,7 @@ void follow(LogFiles& files, LogFilter& filter, const LogOptions& options) {
     Signals signals;
     EventLoop loop(signals);
     while (std::cout && loop.wait(Deadline::in(kBetweenLooks)))
-        print(filter.take(files.takeLines()), 0, options.output);
+        print(filter.take(files.takeLines()), 0, options);
 }
 
 void explainSilence(const std::string& reason, bool hasFile, bool goesOn) {
@@ -74,7 +66,8 @@ void append(LogFilter::Lines& lines, const LogFilter::Lines& more) {
 int runLog(const LogOptions& options, bool isLimited) {
     const MachineFolder machine(options.machine);
     LogFiles files(machine.dumpFolder());
-    explainSilence(whyOff(machine), files.any(), options.follow);
+    explainSilence(whyLogIsOff(machine), files.any(), options.follow);
+    if (isLimited && !options.wish.isAny()) files.skipToLast(options.lines);
     LogFilter filter(options.wish, std::time(nullptr));
     auto lines = filter.take(files.takeLines());
     if (!options.follow) {
@@ -82,7 +75,7 @@ int runLog(const LogOptions& options, bool isLimited) {
         append(lines, filter.takeRest());
     }
     const bool isCut = isLimited && lines.size() > options.lines;
-    print(lines, isCut ? lines.size() - options.lines : 0, options.output);
+    print(lines, isCut ? lines.size() - options.lines : 0, options);
     if (options.follow) follow(files, filter, options);
     return kExitOk;
 }
@@ -100,7 +93,12 @@ void addLogCommand(CLI::App& app, int& exitCode) {
     command->add_flag("-f,--follow", options->follow, "Go on with what is written, until Ctrl-C");
     options->wish.addTo(*command);
     options->output.addTo(*command, {{{"file", "File"}, {"line", "Line"}}}, "Print JSON, an object a line");
-    command->callback([options, lines, &exitCode] { exitCode = runLog(*options, lines->count() > 0); });
+    CLI::Option* redact =
+        command->add_flag("--redact,!--no-redact", options->redact, "Hide passwords; default: on a terminal");
+    command->callback([options, lines, redact, &exitCode] {
+        if (redact->count() == 0) options->redact = isOutputTerminal();
+        exitCode = runLog(*options, lines->count() > 0);
+    });
 }
 
 }  // namespace vexa::client

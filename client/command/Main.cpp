@@ -1,12 +1,17 @@
 #include <CLI/CLI.hpp>
+#include <algorithm>
 #include <array>
 #include <iostream>
 #include <string>
+#include <utility>
 
+#include "client/command/CommandWords.h"
 #include "client/command/Commands.h"
 #include "client/command/Program.h"
 #include "client/output/Silence.h"
 #include "client/terminal/ClientError.h"
+#include "client/terminal/EventLoop.h"
+#include "client/terminal/Terminal.h"
 #include "contract/Version.h"
 
 namespace {
@@ -18,7 +23,7 @@ constexpr std::array kCommands{
     &addChannelsCommand,   &addNetworksCommand, &addConnectCommand, &addDisconnectCommand,
     &addEnableCommand,     &addDisableCommand,  &addRefreshCommand, &addCredentialsCommand,
     &addCredentialCommand, &addReloadCommand,   &addWatchCommand,   &addLogCommand,
-    &addSendCommand,       &addListenCommand,   &addShellCommands};
+    &addDoctorCommand,     &addSendCommand,     &addListenCommand,  &addShellCommands};
 
 int report(const std::exception& error, int exitCode) {
     std::cerr << "vexa: " << error.what() << '\n';
@@ -40,34 +45,51 @@ void addJsonVersion(CLI::App& app) {
         "Display the version of the JSON that the commands print and exit");
 }
 
+/// Parents end as their service does, whoever has asked for it.
+bool isParent(const CLI::App& app) {
+    const auto& chosen = app.get_subcommands();
+    return !chosen.empty() && (chosen.front()->get_name() == "start" || chosen.front()->get_name() == "demo");
+}
+
 int run(int argc, char** argv, Silence& silence) {
     CLI::App app("The Vexa wireless service: start it, look at the air, keep its credentials.", "vexa");
     app.set_version_flag("--version", std::string("vexa ") + vexa::contract::version());
     addJsonVersion(app);
+    app.add_subcommand("help", "Tell how to use a command");
     app.require_subcommand(1);
     int exitCode = kExitOk;
     for (const auto add : kCommands)
         add(app, exitCode);
     silence.addTo(app);
     try {
-        app.parse(argc, argv);
+        auto words = commandWords(app, {argv + 1, argv + argc});
+        std::reverse(words.begin(), words.end());  // so the parser takes them
+        app.parse(std::move(words));
     } catch (const CLI::Success& help) {
         return app.exit(help);
+    } catch (const ClientError& error) {
+        exitCode = report(error, error.exitCode());
     }
-    return exitCode;
+    return EventLoop::stopCode() == 0 || isParent(app) ? exitCode : EventLoop::stopCode();
 }
 
-}  // namespace
-
-int vexa::client::runProgram(int argc, char** argv) {
-    Silence silence;
+int runAndReport(int argc, char** argv, Silence& silence) {
     try {
         return run(argc, argv, silence);
     } catch (const CLI::ParseError& error) {
         return reportWrongUse(error);
-    } catch (const ClientError& error) {
-        return report(error, error.exitCode());
     } catch (const std::exception& error) {
         return report(error, kExitFailed);
     }
+}
+
+}  // namespace
+
+// A reader who has gone wants no more; elsewhere, what could not be printed was not done.
+int vexa::client::runProgram(int argc, char** argv) {
+    Silence silence;
+    const int exitCode = runAndReport(argc, argv, silence);
+    std::cout << std::flush;
+    if (exitCode != kExitOk || std::cout || isOutputPipe()) return exitCode;
+    return report(ClientError("standard output cannot be written"), kExitFailed);
 }

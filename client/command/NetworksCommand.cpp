@@ -8,7 +8,9 @@
 #include "client/hotspot/HotspotQuestions.h"
 #include "client/hotspot/Network.h"
 #include "client/port/HotspotPort.h"
+#include "client/terminal/ListScreen.h"
 #include "client/terminal/TerminalKeys.h"
+#include "client/terminal/Text.h"
 #include "contract/Ports.h"
 
 namespace vexa::client {
@@ -20,9 +22,12 @@ struct NetworksOptions {
     bool watch = false;
 };
 
+std::vector<std::string> linesOf(const NetworkList& list) {
+    return list.empty() ? std::vector<std::string>{"No hotspot networks."} : networkTable(list);
+}
+
 bool show(const NetworkList& list, const OutputOptions& options) {
-    return print(options, networksJson(list),
-                 list.empty() ? std::vector<std::string>{"No hotspot networks."} : networkTable(list));
+    return print(options, networksJson(list), linesOf(list));
 }
 
 /// An empty list has reasons that the list does not tell.
@@ -35,34 +40,74 @@ void explain(HotspotPort& port, const HotspotOptions& options) {
     }
 }
 
-// An adapter that comes is asked for its list; all later lists come by themselves.
-void watch(HotspotPort& port, NetworkList shown, const OutputOptions& options) {
-    while (const auto event = port.next(Deadline::never())) {
-        if (event->id == contract::kCardPlugIn) port.tell(contract::kGetAllNetworkList);
-        if (event->id != contract::kGetAllNetworkList) continue;
-        NetworkList list = networkList(payloadOf(*event));
-        if (list == shown) continue;
-        shown = std::move(list);
-        if (!options.json) std::cout << '\n';
-        if (!show(shown, options)) return;
-    }
+/// Only its own words are drawn.
+bool isDrawn(const OutputOptions& options) {
+    return !options.json && !options.terse && options.chosen.empty() && TerminalScreen::isUsable();
 }
+
+/// The lists of a service, one after the other.
+class Watch {
+public:
+    Watch(HotspotPort& port, std::optional<NetworkList> first, const OutputOptions& options)
+        : m_port(port), m_list(std::move(first)), m_options(options) {}
+
+    /// Until the user has had enough, or nobody reads any more.
+    void run() try {
+        if (isDrawn(m_options)) {
+            m_port.endWith(m_screen.emplace());
+        } else if (TerminalKeys::isUsable()) {
+            m_port.endWith(m_keys.emplace());
+        }
+        if (m_screen) draw();
+        while (next()) {
+        }
+    } catch (const StoppedByUser&) {
+        if (!m_screen) return;
+        m_screen.reset();
+        show(m_list.value_or(NetworkList()), m_options);
+    }
+
+private:
+    // An adapter that comes is asked for its list; all later lists come by themselves.
+    bool next() {
+        const auto event = m_port.next(Deadline::never());
+        if (event->id == contract::kCardPlugIn) m_port.tell(contract::kGetAllNetworkList);
+        if (event->id == contract::kCardPlugOut && m_screen) m_list.reset();
+        if (event->id == contract::kGetAllNetworkList) {
+            NetworkList list = networkList(payloadOf(*event));
+            if (list == m_list) return true;
+            m_list = std::move(list);
+            if (!m_screen && !m_options.json) std::cout << '\n';
+            if (!m_screen && !show(*m_list, m_options)) return false;
+        }
+        if (m_screen) draw();
+        return true;
+    }
+
+    void draw() {
+        auto lines = m_list ? linesOf(*m_list) : std::vector<std::string>{kNoAdapter};
+        lines.insert(lines.begin(),
+                     counted(m_list.value_or(NetworkList()).size(), "network") + "   (q or Ctrl-C ends)");
+        m_screen->show(std::move(lines));
+    }
+
+    HotspotPort& m_port;
+    std::optional<NetworkList> m_list;
+    const OutputOptions& m_options;
+    std::optional<ListScreen> m_screen;
+    std::optional<TerminalKeys> m_keys;
+};
 
 int runNetworks(const NetworksOptions& options) {
     Signals signals;
     HotspotPort port(options.hotspot.port.find(), signals, options.hotspot.limit());
     const auto list = askNetworks(port);
     if (!list && !options.watch) throw ClientError(kNoAdapter);
+    const bool isPicture = options.watch && isDrawn(options.hotspot);
     if (!list) std::cerr << "vexa: " << kNoAdapter << '\n';
-    if (list) show(*list, options.hotspot);
+    if (list && !isPicture && !show(*list, options.hotspot)) return kExitOk;
     if (list && list->empty() && !options.hotspot.json) explain(port, options.hotspot);
-    if (!options.watch) return kExitOk;
-    std::optional<TerminalKeys> keys;
-    if (TerminalKeys::isUsable()) port.endWith(keys.emplace());
-    try {
-        watch(port, list.value_or(NetworkList()), options.hotspot);
-    } catch (const StoppedByUser&) {  // that is how it ends
-    }
+    if (options.watch) Watch(port, list, options.hotspot).run();
     return kExitOk;
 }
 

@@ -13,6 +13,9 @@ namespace {
 
 constexpr const char* kMachineDescription = "Folder of the machine whose service is meant";
 
+constexpr const char* kSpectralName = "sa";
+constexpr const char* kHotspotName = "hs20";
+
 struct HalfNames {
     const char* option;
     const char* variable;
@@ -72,6 +75,21 @@ std::optional<MachineFolder> PortOption::machine() const try {
     return folder;
 } catch (const ClientError&) {  // nothing tells of a folder
     return std::nullopt;
+}
+
+void PortArgument::addTo(CLI::App& command) {
+    command
+        .add_option("PORT", m_given,
+                    "Port of the spectral analyser or of the hotspot half: a number, `sa` or `hs20`")
+        ->required()
+        ->check((CLI::IsMember({kSpectralName, kHotspotName}) | CLI::Range(1, 65535)).description(""));
+    PortOption::addBothTo(command, m_spectral, m_hotspot);
+}
+
+std::uint16_t PortArgument::find() const {
+    if (m_given == kSpectralName) return m_spectral.find();
+    if (m_given == kHotspotName) return m_hotspot.find();
+    return static_cast<std::uint16_t>(std::stoi(m_given));
 }
 
 }  // namespace vexa::client

@@ -41,4 +41,18 @@ private:
     std::string m_machine;
 };
 
+/// The port that a command is given as a number, or by the half whose port it is.
+class PortArgument {
+public:
+    void addTo(CLI::App& command);
+
+    /// As PortOption::find().
+    std::uint16_t find() const;
+
+private:
+    std::string m_given;
+    PortOption m_spectral{Half::Spectral};
+    PortOption m_hotspot{Half::Hotspot};
+};
+
 }  // namespace vexa::client

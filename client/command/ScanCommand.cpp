@@ -9,6 +9,7 @@
 #include "client/spectrum/SpectrumWatch.h"
 #include "client/terminal/ClientError.h"
 #include "client/terminal/EventLoop.h"
+#include "client/terminal/WaitNotice.h"
 
 namespace vexa::client {
 
@@ -38,10 +39,11 @@ public:
 
     /// To be called when the view has changed.
     void update(const SpectralView& view) {
-        const std::size_t known = view.knownChannels();
-        if (known == m_known) return;
-        m_known = known;
-        const bool all = view.hasChannelList() && known == view.channels().size();
+        const std::size_t current = view.currentChannels();
+        const std::size_t told = view.knownChannels() + current;
+        if (told == m_told) return;
+        m_told = told;
+        const bool all = view.hasChannelList() && current == view.channels().size();
         m_end = std::min(m_limit, Deadline::in(all ? kRestOfBurst : kQuietLimit));
     }
 
@@ -51,16 +53,28 @@ public:
 private:
     Deadline m_limit;
     Deadline m_end;
-    std::size_t m_known = 0;
+    std::size_t m_told = 0;
 };
+
+/// Throws ClientError if no value will come.
+void requireHope(const SpectralView& view) {
+    if (!view.hasChannelList() || view.knownChannels() > 0) return;
+    if (view.cardIn() == false) throw ClientError("the adapter was taken out");
+    if (view.radioOn() == false) throw ClientError("the radio is off, or no adapter is in");
+    if (view.channels().empty()) throw ClientError("the adapter tells of no channels");
+}
 
 void scanOnce(SpectralScan& scan, Signals& signals, seconds limit) {
     EventLoop loop(signals);
+    WaitNotice notice("values of the scan");
     Completeness completeness(limit);
     scan.start();
     while (!completeness.end().isOver()) {
-        if (!loop.wait(scan.polled(), completeness.end())) break;
+        if (!loop.wait(scan.polled(), std::min({completeness.end(), scan.wake(), notice.due()}))) break;
+        notice.tick();
+        scan.renew();
         if (!scan.process().empty()) completeness.update(scan.view());
+        requireHope(scan.view());
     }
     scan.stop();
 }

@@ -55,7 +55,7 @@ void addStartCommand(CLI::App& app, int& exitCode) {
         ->type_name("N");
     command
         ->add_option("--service", request.service,
-                     "The service's executable; default: the one beside this program")
+                     "The service's executable; default: the one that came with this program")
         ->type_name("PATH");
     command->add_flag("--stop-on-eof", options->stopOnEof, "Stop as well when standard input ends");
     options->output.addTo(

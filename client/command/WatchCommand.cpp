@@ -25,6 +25,7 @@ struct WatchOptions {
     PortOption hotspot{Half::Hotspot};
     int seconds = 0;
     bool json = false;
+    bool showPasswords = false;
 };
 
 void say(const char* half, const std::string& sentence) {
@@ -37,6 +38,7 @@ class Watch {
 public:
     explicit Watch(const WatchOptions& options)
         : m_options(options),
+          m_passwords(options.showPasswords ? Passwords::Shown : Passwords::Hidden),
           m_hotspot(options.hotspot.find()),
           m_spectral(options.spectral.find()),
           m_machine(options.hotspot.machine()),
@@ -59,7 +61,7 @@ private:
         m_hotspot.process();
         while (const auto text = m_hotspot.take()) {
             const auto event = parseEvent(*text);
-            if (m_options.json) std::cout << eventLine(*text) << '\n';
+            if (m_options.json) std::cout << eventLine(*text, m_passwords) << '\n';
             if (!event) continue;
             for (const std::string& sentence : m_narrator.tell(*event)) {
                 if (!m_options.json) say("hotspot ", sentence);
@@ -84,6 +86,7 @@ private:
     }
 
     const WatchOptions& m_options;
+    Passwords m_passwords;
     WebSocketClient m_hotspot;
     SpectralScan m_spectral;
     std::optional<MachineFolder> m_machine;
@@ -116,6 +119,7 @@ void addWatchCommand(CLI::App& app, int& exitCode) {
         ->type_name("SECONDS")
         ->check(CLI::Range(1, 86400));
     command->add_flag("--json", options->json, "Print JSON: an event a line");
+    command->add_flag("--show-passwords", options->showPasswords, "Show the passwords too, in JSON");
     command->callback([options, &exitCode] { exitCode = runWatch(*options); });
 }
 

@@ -10,6 +10,7 @@
 #include "client/machine/MachineRegistry.h"
 #include "client/port/EventLines.h"
 #include "client/port/JsonLine.h"
+#include "client/terminal/TerminalScreen.h"
 #include "client/terminal/Text.h"
 #include "contract/Ports.h"
 
@@ -69,10 +70,12 @@ void append(std::vector<std::string>& lines, const std::vector<std::string>& blo
 
 }  // namespace
 
-DemoStory::DemoStory(std::uint16_t port, const MachineFolder& machine, CredentialList stored)
+DemoStory::DemoStory(std::uint16_t port, const MachineFolder& machine, CredentialList stored,
+                     Passwords passwords)
     : m_client(port),
       m_narrator([machine] { return readConnectionMethod(machine); }),
       m_stored(std::move(stored)),
+      m_passwords(passwords),
       m_log(machine.dumpFolder()) {
     ask(HotspotNarrator::firstQuestions());
 }
@@ -96,7 +99,7 @@ void DemoStory::takeEvents(std::vector<Item>& items) {
         isAnything = true;
         const auto event = parseEvent(*text);
         if (!event) continue;
-        items.push_back({eventLine(*text), ""});
+        items.push_back({eventLine(*text, m_passwords), ""});
         tell(items, *event);
     }
     if (!isAnything) m_client.requireOpen();
@@ -153,7 +156,7 @@ void DemoStory::ask(const std::vector<const char*>& questions) {
 std::vector<std::string> DemoStory::opening(bool json) const {
     if (json) {
         Json::Value object(Json::objectValue);
-        object["credentials"] = credentialsJson(m_stored, Passwords::Hidden);
+        object["credentials"] = credentialsJson(m_stored, m_passwords);
         return {jsonLine(object)};
     }
     auto lines = credentialTable(m_stored, Passwords::Hidden);
@@ -167,7 +170,7 @@ std::vector<std::string> DemoStory::lines(const Room& room) const {
     if (room.screenRows >= kScreenRowsForCredentials) append(all, opening(false));
     append(all, networkTable(m_narrator.networks()));
     for (std::string& line : all)
-        line = cutToColumns(line, room.columns - 1);
+        line = cutToColumns(line, room.columns - 1, TerminalScreen::ellipsis());
     all.emplace_back();
     const int left = std::max(kFewestStoryRows, room.rows - static_cast<int>(all.size()));
     const std::size_t shown = std::min(m_lines.size(), static_cast<std::size_t>(left));
@@ -177,7 +180,7 @@ std::vector<std::string> DemoStory::lines(const Room& room) const {
 }
 
 std::string DemoStory::paint(const Line& line, const Room& room) const {
-    const std::string text = cutToColumns(line.text, room.columns - 1);
+    const std::string text = cutToColumns(line.text, room.columns - 1, TerminalScreen::ellipsis());
     const std::string colour = kColours[static_cast<std::size_t>(line.speaker)];
     return room.colour && !colour.empty() ? colour + text + kReset : text;
 }

@@ -5,6 +5,7 @@
 #include "client/hotspot/HotspotNarrator.h"
 #include "client/machine/LogFiles.h"
 #include "client/machine/MachineFolder.h"
+#include "client/port/Passwords.h"
 #include "client/port/WebSocketClient.h"
 #include "client/spectrum/SideShow.h"
 
@@ -15,7 +16,7 @@ namespace vexa::client {
 class DemoStory : public SideShow {
 public:
     /// Connects. Throws ClientError.
-    DemoStory(std::uint16_t port, const MachineFolder& machine, CredentialList stored);
+    DemoStory(std::uint16_t port, const MachineFolder& machine, CredentialList stored, Passwords passwords);
 
     Polled polled() const override { return m_client.polled(); }
     Deadline wake() const override;
@@ -43,6 +44,7 @@ private:
     WebSocketClient m_client;
     HotspotNarrator m_narrator;
     CredentialList m_stored;
+    Passwords m_passwords;
     LogFiles m_log;
     Deadline::Clock::time_point m_start = Deadline::Clock::now();
     Deadline m_nextLook = Deadline::in({});

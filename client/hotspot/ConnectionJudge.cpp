@@ -1,8 +1,10 @@
 #include "client/hotspot/ConnectionJudge.h"
-#include "contract/Ports.h"
 
 #include <algorithm>
 #include <utility>
+
+#include "client/terminal/Text.h"
+#include "contract/Ports.h"
 
 namespace vexa::client {
 
@@ -49,13 +51,31 @@ Outcome ConnectionJudge::apply(const Event& event, Time now) {
     return Outcome::Open;
 }
 
+std::string JoinJudge::waitedFor() const {
+    return inQuotes(network()) + " to be joined";
+}
+
 Outcome JoinJudge::judge(const NetworkList& list, const std::vector<Result>& results, Time now) {
     const Network* const wanted = findNetwork(list, network());
-    if (wanted == nullptr || !wanted->isConnected) return judgeAbsent(wanted != nullptr, results, now);
+    if (wanted == nullptr || !wanted->isConnected) {
+        const Outcome outcome = judgeAbsent(wanted != nullptr, results, now);
+        const bool isOver = isOvertaken(connectedNetwork(list), results, now);
+        return outcome == Outcome::Open && isOver ? Outcome::Overtaken : outcome;
+    }
     m_missingSince.reset();
     const bool isTold =
         std::any_of(results.begin(), results.end(), [](const Result& result) { return result.isSuccess; });
     return hasLasted(m_connectedSince, now) || isTold ? Outcome::Joined : Outcome::Open;
+}
+
+// The service keeps one request: that of another client takes the place of one that waits.
+bool JoinJudge::isOvertaken(const Network* connected, const std::vector<Result>& results, Time now) {
+    m_isOtherTold = connected != nullptr &&
+                    (m_isOtherTold || std::any_of(results.begin(), results.end(), [](const Result& result) {
+                         return result.isSuccess && result.isBehind;
+                     }));
+    if (!m_isOtherTold) m_otherSince.reset();
+    return m_isOtherTold && hasLasted(m_otherSince, now);
 }
 
 Outcome JoinJudge::judgeAbsent(bool isInList, const std::vector<Result>& results, Time now) {
@@ -74,6 +94,10 @@ Outcome JoinJudge::judgeFailure(bool isInList, const Result& result) {
     if (result.isReport) return result.isBehind ? Outcome::Refused : Outcome::Open;
     if (!isInList) return Outcome::OutOfRange;
     return result.isBehind ? Outcome::Open : Outcome::NotStarted;
+}
+
+std::string LeaveJudge::waitedFor() const {
+    return inQuotes(network()) + " to be left";
 }
 
 Outcome LeaveJudge::judge(const NetworkList& list, const std::vector<Result>& results, Time /*now*/) {

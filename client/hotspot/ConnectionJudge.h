@@ -20,6 +20,7 @@ enum class Outcome {
     Left,
     Ended,  // left before it was joined
     OutOfRange,
+    Overtaken,  // another network was joined instead, as somebody else has asked for
     RadioOff,
     AdapterOut
 };
@@ -41,6 +42,9 @@ public:
 
     /// The commands that have to be sent now, behind the request, or because of what was applied.
     std::vector<const char*> takeQuestions();
+
+    /// What is waited for, as in "the end of the connection".
+    virtual std::string waitedFor() const = 0;
 
     /// A list of networks, asked for, would tell more.
     virtual bool wantsLists() const = 0;
@@ -69,11 +73,13 @@ private:
 };
 
 /// Joined when the list marks the network as the connected one, and this is no passing moment; refused when
-/// the report of a failed attempt came behind the request.
+/// the report of a failed attempt came behind the request; overtaken when a success behind it was another's,
+/// and stays.
 class JoinJudge : public ConnectionJudge {
 public:
     using ConnectionJudge::ConnectionJudge;
 
+    std::string waitedFor() const override;
     bool wantsLists() const override { return true; }
 
 private:
@@ -81,8 +87,12 @@ private:
     Outcome judgeAbsent(bool isInList, const std::vector<Result>& results, Time now);
     static Outcome judgeFailure(bool isInList, const Result& result);
 
+    bool isOvertaken(const Network* connected, const std::vector<Result>& results, Time now);
+
     std::optional<Time> m_connectedSince;
     std::optional<Time> m_missingSince;
+    bool m_isOtherTold = false;
+    std::optional<Time> m_otherSince;
 };
 
 /// Left when the list does not mark the network any more. One that was not yet joined has ended when its
@@ -91,6 +101,8 @@ class LeaveJudge : public ConnectionJudge {
 public:
     LeaveJudge(std::string network, bool isConnected)
         : ConnectionJudge(std::move(network)), m_isConnected(isConnected) {}
+
+    std::string waitedFor() const override;
 
     /// The end of a connection brings a list by itself, the failure of an attempt does not.
     bool wantsLists() const override { return m_isConnected; }

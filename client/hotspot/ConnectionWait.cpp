@@ -5,6 +5,7 @@
 
 #include "client/hotspot/HotspotQuestions.h"
 #include "client/terminal/Text.h"
+#include "client/terminal/WaitNotice.h"
 #include "contract/Ports.h"
 
 namespace vexa::client {
@@ -28,17 +29,20 @@ struct Reason {
 };
 constexpr std::array kReasons{Reason{Outcome::NotStarted, false, "the service could not begin to join "},
                               Reason{Outcome::OutOfRange, true, " is out of range"},
+                              Reason{Outcome::Overtaken, true, ": another network was joined instead"},
                               Reason{Outcome::RadioOff, true, ": the radio was turned off"},
                               Reason{Outcome::AdapterOut, true, ": the adapter was taken out"}};
 
 }  // namespace
 
 Outcome awaitOutcome(HotspotPort& port, ConnectionJudge& judge, milliseconds limit) try {
+    WaitNotice notice(judge.waitedFor());
     const Deadline end = Deadline::in(limit);
     Deadline nextLook = Deadline::in(kBetweenLooks);
     ask(port, judge);
     while (true) {
-        const auto event = port.next(std::min(end, nextLook));
+        const auto event = port.next(std::min({end, nextLook, notice.due()}));
+        notice.tick();
         if (event) {
             const Outcome outcome = judge.apply(*event, Deadline::Clock::now());
             if (outcome != Outcome::Open) return outcome;

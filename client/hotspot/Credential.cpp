@@ -3,9 +3,11 @@
 #include <algorithm>
 #include <array>
 #include <charconv>
+#include <utility>
 
 #include "client/port/JsonLine.h"
 #include "client/terminal/ClientError.h"
+#include "client/terminal/Nearest.h"
 #include "client/terminal/Text.h"
 #include "text/Utf8.h"
 
@@ -63,6 +65,14 @@ std::optional<int> asId(const std::string& text) {
     return id;
 }
 
+std::string whyNotFound(const CredentialList& list, const std::string& given) {
+    std::vector<std::string> names;
+    for (const Credential& credential : list)
+        names.push_back(credential.name);
+    return "there is no credential " + inQuotes(given) +
+           (names.empty() ? "" : "; there is " + namesLike(std::move(names), given));
+}
+
 bool isControl(char character) {
     const auto byte = static_cast<unsigned char>(character);
     return byte < 0x20 || byte == 0x7F;
@@ -96,14 +106,24 @@ std::string methodName(const Credential& credential) {
 }
 
 const Credential& findCredential(const CredentialList& list, const std::string& idOrName) {
-    if (const auto id = asId(idOrName)) {
-        if (const auto* credential = findById(list, *id)) return *credential;
+    const auto id = asId(idOrName);
+    const Credential* const byId = id ? findById(list, *id) : nullptr;
+    if (byId == nullptr) return findNamed(list, idOrName);
+    for (const Credential& other : list) {
+        if (other.name == idOrName && other.id != byId->id)
+            throw ClientError(inQuotes(idOrName) + " is the id of credential " + inQuotes(byId->name) +
+                              " and the name of credential " + std::to_string(other.id) + ": give --id " +
+                              std::to_string(byId->id) + " or --id " + std::to_string(other.id));
     }
-    const auto hasName = [&](const Credential& credential) { return credential.name == idOrName; };
+    return *byId;
+}
+
+const Credential& findNamed(const CredentialList& list, const std::string& name) {
+    const auto hasName = [&](const Credential& credential) { return credential.name == name; };
     const auto first = std::find_if(list.begin(), list.end(), hasName);
-    if (first == list.end()) throw ClientError("there is no credential " + inQuotes(idOrName));
+    if (first == list.end()) throw ClientError(whyNotFound(list, name));
     if (std::find_if(first + 1, list.end(), hasName) != list.end())
-        throw ClientError("several credentials are named " + inQuotes(idOrName) + ": give an id");
+        throw ClientError("several credentials are named " + inQuotes(name) + ": give an id");
     return *first;
 }
 

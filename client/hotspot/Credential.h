@@ -47,9 +47,12 @@ std::string credentialData(const Credential& credential);
 /// "TTLS", "TLS", or the type's number where it is neither.
 std::string methodName(const Credential& credential);
 
-/// The only credential that is meant by an id or a name; an id goes before. Throws ClientError if there is
-/// none, or if several have the name.
+/// The only credential that is meant by an id or a name. Throws ClientError if there is none, or if several
+/// could be meant.
 const Credential& findCredential(const CredentialList& list, const std::string& idOrName);
+
+/// The only one of this name; throws likewise.
+const Credential& findNamed(const CredentialList& list, const std::string& name);
 
 /// Nothing if the list has no such id.
 const Credential* findById(const CredentialList& list, int id);

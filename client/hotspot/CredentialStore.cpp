@@ -47,20 +47,28 @@ const Credential* findAdded(const CredentialList& before, const CredentialList& 
     return found == after.end() ? nullptr : &*found;
 }
 
-/// Why the service does not take another one like this.
-std::string reasonAgainst(const CredentialList& list, const Credential& wanted) {
-    const std::string& name = wanted.name.empty() ? wanted.realm : wanted.name;
+/// Which other one has the realm for its method, or the name; `before`: what it was, and may stay.
+std::optional<std::string> clash(const CredentialList& list, const Credential& wanted,
+                                 const Credential& before = {}) {
+    const auto isOther = [&](const Credential& other) { return other.id != wanted.id; };
     for (const auto& other : list) {
-        if (other.type == wanted.type && other.realm == wanted.realm)
+        if (isOther(other) && other.type == wanted.type && other.realm == wanted.realm &&
+            wanted.realm != before.realm)
             return nameOf(other) + " is for " + methodName(other) + " and this realm already";
     }
     for (const auto& other : list) {
-        if (other.name == name) return "the name is taken by " + nameOf(other);
+        if (isOther(other) && other.name == wanted.name && wanted.name != before.name)
+            return "the name is taken by " + nameOf(other);
     }
-    return kUnknownReason;
+    return std::nullopt;
 }
 
 }  // namespace
+
+CredentialStore::CredentialStore(HotspotPort& port, const std::optional<MachineFolder>& machine)
+    : m_port(port) {
+    if (machine) m_file.emplace(*machine);
+}
 
 const CredentialList& CredentialStore::read() {
     const auto answer = m_port.question(contract::kGetAllCredentialList, acceptsAny);
@@ -74,6 +82,8 @@ const CredentialList& CredentialStore::reload() {
     const auto answer = m_port.ask(contract::kGetAllCredentialList, std::nullopt,
                                    contract::kGetAllCredentialList, [](const Json::Value&) { return false; });
     if (!answer.payload) throw ClientError(kNoList);
+    if (const auto objection = m_file ? m_file->objection() : std::nullopt)
+        throw ClientError("not read again: " + *objection + "; the service goes on with what it has");
     return m_list = credentialList(*answer.payload);
 }
 
@@ -82,11 +92,16 @@ const Credential& CredentialStore::add(const Credential& wanted) {
     const bool isMade =
         change(contract::kAddCredential, credentialData(wanted),
                [&](const CredentialList& after) { return findAdded(before, after, wanted) != nullptr; });
-    if (!isMade) throw ClientError("not stored: " + reasonAgainst(m_list, wanted));
+    if (!isMade)
+        throw ClientError("not stored: " + clash(m_list, asStored(wanted, {})).value_or(kUnknownReason));
     return *findAdded(before, m_list, wanted);
 }
 
+// The service would take it, and refuse the like when it is added.
 void CredentialStore::edit(const Credential& wanted) {
+    const Credential* const before = findById(m_list, wanted.id);
+    if (const auto reason = clash(m_list, wanted, before == nullptr ? wanted : *before))
+        throw ClientError("not changed: " + *reason);
     const bool isMade =
         change(contract::kEditCredential, credentialData(wanted), [&](const CredentialList& after) {
             const Credential* now = findById(after, wanted.id);
@@ -105,6 +120,7 @@ void CredentialStore::erase(int id) {
 }
 
 std::size_t CredentialStore::move(int id, std::size_t position) {
+    if (positionOf(m_list, id) == std::min(position, m_list.size())) return positionOf(m_list, id);
     const bool isMade = change(contract::kSetPositionCredential, positionData(id, position),
                                [&](const CredentialList& after) {
                                    return findById(after, id) != nullptr &&
@@ -117,6 +133,8 @@ std::size_t CredentialStore::move(int id, std::size_t position) {
 }
 
 bool CredentialStore::change(const std::string& command, const std::string& data, const Shows& shows) {
+    m_whyUnsaved.reset();
+    if (m_file) m_file->look();
     try {
         const auto answer =
             m_port.ask(command, data, contract::kGetAllCredentialList, [&](const Json::Value& payload) {
@@ -124,6 +142,7 @@ bool CredentialStore::change(const std::string& command, const std::string& data
                 return shows(m_list);
             });
         if (!answer.payload) throw ClientError(kNoList);
+        if (answer.isAccepted && m_file && !m_file->isWritten()) m_whyUnsaved = m_file->whyNotWritten();
         return answer.isAccepted;
     } catch (const StoppedByUser& error) {
         throw StoppedByUser(error.what() + std::string(kNotKnown));

@@ -6,12 +6,11 @@
 #include <vector>
 
 #include "client/hotspot/Credential.h"
+#include "client/port/Passwords.h"
 
 namespace vexa::client {
 
 // Credentials in words. Lines have no line end.
-
-enum class Passwords { Hidden, Shown };
 
 /// One row per credential in the order of priority; a heading first.
 std::vector<std::string> credentialTable(const CredentialList& list, Passwords passwords);

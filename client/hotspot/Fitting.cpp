@@ -4,19 +4,25 @@
 #include <iterator>
 
 #include "client/terminal/Text.h"
+#include "contract/Realm.h"
+#include "text/TextConversion.h"
 
 namespace vexa::client {
 
 namespace {
 
 bool isComplete(const Credential& credential) {
-    return credential.method != kMethodTtls || !(credential.username.empty() || credential.password.empty());
+    if (credential.method == kMethodTtls) return !credential.username.empty() && !credential.password.empty();
+    return credential.method == kMethodTls;
 }
 
+// A realm of a network that is UTF-8 is told as it is; of another one we don't know the bytes, and claim
+// nothing.
 bool fits(const Credential& credential, const Network& network) {
-    const Network::Realm wanted{credential.method, credential.realm};
-    return isComplete(credential) &&
-           std::find(network.realms.begin(), network.realms.end(), wanted) != network.realms.end();
+    const auto realm = contract::realmBytes(wideFromUtf8(credential.realm));
+    if (!realm || realm->empty() || !isComplete(credential)) return false;
+    const Network::Realm wanted{credential.method, *realm};
+    return std::find(network.realms.begin(), network.realms.end(), wanted) != network.realms.end();
 }
 
 }  // namespace

@@ -2,9 +2,11 @@
 
 #include <algorithm>
 #include <array>
+#include <utility>
 
 #include "client/hotspot/Credential.h"
 #include "client/port/JsonLine.h"
+#include "client/terminal/Nearest.h"
 #include "client/terminal/Text.h"
 
 namespace vexa::client {
@@ -84,11 +86,25 @@ const Network* findNetwork(const NetworkList& list, const std::string& name) {
     return found == list.end() ? nullptr : &*found;
 }
 
+const Network* networkMeant(const NetworkList& list, const std::string& given) {
+    if (const Network* const named = findNetwork(list, given)) return named;
+    const auto found = std::find_if(list.begin(), list.end(),
+                                    [&](const Network& network) { return printable(network.name) == given; });
+    return found == list.end() ? nullptr : &*found;
+}
+
 std::string namesOf(const NetworkList& list) {
     std::string names;
     for (const Network& network : list)
         names += (names.empty() ? "" : ", ") + inQuotes(network.name);
     return names;
+}
+
+std::string namesLike(const NetworkList& list, const std::string& given) {
+    std::vector<std::string> names;
+    for (const Network& network : list)
+        names.push_back(network.name);
+    return namesLike(std::move(names), given);
 }
 
 std::string networkData(const std::string& name) {
@@ -106,10 +122,10 @@ std::string realmsText(const Network& network) {
 }
 
 std::vector<std::string> networkTable(const NetworkList& list) {
-    std::vector<std::vector<std::string>> rows{{"Network", "Connected", "Internet", "Realms"}};
+    std::vector<std::vector<std::string>> rows{{" ", "Network", "Connected", "Internet", "Realms"}};
     for (const auto& network : list)
-        rows.push_back({network.name, network.isConnected ? "yes" : "no", internetName(network.internet),
-                        realmsText(network)});
+        rows.push_back({network.isConnected ? "*" : "", network.name, network.isConnected ? "yes" : "no",
+                        internetName(network.internet), realmsText(network)});
     return alignedLines(rows);
 }
 

@@ -39,8 +39,15 @@ const Network* connectedNetwork(const NetworkList& list);
 /// Nothing if none has the name.
 const Network* findNetwork(const NetworkList& list, const std::string& name);
 
+/// The one that a user means by what he gives: its name, else the name as it is shown to him. Nothing if
+/// there is none.
+const Network* networkMeant(const NetworkList& list, const std::string& given);
+
 /// Their names in quotes; empty for none.
 std::string namesOf(const NetworkList& list);
+
+/// The three that look most like the given one, and how many more there are.
+std::string namesLike(const NetworkList& list, const std::string& given);
 
 /// The data of a command for the network of this name.
 std::string networkData(const std::string& name);
@@ -48,7 +55,7 @@ std::string networkData(const std::string& name);
 /// Its realms with their methods, in words.
 std::string realmsText(const Network& network);
 
-/// One row per network; a heading first. Lines have no line end.
+/// One row per network, the connected one behind a star; a heading first. Lines have no line end.
 std::vector<std::string> networkTable(const NetworkList& list);
 
 Json::Value networksJson(const NetworkList& list);

@@ -3,9 +3,11 @@
 #include <algorithm>
 #include <fstream>
 #include <iterator>
+#include <string_view>
 #include <tuple>
 #include <utility>
 
+#include "client/port/Passwords.h"
 #include "client/terminal/Text.h"
 
 namespace vexa::client {
@@ -13,6 +15,8 @@ namespace vexa::client {
 namespace fs = std::filesystem;
 
 namespace {
+
+constexpr std::uintmax_t kBlock = 65536;
 
 struct Found {
     fs::file_time_type time;
@@ -31,6 +35,33 @@ std::string readFrom(const fs::path& path, std::uintmax_t offset) {
     return {std::istreambuf_iterator<char>(file), std::istreambuf_iterator<char>()};
 }
 
+/// Where the last lines of a file begin, so many of them at most, and how many these are. Reads from its end.
+struct LastLines {
+    std::uintmax_t begin = 0;
+    std::size_t count = 0;
+};
+
+LastLines findLastLines(const fs::path& path, std::size_t wanted) {
+    std::error_code error;
+    std::ifstream file(path, std::ios::binary);
+    std::uintmax_t left = fs::file_size(path, error);
+    if (error || !file) return {};
+    LastLines found;
+    std::string block;
+    while (left > 0) {
+        block.resize(static_cast<std::size_t>(std::min<std::uintmax_t>(left, kBlock)));
+        left -= block.size();
+        file.seekg(static_cast<std::streamoff>(left));
+        if (!file.read(block.data(), static_cast<std::streamsize>(block.size()))) return {};
+        std::string_view before = block;
+        for (std::size_t end = 0; (end = before.rfind('\n')) != before.npos; before = before.substr(0, end)) {
+            if (found.count == wanted) return {left + end + 1, wanted};
+            ++found.count;
+        }
+    }
+    return found;
+}
+
 /// Windows ends a line with two characters.
 std::string withoutCarriageReturn(std::string line) {
     if (line.ends_with('\r')) line.pop_back();
@@ -41,6 +72,15 @@ std::string withoutCarriageReturn(std::string line) {
 
 bool LogFiles::any() const {
     return !filesByTime().empty();
+}
+
+void LogFiles::skipToLast(std::size_t lines) {
+    const auto files = filesByTime();
+    for (auto path = files.rbegin(); path != files.rend(); ++path) {
+        const LastLines last = findLastLines(*path, lines);
+        m_places[path->filename().string()] = {last.begin, ""};
+        lines -= last.count;
+    }
 }
 
 std::vector<LogFiles::Line> LogFiles::takeLines() {
@@ -71,6 +111,20 @@ std::vector<LogFiles::Line> LogFiles::takeRest() {
     return lines;
 }
 
+std::vector<std::string> LogFiles::lastLines(std::uintmax_t bytes, fs::file_time_type since) const {
+    std::vector<std::string> lines;
+    const auto paths = filesByTime();
+    std::error_code error;
+    if (paths.empty() || fs::last_write_time(paths.back(), error) < since) return lines;
+    const std::uintmax_t size = fs::file_size(paths.back(), error);
+    if (error) return lines;
+    const std::string text = readFrom(paths.back(), size > bytes ? size - bytes : 0);
+    std::size_t begin = size > bytes ? text.find('\n') + 1 : 0;
+    for (std::size_t end = 0; (end = text.find('\n', begin)) != std::string::npos; begin = end + 1)
+        lines.push_back(withoutCarriageReturn(text.substr(begin, end - begin)));
+    return lines;
+}
+
 std::vector<fs::path> LogFiles::filesByTime() const {
     std::vector<Found> found;
     std::error_code error;
@@ -87,6 +141,14 @@ std::vector<fs::path> LogFiles::filesByTime() const {
     for (Found& file : found)
         paths.push_back(std::move(file.path));
     return paths;
+}
+
+// The password stands last, and may hold anything.
+std::string withoutPassword(std::string line) {
+    constexpr std::string_view kBefore = ", password=";
+    const std::size_t found = line.find(kBefore);
+    if (found == std::string::npos) return line;
+    return line.replace(found + kBefore.size(), std::string::npos, kHiddenPassword);
 }
 
 Json::Value lineJson(const LogFiles::Line& line) {

@@ -2,6 +2,7 @@
 
 #include <json/value.h>
 
+#include <cstddef>
 #include <cstdint>
 #include <filesystem>
 #include <map>
@@ -24,11 +25,18 @@ public:
     /// Whether there is any file.
     bool any() const;
 
+    /// Passes over what is there now but for so many whole lines at its end, which are read next with what
+    /// has no line end yet. What is passed over is not read.
+    void skipToLast(std::size_t lines);
+
     /// The whole lines that are new: file by file, the one that was written last at the end.
     std::vector<Line> takeLines();
 
     /// What the files end with and no line end follows yet.
     std::vector<Line> takeRest();
+
+    /// The whole lines in the last bytes of the file that was written last; none if that was before `since`.
+    std::vector<std::string> lastLines(std::uintmax_t bytes, std::filesystem::file_time_type since) const;
 
 private:
     struct Place {
@@ -41,6 +49,9 @@ private:
     std::filesystem::path m_folder;
     std::map<std::string, Place> m_places;
 };
+
+/// The line without the password that it may tell.
+std::string withoutPassword(std::string line);
 
 /// The line as a JSON object.
 Json::Value lineJson(const LogFiles::Line& line);

@@ -9,4 +9,8 @@ namespace vexa::client {
 /// cannot be written.
 bool replaceOwnerFile(const std::filesystem::path& file, const std::string& text);
 
+/// A new file with this text, readable by its owner only wherever it stands; nothing is left of it if it
+/// cannot be written. Throws ClientError, also where there is one already, or a link of the name.
+void createOwnerFile(const std::filesystem::path& file, const std::string& text);
+
 }  // namespace vexa::client

@@ -13,7 +13,7 @@ struct StartRequest;
 /// There may be several machines, each simulated in a folder of its own; otherwise there is this one.
 bool hasSimulatedMachines();
 
-/// The service's executable beside this program.
+/// The service's executable beside this program, or where it was installed together with it.
 std::filesystem::path serviceBesideThis();
 
 /// From now on this process finds the named mutexes of that machine.

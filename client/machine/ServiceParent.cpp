@@ -7,6 +7,7 @@
 #include "client/machine/ServiceHost.h"
 #include "client/machine/ServiceProcess.h"
 #include "client/terminal/ClientError.h"
+#include "client/terminal/WaitNotice.h"
 #include "contract/Process.h"
 
 namespace vexa::client {
@@ -26,6 +27,8 @@ constexpr seconds kGiveUpLimit{2};
 // Its ports or its configuration: it does not say which.
 constexpr int kServiceFailed = 1;
 constexpr int kScenarioRefused = 2;
+constexpr int kSignalBase = 128;
+constexpr int kLastSignal = 64;
 
 fs::path servicePath(const std::string& given) {
     return given.empty() ? serviceBesideThis() : fs::absolute(given);
@@ -35,6 +38,24 @@ std::set<std::uint16_t> wantedPorts(const ServicePorts& ports) {
     std::set<std::uint16_t> wanted{ports.sa, ports.hs20, ports.control};
     wanted.erase(0);
     return wanted;
+}
+
+// The service takes one port for both of its halves, and one of them has none then.
+void checkPorts(const StartRequest& request) {
+    const std::uint16_t control = request.controlPort.value_or(0);
+    if (control != 0 && (control == request.saPort || control == request.hs20Port))
+        throw ClientError("the control channel needs a port of its own, not " + std::to_string(control),
+                          kExitWrongUse);
+    if (request.saPort != 0 && request.saPort == request.hs20Port)
+        std::cerr << "vexa: both halves have the port " << request.saPort
+                  << ": the spectral analyser cannot be reached\n";
+}
+
+// As the exit code tells it, see ServiceProcess::exitCode().
+std::string endOf(int exitCode) {
+    const int signal = exitCode - kSignalBase;
+    return signal > 0 && signal <= kLastSignal ? "was killed by signal " + std::to_string(signal)
+                                               : "ended with exit code " + std::to_string(exitCode);
 }
 
 std::string portNames(const ServicePorts& ports) {
@@ -48,6 +69,7 @@ std::string portNames(const ServicePorts& ports) {
 
 ServiceParent::ServiceParent(const StartRequest& request, StopSource& stop)
     : m_stop(stop), m_folder(request.machine) {
+    checkPorts(request);
     m_folder.create();
     takeMutex();
     choosePorts(request);
@@ -100,6 +122,7 @@ void ServiceParent::start(const StartRequest& request) {
 
 ServiceParent::State ServiceParent::waitUntilReady() {
     const Deadline deadline = Deadline::in(kReadyLimit);
+    WaitNotice notice("the service to listen on its ports");
     for (milliseconds pause = kFirstCheck;; pause = std::min(pause + milliseconds(1), kLongestCheck)) {
         if (const auto code = m_process->exitCode()) {
             reportEarlyEnd(*code);
@@ -107,6 +130,7 @@ ServiceParent::State ServiceParent::waitUntilReady() {
         }
         if (portsListen()) break;
         if (deadline.isOver()) giveUp();
+        notice.tick();
         if (!m_stop.wait(Deadline::in(pause))) return State::StopRequested;
     }
     m_reserved.clear();
@@ -120,14 +144,19 @@ ServiceParent::State ServiceParent::waitForEnd() {
     while (!m_process->exitCode()) {
         if (!m_stop.wait(Deadline::never())) return State::StopRequested;
     }
+    std::cerr << "vexa: the service " << endOf(*m_process->exitCode()) << ", without being asked to stop\n";
     return State::Ended;
 }
 
 int ServiceParent::stop() {
+    const auto before = m_process->exitCode();
     letGo();
+    if (before) return *before;
     if (!waitForExit(kStopLimit)) {
         std::cerr << "vexa: the service did not stop within " << kStopLimit.count() << " s and was killed\n";
         m_process->kill();
+    } else if (const int code = *m_process->exitCode(); code != 0) {
+        std::cerr << "vexa: the service " << endOf(code) << " when it was asked to stop\n";
     }
     return m_process->exitCode().value_or(kExitFailed);
 }
@@ -193,8 +222,10 @@ bool ServiceParent::isOutputEmpty() const {
 
 void ServiceParent::reportEarlyEnd(int exitCode) const {
     if (exitCode == kScenarioRefused) return;  // it has said so itself
-    std::cerr << "vexa: the service ended with exit code " << exitCode << " before it was ready: ";
-    if (exitCode == 0) {
+    std::cerr << "vexa: the service " << endOf(exitCode) << " before it was ready: ";
+    if (exitCode > kSignalBase) {
+        std::cerr << "its output is in " << m_folder.outputFile().string() << '\n';
+    } else if (exitCode == 0) {
         std::cerr << "another one seems to run on the machine " << m_folder.path().string() << '\n';
     } else if (exitCode == kServiceFailed && !portIsBusy() && isOutputEmpty()) {
         std::cerr << "its configuration file " << m_folder.configFile().string() << " cannot be read\n";

@@ -37,7 +37,8 @@ class ServiceParent {
 public:
     enum class State { Ready, StopRequested, Ended };
 
-    /// Takes the mutex and starts the service. Throws ClientError. `stop` must outlive it.
+    /// Takes the mutex and starts the service. Throws ClientError; warns of one port for both halves. `stop`
+    /// must outlive it.
     ServiceParent(const StartRequest& request, StopSource& stop);
 
     /// Stops a service that still runs.
@@ -49,7 +50,7 @@ public:
     /// listens to nothing for ten seconds is stopped, and ClientError thrown.
     State waitUntilReady();
 
-    /// Returns when it is to stop, or when the service has ended.
+    /// Returns when it is to stop, or when the service has ended, which it says.
     State waitForEnd();
 
     /// Lets the service stop and waits for that; kills it if it takes too long. Gives the exit code.

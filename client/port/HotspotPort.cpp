@@ -14,6 +14,8 @@ constexpr milliseconds kFirstCheck{200};
 constexpr milliseconds kStartLimit{5000};
 constexpr milliseconds kGoodbyeLimit{2000};
 
+constexpr const char* kAnswer = "an answer of the service";
+
 std::string silenceText(milliseconds limit) {
     return "the service did not answer within " +
            std::to_string(std::chrono::ceil<std::chrono::seconds>(limit).count()) + " s";
@@ -31,12 +33,13 @@ HotspotPort::Answer HotspotPort::ask(const std::string& command, const std::opti
     const Deadline end = Deadline::in(m_limit);
     Deadline firstCheck = Deadline::in(kFirstCheck);
     Answer answer;
+    WaitNotice notice(kAnswer);
     const auto checkNow = [&] {
         sendCheck();
         firstCheck = end;
     };
     while (!m_checkpoints.isPassed()) {
-        const auto told = next(std::min(end, firstCheck));
+        const auto told = nextAnswer(std::min(end, firstCheck), notice);
         if (!told) {
             if (end.isOver()) throw NoAnswer(silenceText(m_limit));
             checkNow();
@@ -65,10 +68,18 @@ bool HotspotPort::hasAdapter() {
     m_checkpoints.begin();
     sendCheck();
     const Deadline end = Deadline::in(m_limit);
-    while (const auto told = next(end)) {
+    WaitNotice notice(kAnswer);
+    while (const auto told = nextAnswer(end, notice)) {
         if (m_checkpoints.take(*told)) return told->id == contract::kCardPlugIn;
     }
     throw NoAnswer(silenceText(m_limit));
+}
+
+std::optional<Event> HotspotPort::nextAnswer(Deadline deadline, WaitNotice& notice) {
+    auto told = next(std::min(deadline, notice.due()));
+    if (told || !(notice.due() < deadline)) return told;
+    notice.tick();
+    return next(deadline);
 }
 
 void HotspotPort::sendCheck() {

@@ -14,6 +14,7 @@
 #include "client/terminal/ClientError.h"
 #include "client/terminal/Deadline.h"
 #include "client/terminal/EventLoop.h"
+#include "client/terminal/WaitNotice.h"
 
 namespace vexa::client {
 
@@ -66,6 +67,7 @@ public:
 
 private:
     void sendCheck();
+    std::optional<Event> nextAnswer(Deadline deadline, WaitNotice& notice);
 
     WebSocketClient m_client;
     EventLoop m_loop;

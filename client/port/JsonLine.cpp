@@ -5,13 +5,15 @@
 
 #include <memory>
 
+#include "client/terminal/Text.h"
+
 namespace vexa::client {
 
 std::string jsonLine(const Json::Value& value) {
     Json::StreamWriterBuilder builder;
     builder["indentation"] = "";
     builder["emitUTF8"] = true;
-    return Json::writeString(builder, value);
+    return withoutHidden(Json::writeString(builder, value));
 }
 
 std::optional<Json::Value> parseJson(std::string_view text) {

@@ -14,6 +14,7 @@ namespace fs = std::filesystem;
 namespace {
 
 constexpr const char* kMachineVariable = "VEXA_MACHINE";
+constexpr const char* kService = "vexa-service";
 
 }  // namespace
 
@@ -21,8 +22,13 @@ bool hasSimulatedMachines() {
     return true;
 }
 
+// Where they were built it lies in this program's own folder, where they were installed among the programs
+// that nobody calls by name.
 fs::path serviceBesideThis() {
-    return fs::read_symlink("/proc/self/exe").parent_path() / "vexa-service";
+    const fs::path folder = fs::read_symlink("/proc/self/exe").parent_path();
+    const fs::path installed = folder.parent_path() / "libexec" / "vexa" / kService;
+    std::error_code ignored;
+    return fs::exists(installed, ignored) ? installed : folder / kService;
 }
 
 // The named mutexes live in the machine's folder.

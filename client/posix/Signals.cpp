@@ -18,9 +18,9 @@ struct Meaning {
     Signal signal;
 };
 
-constexpr std::array kMeanings{Meaning{SIGINT, Signal::Stop},    Meaning{SIGTERM, Signal::Stop},
-                               Meaning{SIGHUP, Signal::Stop},    Meaning{SIGQUIT, Signal::Stop},
-                               Meaning{SIGCHLD, Signal::Child},  Meaning{SIGTSTP, Signal::Suspend},
+constexpr std::array kMeanings{Meaning{SIGINT, Signal::Interrupt}, Meaning{SIGQUIT, Signal::Quit},
+                               Meaning{SIGHUP, Signal::HangUp},    Meaning{SIGTERM, Signal::Terminate},
+                               Meaning{SIGCHLD, Signal::Child},    Meaning{SIGTSTP, Signal::Suspend},
                                Meaning{SIGWINCH, Signal::Resize}};
 
 sigset_t handledSignals() {

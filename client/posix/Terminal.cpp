@@ -1,6 +1,7 @@
 #include "client/terminal/Terminal.h"
 
 #include <sys/ioctl.h>
+#include <sys/stat.h>
 #include <unistd.h>
 
 #include <algorithm>
@@ -22,6 +23,15 @@ std::string_view variable(const char* name) {
 
 bool isOutputTerminal() {
     return ::isatty(STDOUT_FILENO) != 0;
+}
+
+bool isErrorTerminal() {
+    return ::isatty(STDERR_FILENO) != 0;
+}
+
+bool isOutputPipe() {
+    struct stat status {};
+    return ::fstat(STDOUT_FILENO, &status) == 0 && (S_ISFIFO(status.st_mode) || S_ISSOCK(status.st_mode));
 }
 
 bool canPlaceCursor() {

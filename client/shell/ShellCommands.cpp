@@ -10,6 +10,7 @@
 #include "client/shell/ServiceNames.h"
 #include "client/shell/ShellFiles.h"
 #include "client/terminal/ClientError.h"
+#include "client/terminal/Text.h"
 
 namespace vexa::client {
 
@@ -25,7 +26,7 @@ void printManPage(const CLI::App& app, const std::vector<std::string>& words) {
         std::cout << manPage(program, *command) << std::flush;
         return;
     }
-    throw ClientError("there is no command " + path, kExitWrongUse);
+    throw ClientError("there is no command " + inQuotes(path), kExitWrongUse);
 }
 
 /// Nothing is cleaned up behind a question that is still open.

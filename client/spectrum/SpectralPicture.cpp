@@ -12,7 +12,7 @@ namespace vexa::client {
 namespace {
 
 constexpr int kTopValue = 100;
-constexpr int kColumnsWithoutBars = 29;
+constexpr int kColumnsWithoutBars = 22;
 constexpr int kShortestBar = 4;
 constexpr int kLongestBar = 40;
 constexpr int kEighths = 8;
@@ -74,13 +74,13 @@ std::string bar(int value, const Scale& scale, const PictureStyle& style) {
 
 std::string quantity(const SpectralView::Channel& channel, std::optional<int> value, const Scale& scale,
                      const PictureStyle& style) {
-    const int shown = value.value_or(0);
-    return bar(shown, scale, style) + rightAligned(channel.isKnown() ? std::to_string(shown) : "-", 4);
+    const auto certain = channel.certain(value);
+    return bar(certain.value_or(0), scale, style) + rightAligned(certain ? std::to_string(*certain) : "-", 4);
 }
 
 std::string heading(const PictureStyle& style) {
     std::ostringstream out;
-    out << "Channel  Order  " << std::left << std::setw(barLength(style) + 6) << "Congestion"
+    out << "Channel  " << std::left << std::setw(barLength(style) + 6) << "Congestion"
         << "Interference";
     return painted(out.str(), kBold, style);
 }
@@ -98,8 +98,7 @@ std::string status(const SpectralView& view) {
 std::vector<std::string> drawSpectrum(const SpectralView& view, const PictureStyle& style) {
     std::vector<std::string> lines{status(view), heading(style)};
     for (const auto& channel : view.channels()) {
-        lines.push_back(rightAligned(std::to_string(channel.number), 7) +
-                        rightAligned(std::to_string(channel.order), 7) + "  " +
+        lines.push_back(rightAligned(std::to_string(channel.number), 7) + "  " +
                         quantity(channel, channel.congestion, kCongestionScale, style) + "  " +
                         quantity(channel, channel.interference, kInterferenceScale, style));
     }

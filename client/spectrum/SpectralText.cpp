@@ -31,11 +31,13 @@ std::string describeChannels(const SpectralView& view) {
 }
 
 std::string valueText(const SpectralView::Channel& channel, std::optional<int> value) {
-    return channel.isKnown() ? std::to_string(value.value_or(0)) : "-";
+    const auto certain = channel.certain(value);
+    return certain ? std::to_string(*certain) : "-";
 }
 
 Json::Value valueJson(const SpectralView::Channel& channel, std::optional<int> value) {
-    return channel.isKnown() ? Json::Value(value.value_or(0)) : Json::Value();
+    const auto certain = channel.certain(value);
+    return certain ? Json::Value(*certain) : Json::Value();
 }
 
 }  // namespace
@@ -57,16 +59,15 @@ std::string describeEvent(const Event& event, const SpectralView::Update& update
     }
     if (event.id == contract::kCurrentChannelData)
         return event.data == "0" ? "connected on no channel" : "connected on channel " + event.data;
-    return event.data.empty() ? event.id : event.id + " " + event.data;
+    return printable(event.data.empty() ? event.id : event.id + " " + event.data);
 }
 
 std::vector<std::string> spectrumTable(const SpectralView& view) {
-    std::vector<std::string> lines{"Channel  Order  Congestion  Interference"};
+    std::vector<std::string> lines{"Channel  Congestion  Interference"};
     for (const auto& channel : view.channels()) {
         std::ostringstream line;
-        line << std::setw(7) << channel.number << std::setw(7) << channel.order << std::setw(12)
-             << valueText(channel, channel.congestion) << std::setw(14)
-             << valueText(channel, channel.interference);
+        line << std::setw(7) << channel.number << std::setw(12) << valueText(channel, channel.congestion)
+             << std::setw(14) << valueText(channel, channel.interference);
         lines.push_back(line.str());
     }
     return lines;

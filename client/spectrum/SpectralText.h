@@ -15,10 +15,10 @@ namespace vexa::client {
 /// One event, after it was applied to the view with this outcome.
 std::string describeEvent(const Event& event, const SpectralView::Update& update, const SpectralView& view);
 
-/// One row per channel: number, order, congestion, interference; a heading first.
+/// One row per channel: number, congestion, interference; a heading first.
 std::vector<std::string> spectrumTable(const SpectralView& view);
 
-/// The same as a JSON object.
+/// The same as a JSON object, with the order too.
 Json::Value spectrumJson(const SpectralView& view);
 
 /// What was seen: channels, events, the busiest channel.

@@ -9,8 +9,6 @@
 
 namespace vexa::client {
 
-namespace {}  // namespace
-
 SpectralView::Update SpectralView::apply(const Event& event) {
     ++m_eventCount;
     if (event.id == contract::kSampleDataCongestion) {
@@ -53,18 +51,17 @@ SpectralView::Update SpectralView::applySample(const std::string& data, const ch
     if (!sample || !(*sample)["order"].isInt() || !(*sample)[valueName].isInt()) return {};
     const Update update{change, (*sample)["order"].asInt(), (*sample)[valueName].asInt()};
     m_values[update.order].*value = update.value;
+    m_values[update.order].isCurrent = m_hasChannelList;
     return update;
 }
 
 std::vector<SpectralView::Channel> SpectralView::channels() const {
     std::vector<Channel> result;
     for (const Listed& listed : m_listed) {
-        Channel channel{listed.number, listed.order, std::nullopt, std::nullopt};
-        if (const auto found = m_values.find(listed.order); found != m_values.end()) {
-            channel.congestion = found->second.congestion;
-            channel.interference = found->second.interference;
-        }
-        result.push_back(channel);
+        const auto found = m_values.find(listed.order);
+        const Values values = found == m_values.end() ? Values() : found->second;
+        result.push_back(
+            {listed.number, listed.order, values.congestion, values.interference, values.isCurrent});
     }
     return result;
 }
@@ -81,6 +78,12 @@ std::size_t SpectralView::knownChannels() const {
     const auto all = channels();
     return static_cast<std::size_t>(
         std::count_if(all.begin(), all.end(), [](const Channel& channel) { return channel.isKnown(); }));
+}
+
+std::size_t SpectralView::currentChannels() const {
+    const auto all = channels();
+    return static_cast<std::size_t>(
+        std::count_if(all.begin(), all.end(), [](const Channel& channel) { return channel.isCurrent; }));
 }
 
 std::optional<int> SpectralView::numberOf(int order) const {

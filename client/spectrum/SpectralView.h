@@ -13,14 +13,18 @@ namespace vexa::client {
 /// What the spectral analyser has told so far. Pure: fed with events, asked for channels.
 class SpectralView {
 public:
-    /// A value that was never told has not changed from 0 if the other one of the channel was told.
     struct Channel {
         int number = 0;
         int order = 0;
         std::optional<int> congestion;
         std::optional<int> interference;
+        /// A value was told since the list. The service forgets all values with the list: one that was not
+        /// told then is 0. One that was told before says nothing of the other.
+        bool isCurrent = false;
 
         bool isKnown() const { return congestion || interference; }
+        /// What one of its values certainly is.
+        std::optional<int> certain(std::optional<int> value) const { return !value && isCurrent ? 0 : value; }
     };
 
     enum class Change { None, Radio, Card, ChannelList, Congestion, Interference };
@@ -44,6 +48,7 @@ public:
 
     bool hasChannelList() const { return m_hasChannelList; }
     std::size_t knownChannels() const;
+    std::size_t currentChannels() const;
     std::size_t eventCount() const { return m_eventCount; }
     std::optional<bool> radioOn() const { return m_radioOn; }
     std::optional<bool> cardIn() const { return m_cardIn; }
@@ -60,6 +65,7 @@ private:
     struct Values {
         std::optional<int> congestion;
         std::optional<int> interference;
+        bool isCurrent = false;
     };
 
     Update applyChannelList(const std::string& data);

@@ -65,6 +65,13 @@ void SpectrumOutput::showSide(const std::vector<SideShow::Item>& items) {
     std::cout << std::flush;
 }
 
+void SpectrumOutput::note(const std::string& sentence) {
+    if (sentence == m_note) return;
+    m_note = sentence;
+    m_changed = true;
+    if (!m_screen) std::cerr << "vexa: " << sentence << '\n';
+}
+
 void SpectrumOutput::printLine(const SpectralScan::Told& told, const SpectralView& view) const {
     if (m_form == Form::Json) {
         std::cout << eventLine(told.text) << '\n';
@@ -106,6 +113,7 @@ void SpectrumOutput::printSummary(const SpectralView& view) const {
 std::vector<std::string> SpectrumOutput::picture(const SpectralView& view) const {
     auto lines =
         drawSpectrum(view, {m_screen->columns(), TerminalScreen::wantsColour(), TerminalScreen::isUtf8()});
+    if (!m_note.empty()) lines.insert(lines.begin() + 1, cutToColumns(m_note, m_screen->columns() - 1));
     if (m_side == nullptr) return lines;
     const int left = m_screen->rows() - static_cast<int>(lines.size());
     const auto below =

@@ -25,6 +25,9 @@ public:
     /// What is told beside the spectrum.
     void showSide(const std::vector<SideShow::Item>& items);
 
+    /// Says this once: in the picture, or on standard error.
+    void note(const std::string& sentence);
+
     /// Draws what has changed, but not too often. Gives when it should be called again although nothing has
     /// happened.
     Deadline refresh(const SpectralView& view);
@@ -49,6 +52,7 @@ private:
     std::chrono::steady_clock::time_point m_start;
     Deadline m_nextDrawing = Deadline::in({});
     bool m_changed = true;
+    std::string m_note;
 };
 
 }  // namespace vexa::client

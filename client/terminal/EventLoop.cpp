@@ -5,6 +5,26 @@
 
 namespace vexa::client {
 
+namespace {
+
+/// As shells count them, on every system.
+int exitCodeOf(Signal signal) {
+    switch (signal) {
+        case Signal::HangUp:
+            return 129;
+        case Signal::Interrupt:
+            return 130;
+        case Signal::Quit:
+            return 131;
+        case Signal::Terminate:
+            return 143;
+        default:
+            return 0;
+    }
+}
+
+}  // namespace
+
 // What was found beside a signal is found again, unless it went while the process was suspended.
 bool EventLoop::wait(std::span<Polled> polled, Deadline deadline) {
     std::vector<Polled> watched{{m_signals.descriptor(), kReadable},
@@ -20,7 +40,10 @@ bool EventLoop::wait(std::span<Polled> polled, Deadline deadline) {
 
 bool EventLoop::takeSignals() {
     while (const auto signal = m_signals.take()) {
-        if (*signal == Signal::Stop) return false;
+        if (const int code = exitCodeOf(*signal); code != 0) {
+            s_stopCode = code;
+            return false;
+        }
         if (*signal == Signal::Suspend) suspend();
         if (*signal == Signal::Resize && m_terminal != nullptr) m_terminal->resized();
     }

@@ -31,12 +31,17 @@ public:
     /// The same for nothing but the user.
     bool wait(Deadline deadline) { return wait(std::span<Polled>(), deadline); }
 
+    /// The exit code of a command whose wait a signal has ended, in any loop: 128 and the number of the
+    /// signal, 130 for Ctrl-C. 0: none has.
+    static int stopCode() { return s_stopCode; }
+
 private:
     bool takeSignals();
     void suspend();
 
     Signals& m_signals;
     TerminalMode* m_terminal;
+    static inline int s_stopCode = 0;
 };
 
 }  // namespace vexa::client

@@ -1,5 +1,7 @@
 #include "client/terminal/InputLine.h"
 
+#include <array>
+
 #include "client/terminal/ClientError.h"
 #include "client/terminal/StandardInput.h"
 
@@ -25,6 +27,17 @@ std::optional<std::string> readLine(EventLoop& loop) {
     }
     if (line.ends_with('\r')) line.pop_back();
     return line;
+}
+
+std::string readToEnd(EventLoop& loop) {
+    std::string text;
+    std::array<char, 4096> buffer{};
+    while (true) {
+        waitForInput(loop);
+        const std::size_t count = readStandardInput(buffer);
+        if (count == 0) return text;
+        text.append(buffer.data(), count);
+    }
 }
 
 }  // namespace vexa::client

@@ -15,4 +15,7 @@ void waitForInput(EventLoop& loop);
 /// The next line of standard input, in bytes; nothing if the input ends before anything was read.
 std::optional<std::string> readLine(EventLoop& loop);
 
+/// All of standard input, in bytes.
+std::string readToEnd(EventLoop& loop);
+
 }  // namespace vexa::client

@@ -5,9 +5,9 @@
 
 namespace vexa::client {
 
-/// What the operating system tells a command: the user wants it to end, a child has ended, the user wants it
-/// to pause, the terminal has another size.
-enum class Signal { Stop, Child, Suspend, Resize };
+/// What the operating system tells a command: one of four ways to ask for its end, of which the first is
+/// Ctrl-C; a child has ended, the user wants it to pause, the terminal has another size.
+enum class Signal { Interrupt, Quit, HangUp, Terminate, Child, Suspend, Resize };
 
 /// Turns the signals that concern a command into things to read. From construction on they interrupt nothing;
 /// whoever waits for descriptor() takes them one by one. One at a time exists in a process.

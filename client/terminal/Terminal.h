@@ -7,7 +7,13 @@ namespace vexa::client {
 /// Standard output goes to a terminal, of whatever kind.
 bool isOutputTerminal();
 
-/// It goes to one that can place a cursor.
+/// Standard error does.
+bool isErrorTerminal();
+
+/// Standard output goes to another process, which may read no more.
+bool isOutputPipe();
+
+/// Standard output goes to a terminal that can place a cursor.
 bool canPlaceCursor();
 
 /// It shows more than ASCII.

@@ -5,6 +5,7 @@
 #include <iostream>
 
 #include "client/terminal/Terminal.h"
+#include "client/terminal/Text.h"
 
 namespace vexa::client {
 
@@ -15,6 +16,11 @@ constexpr const char* kLeave = "\033[?7h\033[?25h\033[?1049l";
 constexpr const char* kHome = "\033[H";
 constexpr const char* kClearLine = "\033[K";
 constexpr const char* kClearBelow = "\033[J";
+
+std::string hiddenRows(std::size_t count, int columns) {
+    return cutToColumns(std::to_string(count) + " more; enlarge the window", columns,
+                        TerminalScreen::ellipsis());
+}
 
 }  // namespace
 
@@ -29,6 +35,10 @@ bool TerminalScreen::wantsColour() {
 
 bool TerminalScreen::isUtf8() {
     return showsUtf8();
+}
+
+const char* TerminalScreen::ellipsis() {
+    return isUtf8() ? "…" : "...";
 }
 
 TerminalScreen::TerminalScreen() {
@@ -55,12 +65,15 @@ void TerminalScreen::leave() {
 }
 
 void TerminalScreen::draw(const std::vector<std::string>& lines) {
-    const std::size_t fitting = std::min(lines.size(), static_cast<std::size_t>(m_rows));
+    const auto rows = static_cast<std::size_t>(m_rows);
+    const std::size_t fitting = lines.size() > rows ? rows - 1 : lines.size();
     std::string frame = kHome;
     for (std::size_t i = 0; i < fitting; ++i) {
         if (i > 0) frame += "\r\n";
         frame += lines[i] + kClearLine;
     }
+    if (fitting < lines.size())
+        frame += (fitting > 0 ? "\r\n" : "") + hiddenRows(lines.size() - fitting, m_columns) + kClearLine;
     std::cout << frame << kClearBelow << std::flush;
     m_needsDrawing = false;
 }

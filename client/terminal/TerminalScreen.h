@@ -19,6 +19,9 @@ public:
     /// The terminal shows more than ASCII.
     static bool isUtf8();
 
+    /// What stands for the rest of a line that is too long.
+    static const char* ellipsis();
+
     TerminalScreen();
     ~TerminalScreen() override;
 
@@ -28,7 +31,8 @@ public:
     int keyDescriptor() const override { return m_keys.keyDescriptor(); }
     bool takeQuit() override { return m_keys.takeQuit(); }
 
-    /// Shows these lines in place of the ones before; what does not fit is left out.
+    /// Shows these lines in place of the ones before. Where they are too many, the last row says how many do
+    /// not fit.
     void draw(const std::vector<std::string>& lines);
 
     /// What was drawn last stands there no more, or does not fit any more.

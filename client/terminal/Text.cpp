@@ -4,6 +4,7 @@
 #include <optional>
 
 #include "client/terminal/CharacterWidth.h"
+#include "client/terminal/HiddenCharacters.h"
 #include "text/Utf8.h"
 
 namespace vexa::client {
@@ -11,6 +12,8 @@ namespace vexa::client {
 namespace {
 
 constexpr std::size_t kColumnGap = 2;
+// What lies below is hidden by JSON's own rules.
+constexpr char32_t kDelete = 0x7F;
 
 /// The first character of the text, and what comes behind it; nothing at its end, and where none begins.
 std::optional<Utf8Character> takeCharacter(std::string_view& rest) {
@@ -21,13 +24,17 @@ std::optional<Utf8Character> takeCharacter(std::string_view& rest) {
     return character;
 }
 
-bool isControl(char32_t value) {
-    return value < 0x20 || (value >= 0x7F && value < 0xA0);
+std::string inHex(char32_t value, int digits) {
+    constexpr const char* kDigits = "0123456789abcdef";
+    std::string text;
+    for (int shift = 4 * (digits - 1); shift >= 0; shift -= 4)
+        text += kDigits[(value >> shift) & 0xFU];
+    return text;
 }
 
 std::string escaped(char32_t value) {
-    constexpr const char* kDigits = "0123456789abcdef";
-    return {'\\', 'x', kDigits[(value >> 4U) & 0xFU], kDigits[value & 0xFU]};
+    if (value < 0x100) return "\\x" + inHex(value, 2);
+    return value < 0x10000 ? "\\u" + inHex(value, 4) : "\\U" + inHex(value, 8);
 }
 
 }  // namespace
@@ -53,12 +60,28 @@ std::string printable(std::string_view text, Tabs tabs) {
     std::string shown;
     while (const auto character = takeCharacter(rest)) {
         const char32_t point = character->codePoint;
-        if (!isControl(point) || (point == U'\t' && tabs == Tabs::Kept))
+        if (!isHidden(point) || (point == U'\t' && tabs == Tabs::Kept))
             appendUtf8(shown, point);
         else
             shown += escaped(point);
     }
     return shown;
+}
+
+std::string withoutHidden(std::string_view json) {
+    std::string text;
+    while (!json.empty()) {
+        const Utf8Character character = firstUtf8Character(json);
+        const std::size_t length = std::max<std::size_t>(character.length, 1);
+        std::u16string units;
+        if (character.codePoint >= kDelete && isHidden(character.codePoint))
+            appendUtf16(units, character.codePoint);
+        for (const char16_t unit : units)
+            text += "\\u" + inHex(unit, 4);
+        if (units.empty()) text += json.substr(0, length);
+        json.remove_prefix(length);
+    }
+    return text;
 }
 
 int columnsOf(std::string_view text) {
@@ -68,14 +91,16 @@ int columnsOf(std::string_view text) {
     return columns;
 }
 
-std::string cutToColumns(std::string_view text, int columns) {
+std::string cutToColumns(std::string_view text, int columns, const std::string& ellipsis) {
+    if (columnsOf(text) <= columns) return std::string(text);
+    columns = std::max(columns - columnsOf(ellipsis), 0);
     std::string cut;
     while (const auto character = takeCharacter(text)) {
         columns -= characterWidth(character->codePoint);
         if (columns < 0) break;
         appendUtf8(cut, character->codePoint);
     }
-    return cut;
+    return cut + ellipsis;
 }
 
 std::string inQuotes(std::string_view text) {

@@ -15,14 +15,19 @@ std::string asUtf8(std::string_view text);
 
 enum class Tabs { Escaped, Kept };
 
-/// UTF-8 text that a terminal shows and that does nothing to it: control characters are written as \xNN.
+/// UTF-8 text that a terminal shows and that does nothing to it: hidden characters are written as \xNN,
+/// \uNNNN or \UNNNNNNNN.
 std::string printable(std::string_view text, Tabs tabs = Tabs::Escaped);
+
+/// The same JSON text on one line, its hidden characters in JSON's own notation.
+std::string withoutHidden(std::string_view json);
 
 /// How many columns of a terminal printable UTF-8 text takes.
 int columnsOf(std::string_view text);
 
-/// The longest beginning of printable UTF-8 text that fits into so many columns.
-std::string cutToColumns(std::string_view text, int columns);
+/// Printable UTF-8 text where it fits into so many columns; else the longest beginning that does with the
+/// ellipsis behind it.
+std::string cutToColumns(std::string_view text, int columns, const std::string& ellipsis);
 
 /// The text between double quotes.
 std::string inQuotes(std::string_view text);

@@ -31,8 +31,9 @@ Queue& queue() {
 // A window that is closed, and the end of the session, kill the process as soon as this returns: the command
 // gets what time there is to end in order.
 BOOL WINAPI onConsoleControl(DWORD type) {
-    raiseSignal(Signal::Stop);
-    if (type == CTRL_CLOSE_EVENT || type == CTRL_LOGOFF_EVENT || type == CTRL_SHUTDOWN_EVENT) Sleep(INFINITE);
+    const bool isKey = type == CTRL_C_EVENT || type == CTRL_BREAK_EVENT;
+    raiseSignal(isKey ? Signal::Interrupt : Signal::Terminate);
+    if (!isKey) Sleep(INFINITE);
     return TRUE;
 }
 

@@ -2,15 +2,36 @@
 
 #include <windows.h>
 
+#include <cstdlib>
+#include <string_view>
+
 namespace vexa::client {
 
-bool isOutputTerminal() {
+namespace {
+
+bool isConsole(DWORD stream) {
     DWORD mode = 0;
-    return GetConsoleMode(GetStdHandle(STD_OUTPUT_HANDLE), &mode) != 0;
+    return GetConsoleMode(GetStdHandle(stream), &mode) != 0;
+}
+
+}  // namespace
+
+bool isOutputTerminal() {
+    return isConsole(STD_OUTPUT_HANDLE);
+}
+
+bool isErrorTerminal() {
+    return isConsole(STD_ERROR_HANDLE);
+}
+
+bool isOutputPipe() {
+    return GetFileType(GetStdHandle(STD_OUTPUT_HANDLE)) == FILE_TYPE_PIPE;
 }
 
 // The entry has asked for it.
 bool canPlaceCursor() {
+    const char* const terminal = std::getenv("TERM");
+    if (terminal != nullptr && std::string_view(terminal) == "dumb") return false;
     DWORD mode = 0;
     return GetConsoleMode(GetStdHandle(STD_OUTPUT_HANDLE), &mode) != 0 &&
            (mode & ENABLE_VIRTUAL_TERMINAL_PROCESSING) != 0;

@@ -37,8 +37,7 @@ Config::FileLock Config::beginChange() {
     m_renamed.clear();
     ResultCode result = kFailure;
     auto content = readFile(result);
-    const bool isAsKnown = content == m_content && !m_bUnsaved;
-    if (!content || isAsKnown || openDocument(*content) != kSuccess) return held;
+    if (!content || *content == m_content || openDocument(*content) != kSuccess) return held;
     CredentialTable table;
     Reading stored{.table = table, .trace = Trace::No};
     if (!readSilently(stored)) return held;

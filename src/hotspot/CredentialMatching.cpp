@@ -5,28 +5,20 @@
 #include <utility>
 
 #include "base/DiagnosticLog.h"
+#include "contract/Realm.h"
 #include "text/TextConversion.h"
 
 namespace vexa {
 
 namespace {
 
-constexpr std::size_t kMaxNarrow = 255;
 constexpr std::byte kRoamingConsortiumElement{111};
 
 // A text that can't be converted counts as empty; one that is too long matches nothing.
 std::optional<std::string> narrowForMatch(const std::wstring& text) {
     const NarrowText narrow = narrowByLocale(text);
     if (!narrow.isComplete) return std::string();
-    return narrow.text.size() > kMaxNarrow ? std::nullopt : std::optional(narrow.text);
-}
-
-// A realm that can't be told is not empty: an access point of anybody's may announce an empty one, and would
-// be given the password.
-std::optional<std::string> narrowRealm(const std::wstring& realm) {
-    NarrowText narrow = narrowByLocale(realm);
-    if (!narrow.isComplete || narrow.text.size() > kMaxNarrow) return std::nullopt;
-    return std::move(narrow.text);
+    return narrow.text.size() > contract::kMostMatchedBytes ? std::nullopt : std::optional(narrow.text);
 }
 
 std::string_view textOf(Bytes bytes) {
@@ -67,7 +59,7 @@ bool isComplete(const Credential& credential) {
 
 CredentialMatcher::CredentialMatcher(const CredentialTable& table) {
     for (Credential* credential : table.copyCredentialPointers()) {
-        auto realm = credential->m_realm.empty() ? std::nullopt : narrowRealm(credential->m_realm);
+        auto realm = credential->m_realm.empty() ? std::nullopt : contract::realmBytes(credential->m_realm);
         if (realm) m_candidates.push_back({credential, std::move(*realm)});
     }
     for (std::size_t i = 0; i < m_candidates.size(); ++i)

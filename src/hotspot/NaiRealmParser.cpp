@@ -154,8 +154,8 @@ bool keep(std::string_view name, const std::vector<NaiRealmEap>& methods, RealmC
     return true;
 }
 
-// Names and methods multiply, so nothing here may take as long as there are pairs of them. A ";" that ends the
-// text is followed by no name.
+// Names and methods multiply, so nothing here may take as long as there are pairs of them. A ";" that ends
+// the text is followed by no name.
 void flatten(const NaiRealm& realm, RealmCollection& kept, std::size_t& complaints) {
     std::vector<NaiRealmEap> usable;
     std::copy_if(realm.eap.begin(), realm.eap.end(), std::back_inserter(usable), eapTypeOf);

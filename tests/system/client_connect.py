@@ -32,9 +32,9 @@ class ConnectStory(NetworkStory):
     def slowly(self):
         self.control.do("set", connectMs=SLOW_MS)
 
-    def attempt(self):
-        """`vexa connect` in the middle of an attempt that does not end by itself."""
-        self.control.do("set", connectMs=3600000)
+    def attempt(self, milliseconds=3600000):
+        """`vexa connect` in the middle of an attempt that does not end by itself, or takes so long."""
+        self.control.do("set", connectMs=milliseconds)
         before = self.requests()
         joining = self.running("connect", "Café", "--machine", self.machine.folder)
         wait_until(lambda: self.requests() > before, f"the attempt; {joining.lines} {joining.errors}")
@@ -87,10 +87,19 @@ class Joining(ConnectStory):
         self.assertEqual(self.requests(), 1)
         self.control.wait_connected("Café")
 
+    def test_a_name_that_can_not_be_typed(self):
+        self.control.do("addNetwork", network=network(3, "\u202eH", {"cafe.example": [21]}, accepts=ACCEPTS))
+        self.control.do("reportNetworks")
+        self.pocket(MANUAL)
+        for command, words in (("networks", ""), ("connect", "Connected to"), ("disconnect", "Left")):
+            told = self.done(command, *(["\\u202eH"] if words else []))
+            self.assertTrue(words in told and "\\u202eH" in told and "\u202e" not in told, told)
+        self.assertIn('"network":"\\u202eH"', self.done("connect", "\\u202eH", "--json"))
+
     def test_a_profile_of_the_system(self):
         self.control.do("setNetwork", bssid=HALL["bssid"], osProfile=True)
         self.control.do("reportNetworks")
-        self.assertIn('Connected to "Hall", with no credential of ours', self.done("connect", "Hall"))
+        self.assertIn('Connected to "Hall", with no credential of ours', self.done("connect", "Hall", "--anyway"))
         self.assertEqual(self.status()["possibleCredentials"], [])
         self.assertRegex(self.done("status"), r"Credential +none of ours")
 
@@ -98,18 +107,34 @@ class Joining(ConnectStory):
 class NotJoining(ConnectStory):
     def test_the_network_or_the_credential(self):
         self.assertEqual(
-            self.refused(1, "connect", "Hell"), 'vexa: no network "Hell" is in range; there is "Café", "Hall"'
+            self.refused(1, "connect", "Hell"), 'vexa: no network "Hell" is in range; there is "Hall", "Café"'
         )
         self.pocket(MANUAL, realm="other.example")
-        self.assertIn('no stored credential fits "Hall"', self.refused(1, "connect", "Hall", "--timeout", "2"))
+        anyway = self.refused(1, "connect", "Hall", "--anyway", "--timeout", "1")
+        self.assertIn('no stored credential fits "Hall", and the system did not join it', anyway)
         self.done("credential", "edit", "Pocket", "--realm", "hall.example")
         self.control.do("setNetwork", bssid=HALL["bssid"], accepts=[])
         self.assertEqual(self.refused(1, "connect", "Hall"), 'vexa: could not join "Hall" with "Pocket"')
 
-    def test_realms_that_are_not_known(self):
+    def test_a_connection_ends_only_for_one_that_has_a_chance(self):
         self.control.do("addNetwork", network=network(3, "Later", {}, anqp="never"))
-        self.control.do("reportNetworks")
-        self.assertIn('realms of "Later" are not known yet', self.refused(1, "connect", "Later", "--timeout", "1"))
+        self.control.do("addNetwork", network=network(4, "Umlaut", {"ä.example": [21]}))
+        wait_until(lambda: self.control.do("reportNetworks") or len(self.networks()) == 4, "both")
+        self.pocket(MANUAL)
+        self.add_user("Umlaut", MANUAL, realm="ä.example")
+        self.done("connect", "Café")
+        before = self.requests()
+        for name, told in (
+            ("Hall", 'no stored credential fits "Hall": with --anyway the system is asked to join it by itself'),
+            ("Umlaut", 'no stored credential fits "Umlaut": with --anyway the system is asked to join it by itself'),
+            ("Later", 'the realms of "Later" are not known yet'),
+        ):
+            self.assertEqual(self.refused(1, "connect", name), f"vexa: {told}")
+        self.assertEqual((self.requests(), self.control.connected()), (before, "Café"))
+        self.add_user("Hall", MANUAL, realm="hall.example", password="wrong")
+        self.control.do("setNetwork", bssid=HALL["bssid"], accepts=[])
+        told = 'vexa: could not join "Hall" with "Hall"; the connection to "Café" has ended'
+        self.assertEqual(self.refused(1, "connect", "Hall"), told)
 
     def test_what_keeps_it_from_the_start(self):
         self.done("disable")
@@ -136,7 +161,25 @@ class NotJoining(ConnectStory):
                 self.pocket(MANUAL)
                 joining = self.attempt()
                 end(joining)
-                self.assertEqual((joining.wait(), joining.lines, joining.errors), (1, [], [told]))
+                code = 130 if "not waited for" in told else 1
+                self.assertEqual((joining.wait(), joining.lines, joining.errors), (code, [], [told]))
+
+    def test_another_request_takes_its_place(self):
+        self.pocket(MANUAL)
+        self.add_user("Hall", MANUAL, realm="hall.example")
+        joining = self.attempt(SLOW_MS)
+        self.control.do("set", connectMs=100)
+        self.done("connect", "Hall", "--no-wait")
+        self.assertEqual((joining.wait(), joining.lines), (1, []))
+        self.assertEqual(joining.errors, ['vexa: "Café": another network was joined instead'])
+
+    def test_who_looks_on_is_told_what_is_waited_for(self):
+        self.pocket(MANUAL)
+        self.control.do("set", connectMs=3600000)
+        terminal = self.terminal("connect", "Café", "--machine", self.machine.folder)
+        terminal.read_until('vexa: waiting for "Café" to be joined; Ctrl-C ends it'.encode())
+        terminal.press(b"\x03")
+        self.assertEqual(terminal.finish(), 1)
 
     def test_too_slow(self):
         self.pocket(MANUAL)

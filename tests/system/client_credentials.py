@@ -29,7 +29,7 @@ class CredentialStory(Story):
 
 class Listing(CredentialStory):
     def test_the_table_is_in_the_order_of_priority(self):
-        self.assertEqual(self.done("credentials"), "No credentials are stored.\n")
+        self.assertEqual(self.done("credential", "list"), "No credentials are stored.\n")
         self.add_user("Lounge", "--no-auto-connect")
         self.add_certificate("Work", "--per-user", "--ca-cert", "Root", "--creator", "IT")
         heading, *rows = self.done("credentials").splitlines()
@@ -47,8 +47,10 @@ class Listing(CredentialStory):
 
     def test_passwords_show_only_when_asked_for(self):
         self.add_user("Lounge", password="gEh31m")
-        for command in ("credentials", "credentials --json", "credential edit Lounge --name B --json"):
+        asked = f"send {self.machine.hs20_port} GET_ALL_CREDENTIAL_LIST --wait 500"
+        for command in ("credentials", "credentials --json", "credential edit Lounge --name B --json", asked):
             self.assertNotIn("gEh31m", self.done(*command.split()))
+        self.assertIn("gEh31m", self.done(*asked.split(), "--show-passwords"))
         self.assertIn("gEh31m", self.done("credentials", "--show-passwords"))
         self.assertEqual(self.list("--show-passwords")[0]["password"], "gEh31m")
 
@@ -87,7 +89,7 @@ class Adding(CredentialStory):
              [*user, "--auto-connect", "--no-auto-connect"], [*tls, "--password-stdin"],
              *([*user, option, "x" * 128] for option in ("--realm", "--name")),
              *([*tls, option, text] for option in ("--client-cert", "--ca-cert") for text in ("x" * 128, "caf\udce9")),
-             *([*user, option, "x" * 64] for option in ("--username", "--creator"))),
+             *([*user, option, "x" * 64] for option in ("--username", "--creator")), [*self.USER, "空港"]),
             *((password, user) for password in ("p" * 64, "😀" * 32, "a\x1bb", "a\tb", "a\x7f")),
         ):  # fmt: skip
             for command in commands:
@@ -106,7 +108,8 @@ class Adding(CredentialStory):
     def test_any_text_is_stored_as_it_is(self):
         for text in ("空港ラウンジ", "<&>\"'", " blanks ", "😀" * 31 + "x", "-dash", "a;b%s", "0"):
             with self.subTest(text):
-                arguments = [f"--realm=r{text}", f"--name={text}", f"--username={text}", "--password-stdin", "--json"]
+                realm = "r" + text.encode("latin-1", "ignore").decode("latin-1")
+                arguments = [f"--realm={realm}", f"--name={text}", f"--username={text}", "--password-stdin", "--json"]
                 self.done("credential", "add", *arguments, stdin=text)
                 stored = self.list("--show-passwords")[0]
                 self.assertEqual([stored[k] for k in ("name", "username", "password")], [text] * 3)
@@ -166,10 +169,53 @@ class Changing(CredentialStory):
                 with self.subTest(arguments):
                     self.assertIn(which, self.refused(1, "credential", *arguments))
         self.assertEqual(self.names(), ["A", "B", "C"])
-        self.done("credential", "edit", "A", "--name", "B")
-        self.assertIn("several", self.refused(1, "credential", "delete", "B"))
-        self.done("credential", "edit", "C", "--name", "3")
-        self.assertIn('credential 3 "B"', self.done("credential", "delete", "3"), "an id goes before a name")
+
+    def test_who_could_be_two_is_not_guessed(self):
+        for part, told in ((("--name", "B"), "name is taken by"), (("--realm", "b"), "this realm already")):
+            line = self.refused(1, "credential", "edit", "A", *part)
+            self.assertRegex(line, 'not changed: .*credential 2 "B"')
+            self.assertIn(told, line)
+        self.assertIn("Changed", self.done("credential", "edit", "A", "--name", "A", "--realm", "a2"))
+        client = self.machine.hs20()
+        client.credentials("EDIT_CREDENTIAL", {**client.credentials()[0], "CredentialName": "B", "RealName": "b"})
+        self.done("credential", "edit", "--id", "3", "--no-auto-connect")
+        for arguments in (["delete", "B"], ["delete", "--name", "B"], ["move", "--name", "B", "1"]):
+            self.assertIn("several", self.refused(1, "credential", *arguments))
+        self.done("credential", "edit", "--id", "1", "--name", "3")
+        told = 'vexa: "3" is the id of credential "B" and the name of credential 1: give --id 3 or --id 1'
+        for arguments in (["delete", "3"], ["move", "3", "1"], ["edit", "3", "--name=x"]):
+            self.assertEqual(self.refused(1, "credential", *arguments), told)
+        for arguments in (["delete"], ["delete", "3", "--id", "3"], ["move", "--id", "3"], ["move", "3", "--id", "3", "1"]):
+            self.refused(2, "credential", *arguments)
+        self.assertIn('credential 1 "3"', self.done("credential", "move", "--name", "3", "1"))
+        self.assertIn('credential 3 "B"', self.done("credential", "delete", "--id", "3"))
+
+    def test_what_does_not_get_into_the_file_is_told(self):
+        path, good = self.machine.config(), self.machine.config().read_bytes()
+
+        def cannot_write():
+            path.write_bytes(good)
+            self.control.do("fail", call="rename", error=112)
+
+        for why, spoil in (
+            ("could not be written", cannot_write),
+            ("is not well-formed XML", lambda: path.write_bytes(good[:-1])),
+            ("cannot be opened", path.unlink),
+        ):
+            for verb, name, *arguments in (
+                ("edited", "B", "edit", "B", "--no-auto-connect"), ("moved", "A", "move", "A", 3),
+                ("deleted", "C", "delete", "C"), ("added", "D", "add", *Adding.TLS[2:], "D"),
+            ):  # fmt: skip
+                with self.subTest((why, verb)):
+                    spoil() if path.exists() else None
+                    told = self.refused(1, "credential", *arguments, "--json")
+                    expected = rf'vexa: kept in memory only: credential \d "{name}" was {verb}, but {path} {why}'
+                    self.assertRegex(told, expected)
+            if spoil != cannot_write:
+                told = f"vexa: not read again: {path} {why}; the service goes on with what it has"
+                self.assertEqual(self.refused(1, "reload"), told)
+            path.write_bytes(good)
+            self.assertEqual(self.done("reload"), "The configuration was read again: 3 credentials.\n")
 
     def test_reload_takes_what_was_edited_by_hand(self):
         path = self.machine.config()

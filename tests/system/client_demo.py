@@ -63,6 +63,8 @@ class InPipe(DemoStory):
         self.assertEqual(demo.stop(signal.SIGINT), 0)
         stored, *events, summary = map(json.loads, demo.lines)
         self.assertIsInstance(summary["joined"], list)
+        self.assertNotIn("only for the demo", "".join(demo.lines))
+        self.assertIn("********", "".join(demo.lines))
         self.assertEqual([entry["name"] for entry in stored["credentials"]], STORED)
         sources = [event["Source"] for event in events]
         self.assertLessEqual(set(sources), {"SpectralAnalyser", "HotSpot20"})

@@ -4,8 +4,10 @@ import json
 import os
 import pathlib
 import re
+import resource
 import signal
 import time
+import unicodedata
 
 from harness import STORE, Story, run_client, wait_until
 
@@ -46,7 +48,7 @@ class OfService(Story):
         machine.hs20().send("ANOTHER_COMMAND")
         follower.wait_line("ANOTHER_COMMAND")
         self.assertIn("ANOTHER_COMMAND", self.done("log"))
-        self.assertEqual(follower.stop(signal.SIGINT), 0)
+        self.assertEqual(follower.stop(signal.SIGINT), 130)
 
     def test_a_log_that_is_off_is_told(self):
         self.start(config=config("false"))
@@ -89,17 +91,48 @@ class OfFiles(Story):
         self.write("hs20log_user_1.txt", "first\n", age=9)
         (self.folder / STORE / "Dump" / "folder").mkdir()
         self.assertEqual(self.lines(), ["first", "second", "third", "fourth", "last, without an end"])
-        self.assertEqual(self.lines("-n", "2"), ["fourth", "last, without an end"])
-        self.assertEqual(self.lines("-n", "99"), self.lines())
-        self.assertEqual(self.lines("--lines", "0"), [])
-        entries = list(map(json.loads, self.lines("--json", "-n", "3")))
+        self.write("hs20log_user_2.txt", "x" * 70000 + "\n", age=20)
+        self.write("hs20log_user_3.txt", "rest", age=30)
+        lines = self.lines()
+        for count in range(len(lines) + 2):
+            self.assertEqual(self.lines("--lines", str(count)), lines[-count:] if count else [], count)
+        entries = list(map(json.loads, self.lines("--json", "-n", "4")))
         self.assertEqual(entries[0], {"file": "hs20log_user_10.txt", "line": "third"})
+
+    def test_of_a_long_log_its_end_alone_is_read(self):
+        self.set_config("true")
+        self.write("a.txt", "")
+        os.truncate(self.folder / STORE / "Dump" / "a.txt", 1 << 28)
+        self.write("a.txt", "\none\ntwo\n")
+        self.assertEqual(self.lines("-n", "2"), ["one", "two"])
+        self.assertLess(resource.getrusage(resource.RUSAGE_CHILDREN).ru_maxrss, 1 << 18, "KiB, as much as it holds")
 
     def test_bytes_of_any_kind_become_text(self):
         self.set_config("true")
         self.write("a.txt", b"caf\xe9\nsnow \xe2\x98\x83\nred \x1b[31m\ttab\n")
-        self.assertEqual(self.lines(), ["café", "snow ☃", "red \\x1b[31m\ttab"])
-        self.assertEqual(json.loads(self.lines("--json")[2])["line"], "red \x1b[31m\ttab")
+        hidden = [c for c in map(chr, range(127, 0x110000)) if unicodedata.category(c) in ("Cc", "Cf", "Zl", "Zp")]
+        self.write("a.txt", "".join(c + "\n" for c in hidden))
+        told = self.vexa("log").stdout.split("\n")[:-1]
+        self.assertEqual(told[:3], ["café", "snow ☃", "red \\x1b[31m\ttab"])
+        escapes = [repr(c)[1:-1] for c in hidden]
+        self.assertEqual((told[3:], escapes[-1]), (escapes, "\\U000e007f"))
+        told = self.vexa("log", "--json").stdout.split("\n")[2:-1]
+        self.assertEqual([json.loads(line)["line"] for line in told], ["red \x1b[31m\ttab", *hidden])
+        self.assertTrue(all(map(str.isascii, told)), told)
+
+    def test_passwords_show_where_nobody_looks_on_or_when_asked_for(self):
+        self.set_config("true")
+        self.write("a.txt", "[7] 05/17 06:32:17  \tUsername=anna, password=gEh31m, 1\n")
+        hidden, shown = "anna, password=********", "anna, password=gEh31m, 1"
+        for runs in (lambda *options: self.lines(*options)[0], self.in_terminal):
+            for options, told in ((["--redact"], hidden), (["--redact", "--json"], hidden), (["--no-redact"], shown),
+                                  ([], hidden if runs == self.in_terminal else shown)):  # fmt: skip
+                self.assertRegex(runs(*options), re.escape(told) + r'"?}?\s*$', options)
+
+    def in_terminal(self, *options):
+        terminal = self.terminal("log", *options, "--machine", self.folder)
+        terminal.finish()
+        return terminal.screen.decode()
 
     def test_files_of_a_log_that_is_off_now_are_shown_with_a_word(self):
         self.set_config("false")
@@ -118,7 +151,7 @@ class OfFiles(Story):
         follower.wait_line("", count=3)
         told = [json.loads(line)["line"] for line in follower.lines]
         self.assertEqual((told[0], sorted(told[1:])), ("one", ["three", "two"]))
-        self.assertEqual(follower.stop(signal.SIGTERM), 0)
+        self.assertEqual(follower.stop(signal.SIGTERM), 143)
 
     def test_following_begins_with_the_last_lines(self):
         self.set_config("true")

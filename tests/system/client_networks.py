@@ -1,6 +1,7 @@
 """`vexa networks`, `status`, `enable`, `disable` and `refresh` on a running service."""
 
 import json
+import re
 import signal
 
 from client_credentials import CredentialStory
@@ -50,9 +51,9 @@ class Looking(NetworkStory):
         self.assertFalse(any(n["connected"] for n in networks))
         heading, first, second, third = self.done("networks").splitlines()
         self.assertEqual(heading.split(), ["Network", "Connected", "Internet", "Realms"])
-        self.assertRegex(first, r"^Airport Free  no +offered +.*roam\.example \(TTLS\)")
-        self.assertRegex(second, r"^Café +no +none +none$")
-        self.assertRegex(third, r"^Later +no +offered +not known yet$")
+        self.assertRegex(first, r"^   Airport Free  no +offered +.*roam\.example \(TTLS\)")
+        self.assertRegex(second, r"^   Café +no +none +none$")
+        self.assertRegex(third, r"^   Later +no +offered +not known yet$")
 
     def test_a_connection_shows(self):
         self.hide(NETWORKS[2]["bssid"])  # one that never tells its realms keeps the service from joining any
@@ -60,9 +61,10 @@ class Looking(NetworkStory):
         wait_until(lambda: self.status()["credential"] == "Roam", "the connection with the credential's name")
         shown = [(n["name"], n["internet"]) for n in self.networks() if n["connected"]]
         self.assertEqual(shown, [("Airport Free", "reached")])
-        self.assertRegex(self.done("status"), r"Credential +Roam\n")
+        self.assertRegex(self.done("status"), r"Credential +Roam\n(.*\n)*Channel +36\n")
+        self.assertRegex(self.done("networks"), r"\n\*  Airport Free  yes .*\n   ")
         status = self.status()
-        self.assertEqual((status["connection"], status["internet"]), ("Airport Free", True))
+        self.assertEqual([status[k] for k in ("connection", "internet", "channel")], ["Airport Free", True, 36])
         self.control.do("setDns", dns=[])
         self.assertFalse(self.status()["internet"])
         self.assertEqual([n["internet"] for n in self.networks() if n["connected"]], ["missing"])
@@ -75,7 +77,21 @@ class Looking(NetworkStory):
         watch.wait_line("", count=2)
         names = [[n["name"] for n in json.loads(line)] for line in watch.lines]
         self.assertEqual(names, [["Airport Free", "Café", "Later"], ["Airport Free", "Later"]])
-        self.assertEqual((watch.stop(signal.SIGINT), watch.errors), (0, []))
+        self.assertEqual((watch.stop(signal.SIGINT), watch.errors), (130, []))
+
+    def test_in_a_terminal_the_list_is_drawn_anew(self):
+        for locale, rest in (("C.UTF-8", "…"), ("C", "...")):
+            command = "networks", "--watch", "--machine", self.machine.folder
+            terminal = self.terminal(*command, columns=99, rows=4, LC_ALL=locale)
+            terminal.read_until(rb"(?s)3 networks .*Airport Free.*2 more; enlarge the window\x1b")
+            terminal.resize(28, 6)
+            terminal.read_until(f"(?s)Airport Free +no +[a-z]*{re.escape(rest)}\x1b.*Later".encode())
+            self.hide(NETWORKS[1]["bssid"])
+            terminal.read_until(b"2 networks")
+            terminal.press(b"q")
+            self.assertEqual((terminal.finish(), terminal.last_line().split()[0]), (0, "Later"))
+            self.control.do("show", bssid=NETWORKS[1]["bssid"])
+            self.all_reported()
 
     def test_watching_waits_for_an_adapter(self):
         self.control.do("pullAdapter")
@@ -83,7 +99,7 @@ class Looking(NetworkStory):
         wait_until(lambda: watch.errors, "a word about the adapter")
         self.control.do("insertAdapter")
         wait_until(lambda: self.control.do("reportNetworks") or watch.lines, "a list")
-        self.assertEqual(watch.stop(signal.SIGTERM), 0)
+        self.assertEqual(watch.stop(signal.SIGTERM), 143)
 
     def test_why_there_are_none(self):
         def none_listed():
@@ -107,11 +123,14 @@ class Status(NetworkStory):
     def test_it_follows_what_happens(self):
         self.all_reported()
         expected = {"adapter": True, "radio": True, "hotspot": True, "networks": 3, "connection": None}
-        expected |= {"internet": False, "credential": None, "possibleCredentials": []}
+        expected |= {"internet": False, "credential": None, "possibleCredentials": [], "channel": 0}
+        expected |= {"ports": {"sa": self.machine.sa_port, "hs20": self.machine.hs20_port}}
+        expected |= {"machine": str(self.machine.folder), "version": self.done("--version").split()[1]}
         self.assertEqual(self.status(), expected)
         port = self.machine.hs20_port
         elsewhere = json.loads(self.done("status", "--json", "--hs20-port", port, VEXA_MACHINE="/nonexistent"))
-        self.assertIsNone(elsewhere["hotspot"], "the switch of a machine that is not known")
+        told = [elsewhere[k] for k in ("hotspot", "channel", "machine", "ports")]
+        self.assertEqual(told, [None, None, None, {"sa": None, "hs20": port}], "of a machine that is not known")
         self.control.do("radio", software="off")
         expected |= {"radio": False, "networks": 0}
         self.assertEqual(self.status(), expected)
@@ -121,7 +140,8 @@ class Status(NetworkStory):
     def test_in_words(self):
         words = [line.split()[:2] for line in self.done("status").splitlines()]
         self.assertEqual(words[:3], [["Adapter", "in"], ["Radio", "on"], ["Hotspot", "enabled"]])
-        self.assertEqual([name for name, _ in words[3:]], ["Networks", "Connection", "Credential", "Internet"])
+        names = ["Networks", "Connection", "Credential", "Internet", "Channel", "Ports", "Machine", "Version"]
+        self.assertEqual([name for name, _ in words[3:]], names)
 
 
 class Switching(NetworkStory):

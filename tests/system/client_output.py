@@ -48,12 +48,13 @@ class Forms(ConnectStory):
         folder = self.machine.folder / STORE / "Dump"
         folder.mkdir(parents=True, exist_ok=True)
         (folder / "log.txt").write_text("a line\nanother: line\n")
-        yield from ("status", "networks", "scan", "channels", "enable", "refresh", "watch --for 1", "log")
+        yield from ("status", "doctor", "networks", "scan", "channels", "enable", "refresh", "watch --for 1", "log")
         yield f"credential add --name A:\\ --realm r {PASSWORD}"
         yield f"credential add {CAFE_CARD} {MANUAL}"
         yield from ("credential edit 1 --name B:\\", "credential edit 1 --name B:\\", "credential move 1 1")
         yield from ("credentials", "credentials --show-passwords", "connect Café", "connect Café --no-wait", "status")
-        yield from ("networks", "disconnect", "credential delete 1", "reload", "disable")
+        yield from ("networks", "disconnect", "credential delete 1", "reload", "disable", "credential list")
+        yield from (f"credential export {folder}/own.json", f"credential import {folder}/own.json {PASSWORD}")
         yield f"send {self.machine.hs20_port} GET_IS_CARD_IN"
 
     def told_until_stopped(self):
@@ -95,7 +96,7 @@ class Forms(ConnectStory):
             ("networks --terse --fields realms,name", [f"{CAFE_REALMS}:Café", "b\\:c (TTLS), d (TLS):Gate\\: B\\\\2"]),
             ("networks --fields internet,name", ["Internet  Network", "offered   Café", "offered   Gate: B\\2"]),
             ("networks --json --fields name", ['[{"name":"Café"},{"name":"Gate: B\\\\2"}]']),
-            ("status --terse", ["yes:yes:yes:2::::no"]),
+            ("status --terse --fields networks,credential,ports.hs20", [f"2::{self.machine.hs20_port}"]),
             ("status --fields radio,connection", ["Radio       yes", "Connection  -"]),
             ("credentials --terse", ["1:1:cafe.example:cafe.example:TLS:all users:no:KORVANE-PC\\\\user::Anna:Root:"]),
             ("credential edit 1 --name B --json --fields credential.id,done", ['{"credential":{"id":1},"done":"edited"}']),

@@ -65,12 +65,12 @@ class PasswordStory(Story):
         for typed in (b"\x03", b"half a pass\x03"):
             terminal = self.asking()
             terminal.press(typed)
-            self.assert_end(terminal, 1, "stopped")
+            self.assert_end(terminal, 130, "stopped")
             self.assertNotIn(b"half", terminal.screen)
         for number in (signal.SIGTERM, signal.SIGHUP):
             terminal = self.asking()
             terminal.process.send_signal(number)
-            self.assert_end(terminal, 1, "stopped")
+            self.assert_end(terminal, 128 + number, "stopped")
 
     def test_a_suspended_one_gives_the_terminal_back_and_asks_again(self):
         terminal = self.asking()

@@ -100,4 +100,4 @@ class Pages(Story):
             text = pages["-".join(["vexa", *path.split()])].read_text()
             self.assertIn("\\-\\-" + option.replace("-", "\\-"), text, path)
         self.assertEqual(self.done("man", "credential", "add", VEXA_MACHINE=None), pages["vexa-credential-add"].read_text())
-        self.assertIn("no command nonsense", self.refused(2, "man", "nonsense", VEXA_MACHINE=None))
+        self.assertIn('no command "nonsense"', self.refused(2, "man", "nonsense", VEXA_MACHINE=None))

@@ -1,6 +1,7 @@
 """`vexa start`: the parent of a service; and wrong use of any command."""
 
 import json
+import os
 import signal
 import socket
 import stat
@@ -34,6 +35,12 @@ class RunningService(Story):
         self.assertEqual([machine.sa_port, machine.hs20_port], ports)
         for port in ports:
             self.assertIn(f"port={port}\n", machine.output())
+
+    def test_a_service_that_is_killed_is_told(self):
+        machine = self.start()
+        os.kill(machine.service_pid(), signal.SIGKILL)
+        told = ["vexa: the service was killed by signal 9, without being asked to stop"]
+        self.assertEqual((machine.parent.wait(), machine.parent.errors), (128 + 9, told))
 
     def test_it_stops_with_its_input_and_opens_no_control_channel_if_asked_to(self):
         command = ["start", "--json", "--stop-on-eof", "--machine", self.new_folder()]
@@ -104,6 +111,8 @@ class ServiceThatDoesNotCome(Story):
         for code in (0, 1, 77):
             with self.subTest(code):
                 self.assert_ends(self.begin(*self.stand_in(f"exit {code}\n")), code, "vexa: ")
+        told = "killed by signal 9 before it was ready: its output is in"
+        self.assert_ends(self.begin(*self.stand_in("kill -9 $$\n")), 128 + 9, told)
         refusing = self.stand_in("echo speed: negative >&2\nexit 2\n")
         self.assert_ends(self.begin(*refusing), 2, "speed: negative")
         self.assert_ends(self.begin("--service", self.folder / "none"), 3, "vexa: ")
@@ -124,8 +133,8 @@ class ServiceThatDoesNotCome(Story):
         started = self.folder / "started"
         parent = self.begin(*self.stand_in(f'trap "exit 5" TERM\n: >"{started}"\nsleep 1\nexit 6\n'))
         wait_until(started.exists, "the start of the stand-in")
-        self.assertEqual(parent.stop(), 6)
-        self.assertEqual(parent.lines, [])
+        told = ["vexa: the service ended with exit code 6 when it was asked to stop"]
+        self.assertEqual((parent.stop(), parent.lines, parent.errors), (6, [], told))
 
     def test_it_inherits_neither_the_input_nor_the_mutex(self):
         seen = self.folder / "open"
@@ -144,6 +153,7 @@ class Use(Story):
         for command in (
             "", "nonsense", "start --sa-port 70000", "start --sa-port -1", "start --hs20-port abc",
             "start --control-port", "start extra", "demo --seconds 0", "scan --port 0", "scan --timeout no", "send",
+            *(f"start --{half}-port 9 --control-port 9" for half in ("sa", "hs20")),
             "send 80", "send 0 GET_RADIO", "listen", "listen 65536", "log -n", "log -n x", "log -n -1",
             "log --nonsense", "log more",
         ):  # fmt: skip

@@ -3,8 +3,9 @@
 import json
 import re
 import signal
+import subprocess
 
-from harness import Machine, Story, wait_until
+from harness import Machine, Story, clean_environment, program, run_client, wait_until
 
 LEVELS = {
     "1": {"congestion": 30, "power": 60, "spread": 0},
@@ -34,16 +35,28 @@ class WithService(Story):
         self.assertTrue(self.scan_requests(1))
         wait_until(lambda: self.scan_requests(0), "a stop request")
         heading, *rows = self.done("scan").splitlines()
-        self.assertEqual(heading.split(), ["Channel", "Order", "Congestion", "Interference"])
-        self.assertEqual([list(map(int, row.split())) for row in rows], [list(row.values()) for row in EXPECTED])
+        self.assertEqual(heading.split(), ["Channel", "Congestion", "Interference"])
+        wanted = [[row["channel"], row["congestion"], row["interference"]] for row in EXPECTED]
+        self.assertEqual([list(map(int, row.split())) for row in rows], wanted)
+        self.assertEqual(self.done("channels").split(), ["Channel", "1", "36", "149"])
 
     def test_watching_goes_on_until_it_is_asked_to_end(self):
         watch = self.running("scan", "--watch", "--machine", self.machine.folder)
         watch.wait_line("channel 36: congestion 70")
         self.control.do("levels", levels={"36": {"congestion": 0, "power": 96, "spread": 0}})
         watch.wait_line("channel 36: congestion 28")
-        self.assertEqual(watch.stop(signal.SIGINT), 0)
+        self.assertEqual(watch.stop(signal.SIGINT), 130)
         wait_until(lambda: self.scan_requests(0), "a stop request")
+
+    def test_a_scan_that_another_client_has_stopped_is_asked_for_again(self):
+        watch = self.running("scan", "--watch", "--machine", self.machine.folder)
+        watch.wait_line("channel 36: congestion 70")
+        self.machine.sa().send("STOP_SCAN")
+        wait_until(lambda: self.scan_requests(0), "a stop request")
+        self.control.do("levels", levels={"36": {"congestion": 0, "power": 96, "spread": 0}})
+        watch.wait_line("channel 36: congestion 28")
+        (told,) = wait_until(lambda: watch.errors, "a word about it")
+        self.assertRegex(told, "another client may have stopped the scan")
 
     def test_the_port_can_come_from_option_environment_and_machine(self):
         port = str(self.machine.sa_port)
@@ -63,22 +76,33 @@ class WithService(Story):
         answer = self.done("send", self.machine.hs20_port, "GET_IS_CARD_IN", "--wait", 2000)
         events = list(map(json.loads, answer.splitlines()))
         self.assertEqual([(event["EventId"], event["Data"]) for event in events], [("CARD_PLUG_IN", "")])
-        self.assertEqual(self.done("send", self.machine.sa_port, "FULL_SCAN", "--wait", 0), "")
+        self.assertEqual(self.done("send", "sa", "FULL_SCAN", "--wait", 0), "")
         wait_until(lambda: self.scan_requests(1), "a scan request")
+        event = json.loads(self.done("send", "hs20", "SET_HOTSPOT_AUTO_CONNECT", "-", stdin="true").splitlines()[-1])
+        self.assertEqual((event["EventId"], event["Data"]), ("SET_HOTSPOT_AUTO_CONNECT", "true\n"))
+
+    def test_what_can_not_be_printed_has_failed(self):
+        environment = clean_environment(VEXA_MACHINE=str(self.machine.folder))
+        for command in ("status", "scan", "scan --watch", "channels --json", "networks", "networks --watch", "watch",
+                        "credentials", "send sa GET_CHANNEL_LIST", "--version", "scan --help"):  # fmt: skip
+            with self.subTest(command), open("/dev/full", "w") as full:
+                arguments = [program("vexa"), *command.split()]
+                told = subprocess.run(arguments, env=environment, stdout=full, stderr=subprocess.PIPE, timeout=60)
+                self.assertEqual((told.returncode, told.stderr), (1, b"vexa: standard output cannot be written\n"))
 
     def listener(self, *command):
         """It has heard something."""
-        listener = self.running(*command, self.machine.sa_port)
+        listener = self.running(*command, "--machine", self.machine.folder)
         wait_until(lambda: self.control.do("pullAdapter") or listener.lines, "an event")
         return listener
 
     def test_listening_shows_events_as_they_come(self):
-        listener = self.listener("listen")
+        listener = self.listener("listen", "sa")
         self.assertEqual(json.loads(listener.lines[0])["EventId"], "CARD_PLUG_OUT")
-        self.assertEqual(listener.stop(signal.SIGINT), 0)
+        self.assertEqual(listener.stop(signal.SIGINT), 130)
 
     def test_a_service_that_goes_is_told(self):
-        listeners = [self.listener("listen"), self.listener("scan", "--watch", "--sa-port")]
+        listeners = [self.listener("listen", "sa"), self.listener("scan", "--watch")]
         self.machine.stop()
         for listener in listeners:
             self.assertEqual(listener.wait(), 1)
@@ -86,13 +110,25 @@ class WithService(Story):
 
     def test_without_an_adapter_each_command_says_so_at_once(self):
         self.control.do("pullAdapter")
-        for command in ("credentials", "reload", "credential delete A", "networks", "enable", "disable", "refresh",
+        for command in ("scan", "credentials", "reload", "credential delete A", "networks", "enable", "disable", "refresh",
                         "credential add --realm r --method tls --client-cert c"):  # fmt: skip
             with self.subTest(command):
                 self.assertIn("no adapter", self.refused(1, *command.split(), "--timeout", "3600"))
 
 
 class WithoutService(Story):
+    def test_a_word_that_is_no_command_is_named(self):
+        for words, told in (
+            ("stauts", '"stauts": did you mean "status" or "start"?'),
+            ("help Netwroks", '"Netwroks": did you mean "networks"?'),
+            ("dis --json", '"dis": did you mean "disable" or "disconnect"?'),
+            ("credential mov 1 2", '"credential mov": did you mean "credential move"?'),
+            ("spectrum", '"spectrum"'),
+        ):
+            self.assertEqual(self.refused(2, *words.split(), VEXA_MACHINE=""), f"vexa: there is no command {told}")
+        for words in ([], ["scan"], ["credential", "add"]):
+            self.assertEqual(run_client("help", *words).stdout, run_client(*words, "--help").stdout)
+
     def test_each_command_says_so(self):
         folder = str(self.new_folder())
         for command in (

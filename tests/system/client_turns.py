@@ -6,7 +6,7 @@ import signal
 import socket
 import threading
 
-from harness import TEXT, Story, accepted, frame, read_frame, read_head, run_client, wait_until
+from harness import CHANNEL_LIST, TEXT, Story, accepted, frame, read_frame, read_head, run_client, wait_until
 
 ADD = ["credential", "add", "--method", "tls", "--client-cert", "c", "--realm"]
 UNKNOWN = "whether the change was made is not known"
@@ -46,6 +46,7 @@ class WithService(Story):
 
 
 NO_DATA = object()
+SAMPLE = "SPECTRAL_ANALYSER_SAMPLE_DATA_"
 
 
 class Peer:
@@ -151,6 +152,20 @@ class InAnyOrder(Story):
                 result, _ = self.add(*events)
                 self.assertEqual((result.returncode, result.stdout, result.stderr), (1, "", f"vexa: {told}\n"))
 
+    def test_a_scan_is_not_over_with_what_was_told_before_its_list(self):
+        def answer(command):
+            if command["CommandId"] == "GET_CHANNEL_LIST":
+                return [(f"{SAMPLE}INTERFERENCE", {"order": 1, "noise_value": 42}), (CHANNEL_LIST, listed)]
+            is_renewed = peer.commands.count("FULL_SCAN") == 2
+            return [(f"{SAMPLE}CONGESTION", {"order": 1, "congestion_value": 30})] if is_renewed else []
+
+        listed = [{"Channel": 36, "Order": 1}]
+        for limit, congestion in ((1, None), (30, 30)):
+            peer = self.enterContext(Peer(answer))
+            told = self.done("scan", "--json", "--timeout", limit, "--sa-port", peer.port, VEXA_MACHINE=None)
+            channel = {"channel": 36, "order": 1, "congestion": congestion, "interference": 42}
+            self.assertEqual(json.loads(told), {"channels": [channel]})
+
     def test_a_service_that_has_just_started_is_asked_again(self):
         def answer(command):
             name = command["CommandId"]
@@ -167,7 +182,7 @@ class InAnyOrder(Story):
         peer = self.enterContext(Peer(lambda command: [(LIST, None)] if command["CommandId"] == LIST else []))
         adding = self.running(*ADD, "new", "--hs20-port", peer.port)
         wait_until(lambda: "ADD_CREDENTIAL" in peer.commands, "the command")
-        self.assertEqual(adding.stop(signal.SIGINT), 1)
+        self.assertEqual(adding.stop(signal.SIGINT), 130)
         self.assertEqual(adding.errors, [f"vexa: stopped before the service had answered; {UNKNOWN}"])
 
     def test_a_connection_that_nothing_tells_of_is_believed_when_it_lasts(self):

@@ -30,7 +30,7 @@ class WatchStory(NetworkStory):
         return watch
 
     def assert_quiet_end(self, watch, number=signal.SIGINT):
-        self.assertEqual((watch.stop(number), watch.errors), (0, []))
+        self.assertEqual((watch.stop(number), watch.errors), (128 + number, []))
         self.assertTrue(all(map(LINE.fullmatch, watch.lines)), watch.lines)
 
 
@@ -74,13 +74,15 @@ class Telling(WatchStory):
         self.assert_quiet_end(watch, signal.SIGTERM)
 
     def test_json_is_each_event_of_both_ports(self):
-        watch = self.watch("--json")
-
         def sources():
             return {json.loads(line)["Source"] for line in list(watch.lines)}
 
-        wait_until(lambda: sources() == {"HotSpot20", "SpectralAnalyser"}, "both")
-        self.assertEqual((watch.stop(signal.SIGINT), watch.errors), (0, []))
+        self.add_user("Roam", password="gEh31m")
+        for options, told in (((), "********"), (("--show-passwords",), "gEh31m")):
+            watch = self.watch("--json", *options)
+            wait_until(lambda: sources() == {"HotSpot20", "SpectralAnalyser"}, "both")
+            self.assertIn(f'\\"Password\\":\\"{told}\\"', watch.wait_line(LIST).replace(" : ", ":"))
+            self.assertEqual((watch.stop(signal.SIGINT), watch.errors), (130, []))
 
 
 class Ending(WatchStory):
@@ -127,6 +129,7 @@ STORIES = {
          '"C" is in range; realms: x (TLS)', f'joined "B"{NONE_OF_OURS}'),
         (networks(), 'the connection to "B" has ended', '"B" is out of range', '"C" is out of range'),
     ],
+    "what is hidden in a name": [(networks("\u202e", "\u200b"), 'hotspots in range: "\\u202e", "\\u200b"')],
     "a connection that was there is not joined": [
         ((LIST, TWO), "2 credentials stored"),
         (networks("A*:r"), 'hotspots in range: "A"', 'connected to "A" with the credential "One" or "Two"'),
@@ -186,6 +189,6 @@ class Sentences(Story):
                 watch = self.running("watch", "--hs20-port", peer.port, "--sa-port", silent.port)
                 watch.wait_line(sentences[-1], count=sentences.count(sentences[-1]))
                 wait_until(lambda: len(peer.commands) >= 5 + len(asked), "the questions")
-                self.assertEqual((watch.stop(signal.SIGINT), watch.errors), (0, []))
+                self.assertEqual((watch.stop(signal.SIGINT), watch.errors), (130, []))
                 self.assertEqual([line[20:] for line in watch.lines], sentences)
                 self.assertEqual(peer.commands[5:], asked)

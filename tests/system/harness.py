@@ -6,6 +6,7 @@ A test gets the folder with the programs from VEXA_BUILD.
 import base64
 import collections
 import contextlib
+import ctypes
 import fcntl
 import hashlib
 import json
@@ -29,11 +30,24 @@ import unittest
 
 PATIENCE = 30.0
 KEY = base64.b64encode(bytes(16))
+CLONE_NEWUSER = 0x10000000
 TEXT, BINARY, CLOSE, PING, PONG = 1, 2, 8, 9, 10
 CHANNEL, CHANNEL_LIST = "SPECTRAL_ANALYSER_CURRENT_CHANNEL_DATA", "SPECTRAL_ANALYSER_CHANNEL_LIST_DATA_2G5G"
 # Commands whose answer has another name.
 ANSWERS = {"GET_CURRENT_CHANNEL": CHANNEL, "GET_CHANNEL_LIST": CHANNEL_LIST, "GET_IS_CARD_IN": "CARD_PLUG_IN"}
 STORE = pathlib.PurePath("Public", "Roaming", "Korvane")
+
+
+def enter_namespace(kind):
+    """Moves this process and its children into a namespace of their own; False where that isn't allowed."""
+    libc = ctypes.CDLL(None, use_errno=True)
+    user, group = os.getuid(), os.getgid()
+    if libc.unshare(kind) != 0:
+        if libc.unshare(CLONE_NEWUSER | kind) != 0:
+            return False
+        for name, content in (("uid_map", f"{user} {user} 1"), ("setgroups", "deny"), ("gid_map", f"{group} {group} 1")):
+            pathlib.Path("/proc/self", name).write_text(content)
+    return True
 
 
 def program(name):
@@ -399,7 +413,7 @@ class Terminal:
     def __init__(self, arguments, environment, columns=100, rows=40):
         self.screen = b""
         self.ours, self._theirs = pty.openpty()
-        fcntl.ioctl(self.ours, termios.TIOCSWINSZ, struct.pack("HHHH", rows, columns, 0, 0))
+        self.resize(columns, rows)
         self.before = self.settings()
         self.process = subprocess.Popen(
             arguments,
@@ -410,6 +424,9 @@ class Terminal:
             start_new_session=True,
             preexec_fn=lambda: fcntl.ioctl(0, termios.TIOCSCTTY, 0),
         )
+
+    def resize(self, columns, rows):
+        fcntl.ioctl(self.ours, termios.TIOCSWINSZ, struct.pack("HHHH", rows, columns, 0, 0))
 
     def read_until(self, pattern, timeout=PATIENCE):
         self._read(lambda: re.search(pattern, self.screen), timeout)

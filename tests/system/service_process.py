@@ -155,6 +155,8 @@ class WithParent(Story):
         (port,) = free_ports(1)
         machine = self.start(arguments=["--sa-port", f"{port}", "--hs20-port", f"{port}"])
         self.assertEqual(machine.output(), HOTSPOT.format(port) + NO_SPECTRAL)
+        told = [f"vexa: both halves have the port {port}: the spectral analyser cannot be reached"]
+        self.assertEqual(machine.parent.errors, told)
         client = machine.hs20()
         self.control.do("pullAdapter")
         self.control.do("insertAdapter")

@@ -7,7 +7,6 @@ clock is that of the host: a scenario's `speed` is left out.
 
 import atexit
 import contextlib
-import ctypes
 import fcntl
 import functools
 import json
@@ -28,7 +27,7 @@ from harness import PATIENCE, STORE, ControlClient, Program, clean_environment, 
 
 STAND_INS = ("wlanapi", "iphlpapi", "wtsapi32", "secur32")
 
-CLONE_NEWUSER, CLONE_NEWNET = 0x10000000, 0x40000000
+CLONE_NEWNET = 0x40000000
 SIOCGIFFLAGS, SIOCSIFFLAGS, IFF_UP = 0x8913, 0x8914, 1
 
 BUILD, PREFIX = (pathlib.Path(os.environ[name]) for name in ("VEXA_WINDOWS_BUILD", "WINEPREFIX"))
@@ -42,13 +41,8 @@ def enter_own_network():
     """Moves this process and its children into a network without anybody else. Wine looks for the owner of every row of
     the TCP table in all processes, which takes it half a second for a thousand rows, and the table of a busy host
     grows between two looks. Where that isn't allowed, the stories take longer."""
-    libc = ctypes.CDLL(None, use_errno=True)
-    user, group = os.getuid(), os.getgid()
-    if libc.unshare(CLONE_NEWNET) != 0:
-        if libc.unshare(CLONE_NEWUSER | CLONE_NEWNET) != 0:
-            return
-        for name, content in (("uid_map", f"{user} {user} 1"), ("setgroups", "deny"), ("gid_map", f"{group} {group} 1")):
-            pathlib.Path("/proc/self", name).write_text(content)
+    if not harness.enter_namespace(CLONE_NEWNET):
+        return
     with socket.socket(socket.AF_INET, socket.SOCK_DGRAM) as any_socket:
         request = bytearray(struct.pack("16sh22x", b"lo", 0))
         fcntl.ioctl(any_socket, SIOCGIFFLAGS, request)

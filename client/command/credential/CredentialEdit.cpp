@@ -3,6 +3,7 @@
 #include <memory>
 
 #include "client/command/Commands.h"
+#include "client/command/credential/CredentialChoice.h"
 #include "client/command/credential/CredentialFields.h"
 #include "client/command/credential/CredentialOutput.h"
 #include "client/command/credential/CredentialSession.h"
@@ -16,7 +17,7 @@ namespace {
 struct EditOptions {
     HotspotOptions hotspot;
     CredentialFields fields;
-    std::string which;
+    CredentialChoice choice;
     bool askPassword = false;
 };
 
@@ -65,10 +66,11 @@ Credential wantedCredential(const EditOptions& options, const Credential& stored
 int runEdit(const EditOptions& options) {
     if (options.fields.isEmpty() && !options.askPassword)
         throw ClientError("nothing to change was given", kExitWrongUse);
+    options.choice.check();
     CredentialSession session(options.hotspot);
     const auto password = newPassword(options, session.signals());
     CredentialStore& store = session.begin();
-    const Credential stored = findCredential(store.list(), options.which);
+    const Credential stored = options.choice.findIn(store.list());
     const Credential wanted = wantedCredential(options, stored, password);
     const std::string changed = differences(stored, wanted);
     if (!changed.empty()) store.edit(wanted);
@@ -84,7 +86,7 @@ int runEdit(const EditOptions& options) {
 void addCredentialEdit(CLI::App& parent, int& exitCode) {
     auto options = std::make_shared<EditOptions>();
     CLI::App* command = parent.add_subcommand("edit", "Change a credential; what is not given stays");
-    command->add_option("WHICH", options->which, "Its id, or its name")->required();
+    options->choice.addTo(*command, false);
     options->hotspot.addTo(*command, credentialChangeFields());
     options->fields.addTo(*command);
     command->add_flag("--ask-password", options->askPassword, "Ask for a new password")

@@ -4,6 +4,9 @@
 #include <array>
 
 #include "client/terminal/ClientError.h"
+#include "contract/Realm.h"
+#include "text/TextConversion.h"
+#include "text/Utf8.h"
 
 namespace vexa::client {
 
@@ -75,6 +78,9 @@ void CredentialFields::checkAgainst(const Credential& credential) const {
         if (isApplicable && option.isRequired && (credential.*option.field).empty())
             failWrongUse(methodName(credential) + " needs " + option.option);
     }
+    if (realm && isValidUtf8(*realm) && !contract::realmBytes(wideFromUtf8(*realm)))
+        failWrongUse(
+            "the realm holds a character beyond Latin-1: the service can compare it with no network");
     if (passwordFromInput && credential.type != kTypeUser)
         failWrongUse("--password-stdin does not go with " + methodName(credential));
 }

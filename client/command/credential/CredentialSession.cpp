@@ -1,6 +1,7 @@
 #include "client/command/credential/CredentialSession.h"
 
 #include "client/command/Output.h"
+#include "client/terminal/ClientError.h"
 
 namespace vexa::client {
 
@@ -12,7 +13,7 @@ CredentialSession::CredentialSession(const HotspotOptions& options)
 void CredentialSession::connect() {
     m_store.reset();
     m_port.emplace(m_number, m_signals, m_options.limit());
-    m_store.emplace(*m_port);
+    m_store.emplace(*m_port, m_options.port.machine());
 }
 
 // The first connection has heard what was answered to those before us; a new one hears only what comes now.
@@ -25,6 +26,8 @@ CredentialStore& CredentialSession::begin() {
 
 void CredentialSession::report(const std::string& verb, const std::string& sentence,
                                const Credential& credential, std::size_t position) const {
+    if (const auto& why = m_store->whyUnsaved())
+        throw ClientError("kept in memory only: " + nameOf(credential) + " was " + verb + ", but " + *why);
     Json::Value object(Json::objectValue);
     object["done"] = verb;
     object["credential"] = credentialJson(credential, position, Passwords::Hidden);

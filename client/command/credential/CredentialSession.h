@@ -22,7 +22,8 @@ public:
     /// Waits for our turn and reads the list.
     CredentialStore& begin();
 
-    /// Says what was done: a sentence, or an object with `verb` and the credential.
+    /// Says what was done: a sentence, or an object with `verb` and the credential. Throws ClientError if the
+    /// service could not save it.
     void report(const std::string& verb, const std::string& sentence, const Credential& credential,
                 std::size_t position) const;
 

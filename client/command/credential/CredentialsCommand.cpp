@@ -34,7 +34,7 @@ int runCredentials(const CredentialsOptions& options) {
 int runReload(const HotspotOptions& options) {
     Signals signals;
     HotspotPort port(options.port.find(), signals, options.limit());
-    CredentialStore store(port);
+    CredentialStore store(port, options.port.machine());
     const std::size_t count = store.reload().size();
     Json::Value object(Json::objectValue);
     object["credentials"] = static_cast<Json::UInt64>(count);
@@ -42,15 +42,22 @@ int runReload(const HotspotOptions& options) {
     return kExitOk;
 }
 
-}  // namespace
-
-void addCredentialsCommand(CLI::App& app, int& exitCode) {
+void addList(CLI::App& parent, const char* name, int& exitCode) {
     auto options = std::make_shared<CredentialsOptions>();
-    CLI::App* command =
-        app.add_subcommand("credentials", "List the stored credentials in the order of priority");
+    CLI::App* command = parent.add_subcommand(name, "List the stored credentials in the order of priority");
     options->hotspot.addTo(*command, credentialListFields());
     command->add_flag("--show-passwords", options->showPasswords, "Show the passwords too");
     command->callback([options, &exitCode] { exitCode = runCredentials(*options); });
+}
+
+}  // namespace
+
+void addCredentialsCommand(CLI::App& app, int& exitCode) {
+    addList(app, "credentials", exitCode);
+}
+
+void addCredentialList(CLI::App& parent, int& exitCode) {
+    addList(parent, "list", exitCode);
 }
 
 void addReloadCommand(CLI::App& app, int& exitCode) {

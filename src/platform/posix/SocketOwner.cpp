@@ -1,10 +1,6 @@
 #include "platform/posix/SocketOwner.h"
 
 #include <arpa/inet.h>
-#include <linux/inet_diag.h>
-#include <linux/netlink.h>
-#include <linux/sock_diag.h>
-#include <netinet/in.h>
 #include <sys/socket.h>
 
 #include <algorithm>
@@ -15,6 +11,7 @@
 #include <vector>
 
 #include "platform/posix/ProcNetTcp.h"
+#include "platform/posix/SockDiag.h"
 
 namespace vexa::posix {
 
@@ -22,11 +19,6 @@ namespace {
 
 constexpr std::uint32_t kEstablished = 1;
 constexpr std::uint32_t kAllStates = ~0U;
-
-struct Request {
-    nlmsghdr header;
-    inet_diag_req_v2 socket;
-};
 
 struct Table {
     const char* path;
@@ -45,14 +37,8 @@ bool isOwned(std::uint32_t state, std::uint64_t inode) {
 }
 
 // The kernel finds by it an IPv6 socket with IPv4 addresses, too.
-Request requestFor(std::uint16_t localPort, std::uint16_t remotePort) {
-    Request request{};
-    request.header.nlmsg_len = sizeof request;
-    request.header.nlmsg_type = SOCK_DIAG_BY_FAMILY;
-    request.header.nlmsg_flags = NLM_F_REQUEST;
-    request.socket.sdiag_family = AF_INET;
-    request.socket.sdiag_protocol = IPPROTO_TCP;
-    request.socket.idiag_states = kAllStates;
+SockDiagRequest requestFor(std::uint16_t localPort, std::uint16_t remotePort) {
+    SockDiagRequest request = sockDiagRequest(0, kAllStates);
     inet_diag_sockid& id = request.socket.id;
     id.idiag_sport = htons(localPort);
     id.idiag_dport = htons(remotePort);
@@ -76,7 +62,7 @@ SocketOwners::SocketOwners()
 // The kernel has answered when it has taken the question.
 SocketOwners::Answer SocketOwners::ask(std::uint16_t localPort, std::uint16_t remotePort,
                                        std::uint32_t& uid) {
-    const Request request = requestFor(localPort, remotePort);
+    const SockDiagRequest request = requestFor(localPort, remotePort);
     if (!m_netlink || ::send(m_netlink.get(), &request, sizeof request, 0) < 0) return Answer::Unavailable;
     std::array<char, 512> answer{};
     const ssize_t size = ::recv(m_netlink.get(), answer.data(), answer.size(), MSG_DONTWAIT);

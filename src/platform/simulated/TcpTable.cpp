@@ -13,6 +13,7 @@
 #include <vector>
 
 #include "platform/Mutex.h"
+#include "platform/posix/KernelTcp.h"
 #include "platform/simulated/TcpSockets.h"
 #include "simulation/Machine.h"
 #include "text/NeverDestroyed.h"
@@ -80,8 +81,8 @@ public:
         if (room != 0 && room == m_roomTold) return takeSnapshot();
         if (m_own) return m_own;
         std::vector<posix::TcpSocket> sockets;
-        return posix::readProcNetTcp("/proc/net/tcp", sockets) ? std::optional(std::move(sockets))
-                                                               : std::nullopt;
+        const bool isRead = posix::readKernelTcp(sockets) || posix::readProcNetTcp("/proc/net/tcp", sockets);
+        return isRead ? std::optional(std::move(sockets)) : std::nullopt;
     }
 
     std::uint32_t tellRoom(std::vector<posix::TcpSocket> sockets) {

@@ -3,8 +3,6 @@
 #include <fcntl.h>
 #include <io.h>
 #include <windows.h>
-// After <windows.h>.
-#include <sddl.h>
 
 #include <algorithm>
 #include <array>
@@ -14,7 +12,7 @@
 #include <utility>
 
 #include "platform/windows/Handle.h"
-#include "platform/windows/ProcessUser.h"
+#include "platform/windows/OwnerRights.h"
 
 namespace vexa::platform {
 
@@ -68,22 +66,6 @@ bool meansInUse(DWORD error) {
 struct CloseFile {
     void operator()(std::FILE* file) const { std::fclose(file); }
 };
-
-using SecurityDescriptor = Owned<PSECURITY_DESCRIPTOR, &::LocalFree>;
-
-// All rights for the system, the administrators and the user of this process, those besides for `others`, and
-// nothing inherited. Empty if the user can't be told.
-SecurityDescriptor rightsOf(const wchar_t* others) {
-    SecurityDescriptor descriptor;
-    const Storage user = userOf(GetCurrentProcess());
-    Owned<LPWSTR, &::LocalFree> sid;
-    if (user.empty() || ConvertSidToStringSidW(sidOf(user), sid.receive()) == 0) return descriptor;
-    const std::wstring rights =
-        L"D:P(A;;FA;;;SY)(A;;FA;;;BA)(A;;FA;;;" + std::wstring(sid.get()) + L")" + others;
-    ConvertStringSecurityDescriptorToSecurityDescriptorW(rights.c_str(), SDDL_REVISION_1,
-                                                         descriptor.receive(), nullptr);
-    return descriptor;
-}
 
 // The rights of a file that exists stay what they are.
 Handle openOwnersFile(const std::string& narrowPath) {

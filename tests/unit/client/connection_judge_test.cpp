@@ -54,6 +54,13 @@ TEST(JoinJudge, BelievesTheListAndWhatComesBehindTheRequest) {
     const std::tuple<const char*, const char*, Outcome> cases[] = {
         {"told and listed", "succeeded internet Cafe*", Outcome::Joined},
         {"told, but another is listed", "succeeded internet Hall*+Cafe", Outcome::Open},
+        {"another joined instead", "checked checked succeeded internet Hall*+Cafe 950 Hall*+Cafe",
+         Outcome::Overtaken},
+        {"another before ours", "succeeded internet Hall*+Cafe 950 Hall*+Cafe", Outcome::Open},
+        {"another for a moment", "checked checked succeeded Hall*+Cafe 500 Hall*+Cafe 950 Cafe",
+         Outcome::Open},
+        {"another, then ours", "checked checked succeeded Hall*+Cafe 500 succeeded Cafe*", Outcome::Joined},
+        {"another that was there", "checked checked Hall*+Cafe 5000 Hall*+Cafe", Outcome::Open},
         {"listed for a moment", "Cafe* 950 Cafe 1000 Cafe*", Outcome::Open},
         {"listed for long", "Cafe* 950 Cafe*", Outcome::Joined},
         {"failed before", "failed internet Cafe", Outcome::Open},

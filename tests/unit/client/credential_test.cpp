@@ -40,7 +40,9 @@ TEST(Fitting, RealmAndMethodStandBesideEachOther) {
     };
     const CredentialList all{stored("card", kMethodTls, "a"),  stored("phone", kMethodTtls, "a"),
                              stored("case", kMethodTtls, "A"), stored("half", kMethodTtls, "a", ""),
-                             stored("late", kMethodTtls, "b"), stored("bare", kMethodTls, "b", "")};
+                             stored("late", kMethodTtls, "b"), stored("bare", kMethodTls, "b", ""),
+                             stored("wide", kMethodTtls, "ä"), stored("bytes", kMethodTtls, "Ã¤"),
+                             stored("none", kMethodTtls, ""),  stored("far", kMethodTtls, "空")};
     const std::tuple<std::vector<Network::Realm>, std::optional<int>, const char*> cases[] = {
         {{}, {}, ""},
         {{{kMethodTls, "a"}}, {}, "card"},
@@ -49,6 +51,7 @@ TEST(Fitting, RealmAndMethodStandBesideEachOther) {
         {{{kMethodTtls, "a"}, {kMethodTls, "a"}}, kMethodTtls, "phone"},
         {{{kMethodTtls, "b"}, {kMethodTls, "b"}, {kMethodTtls, "a"}}, {}, "phone, late or bare"},
         {{{kMethodTls, "a"}}, 0, ""},
+        {{{kMethodTtls, "ä"}, {kMethodTtls, ""}, {kMethodTtls, "空"}}, {}, "bytes"},
     };
     for (const auto& [realms, method, names] : cases) {
         Network network;

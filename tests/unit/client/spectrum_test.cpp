@@ -105,14 +105,16 @@ TEST(SpectralText, EveryEventIsALine) {
     }
 }
 
-TEST(SpectralText, AValueThatDidNotChangeIs0AndASilentChannelHasNone) {
-    const SpectralView view = viewOf({channelList(kTwoChannels), interference(1, 42)});
-    EXPECT_EQ(spectrumTable(view), (std::vector<std::string>{"Channel  Order  Congestion  Interference",
-                                                             "      1      2           -             -",
-                                                             "     36      1           0            42"}));
+TEST(SpectralText, AValueThatDidNotChangeSinceTheListIs0AndAnyOtherThatWasNotToldIsNone) {
+    const SpectralView view = viewOf({interference(2, 7), channelList(kTwoChannels), interference(1, 42)});
+    EXPECT_EQ(spectrumTable(view), (std::vector<std::string>{"Channel  Congestion  Interference",
+                                                             "      1           -             7",
+                                                             "     36           0            42"}));
     EXPECT_EQ(jsonLine(spectrumJson(view)),
-              R"({"channels":[{"channel":1,"congestion":null,"interference":null,"order":2},)"
+              R"({"channels":[{"channel":1,"congestion":null,"interference":7,"order":2},)"
               R"({"channel":36,"congestion":0,"interference":42,"order":1}]})");
+    EXPECT_EQ(spectrumTable(viewOf({channelList(kTwoChannels)}))[1],
+              "      1           -             -");
 }
 
 TEST(SpectralText, TheSummaryNamesTheBusiestChannel) {
@@ -125,7 +127,7 @@ TEST(SpectralText, TheSummaryNamesTheBusiestChannel) {
               R"({"busiest":{"channel":36,"congestion":42},"channels":2,"events":2})");
 }
 
-// The picture of one channel; 49 columns leave bars of 10.
+// The picture of one channel; 42 columns leave bars of 10.
 std::vector<std::string> picture(int congestionValue, int interferenceValue, const PictureStyle& style) {
     return drawSpectrum(viewOf({channelList(R"([{"Channel": 36, "Order": 1}])"),
                                 congestion(1, congestionValue), interference(1, interferenceValue)}),
@@ -135,11 +137,11 @@ std::vector<std::string> picture(int congestionValue, int interferenceValue, con
 TEST(SpectralPicture, BarsAreAsLongAsTheirValues) {
     const std::pair<int, const char*> rows[] = {{9, "          "}, {10, "#         "}, {99, "######### "}};
     for (const auto& [value, bar] : rows)
-        EXPECT_EQ(picture(value, 20, {49, false, false}).at(2).substr(16, 10), bar) << value;
-    const auto lines = picture(30, 100, {49, false, false});
+        EXPECT_EQ(picture(value, 20, {42, false, false}).at(2).substr(9, 10), bar) << value;
+    const auto lines = picture(30, 100, {42, false, false});
     EXPECT_EQ(lines[0], "1 channel, 3 events");
-    EXPECT_EQ(lines[2], "     36      1  ###         30  ########## 100");
-    EXPECT_NE(picture(35, 0, {49, false, true})[2].find("███▌······  35"), std::string::npos);
+    EXPECT_EQ(lines[2], "     36  ###         30  ########## 100");
+    EXPECT_NE(picture(35, 0, {42, false, true})[2].find("███▌······  35"), std::string::npos);
     for (const int columns : {40, 80, 81, 120, 300})
         for (const std::string& line : picture(100, 100, {columns, false, false}))
             EXPECT_LT(line.size(), static_cast<std::size_t>(columns));
@@ -149,8 +151,8 @@ TEST(SpectralPicture, TheColourGoesWithTheValueAndIsEndedInEveryRow) {
     const std::pair<int, const char*> rows[] = {
         {39, "\033[32m"}, {40, "\033[33m"}, {69, "\033[33m"}, {70, "\033[31m"}};
     for (const auto& [value, colour] : rows) {
-        const std::string line = picture(value, 1, {49, true, false})[2];
-        EXPECT_EQ(line.substr(16, 5), colour) << value;
+        const std::string line = picture(value, 1, {42, true, false})[2];
+        EXPECT_EQ(line.substr(9, 5), colour) << value;
         EXPECT_LT(line.rfind("\033[3"), line.rfind("\033[0m"));
     }
     EXPECT_EQ(picture(80, 80, {120, false, true})[2].find('\033'), std::string::npos);

@@ -1,5 +1,6 @@
 #include <gtest/gtest.h>
 
+#include "client/terminal/Nearest.h"
 #include "client/terminal/Text.h"
 #include "text/Utf8.h"
 
@@ -18,10 +19,20 @@ TEST(Text, ColumnsFollowTheWidthOfCharacters) {
     EXPECT_EQ(columnsOf("abc"), 3);
     EXPECT_EQ(columnsOf("空港"), 4);
     EXPECT_EQ(columnsOf("e\xCC\x81"), 1) << "an accent of its own takes no column";
-    EXPECT_EQ(cutToColumns("abc", 2), "ab");
-    EXPECT_EQ(cutToColumns("abc", 9), "abc");
-    EXPECT_EQ(cutToColumns("空港", 3), "空");
-    EXPECT_EQ(cutToColumns("abc", 0), "");
+    EXPECT_EQ(cutToColumns("abcd", 3, "…"), "ab…");
+    EXPECT_EQ(cutToColumns("abcd", 4, "…"), "abcd");
+    EXPECT_EQ(cutToColumns("空港空港", 4, "…"), "空…");
+    EXPECT_EQ(cutToColumns("abcde", 4, "..."), "a...");
+}
+
+TEST(Text, NamesThatLookAlikeComeFirst) {
+    const std::tuple<const char*, const char*, std::size_t> distances[] = {
+        {"", "", 0},         {"", "ab", 2},          {"ab", "", 2},           {"Gate", "gate", 0},
+        {"café", "cafe", 1}, {"stauts", "stats", 1}, {"stauts", "status", 1}, {"sitting", "kitten", 3}};
+    for (const auto& [a, b, distance] : distances)
+        EXPECT_EQ(editDistance(a, b), distance) << a << " " << b;
+    EXPECT_EQ(namesLike({"Hall", "Café", "Hell", "Hill", "Bar"}, "hell"),
+              R"("Hell", "Hall", "Hill" and 2 more)");
 }
 
 TEST(Text, RowsAreAlignedByColumns) {

@@ -240,6 +240,9 @@ TEST(Sharing, WhatOthersChangedIsTakenOverAndWhatCouldNotBeSavedStays) {
         {"one was deleted", {writing(ttls(2, "b"), 3), moving(2, 1)}, "2:b", 3},
         {"one was edited", {writing(one + ttls(2, "y"), 3), moving(2, 1)}, "2:y 1:a", 3},
         {"the order was changed", {listed("2:1 1:2"), adding("c")}, "3:c 2:b 1:a"},
+        {"the order was changed back",
+         {moving(1, 1), moving(2, 1), listed("1:1 2:2"), adding("c")},
+         "3:c 1:a 2:b"},
         {"unsaved: an addition", {inVain(adding("c")), adding("d")}, "4:d 3:c 1:a 2:b", 5},
         {"unsaved: an addition, its id given to another",
          {inVain(adding("c")), writing(both + ttls(3, "y"), 4), moving(1, 1)},
@@ -315,7 +318,11 @@ void changeAtRandom(Config& config, unsigned kind, std::int32_t id, const std::w
     std::int32_t added = 0;
     if (kind < 3 && table.addCredential(input, config.nextCredId(), config.userName(), added) == kSuccess)
         config.advanceNextCredId();
-    if (kind == 3 && one != nullptr) one->m_credName = one->m_realm = text;
+    if (kind == 3 && one != nullptr) {
+        if (!text.empty() && id % 3 == 0) one->m_credName = one->m_realm = text;
+        if (id % 3 == 1) one->m_password = text;
+        if (id % 3 == 2) one->m_bAutoConnect = !one->m_bAutoConnect;
+    }
     if (kind == 4) table.deleteCredential(config.currentId(id));
     if (kind == 5) table.setCredentialPosition(config.currentId(id), id);
     config.saveConfig(held);

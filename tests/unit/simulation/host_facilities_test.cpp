@@ -4,10 +4,13 @@
 #include <unistd.h>
 
 #include <algorithm>
+#include <boost/asio.hpp>
+#include <set>
 
 #include "TestMachine.h"
 #include "platform/DebugOutput.h"
 #include "platform/NamedMutex.h"
+#include "platform/posix/KernelTcp.h"
 #include "platform/posix/MachineFolder.h"
 #include "platform/posix/OwnerFiles.h"
 #include "platform/posix/ProcNetTcp.h"
@@ -55,6 +58,35 @@ TEST(ProcNetTcp, HoldsEachConnectionOnceAndEveryoneWhoListens) {
     EXPECT_EQ(rows[2].inode, 4711U);
     ASSERT_TRUE(posix::readProcNetTcp(path.string(), rows, posix::TcpSockets::Listening));
     EXPECT_EQ(rows.size(), 2U);
+}
+
+TEST(KernelTcp, TellsWhatTheFileTells) {
+    using boost::asio::ip::tcp;
+    const tcp::endpoint anyPort(boost::asio::ip::address_v4::loopback(), 0);
+    boost::asio::io_context io;
+    tcp::acceptor listener(io, anyPort);
+    const tcp::socket bound(io, anyPort);
+    tcp::socket clients[] = {tcp::socket(io), tcp::socket(io)};
+    for (tcp::socket& client : clients)
+        client.connect(listener.local_endpoint());
+    const tcp::socket kept = listener.accept();
+    listener.accept().close();
+    clients[1].close();  // the other end is in TIME_WAIT
+    const auto rowsOf = [&](const std::vector<posix::TcpSocket>& rows) {
+        std::multiset<std::string> texts;
+        for (const auto& [local, remote, port, remotePort, state, uid, inode] : rows)
+            for (const tcp::endpoint& end : {listener.local_endpoint(), bound.local_endpoint()})
+                if (end.port() == port || end.port() == remotePort)
+                    texts.insert(local + " " + std::to_string(port) + " " + remote + " " +
+                                 std::to_string(remotePort) + " " + std::to_string(state) + " " +
+                                 std::to_string(uid) + " " + std::to_string(inode));
+        return texts;
+    };
+    std::vector<posix::TcpSocket> asked;
+    std::vector<posix::TcpSocket> read;
+    ASSERT_TRUE(posix::readKernelTcp(asked) && posix::readProcNetTcp("/proc/net/tcp", read));
+    EXPECT_EQ(rowsOf(asked), rowsOf(read));
+    EXPECT_EQ(rowsOf(asked).size(), 4U);
 }
 
 TEST(MachineFolder, IsWhatTheEnvironmentSays) {

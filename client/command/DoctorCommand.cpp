@@ -1,0 +1,50 @@
+#include <CLI/CLI.hpp>
+#include <memory>
+
+#include "client/command/Commands.h"
+#include "client/command/HotspotOptions.h"
+#include "client/command/Output.h"
+#include "client/doctor/Diagnosis.h"
+#include "client/terminal/ClientError.h"
+
+namespace vexa::client {
+
+namespace {
+
+/// Also of a service that has left no port.
+Observations observed(const HotspotOptions& options) {
+    Signals signals;
+    std::uint16_t port = 0;
+    try {
+        port = options.port.find();
+    } catch (const ClientError& error) {
+        Observations seen;
+        seen.serviceTrouble = error.what();
+        seen.whyNoLog = "the service was not asked";
+        return seen;
+    }
+    return observe(port, signals, options.limit(), options.port.machine());
+}
+
+int runDoctor(const HotspotOptions& options) {
+    const auto findings = diagnose(observed(options));
+    auto lines = diagnosisLines(findings);
+    const std::string names = namesInTheWay(findings);
+    if (names.empty()) lines.emplace_back("Nothing is in the way of a connection.");
+    print(options, diagnosisJson(findings), lines);
+    if (!names.empty()) throw ClientError("in the way of a connection: " + names);
+    return kExitOk;
+}
+
+}  // namespace
+
+void addDoctorCommand(CLI::App& app, int& exitCode) {
+    auto options = std::make_shared<HotspotOptions>();
+    CLI::App* command = app.add_subcommand(
+        "doctor", "Tell what stands between you and a connection, and what to do about it");
+    options->addTo(*command,
+                   {{{"state", "State"}, {"gate", "Gate"}, {"seen", "Seen"}, {"advice", "Advice"}}, "gates"});
+    command->callback([options, &exitCode] { exitCode = runDoctor(*options); });
+}
+
+}  // namespace vexa::client
