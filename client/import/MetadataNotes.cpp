@@ -60,9 +60,7 @@ bool isContainer(const std::string& name) {
 }
 
 std::string shortened(const std::string& text) {
-    const std::string whole = printable(text);
-    const std::string cut = cutToColumns(whole, kWidest);
-    return '"' + cut + (cut == whole ? "" : "...") + '"';
+    return '"' + cutToColumns(printable(text), kWidest, "...") + '"';
 }
 
 }  // namespace

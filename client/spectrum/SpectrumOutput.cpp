@@ -113,7 +113,9 @@ void SpectrumOutput::printSummary(const SpectralView& view) const {
 std::vector<std::string> SpectrumOutput::picture(const SpectralView& view) const {
     auto lines =
         drawSpectrum(view, {m_screen->columns(), TerminalScreen::wantsColour(), TerminalScreen::isUtf8()});
-    if (!m_note.empty()) lines.insert(lines.begin() + 1, cutToColumns(m_note, m_screen->columns() - 1));
+    if (!m_note.empty())
+        lines.insert(lines.begin() + 1,
+                     cutToColumns(m_note, m_screen->columns() - 1, TerminalScreen::ellipsis()));
     if (m_side == nullptr) return lines;
     const int left = m_screen->rows() - static_cast<int>(lines.size());
     const auto below =

@@ -71,6 +71,7 @@ public:
             if (!m_file.credentials.empty()) addAll(session.begin());
             report("added", "Added ", m_added);
         }
+        if (m_whyUnsaved) throw ClientError("kept in memory only: " + *m_whyUnsaved);
         if (m_isMissing) throw ClientError("not all that the file is for can be stored");
         return kExitOk;
     }
@@ -139,6 +140,7 @@ private:
         leaveOut(store.list());
         for (auto filed = m_file.credentials.rbegin(); filed != m_file.credentials.rend(); ++filed)
             m_added.insert(m_added.begin(), {store.add(filed->credential), filed->provider, ""});
+        m_whyUnsaved = store.whyUnsaved();
     } catch (const ClientError&) {
         report("added", "Added ", m_added);
         throw;
@@ -177,6 +179,7 @@ private:
     std::vector<std::pair<std::string, std::string>> m_skipped;
     /// Of what the file is for, something is neither stored nor going to be.
     bool m_isMissing = false;
+    std::optional<std::string> m_whyUnsaved;
 };
 
 }  // namespace
