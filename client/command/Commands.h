@@ -43,5 +43,6 @@ void addDoctorCommand(CLI::App& app, int& exitCode);
 void addEnableCommand(CLI::App& app, int& exitCode);
 void addDisableCommand(CLI::App& app, int& exitCode);
 void addRefreshCommand(CLI::App& app, int& exitCode);
+void addShellCommands(CLI::App& app, int& exitCode);
 
 }  // namespace vexa::client
