@@ -119,7 +119,7 @@ class WithService(Story):
 class WithoutService(Story):
     def test_a_word_that_is_no_command_is_named(self):
         for words, told in (
-            ("stauts", '"stauts": did you mean "status" or "start"?'),
+            ("stauts", '"stauts": did you mean "status", "stats" or "start"?'),
             ("help Netwroks", '"Netwroks": did you mean "networks"?'),
             ("dis --json", '"dis": did you mean "disable" or "disconnect"?'),
             ("credential mov 1 2", '"credential mov": did you mean "credential move"?'),
