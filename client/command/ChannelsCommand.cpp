@@ -21,7 +21,7 @@ constexpr std::chrono::seconds kAnswerLimit{10};
 
 struct ChannelsOptions {
     PortOption port{Half::Spectral};
-    bool json = false;
+    OutputOptions output;
 };
 
 bool waitForList(SpectralScan& scan, Signals& signals) {
@@ -60,7 +60,7 @@ int runChannels(const ChannelsOptions& options) {
     Signals signals;
     SpectralScan scan(options.port.find());
     if (!waitForList(scan, signals)) return kExitOk;
-    print(options.json, channelsJson(scan.view()), channelTable(scan.view()));
+    print(options.output, channelsJson(scan.view()), channelTable(scan.view()));
     if (scan.view().channels().empty()) std::cerr << "vexa: the service knows no channels\n";
     return kExitOk;
 }
@@ -71,7 +71,7 @@ void addChannelsCommand(CLI::App& app, int& exitCode) {
     auto options = std::make_shared<ChannelsOptions>();
     CLI::App* command = app.add_subcommand("channels", "List the channels of the adapter");
     options->port.addTo(*command);
-    command->add_flag("--json", options->json, "Print JSON");
+    options->output.addTo(*command, {{{"channel", "Channel"}, {"order", "Order"}}});
     command->callback([options, &exitCode] { exitCode = runChannels(*options); });
 }
 

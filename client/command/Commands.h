@@ -11,6 +11,7 @@ namespace vexa::client {
 
 void addStartCommand(CLI::App& app, int& exitCode);
 void addDemoCommand(CLI::App& app, int& exitCode);
+void addReplayCommand(CLI::App& app, int& exitCode);
 
 /// What there is on this kind of machine alone.
 void addHostCommands(CLI::App& app, int& exitCode);
@@ -29,8 +30,11 @@ void addCredentialExport(CLI::App& parent, int& exitCode);
 void addCredentialImport(CLI::App& parent, int& exitCode);
 void addCredentialList(CLI::App& parent, int& exitCode);
 void addCredentialMove(CLI::App& parent, int& exitCode);
+void addRecordCommand(CLI::App& app, int& exitCode);
 void addReloadCommand(CLI::App& app, int& exitCode);
 void addLogCommand(CLI::App& app, int& exitCode);
+void addScenarioCommand(CLI::App& app, int& exitCode);
+void addStatsCommand(CLI::App& app, int& exitCode);
 void addStatusCommand(CLI::App& app, int& exitCode);
 void addConnectCommand(CLI::App& app, int& exitCode);
 void addDisconnectCommand(CLI::App& app, int& exitCode);
@@ -39,5 +43,6 @@ void addDoctorCommand(CLI::App& app, int& exitCode);
 void addEnableCommand(CLI::App& app, int& exitCode);
 void addDisableCommand(CLI::App& app, int& exitCode);
 void addRefreshCommand(CLI::App& app, int& exitCode);
+void addShellCommands(CLI::App& app, int& exitCode);
 
 }  // namespace vexa::client

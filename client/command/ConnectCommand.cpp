@@ -140,7 +140,11 @@ void addConnectCommand(CLI::App& app, int& exitCode) {
     auto options = std::make_shared<JoinOptions>();
     CLI::App* command = app.add_subcommand("connect", "Join a network, with each credential that fits it");
     command->add_option("NAME", options->network, "Name of the network")->required();
-    options->addTo(*command, kDefaultTimeout);
+    options->addTo(*command, kDefaultTimeout,
+                   {{{"done", "Done"},
+                     {"network", "Network"},
+                     {"credentials", "Credentials"},
+                     {"internet", "Internet"}}});
     command->add_flag("--anyway", options->anyway,
                       "Leave it to the system where no credential fits; that ends the connection there is");
     command->callback([options, &exitCode] { exitCode = Joining(*options).run(); });

@@ -14,9 +14,9 @@ constexpr std::chrono::seconds kAnswerLimit{10};
 
 }  // namespace
 
-void ConnectionOptions::addTo(CLI::App& command, int timeout) {
+void ConnectionOptions::addTo(CLI::App& command, int timeout, const FieldList& fields) {
     hotspot.timeout = timeout;
-    hotspot.addTo(command);
+    hotspot.addTo(command, fields);
     command.add_flag("--no-wait", noWait, "Do not wait for what comes of it");
 }
 
@@ -28,7 +28,7 @@ void sayDone(const ConnectionOptions& options, const char* verb, const std::stri
              Json::Value details) {
     details["done"] = verb;
     details["network"] = options.network;
-    print(options.hotspot.json, details, sentence);
+    print(options.hotspot, details, sentence);
 }
 
 void tellOfNetwork(HotspotPort& port, const char* command, const std::string& network) {

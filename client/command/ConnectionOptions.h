@@ -13,8 +13,8 @@ struct ConnectionOptions {
     std::string network;
     bool noWait = false;
 
-    /// `timeout`: the default, in seconds.
-    void addTo(CLI::App& command, int timeout);
+    /// `timeout`: the default, in seconds; `fields`: of what the command tells.
+    void addTo(CLI::App& command, int timeout, const FieldList& fields);
 
     /// How long one question may take; the outcome may take longer.
     std::chrono::seconds answerLimit() const;

@@ -72,7 +72,7 @@ void addDisconnectCommand(CLI::App& app, int& exitCode) {
     CLI::App* command = app.add_subcommand(
         "disconnect", "Leave a network; the service does not join it again until it is asked to");
     command->add_option("NAME", options->network, "Name of the network; default: the connected one");
-    options->addTo(*command, kDefaultTimeout);
+    options->addTo(*command, kDefaultTimeout, {{{"done", "Done"}, {"network", "Network"}}});
     command->callback([options, &exitCode] { exitCode = runDisconnect(*options); });
 }
 

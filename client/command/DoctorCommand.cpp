@@ -31,7 +31,7 @@ int runDoctor(const HotspotOptions& options) {
     auto lines = diagnosisLines(findings);
     const std::string names = namesInTheWay(findings);
     if (names.empty()) lines.emplace_back("Nothing is in the way of a connection.");
-    print(options.json, diagnosisJson(findings), lines);
+    print(options, diagnosisJson(findings), lines);
     if (!names.empty()) throw ClientError("in the way of a connection: " + names);
     return kExitOk;
 }
@@ -42,7 +42,8 @@ void addDoctorCommand(CLI::App& app, int& exitCode) {
     auto options = std::make_shared<HotspotOptions>();
     CLI::App* command = app.add_subcommand(
         "doctor", "Tell what stands between you and a connection, and what to do about it");
-    options->addTo(*command);
+    options->addTo(*command,
+                   {{{"state", "State"}, {"gate", "Gate"}, {"seen", "Seen"}, {"advice", "Advice"}}, "gates"});
     command->callback([options, &exitCode] { exitCode = runDoctor(*options); });
 }
 

@@ -4,14 +4,14 @@
 
 namespace vexa::client {
 
-void HotspotOptions::addTo(CLI::App& command) {
+void HotspotOptions::addTo(CLI::App& command, const FieldList& fields) {
     port.addTo(command);
     command
         .add_option("--timeout", timeout,
                     "Seconds to wait for the service at most; default " + std::to_string(timeout))
         ->type_name("N")
         ->check(CLI::Range(1, 3600));
-    command.add_flag("--json", json, "Print JSON");
+    OutputOptions::addTo(command, fields);
 }
 
 }  // namespace vexa::client

@@ -3,10 +3,12 @@
 #include <memory>
 
 #include "client/command/Commands.h"
+#include "client/log/LogFilter.h"
 #include "client/machine/LogFiles.h"
 #include "client/machine/LogSwitch.h"
 #include "client/machine/MachineFolder.h"
 #include "client/machine/ServiceHost.h"
+#include "client/output/Records.h"
 #include "client/terminal/ClientError.h"
 #include "client/terminal/EventLoop.h"
 #include "client/terminal/Terminal.h"
@@ -22,24 +24,31 @@ struct LogOptions {
     std::string machine;
     std::size_t lines = 0;
     bool follow = false;
-    bool json = false;
     bool redact = false;
+    OutputOptions output;
+    LogWish wish;
 };
+
+std::string shown(const LogFiles::Line& line, const OutputOptions& options) {
+    if (options.json) return recordsJson(options, lineJson(line));
+    if (options.terse || !options.chosen.empty()) return terseLines(options, lineJson(line)).front();
+    return printable(line.text, Tabs::Kept);
+}
 
 void print(std::vector<LogFiles::Line> lines, std::size_t from, const LogOptions& options) {
     for (std::size_t i = from; i < lines.size(); ++i) {
         LogFiles::Line& line = lines[i];
         if (options.redact) line.text = withoutPassword(std::move(line.text));
-        std::cout << (options.json ? jsonOf(line) : printable(line.text, Tabs::Kept)) << '\n';
+        std::cout << shown(line, options.output) << '\n';
     }
     std::cout << std::flush;
 }
 
-void follow(LogFiles& files, const LogOptions& options) {
+void follow(LogFiles& files, LogFilter& filter, const LogOptions& options) {
     Signals signals;
     EventLoop loop(signals);
     while (std::cout && loop.wait(Deadline::in(kBetweenLooks)))
-        print(files.takeLines(), 0, options);
+        print(filter.take(files.takeLines()), 0, options);
 }
 
 void explainSilence(const std::string& reason, bool hasFile, bool goesOn) {
@@ -50,19 +59,24 @@ void explainSilence(const std::string& reason, bool hasFile, bool goesOn) {
     std::cerr << "vexa: " << line << '\n';
 }
 
+void append(LogFilter::Lines& lines, const LogFilter::Lines& more) {
+    lines.insert(lines.end(), more.begin(), more.end());
+}
+
 int runLog(const LogOptions& options, bool isLimited) {
     const MachineFolder machine(options.machine);
     LogFiles files(machine.dumpFolder());
     explainSilence(whyLogIsOff(machine), files.any(), options.follow);
-    if (isLimited) files.skipToLast(options.lines);
-    auto lines = files.takeLines();
+    if (isLimited && !options.wish.isAny()) files.skipToLast(options.lines);
+    LogFilter filter(options.wish, std::time(nullptr));
+    auto lines = filter.take(files.takeLines());
     if (!options.follow) {
-        const auto rest = files.takeRest();
-        lines.insert(lines.end(), rest.begin(), rest.end());
+        append(lines, filter.take(files.takeRest()));
+        append(lines, filter.takeRest());
     }
     const bool isCut = isLimited && lines.size() > options.lines;
     print(lines, isCut ? lines.size() - options.lines : 0, options);
-    if (options.follow) follow(files, options);
+    if (options.follow) follow(files, filter, options);
     return kExitOk;
 }
 
@@ -77,7 +91,8 @@ void addLogCommand(CLI::App& app, int& exitCode) {
         command->add_option("-n,--lines", options->lines, "The last lines alone; default: all");
     lines->type_name("LINES")->check(CLI::NonNegativeNumber);
     command->add_flag("-f,--follow", options->follow, "Go on with what is written, until Ctrl-C");
-    command->add_flag("--json", options->json, "Print JSON, an object a line");
+    options->wish.addTo(*command);
+    options->output.addTo(*command, {{{"file", "File"}, {"line", "Line"}}}, "Print JSON, an object a line");
     CLI::Option* redact =
         command->add_flag("--redact,!--no-redact", options->redact, "Hide passwords; default: on a terminal");
     command->callback([options, lines, redact, &exitCode] {

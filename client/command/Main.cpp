@@ -8,6 +8,7 @@
 #include "client/command/CommandWords.h"
 #include "client/command/Commands.h"
 #include "client/command/Program.h"
+#include "client/output/Silence.h"
 #include "client/terminal/ClientError.h"
 #include "client/terminal/EventLoop.h"
 #include "client/terminal/Terminal.h"
@@ -22,7 +23,8 @@ constexpr std::array kCommands{
     &addChannelsCommand,   &addNetworksCommand, &addConnectCommand, &addDisconnectCommand,
     &addEnableCommand,     &addDisableCommand,  &addRefreshCommand, &addCredentialsCommand,
     &addCredentialCommand, &addReloadCommand,   &addWatchCommand,   &addLogCommand,
-    &addDoctorCommand,     &addSendCommand,     &addListenCommand};
+    &addDoctorCommand,     &addSendCommand,     &addListenCommand,  &addRecordCommand,
+    &addStatsCommand,      &addScenarioCommand, &addShellCommands};
 
 int report(const std::exception& error, int exitCode) {
     std::cerr << "vexa: " << error.what() << '\n';
@@ -35,20 +37,31 @@ int reportWrongUse(const CLI::ParseError& error) {
     return kExitWrongUse;
 }
 
+// Rises when a member that is there today goes, or means something else; new members don't count.
+constexpr const char* kJsonVersion = "1";
+
+void addJsonVersion(CLI::App& app) {
+    app.add_flag_callback(
+        "--json-version", [] { throw CLI::CallForVersion(kJsonVersion, 0); },
+        "Display the version of the JSON that the commands print and exit");
+}
+
 /// Parents end as their service does, whoever has asked for it.
 bool isParent(const CLI::App& app) {
     const auto& chosen = app.get_subcommands();
     return !chosen.empty() && (chosen.front()->get_name() == "start" || chosen.front()->get_name() == "demo");
 }
 
-int run(int argc, char** argv) {
+int run(int argc, char** argv, Silence& silence) {
     CLI::App app("The Vexa wireless service: start it, look at the air, keep its credentials.", "vexa");
     app.set_version_flag("--version", std::string("vexa ") + vexa::contract::version());
+    addJsonVersion(app);
     app.add_subcommand("help", "Tell how to use a command");
     app.require_subcommand(1);
     int exitCode = kExitOk;
     for (const auto add : kCommands)
         add(app, exitCode);
+    silence.addTo(app);
     try {
         auto words = commandWords(app, {argv + 1, argv + argc});
         std::reverse(words.begin(), words.end());  // so the parser takes them
@@ -61,9 +74,9 @@ int run(int argc, char** argv) {
     return EventLoop::stopCode() == 0 || isParent(app) ? exitCode : EventLoop::stopCode();
 }
 
-int runAndReport(int argc, char** argv) {
+int runAndReport(int argc, char** argv, Silence& silence) {
     try {
-        return run(argc, argv);
+        return run(argc, argv, silence);
     } catch (const CLI::ParseError& error) {
         return reportWrongUse(error);
     } catch (const std::exception& error) {
@@ -75,7 +88,8 @@ int runAndReport(int argc, char** argv) {
 
 // A reader who has gone wants no more; elsewhere, what could not be printed was not done.
 int vexa::client::runProgram(int argc, char** argv) {
-    const int exitCode = runAndReport(argc, argv);
+    Silence silence;
+    const int exitCode = runAndReport(argc, argv, silence);
     std::cout << std::flush;
     if (exitCode != kExitOk || std::cout || isOutputPipe()) return exitCode;
     return report(ClientError("standard output cannot be written"), kExitFailed);

@@ -26,8 +26,8 @@ std::vector<std::string> linesOf(const NetworkList& list) {
     return list.empty() ? std::vector<std::string>{"No hotspot networks."} : networkTable(list);
 }
 
-bool show(const NetworkList& list, bool json) {
-    return print(json, networksJson(list), linesOf(list));
+bool show(const NetworkList& list, const OutputOptions& options) {
+    return print(options, networksJson(list), linesOf(list));
 }
 
 /// An empty list has reasons that the list does not tell.
@@ -40,15 +40,20 @@ void explain(HotspotPort& port, const HotspotOptions& options) {
     }
 }
 
+/// Only its own words are drawn.
+bool isDrawn(const OutputOptions& options) {
+    return !options.json && !options.terse && options.chosen.empty() && TerminalScreen::isUsable();
+}
+
 /// The lists of a service, one after the other.
 class Watch {
 public:
-    Watch(HotspotPort& port, std::optional<NetworkList> first, bool json)
-        : m_port(port), m_list(std::move(first)), m_json(json) {}
+    Watch(HotspotPort& port, std::optional<NetworkList> first, const OutputOptions& options)
+        : m_port(port), m_list(std::move(first)), m_options(options) {}
 
     /// Until the user has had enough, or nobody reads any more.
     void run() try {
-        if (!m_json && TerminalScreen::isUsable()) {
+        if (isDrawn(m_options)) {
             m_port.endWith(m_screen.emplace());
         } else if (TerminalKeys::isUsable()) {
             m_port.endWith(m_keys.emplace());
@@ -59,7 +64,7 @@ public:
     } catch (const StoppedByUser&) {
         if (!m_screen) return;
         m_screen.reset();
-        show(m_list.value_or(NetworkList()), m_json);
+        show(m_list.value_or(NetworkList()), m_options);
     }
 
 private:
@@ -72,8 +77,8 @@ private:
             NetworkList list = networkList(payloadOf(*event));
             if (list == m_list) return true;
             m_list = std::move(list);
-            if (!m_screen && !m_json) std::cout << '\n';
-            if (!m_screen && !show(*m_list, m_json)) return false;
+            if (!m_screen && !m_options.json) std::cout << '\n';
+            if (!m_screen && !show(*m_list, m_options)) return false;
         }
         if (m_screen) draw();
         return true;
@@ -88,7 +93,7 @@ private:
 
     HotspotPort& m_port;
     std::optional<NetworkList> m_list;
-    bool m_json;
+    const OutputOptions& m_options;
     std::optional<ListScreen> m_screen;
     std::optional<TerminalKeys> m_keys;
 };
@@ -96,14 +101,13 @@ private:
 int runNetworks(const NetworksOptions& options) {
     Signals signals;
     HotspotPort port(options.hotspot.port.find(), signals, options.hotspot.limit());
-    const bool json = options.hotspot.json;
     const auto list = askNetworks(port);
     if (!list && !options.watch) throw ClientError(kNoAdapter);
-    const bool isDrawn = options.watch && !json && TerminalScreen::isUsable();
+    const bool isPicture = options.watch && isDrawn(options.hotspot);
     if (!list) std::cerr << "vexa: " << kNoAdapter << '\n';
-    if (list && !isDrawn && !show(*list, json)) return kExitOk;
-    if (list && list->empty() && !json) explain(port, options.hotspot);
-    if (options.watch) Watch(port, list, json).run();
+    if (list && !isPicture && !show(*list, options.hotspot)) return kExitOk;
+    if (list && list->empty() && !options.hotspot.json) explain(port, options.hotspot);
+    if (options.watch) Watch(port, list, options.hotspot).run();
     return kExitOk;
 }
 
@@ -113,7 +117,9 @@ void addNetworksCommand(CLI::App& app, int& exitCode) {
     auto options = std::make_shared<NetworksOptions>();
     CLI::App* command =
         app.add_subcommand("networks", "List the hotspot networks in range, with their realms");
-    options->hotspot.addTo(*command);
+    options->hotspot.addTo(
+        *command,
+        {{{"name", "Network"}, {"connected", "Connected"}, {"internet", "Internet"}, {"realms", "Realms"}}});
     command->add_flag("--watch", options->watch, "Go on with every list that differs, until q or Ctrl-C");
     command->callback([options, &exitCode] { exitCode = runNetworks(*options); });
 }

@@ -1,9 +1,9 @@
 #include <CLI/CLI.hpp>
 #include <algorithm>
-#include <iostream>
 #include <memory>
 
 #include "client/command/Commands.h"
+#include "client/command/Output.h"
 #include "client/command/PortOption.h"
 #include "client/spectrum/SpectralText.h"
 #include "client/spectrum/SpectrumWatch.h"
@@ -29,7 +29,7 @@ struct ScanOptions {
     PortOption port{Half::Spectral};
     int timeout = kDefaultTimeout;
     bool watch = false;
-    bool json = false;
+    OutputOptions output;
 };
 
 /// Decides when a scan has told enough.
@@ -83,17 +83,13 @@ int runScan(const ScanOptions& options) {
     Signals signals;
     SpectralScan scan(options.port.find());
     if (options.watch) {
-        SpectrumOutput output(options.json ? SpectrumOutput::Form::Json : SpectrumOutput::Form::Readable);
+        SpectrumOutput output(options.output.json ? SpectrumOutput::Form::Json
+                                                  : SpectrumOutput::Form::Readable);
         watchSpectrum(scan, signals, output, Deadline::never());
         return kExitOk;
     }
     scanOnce(scan, signals, seconds(options.timeout));
-    if (options.json) {
-        std::cout << spectrumJson(scan.view()) << std::endl;
-    } else {
-        for (const auto& line : spectrumTable(scan.view()))
-            std::cout << line << '\n';
-    }
+    print(options.output, spectrumJson(scan.view()), spectrumTable(scan.view()));
     if (scan.view().knownChannels() > 0) return kExitOk;
     throw ClientError("no channel told a value within " + std::to_string(options.timeout) + " s");
 }
@@ -105,12 +101,17 @@ void addScanCommand(CLI::App& app, int& exitCode) {
     CLI::App* command =
         app.add_subcommand("scan", "Scan the spectrum and show congestion and interference per channel");
     options->port.addTo(*command);
-    command->add_flag("--watch", options->watch,
-                      "Go on, as bars in the terminal or a line per event, until q or Ctrl-C");
+    CLI::Option* watch = command->add_flag(
+        "--watch", options->watch, "Go on, as bars in the terminal or a line per event, until q or Ctrl-C");
     command->add_option("--timeout", options->timeout, "Seconds to wait for values at most; default 15")
         ->type_name("N")
         ->check(CLI::Range(1, 3600));
-    command->add_flag("--json", options->json, "Print JSON");
+    options->output.addTo(*command, {{{"channel", "Channel"},
+                                      {"order", "Order"},
+                                      {"congestion", "Congestion"},
+                                      {"interference", "Interference"}},
+                                     "channels"});
+    watch->excludes(command->get_option("--fields"))->excludes(command->get_option("--terse"));
     command->callback([options, &exitCode] { exitCode = runScan(*options); });
 }
 

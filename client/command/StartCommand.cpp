@@ -1,8 +1,8 @@
 #include <CLI/CLI.hpp>
-#include <iostream>
 #include <memory>
 
 #include "client/command/Commands.h"
+#include "client/command/Output.h"
 #include "client/machine/ServiceHost.h"
 #include "client/machine/ServiceParent.h"
 #include "client/terminal/ClientError.h"
@@ -15,19 +15,15 @@ struct StartOptions {
     StartRequest request;
     std::uint16_t controlPort = 0;
     bool stopOnEof = false;
-    bool json = false;
+    OutputOptions output;
 };
-
-void announce(const ServicePorts& ports, bool json) {
-    std::cout << (json ? portsAsJson(ports) : "ready " + portsAsText(ports)) << std::endl;
-}
 
 int runStart(const StartOptions& options) {
     Signals signals;
     StopSource stop(signals, options.stopOnEof);
     ServiceParent parent(options.request, stop);
     if (parent.waitUntilReady() == ServiceParent::State::Ready) {
-        announce(parent.ports(), options.json);
+        print(options.output, portsJson(parent.ports()), "ready " + portsAsText(parent.ports()));
         parent.waitForEnd();
     }
     return parent.stop();
@@ -62,7 +58,9 @@ void addStartCommand(CLI::App& app, int& exitCode) {
                      "The service's executable; default: the one that came with this program")
         ->type_name("PATH");
     command->add_flag("--stop-on-eof", options->stopOnEof, "Stop as well when standard input ends");
-    command->add_flag("--json", options->json, "Announce the ports as a JSON object");
+    options->output.addTo(
+        *command, {{{"sa", "Spectral analyser"}, {"hs20", "Hotspot"}, {"control", "Control channel"}}},
+        "Announce the ports as a JSON object");
     CLI::Option* const control = hasSimulatedMachines() ? addMachineOptions(*command, *options) : nullptr;
     command->callback([options, control, &exitCode] {
         if (control != nullptr && control->count() > 0) options->request.controlPort = options->controlPort;

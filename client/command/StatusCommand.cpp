@@ -139,12 +139,28 @@ Json::Value statusJson(const Status& status) {
     return object;
 }
 
+FieldList statusFields() {
+    return {{{"adapter", "Adapter"},
+             {"radio", "Radio"},
+             {"hotspot", "Hotspot"},
+             {"networks", "Networks"},
+             {"connection", "Connection"},
+             {"credential", "Credential"},
+             {"possibleCredentials", "Possible credentials"},
+             {"internet", "Internet"},
+             {"channel", "Channel"},
+             {"ports.sa", "Spectral port"},
+             {"ports.hs20", "Hotspot port"},
+             {"machine", "Machine"},
+             {"version", "Version"}}};
+}
+
 int runStatus(const HotspotOptions& options) {
     Signals signals;
     HotspotPort port(options.port.find(), signals, options.limit());
     Status status = askStatus(port, options);
     askMachine(status, options, signals);
-    print(options.json, statusJson(status), statusLines(status));
+    print(options, statusJson(status), statusLines(status));
     return kExitOk;
 }
 
@@ -154,7 +170,7 @@ void addStatusCommand(CLI::App& app, int& exitCode) {
     auto options = std::make_shared<HotspotOptions>();
     CLI::App* command = app.add_subcommand(
         "status", "Tell of the adapter, its radio, the hotspot switch, the connection and the service");
-    options->addTo(*command);
+    options->addTo(*command, statusFields());
     command->callback([options, &exitCode] { exitCode = runStatus(*options); });
 }
 

@@ -16,7 +16,7 @@ namespace {
 void say(const HotspotOptions& options, const char* member, const Json::Value& value, const char* sentence) {
     Json::Value object(Json::objectValue);
     object[member] = value;
-    print(options.json, object, sentence);
+    print(options, object, sentence);
 }
 
 // Without an adapter, or before it knows the adapter, the service answers all the same, and turns nothing. It
@@ -56,7 +56,7 @@ int runRefresh(const HotspotOptions& options) {
 void addSwitch(CLI::App& app, int& exitCode, const char* name, const char* description, bool isOn) {
     auto options = std::make_shared<HotspotOptions>();
     CLI::App* command = app.add_subcommand(name, description);
-    options->addTo(*command);
+    options->addTo(*command, {{{"hotspot", "Hotspot"}}});
     command->callback([options, isOn, &exitCode] { exitCode = runSwitch(*options, isOn); });
 }
 
@@ -74,7 +74,7 @@ void addRefreshCommand(CLI::App& app, int& exitCode) {
     auto options = std::make_shared<HotspotOptions>();
     CLI::App* command =
         app.add_subcommand("refresh", "Ask the networks for their realms again; ends a connection first");
-    options->addTo(*command);
+    options->addTo(*command, {{{"refreshing", "Refreshing"}}});
     command->callback([options, &exitCode] { exitCode = runRefresh(*options); });
 }
 

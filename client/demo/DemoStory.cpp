@@ -135,7 +135,7 @@ void DemoStory::takeReasons(std::vector<Item>& items) {
         const std::string text = textOf(line.text);
         if (std::find(m_reasons.begin(), m_reasons.end(), text) != m_reasons.end()) continue;
         m_reasons.push_back(text);
-        say(items, Speaker::Log, jsonOf(line), "log: " + text);
+        say(items, Speaker::Log, jsonLine(lineJson(line)), "log: " + text);
     }
 }
 

@@ -9,6 +9,8 @@
 #include "client/import/MetadataNotes.h"
 #include "client/terminal/ClientError.h"
 #include "client/terminal/Text.h"
+#include "contract/Realm.h"
+#include "text/TextConversion.h"
 
 namespace vexa::client {
 
@@ -76,7 +78,7 @@ public:
         }
         nameAll();
         for (FiledCredential& filed : m_found) {
-            const auto objection = objectionTo(filed.credential);
+            const auto objection = objectionToFiled(filed.credential);
             if (objection)
                 m_notes.tell(methodOf(filed.credential), *objection);
             else
@@ -96,6 +98,12 @@ private:
     }
 
     std::string shownName() const { return m_name.empty() ? m_provider.attribute("ID").value() : m_name; }
+
+    static std::optional<std::string> objectionToFiled(const Credential& credential) {
+        if (const auto objection = objectionTo(credential)) return objection;
+        if (contract::realmBytes(wideFromUtf8(credential.realm))) return std::nullopt;
+        return "its realm holds a character beyond Latin-1, which no network's can be compared with";
+    }
 
     static std::string methodOf(const Credential& credential) { return "EAP-" + methodName(credential); }
 

@@ -7,7 +7,6 @@
 #include <tuple>
 #include <utility>
 
-#include "client/port/JsonLine.h"
 #include "client/port/Passwords.h"
 #include "client/terminal/Text.h"
 
@@ -152,11 +151,11 @@ std::string withoutPassword(std::string line) {
     return line.replace(found + kBefore.size(), std::string::npos, kHiddenPassword);
 }
 
-std::string jsonOf(const LogFiles::Line& line) {
+Json::Value lineJson(const LogFiles::Line& line) {
     Json::Value object(Json::objectValue);
     object["file"] = line.file;
     object["line"] = asUtf8(line.text);
-    return jsonLine(object);
+    return object;
 }
 
 }  // namespace vexa::client

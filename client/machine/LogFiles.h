@@ -1,5 +1,7 @@
 #pragma once
 
+#include <json/value.h>
+
 #include <cstddef>
 #include <cstdint>
 #include <filesystem>
@@ -51,7 +53,7 @@ private:
 /// The line without the password that it may tell.
 std::string withoutPassword(std::string line);
 
-/// The line as a JSON object on one line.
-std::string jsonOf(const LogFiles::Line& line);
+/// The line as a JSON object.
+Json::Value lineJson(const LogFiles::Line& line);
 
 }  // namespace vexa::client

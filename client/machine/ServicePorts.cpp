@@ -24,16 +24,16 @@ std::string portsAsText(const ServicePorts& ports) {
            " control=" + std::to_string(ports.control);
 }
 
-std::string portsAsJson(const ServicePorts& ports) {
+Json::Value portsJson(const ServicePorts& ports) {
     Json::Value object(Json::objectValue);
     object["sa"] = ports.sa;
     object["hs20"] = ports.hs20;
     object["control"] = ports.control;
-    return jsonLine(object);
+    return object;
 }
 
 bool writePortsFile(const std::filesystem::path& file, const ServicePorts& ports) {
-    return replaceOwnerFile(file, portsAsJson(ports) + "\n");
+    return replaceOwnerFile(file, jsonLine(portsJson(ports)) + "\n");
 }
 
 std::optional<ServicePorts> readPortsFile(const std::filesystem::path& file) {

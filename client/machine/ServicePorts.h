@@ -1,5 +1,7 @@
 #pragma once
 
+#include <json/value.h>
+
 #include <cstdint>
 #include <filesystem>
 #include <optional>
@@ -17,8 +19,8 @@ struct ServicePorts {
 /// `sa=N hs20=N control=N`
 std::string portsAsText(const ServicePorts& ports);
 
-/// An object with these three names, on one line.
-std::string portsAsJson(const ServicePorts& ports);
+/// An object with these three names.
+Json::Value portsJson(const ServicePorts& ports);
 
 /// The ports of the running service, left in its machine's folder by its parent so that the other commands
 /// find them. False if the file cannot be written.

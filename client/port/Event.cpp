@@ -6,11 +6,15 @@ namespace vexa::client {
 
 std::optional<Event> parseEvent(std::string_view text) {
     const auto envelope = parseJsonObject(text);
-    if (!envelope) return std::nullopt;
-    const Json::Value& id = (*envelope)["EventId"];
-    const Json::Value& data = (*envelope)["Data"];
+    return envelope ? eventOf(*envelope) : std::nullopt;
+}
+
+std::optional<Event> eventOf(const Json::Value& envelope) {
+    if (!envelope.isObject()) return std::nullopt;
+    const Json::Value& id = envelope["EventId"];
+    const Json::Value& data = envelope["Data"];
     if (!id.isString() || !(data.isString() || data.isNull())) return std::nullopt;
-    const Json::Value& source = (*envelope)["Source"];
+    const Json::Value& source = envelope["Source"];
     return Event{id.asString(), data.asString(), source.isString() ? source.asString() : ""};
 }
 

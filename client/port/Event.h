@@ -15,8 +15,9 @@ struct Event {
     std::string source = {};
 };
 
-/// Nothing if the text is no event.
+/// Nothing if the text, or the value, is no event.
 std::optional<Event> parseEvent(std::string_view text);
+std::optional<Event> eventOf(const Json::Value& envelope);
 
 /// Its data as JSON; null if it is none.
 Json::Value payloadOf(const Event& event);

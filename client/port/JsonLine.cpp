@@ -13,6 +13,7 @@ std::string jsonLine(const Json::Value& value) {
     Json::StreamWriterBuilder builder;
     builder["indentation"] = "";
     builder["emitUTF8"] = true;
+    builder["precision"] = 15;  // what a double keeps of a decimal: 0.1 is no 0.10000000000000001
     return withoutHidden(Json::writeString(builder, value));
 }
 

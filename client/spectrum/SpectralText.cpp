@@ -73,7 +73,7 @@ std::vector<std::string> spectrumTable(const SpectralView& view) {
     return lines;
 }
 
-std::string spectrumJson(const SpectralView& view) {
+Json::Value spectrumJson(const SpectralView& view) {
     Json::Value channels(Json::arrayValue);
     for (const auto& channel : view.channels()) {
         Json::Value entry(Json::objectValue);
@@ -85,7 +85,7 @@ std::string spectrumJson(const SpectralView& view) {
     }
     Json::Value object(Json::objectValue);
     object["channels"] = channels;
-    return jsonLine(object);
+    return object;
 }
 
 std::string summaryText(const SpectralView& view) {

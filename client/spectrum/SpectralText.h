@@ -19,7 +19,7 @@ std::string describeEvent(const Event& event, const SpectralView::Update& update
 std::vector<std::string> spectrumTable(const SpectralView& view);
 
 /// The same as a JSON object, with the order too.
-std::string spectrumJson(const SpectralView& view);
+Json::Value spectrumJson(const SpectralView& view);
 
 /// What was seen: channels, events, the busiest channel.
 std::string summaryText(const SpectralView& view);

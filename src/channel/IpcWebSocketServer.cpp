@@ -295,8 +295,12 @@ void IpcWebSocketServer::stop() {
     m_impl->stop();
 }
 
+bool IpcWebSocketServer::hasClients() const {
+    return m_impl->hasClients();
+}
+
 bool IpcWebSocketServer::sendToAll(std::string_view message) {
-    const bool isTaken = m_impl->hasClients();
+    const bool isTaken = hasClients();
     if (isTaken) m_impl->queue(0, message);
     return isTaken;
 }

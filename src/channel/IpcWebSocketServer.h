@@ -51,6 +51,9 @@ public:
     /// Queues a message for one client, dropped if he has left.
     void sendTo(ClientId client, std::string_view message);
 
+    /// Whether any client is in. Any thread.
+    bool hasClients() const;
+
     /// Sends what is queued, for half a second at most, and drops all clients with close code 1001. Returns
     /// after the last call of the handler has; sends give false from now on. REQUIRES: not called by the
     /// handler, and no lock held that it takes.

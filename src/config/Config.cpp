@@ -92,7 +92,7 @@ ResultCode Config::readConfig(bool* configChanged) {
     bool isChanged = false;
     Reading reading{.table = m_credentials, .trace = Trace::Yes};
     if (readTable(reading, isChanged) != kSuccess) return kFailure;
-    remember();
+    remember(reading.inFile, reading.hasUser);
     m_content = std::move(*content);
     m_bUnsaved = false;
     if (configChanged != nullptr) *configChanged = isChanged;

@@ -80,6 +80,7 @@ private:
         std::int32_t highestId = 0;                        // whoever's it is
         std::unordered_set<std::int32_t> foreignIds = {};  // of other users' private credentials
         bool hasUser = false;                              // the user's own list is there
+        std::vector<Credential> inFile = {};               // traced: with the places that this list gives
     };
 
     /// A credential as the file held it when it was last read or saved, its place as the user's list gave it,
@@ -132,7 +133,8 @@ private:
     bool applyReferences(const std::vector<Node>& references, const Reading& reading) REQUIRES(g_hs20Lock);
 
     bool readSilently(Reading& reading) REQUIRES(g_hs20Lock);
-    void remember() REQUIRES(g_hs20Lock);
+    void remember(const std::vector<Credential>& inFile, bool hasUser) REQUIRES(g_hs20Lock);
+    void rememberFile(const std::string& content) REQUIRES(g_hs20Lock);
     void takeOver(const Reading& stored) REQUIRES(g_hs20Lock);
     void takeOverDeletions(const CredentialTable& stored) REQUIRES(g_hs20Lock);
     void giveNewId(Credential& credential) REQUIRES(g_hs20Lock);

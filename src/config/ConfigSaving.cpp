@@ -162,17 +162,26 @@ void Config::appendCredentials(std::string& text, bool isKnownFile, std::vector<
     }
 }
 
-// Memory and file hold the same now, each in its way.
+// As the next reading will find it.
+void Config::rememberFile(const std::string& content) {
+    m_xmlDoc.release();
+    CredentialTable table;
+    Reading reading{.table = table, .trace = Trace::No};
+    if (openDocument(content) != kSuccess) return;
+    readSilently(reading);
+    std::vector<Credential> inFile;
+    for (const Credential* credential : table.copyCredentialPointers())
+        inFile.push_back(*credential);
+    remember(inFile, reading.hasUser);
+}
+
 void Config::rememberSaved(const std::string& text, const Frame& frame, bool isKnownFile,
                            const std::vector<Written>& written) {
     std::unordered_set<std::int32_t> ids;
     for (const Written& one : written)
         if (!frame.foreignIds.contains(one.credential->m_id)) ids.insert(one.credential->m_id);
     const bool areIdsPlain = frame.isWhole() && ids.size() == written.size();
-    if (!isKnownFile || !areIdsPlain) {
-        m_xmlDoc.release();
-        if (openDocument(text) == kSuccess) remember();
-    }
+    if (!isKnownFile || !areIdsPlain) rememberFile(text);
     if (!areIdsPlain) return;
     for (const Written& one : written)
         rememberWritten(one, text);

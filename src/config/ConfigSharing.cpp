@@ -59,19 +59,16 @@ bool Config::readSilently(Reading& reading) {
     return readCredentials(reading, isChanged) == kSuccess && readUsers(reading, isChanged) == kSuccess;
 }
 
-// Memory and the open document hold the same now, each in its way.
-void Config::remember() {
-    CredentialTable stored;
-    Reading reading{.table = stored, .trace = Trace::No};
-    readSilently(reading);
+// Memory and file hold the same now, each in its way.
+void Config::remember(const std::vector<Credential>& inFile, bool hasUser) {
     const auto inMemory = m_credentials.credentialsById();
     std::unordered_map<std::int32_t, Known> known;
-    for (const Credential* theirs : stored.copyCredentialPointers()) {
-        const Credential* const mine = find(inMemory, theirs->m_id);
-        known.try_emplace(theirs->m_id, Known{*theirs, mine == nullptr ? *theirs : *mine});
+    for (const Credential& theirs : inFile) {
+        const Credential* const mine = find(inMemory, theirs.m_id);
+        known.try_emplace(theirs.m_id, Known{theirs, mine == nullptr ? theirs : *mine});
     }
     m_known.swap(known);
-    m_hadUser = reading.hasUser;
+    m_hadUser = hasUser;
 }
 
 // What the file holds otherwise than before is what others changed; what memory holds otherwise is what could

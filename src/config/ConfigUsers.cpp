@@ -22,6 +22,8 @@ ResultCode Config::readUsers(Reading& reading, bool& isChanged) {
         isChanged = applyReferences(references, reading) || isChanged;
     }
     if (!isTraced) return kSuccess;
+    for (const Credential* credential : reading.table.copyCredentialPointers())
+        reading.inFile.push_back(*credential);
     reading.table.placeUnplacedCredentials();
     reading.table.dumpCredentials();
     return kSuccess;

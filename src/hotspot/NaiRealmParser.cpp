@@ -130,8 +130,9 @@ bool parseNaiRealm(NaiRealm& realm, Reader& reader) {
     }
     const Bytes name = entry.take(realmLength);
     LogBytes(2, "\tNAI Realm=", name.data(), static_cast<std::int64_t>(name.size()), true);
-    std::transform(name.begin(), std::find(name.begin(), name.end(), std::byte{0}),
-                   std::back_inserter(realm.realm), [](std::byte byte) { return static_cast<char>(byte); });
+    const auto end = std::find(name.begin(), name.end(), std::byte{0});
+    realm.realm.assign(reinterpret_cast<const char*>(name.data()),
+                       static_cast<std::size_t>(end - name.begin()));
     return parseMethods(realm, entry);
 }
 

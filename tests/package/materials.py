@@ -12,7 +12,7 @@ import unittest
 BUILD, BILL = (pathlib.Path(os.environ[name]).resolve() for name in ("VEXA_BUILD", "VEXA_BILL"))
 PROGRAMS = ("vexa", "vexa-service")
 # Of what is built for Windows from source packages, by what its files are called.
-FROM_SOURCES = {"json": "libjsoncpp", "pugi": "pugixml"}
+FROM_SOURCES = {"json": "libjsoncpp", "pugi": "pugixml", "zlib": "zlib", "zconf": "zlib"}
 # Headers that say how to call the kernel; nothing of it comes along.
 KERNEL = "linux"
 

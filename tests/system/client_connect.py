@@ -179,7 +179,7 @@ class NotJoining(ConnectStory):
         terminal = self.terminal("connect", "Café", "--machine", self.machine.folder)
         terminal.read_until('vexa: waiting for "Café" to be joined; Ctrl-C ends it'.encode())
         terminal.press(b"\x03")
-        self.assertEqual(terminal.finish(), 1)
+        self.assertEqual(terminal.finish(), 130)
 
     def test_too_slow(self):
         self.pocket(MANUAL)

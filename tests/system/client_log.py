@@ -2,14 +2,18 @@
 
 import json
 import os
+import pathlib
 import re
 import resource
 import signal
+import time
 import unicodedata
 
 from harness import STORE, Story, run_client, wait_until
 
 LINE = re.compile(r"\[\d+\] \d\d/\d\d \d\d:\d\d:\d\d  ")
+TEXT = r'"(?:[^"\\]|\\.)*"'
+CALL, ROW = re.compile(rf"\bLog(?:Wide)?\(\s*([2-6]),\s*((?:L?{TEXT}\s*)+)"), re.compile(rf"\{{\d+, ({TEXT}), (\d), ")
 
 
 def config(enabled):
@@ -18,6 +22,21 @@ def config(enabled):
         f"<create_new_dump_file>true</create_new_dump_file><enabledump>{enabled}</enabledump>"
         "<nextcredid>1</nextcredid></global><credentials></credentials><users></users></configurations>"
     )
+
+
+def logged():
+    """The level and the text of all that the service logs, each network named `Gate 1`."""
+    for path in (pathlib.Path(__file__).parents[2] / "src").rglob("*.cpp"):
+        source = path.read_text()
+        calls = [(level, "".join(json.loads(part) for part in re.findall(TEXT, text))) for level, text in CALL.findall(source)]
+        for level, text in calls + [(level, json.loads(text)) for text, level in ROW.findall(source)]:
+            text = re.sub("(ssid=|network=|####)%s", r"\1Gate 1", text)
+            if text != "%s":
+                yield int(level), re.sub(r"%[\w]+", "7", text)
+
+
+def entry(number, text, age=0):
+    return time.strftime(f"[{number}] %m/%d %H:%M:%S  {text}\n", time.localtime(time.time() - age))
 
 
 class OfService(Story):
@@ -142,3 +161,36 @@ class OfFiles(Story):
         (self.folder / STORE / "Dump" / "a.txt").write_text("anew\n")
         follower.wait_line("anew")
         self.assertEqual(follower.lines, ["three", "anew"])
+
+    def test_entries_by_their_level_and_their_network(self):
+        self.set_config("true")
+        entries = [(level, entry(number, text)) for number, (level, text) in enumerate(logged(), 1)]
+        self.assertGreater(len(entries), 250)
+        self.write("a.txt", "".join(text for _, text in entries))
+        for level in range(2, 7):
+            wanted = "".join(text for its_level, text in entries if its_level >= level).splitlines()
+            self.assertEqual(self.lines("--level", str(level)), wanted)
+        named = "".join(text for _, text in entries if "Gate 1" in text).splitlines()
+        self.assertEqual((self.lines("--ssid", "Gate 1"), self.lines("--ssid", "Gate")), (named, []))
+
+    def test_entries_by_their_time_and_their_text(self):
+        self.set_config("true")
+        hex_dump = "[4] Interworking: AP domain name 2e 63"
+        old, empty, error = entry(1, "old: one", 3 * 3600), entry(2, "\n\tnew one"), entry(5, "ERROR: new two")
+        self.write("a.txt", old + empty + "and on\n" + entry(3, "new three") + hex_dump + error)
+        one, two, three = [*empty.splitlines(), "and on"], [hex_dump + error[:-1]], entry(3, "new three").splitlines()
+        then = time.localtime(time.time() - 2 * 3600)
+        for since in ("90m", "2h", time.strftime("%H:%M", then), time.strftime("%Y-%m-%d %H:%M", then)):
+            self.assertEqual(self.lines("--since", since), [*one, *three, *two], since)
+        self.assertEqual(self.lines("--grep", "one"), [*old.splitlines(), *one])
+        self.assertEqual(self.lines("--grep", "one", "--since", "1h"), one)
+        self.assertEqual(self.lines("--level", "3", "--grep", "new", "-n", "2"), three + two)
+        self.assertEqual(self.lines("--terse", "--fields", "line,file", "-n", "1", "--since", "4h", "--grep", "old"),
+                         [old[:-1].replace(":", "\\:") + ":a.txt"])
+        for wrong in ("soon", "10", "25:00", "1m2", "2026-11-24"):
+            self.assertIn("is no time", self.refused(2, "log", "--since", wrong))
+        follower = self.running("log", "-f", "--level", "6", "--machine", self.folder)
+        follower.wait_line("ERROR: new two")
+        self.write("a.txt", entry(6, "more") + entry(7, "ERROR: three"))
+        follower.wait_line("ERROR: three")
+        self.assertEqual(len(follower.lines), 2)

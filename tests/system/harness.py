@@ -428,8 +428,8 @@ class Terminal:
     def resize(self, columns, rows):
         fcntl.ioctl(self.ours, termios.TIOCSWINSZ, struct.pack("HHHH", rows, columns, 0, 0))
 
-    def read_until(self, pattern):
-        self._read(lambda: re.search(pattern, self.screen))
+    def read_until(self, pattern, timeout=PATIENCE):
+        self._read(lambda: re.search(pattern, self.screen), timeout)
 
     def finish(self):
         self._read(lambda: self.process.poll() is not None)
@@ -443,11 +443,11 @@ class Terminal:
         self.process.send_signal(signal.SIGCONT)
         wait_until(lambda: self.settings() != self.before, "the terminal being taken again")
 
-    def _read(self, done):
-        end = time.monotonic() + PATIENCE
+    def _read(self, done, timeout=PATIENCE):
+        end = time.monotonic() + timeout
         while not done():
             if time.monotonic() > end:
-                raise AssertionError(f"not in {PATIENCE} s; the terminal got {self.screen[-2000:]!r}")
+                raise AssertionError(f"not in {timeout} s; the terminal got {self.screen[-2000:]!r}")
             self._drain(0.05)
 
     def _drain(self, wait):

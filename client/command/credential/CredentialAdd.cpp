@@ -3,6 +3,7 @@
 
 #include "client/command/Commands.h"
 #include "client/command/credential/CredentialFields.h"
+#include "client/command/credential/CredentialOutput.h"
 #include "client/command/credential/CredentialSession.h"
 #include "client/terminal/ClientError.h"
 #include "client/terminal/PasswordPrompt.h"
@@ -57,7 +58,7 @@ int runAdd(const AddOptions& options) {
 void addCredentialAdd(CLI::App& parent, int& exitCode) {
     auto options = std::make_shared<AddOptions>();
     CLI::App* command = parent.add_subcommand("add", "Store a credential; it goes before all others");
-    options->hotspot.addTo(*command);
+    options->hotspot.addTo(*command, credentialChangeFields());
     options->fields.addTo(*command);
     command
         ->add_option("--method", options->method,

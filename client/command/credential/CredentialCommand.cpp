@@ -5,6 +5,7 @@
 
 #include "client/command/Commands.h"
 #include "client/command/credential/CredentialChoice.h"
+#include "client/command/credential/CredentialOutput.h"
 #include "client/command/credential/CredentialSession.h"
 #include "client/terminal/ClientError.h"
 
@@ -66,7 +67,7 @@ void addCredentialDelete(CLI::App& parent, int& exitCode) {
     auto options = std::make_shared<PlaceOptions>();
     CLI::App* command = parent.add_subcommand("delete", "Delete a credential");
     options->choice.addTo(*command, true);
-    options->hotspot.addTo(*command);
+    options->hotspot.addTo(*command, credentialChangeFields());
     command->callback([options, &exitCode] { exitCode = runDelete(*options); });
 }
 
@@ -76,7 +77,7 @@ void addCredentialMove(CLI::App& parent, int& exitCode) {
     options->choice.addTo(*command, true);
     command->add_option("POSITION", options->position, "Its place in the order of priority; 1 is the first")
         ->type_name("N");
-    options->hotspot.addTo(*command);
+    options->hotspot.addTo(*command, credentialChangeFields());
     command->callback([options, &exitCode] { exitCode = runMove(*options); });
 }
 

@@ -5,6 +5,7 @@
 #include "client/command/Commands.h"
 #include "client/command/credential/CredentialChoice.h"
 #include "client/command/credential/CredentialFields.h"
+#include "client/command/credential/CredentialOutput.h"
 #include "client/command/credential/CredentialSession.h"
 #include "client/terminal/ClientError.h"
 #include "client/terminal/PasswordPrompt.h"
@@ -86,7 +87,7 @@ void addCredentialEdit(CLI::App& parent, int& exitCode) {
     auto options = std::make_shared<EditOptions>();
     CLI::App* command = parent.add_subcommand("edit", "Change a credential; what is not given stays");
     options->choice.addTo(*command, false);
-    options->hotspot.addTo(*command);
+    options->hotspot.addTo(*command, credentialChangeFields());
     options->fields.addTo(*command);
     command->add_flag("--ask-password", options->askPassword, "Ask for a new password")
         ->excludes(command->get_option("--password-stdin"));

@@ -31,7 +31,7 @@ void CredentialSession::report(const std::string& verb, const std::string& sente
     Json::Value object(Json::objectValue);
     object["done"] = verb;
     object["credential"] = credentialJson(credential, position, Passwords::Hidden);
-    print(m_options.json, object, sentence);
+    print(m_options, object, sentence);
 }
 
 }  // namespace vexa::client

@@ -114,6 +114,9 @@ TEST(EapMetadata, BecomesCredentialsAndALineForWhatTheyCannotHold) {
          "\"\": EAP-TTLS with EAP-GTC is not kept: the service has it with PAP and MSCHAPv2\n"},
         {ttls + client("<UserName>u@r</UserName><Password> p\n</Password>"), "TTLS r u@r/p\n"},
         {ttls + client("<UserName>u</UserName><OuterIdentity>anonymous@o</OuterIdentity>"), "TTLS o u/\n"},
+        {ttls + client("<UserName>u@\u0142</UserName>"),
+         "\"\": EAP-TTLS is not kept: its realm holds a character beyond Latin-1, which no network's can be "
+         "compared with\n"},
         {ttls + client("<UserName>u</UserName>"), "\"\": EAP-TTLS is not kept: it names no realm\n"},
         {ttls + client("<InnerIdentitySuffix>" + std::string(128, 'r') + "</InnerIdentitySuffix>"),
          "\"\": EAP-TTLS is not kept: the name is longer than 127 characters\n"},

@@ -110,7 +110,7 @@ TEST(SpectralText, AValueThatDidNotChangeSinceTheListIs0AndAnyOtherThatWasNotTol
     EXPECT_EQ(spectrumTable(view), (std::vector<std::string>{"Channel  Congestion  Interference",
                                                              "      1           -             7",
                                                              "     36           0            42"}));
-    EXPECT_EQ(spectrumJson(view),
+    EXPECT_EQ(jsonLine(spectrumJson(view)),
               R"({"channels":[{"channel":1,"congestion":null,"interference":7,"order":2},)"
               R"({"channel":36,"congestion":0,"interference":42,"order":1}]})");
     EXPECT_EQ(spectrumTable(viewOf({channelList(kTwoChannels)}))[1], "      1           -             -");

@@ -1,0 +1,104 @@
+#include "client/record/Recording.h"
+
+#include <json/value.h>
+
+#include "client/port/JsonLine.h"
+#include "client/port/Passwords.h"
+
+namespace vexa::client {
+
+namespace {
+
+constexpr const char* kPassword = "Password";
+constexpr const char* kSpectralName = "sa";
+constexpr const char* kHotspotName = "hs20";
+
+void maskPasswords(Json::Value& value) {
+    if (!value.isArray() && !value.isObject()) return;
+    for (Json::Value& member : value)
+        maskPasswords(member);
+    if (!value.isObject() || !value.isMember(kPassword)) return;
+    Json::Value& password = value[kPassword];
+    if (!password.isString() || !password.asString().empty()) password = kHiddenPassword;
+}
+
+// Data that can't be looked through is left out.
+void maskData(Json::Value& envelope) {
+    if (!envelope["Data"].isString()) return;
+    const std::string data = envelope["Data"].asString();
+    if (data.find(kPassword) == std::string::npos) return;
+    if (auto payload = parseJson(data)) {
+        maskPasswords(*payload);
+        envelope["Data"] = jsonLine(*payload);
+    } else {
+        envelope.removeMember("Data");
+    }
+}
+
+std::optional<RecordedTime> timeOf(const Json::Value& object) {
+    const Json::Value& value = object["ms"];
+    if (!value.isInt64() || value.asInt64() < 0) return std::nullopt;
+    return RecordedTime(value.asInt64());
+}
+
+std::string textOf(const Json::Value& value) {
+    return value.isString() ? value.asString() : "";
+}
+
+Json::Value timed(RecordedTime at) {
+    Json::Value object(Json::objectValue);
+    object["ms"] = static_cast<Json::Int64>(at.count());
+    return object;
+}
+
+}  // namespace
+
+std::string headerLine(const RecordingHeader& header) {
+    Json::Value object(Json::objectValue);
+    object["recording"] = "vexa";
+    object["format"] = header.format;
+    object["version"] = header.version;
+    object["started"] = header.started;
+    object["passwords"] = header.showsPasswords;
+    return jsonLine(object);
+}
+
+std::optional<std::string> recordedLine(RecordedTime at, RecordedPort port, const std::string& text,
+                                        bool showPasswords) {
+    auto envelope = parseJsonObject(text);
+    if (!envelope || !eventOf(*envelope)) return std::nullopt;
+    if (!showPasswords) maskData(*envelope);
+    Json::Value object = timed(at);
+    object["port"] = port == RecordedPort::Spectral ? kSpectralName : kHotspotName;
+    object["event"] = *envelope;
+    return jsonLine(object);
+}
+
+std::string endLine(RecordedTime at) {
+    Json::Value object = timed(at);
+    object["end"] = true;
+    return jsonLine(object);
+}
+
+std::optional<RecordingHeader> parseHeader(std::string_view line) {
+    const auto object = parseJsonObject(line);
+    if (!object || (*object)["recording"] != "vexa" || !(*object)["format"].isInt()) return std::nullopt;
+    return RecordingHeader{(*object)["format"].asInt(), textOf((*object)["version"]),
+                           textOf((*object)["started"]), (*object)["passwords"] == true};
+}
+
+std::optional<RecordedLine> parseRecordedLine(std::string_view line) {
+    const auto object = parseJsonObject(line);
+    const auto at = object ? timeOf(*object) : std::nullopt;
+    if (!at) return std::nullopt;
+    if ((*object)["end"] == true) return RecordedLine{*at, std::nullopt};
+    const std::string port = textOf((*object)["port"]);
+    if (port != kSpectralName && port != kHotspotName) return std::nullopt;
+    const auto event = eventOf((*object)["event"]);
+    if (!event) return std::nullopt;
+    return RecordedLine{
+        *at,
+        RecordedEvent{*at, port == kSpectralName ? RecordedPort::Spectral : RecordedPort::Hotspot, *event}};
+}
+
+}  // namespace vexa::client

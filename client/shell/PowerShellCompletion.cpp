@@ -1,0 +1,116 @@
+#include <sstream>
+
+#include "client/shell/Completion.h"
+
+namespace vexa::client {
+
+namespace {
+
+constexpr const char* kHead =
+    R"ps(# Completes the command line of vexa in PowerShell, made by `vexa completion powershell`.
+
+Register-ArgumentCompleter -Native -CommandName vexa, vexa.exe -ScriptBlock {
+    param($wordToComplete, $commandAst, $cursorPosition)
+)ps";
+
+constexpr const char* kTail = R"ps(
+    $all = @($commandAst.CommandElements | Where-Object { $_.Extent.EndOffset -lt $cursorPosition } | ForEach-Object {
+            if ($_ -is [System.Management.Automation.Language.StringConstantExpressionAst]) { $_.Value }
+            else { $_.Extent.Text }
+        })
+    $words = @($all | Select-Object -Skip 1)
+    $path = ''
+    $place = 1
+    $option = ''
+    foreach ($word in $words) {
+        if ($option) { $option = '' }
+        elseif ($word.StartsWith('-')) { if ($values.ContainsKey("$path $word")) { $option = $word } }
+        elseif ($commands[$path] -and $commands[$path].Contains($word)) { $path = "$path $word".Trim() }
+        else { $place++ }
+    }
+    $key = if ($option) { "$path $option" } else { "$path $place" }
+    $found = [ordered]@{}
+    if (-not $option -and $wordToComplete.StartsWith('-')) { $found = $options[$path] }
+    elseif ($values.ContainsKey($key)) {
+        $kind, $rest = $values[$key]
+        if ($kind -eq 'words') { foreach ($name in $rest) { $found[$name] = $name } }
+        elseif ($kind) {
+            [Console]::OutputEncoding = [System.Text.Encoding]::UTF8
+            foreach ($name in @(& $all[0] __complete $kind @words 2>$null)) { $found[$name] = $name }
+        }
+    }
+    elseif ($commands[$path]) { $found = $commands[$path] }
+    $typed = $wordToComplete.Trim([char[]]"'""")
+    foreach ($name in $found.Keys) {
+        if (-not $name.StartsWith($typed)) { continue }
+        $text = if ($name -match '^[\w./-]+$') { $name } else { "'" + $name.Replace("'", "''") + "'" }
+        [System.Management.Automation.CompletionResult]::new($text, $name, 'ParameterValue', $found[$name])
+    }
+}
+)ps";
+
+std::string quoted(const std::string& text) {
+    return "'" + escapedText(text, "'", "'") + "'";
+}
+
+std::string kindText(const OptionText& option) {
+    if (option.kind != ValueKind::Choice) return "@(" + quoted(askedNames(option.kind)) + ")";
+    std::string text = "@('words'";
+    for (const std::string& choice : option.choices)
+        text += ", " + quoted(choice);
+    return text + ")";
+}
+
+/// Tables of what can be chosen from at each command.
+template <typename Append>
+void appendTable(std::ostream& out, const char* name, const CommandText& program, Append append) {
+    out << "    $" << name << " = @{\n";
+    for (const CommandText* command : allCommands(program)) {
+        out << "        " << quoted(command->path) << " = [ordered]@{";
+        append(*command);
+        out << " }\n";
+    }
+    out << "    }\n";
+}
+
+void appendValues(std::ostream& out, const CommandText& program) {
+    out << "    $values = @{\n";
+    const auto append = [&out](const std::string& key, const OptionText& option) {
+        out << "        " << quoted(key) << " = " << kindText(option) << '\n';
+    };
+    for (const CommandText* command : allCommands(program)) {
+        for (const OptionText& option : command->options) {
+            for (const std::string& name : option.names) {
+                if (!option.value.empty()) append(command->path + " " + name, option);
+            }
+        }
+        for (std::size_t i = 0; i < command->arguments.size(); ++i)
+            append(command->path + " " + std::to_string(i + 1), command->arguments[i]);
+    }
+    out << "    }\n";
+}
+
+}  // namespace
+
+std::string powerShellCompletion(const CommandText& program) {
+    std::ostringstream out;
+    out << kHead;
+    const auto append = [&out](const std::string& word, const std::string& description) {
+        out << " " << quoted(word) << " = " << quoted(description) << ";";
+    };
+    appendTable(out, "commands", program, [&](const CommandText& command) {
+        for (const CommandText& below : command.commands)
+            append(below.name(), below.description);
+    });
+    appendTable(out, "options", program, [&](const CommandText& command) {
+        for (const OptionText& option : command.options) {
+            for (const std::string& name : option.names)
+                append(name, option.description);
+        }
+    });
+    appendValues(out, program);
+    out << kTail;
+    return out.str();
+}
+
+}  // namespace vexa::client
