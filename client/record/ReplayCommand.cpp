@@ -142,7 +142,7 @@ int runReplay(const ReplayOptions& options) {
     Signals signals;
     ReplayPorts ports(spectral.number(), hotspot.number());
     if (options.json)
-        std::cout << portsAsJson({spectral.number(), hotspot.number()}) << std::endl;
+        std::cout << jsonLine(portsJson({spectral.number(), hotspot.number()})) << std::endl;
     else
         sayHow(header, std::to_string(spectral.number()), std::to_string(hotspot.number()));
     Replay(options, ports, signals).run();
