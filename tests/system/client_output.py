@@ -6,11 +6,20 @@ import re
 import signal
 
 from client_connect import CAFE, MANUAL, ConnectStory
+from client_record import WRITTEN, text_of
 from client_watch import CHANNELS
 from harness import STORE, network, wait_until
 
 PAGE = pathlib.Path(__file__).parents[2] / "docs" / "json.md"
-NAMES = {bool: "true or false", str: "text", int: "number", list: "list", dict: "object", type(None): "null"}
+NAMES = {
+    bool: "true or false",
+    str: "text",
+    int: "number",
+    float: "number",
+    list: "list",
+    dict: "object",
+    type(None): "null",
+}
 ODD = network(3, "Gate: B\\2", {"b:c": [21], "d": [13]})
 CAFE_REALMS = "cafe.example (TTLS), cafe.example (TLS)"
 PASSWORD = "--username anna --password-stdin"
@@ -32,8 +41,8 @@ def differences(value, form, seen, path=""):
     faults = [] if kind in form.get(path, (kind,))[0] else [f"{path} is {value!r}"]
     if isinstance(value, list) and any(known.startswith(path + "[]") for known in form):
         faults += [fault for part in value for fault in differences(part, form, seen, path + "[]")]
-    if isinstance(value, dict):
-        dot = path + "." if path else ""
+    dot = path + "." if path else ""
+    if isinstance(value, dict) and any(known.startswith(dot) for known in form):
         names = {re.split(r"[.[]", known[len(dot) :])[0] for known in form if known.startswith(dot)}
         needed = {name for name in names if not form.get(dot + name, ("", ""))[1]}
         faults += [f"{path}: {name}" for name in (needed - value.keys()) | (value.keys() - names)]
@@ -56,6 +65,8 @@ class Forms(ConnectStory):
         yield from ("networks", "disconnect", "credential delete 1", "reload", "disable", "credential list")
         yield from (f"credential export {folder}/own.json", f"credential import {folder}/own.json {PASSWORD}")
         yield f"send {self.machine.hs20_port} GET_IS_CARD_IN"
+        (folder / "case.rec").write_text(text_of(WRITTEN))
+        yield from (f"record {folder}/new.rec --for 1", f"stats {folder}/case.rec", f"scenario from {folder}/case.rec")
 
     def told_until_stopped(self):
         """Of the commands that go on by themselves."""
@@ -71,6 +82,12 @@ class Forms(ConnectStory):
                 program.wait_line(text)
             program.stop(signal.SIGINT)
             yield words[0], program.lines
+        (folder / "case.rec").write_text(text_of(WRITTEN))
+        replay = self.running("replay", folder / "case.rec", "--speed", 20, "--json")
+        self.vexa("send", json.loads(replay.wait_line("hs20"))["hs20"], "SET_HOTSPOT_AUTO_CONNECT", "true")
+        replay.wait_line("events")
+        replay.wait()
+        yield "replay", replay.lines
 
     def test_the_page_tells_the_members_of_all_commands(self):
         told = [(line, self.vexa(*line.split(), "--json", stdin="secret")) for line in self.commands()]
@@ -99,7 +116,10 @@ class Forms(ConnectStory):
             ("status --terse --fields networks,credential,ports.hs20", [f"2::{self.machine.hs20_port}"]),
             ("status --fields radio,connection", ["Radio       yes", "Connection  -"]),
             ("credentials --terse", ["1:1:cafe.example:cafe.example:TLS:all users:no:KORVANE-PC\\\\user::Anna:Root:"]),
-            ("credential edit 1 --name B --json --fields credential.id,done", ['{"credential":{"id":1},"done":"edited"}']),
+            (
+                "credential edit 1 --name B --json --fields credential.id,done",
+                ['{"credential":{"id":1},"done":"edited"}'],
+            ),
             ("connect Café --terse", ["connected:Café:B:yes"]),
             ("channels --terse --fields order", ["1", "2"]),
         ):
