@@ -100,7 +100,7 @@ private:
     std::string shownName() const { return m_name.empty() ? m_provider.attribute("ID").value() : m_name; }
 
     static std::optional<std::string> objectionToFiled(const Credential& credential) {
-        if (const auto objection = objectionTo(credential)) return objection;
+        if (auto objection = objectionTo(credential)) return objection;
         if (contract::realmBytes(wideFromUtf8(credential.realm))) return std::nullopt;
         return "its realm holds a character beyond Latin-1, which no network's can be compared with";
     }

@@ -103,11 +103,12 @@ private:
         bool isWhole() const { return hasCredentials && isEnough; }
     };
 
-    /// A credential in the text of a save.
+    /// A credential in the text of a save, and what the file has of it already; null: it has changed.
     struct Written {
         const Credential* credential;
-        std::size_t at;
-        std::size_t length;
+        Known* known;
+        std::size_t at = 0;
+        std::size_t length = 0;
     };
 
     ResultCode createDefaultFile(const std::wstring& path) REQUIRES(g_hs20Lock);
@@ -144,20 +145,21 @@ private:
     void takeOverPlaces(const CredentialTable& stored) REQUIRES(g_hs20Lock);
 
     ResultCode saveInto(const std::string& content, bool& isSaved) REQUIRES(g_hs20Lock);
-    bool areCredentialsWritable() const REQUIRES(g_hs20Lock);
+    std::vector<Written> whatToWrite(bool isKnownFile) REQUIRES(g_hs20Lock);
+    bool areWritable(const std::vector<Written>& all) const REQUIRES(g_hs20Lock);
     bool isUserWritable() const REQUIRES(g_hs20Lock);
-    std::optional<Frame> frameOf(const std::string& content) REQUIRES(g_hs20Lock);
+    std::optional<Frame> frameOf(const std::string& content, const std::vector<Written>& all)
+        REQUIRES(g_hs20Lock);
     bool cutOutNextCredId() REQUIRES(g_hs20Lock);
-    bool cutOutCredentials(Frame& frame) REQUIRES(g_hs20Lock);
+    bool cutOutCredentials(Frame& frame, const std::vector<Written>& all) REQUIRES(g_hs20Lock);
     bool cutOutUser() REQUIRES(g_hs20Lock);
     bool mustRemove(Node node, Frame& frame) REQUIRES(g_hs20Lock);
-    std::string fill(const Frame& frame, bool isKnownFile, std::vector<Written>& written)
-        REQUIRES(g_hs20Lock);
-    void appendCredentials(std::string& text, bool isKnownFile, std::vector<Written>& written)
-        REQUIRES(g_hs20Lock);
+    std::string fill(const Frame& frame, std::vector<Written>& all) REQUIRES(g_hs20Lock);
+    void appendCredentials(std::string& text, std::vector<Written>& all) const REQUIRES(g_hs20Lock);
     void rememberSaved(const std::string& text, const Frame& frame, bool isKnownFile,
-                       const std::vector<Written>& written) REQUIRES(g_hs20Lock);
-    void rememberWritten(const Written& written, const std::string& text) REQUIRES(g_hs20Lock);
+                       const std::vector<Written>& all) REQUIRES(g_hs20Lock);
+    void rememberWritten(const Written& written, const std::string& text, bool isReadAnew)
+        REQUIRES(g_hs20Lock);
     std::optional<Credential> asRead(const std::string& text) REQUIRES(g_hs20Lock);
 
     std::wstring m_userName GUARDED_BY(g_hs20Lock);

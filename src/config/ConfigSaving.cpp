@@ -40,24 +40,38 @@ ResultCode Config::saveConfig(const FileLock& held) {
 // A file that is as this process left it needs no reading: what is not the user's is known, and so is the
 // text of each credential that has not changed.
 ResultCode Config::saveInto(const std::string& content, bool& isSaved) {
-    const bool isKnownFile = m_frame && content == m_content && areCredentialsWritable() && isUserWritable();
-    auto frame = isKnownFile ? std::exchange(m_frame, std::nullopt) : frameOf(content);
+    const bool mayBeKnown = m_frame && content == m_content && isUserWritable();
+    auto all = whatToWrite(mayBeKnown);
+    const bool isKnownFile = mayBeKnown && areWritable(all);
+    if (mayBeKnown && !isKnownFile) all = whatToWrite(false);
+    auto frame = isKnownFile ? std::exchange(m_frame, std::nullopt) : frameOf(content, all);
     if (!frame) return kFailure;
     const ResultCode result = frame->isEnough ? kSuccess : kFailure;
-    std::vector<Written> written;
-    std::string text = fill(*frame, isKnownFile, written);
+    std::string text = fill(*frame, all);
     isSaved = saveSafely(m_configPath, text);
     if (isSaved) {
-        rememberSaved(text, *frame, isKnownFile, written);
+        rememberSaved(text, *frame, isKnownFile, all);
         m_content = std::move(text);
     }
     if (frame->isWhole() && (isSaved || isKnownFile)) m_frame = std::move(frame);
     return result;
 }
 
-bool Config::areCredentialsWritable() const {
-    const auto all = m_credentials.copyCredentialPointers();
-    return std::all_of(all.begin(), all.end(), [](const Credential* one) { return canBeWritten(*one); }) &&
+std::vector<Config::Written> Config::whatToWrite(bool isKnownFile) {
+    std::vector<Written> all;
+    for (const Credential* mine : m_credentials.copyCredentialPointers()) {
+        const auto known = isKnownFile ? m_known.find(mine->m_id) : m_known.end();
+        const bool isAsKnown =
+            known != m_known.end() && known->second.length > 0 && holdTheSame(*mine, known->second.inMemory);
+        all.push_back({mine, isAsKnown ? &known->second : nullptr});
+    }
+    return all;
+}
+
+bool Config::areWritable(const std::vector<Written>& all) const {
+    return std::all_of(
+               all.begin(), all.end(),
+               [](const Written& one) { return one.known != nullptr || canBeWritten(*one.credential); }) &&
            (all.empty() || canStandInXml(m_userName));
 }
 
@@ -66,10 +80,10 @@ bool Config::isUserWritable() const {
 }
 
 // Up to the first section that the file has no place for. Nothing: that is the next id's.
-std::optional<Config::Frame> Config::frameOf(const std::string& content) {
+std::optional<Config::Frame> Config::frameOf(const std::string& content, const std::vector<Written>& all) {
     if (openDocument(content) != kSuccess || !cutOutNextCredId()) return std::nullopt;
     Frame frame;
-    frame.isEnough = cutOutCredentials(frame) && isUserWritable() && cutOutUser();
+    frame.isEnough = cutOutCredentials(frame, all) && isUserWritable() && cutOutUser();
     frame.pieces = m_xmlDoc.textAroundHoles();
     return frame.pieces.empty() ? std::nullopt : std::optional(std::move(frame));
 }
@@ -92,15 +106,15 @@ bool Config::cutOutNextCredId() {
 
 // What goes is taken out last, so that a failure changes nothing. Where there is no credential, there need be
 // no place for any.
-bool Config::cutOutCredentials(Frame& frame) {
+bool Config::cutOutCredentials(Frame& frame, const std::vector<Written>& all) {
     Node section;
     std::vector<Node> nodes;
     if (m_xmlDoc.selectSingleNode("/*/credentials", Node(), section) != kSuccess ||
         m_xmlDoc.selectNodes("/*/credentials/*", Node(), nodes) != kSuccess)
         return false;
     std::erase_if(nodes, [&](Node node) NO_THREAD_SAFETY_ANALYSIS { return !mustRemove(node, frame); });
-    if (!section) return m_credentials.size() == 0;
-    if (!areCredentialsWritable() || !XmlDocument::addHole(section, kCredentials)) return false;
+    if (!section) return all.empty();
+    if (!areWritable(all) || !XmlDocument::addHole(section, kCredentials)) return false;
     frame.hasCredentials = true;
     for (const Node node : nodes)
         XmlDocument::remove(node);
@@ -133,7 +147,7 @@ bool Config::cutOutUser() {
 }
 
 // What the file will hold.
-std::string Config::fill(const Frame& frame, bool isKnownFile, std::vector<Written>& written) {
+std::string Config::fill(const Frame& frame, std::vector<Written>& all) {
     std::string text;
     text.reserve(m_content.size() + kUsualGrowth);
     for (const std::int32_t id : frame.invalidIds)
@@ -141,24 +155,21 @@ std::string Config::fill(const Frame& frame, bool isKnownFile, std::vector<Writt
     for (const auto& [piece, hole] : frame.pieces) {
         text.append(piece);
         if (hole == kNextId) text.append(std::to_string(m_nextCredId));
-        if (hole == kCredentials) appendCredentials(text, isKnownFile, written);
+        if (hole == kCredentials) appendCredentials(text, all);
         if (hole == kUser) appendUserText(text, m_userName, m_credentials.copyCredentialPointers());
     }
     if (frame.hasCredentials || frame.isEnough) Log(2, "Saving credentials to xml file...");
     return text;
 }
 
-void Config::appendCredentials(std::string& text, bool isKnownFile, std::vector<Written>& written) {
-    for (const Credential* mine : m_credentials.copyCredentialPointers()) {
-        const auto known = m_known.find(mine->m_id);
-        const bool isAsKnown = isKnownFile && known != m_known.end() && known->second.length > 0 &&
-                               holdTheSame(*mine, known->second.inMemory);
-        const std::size_t at = text.size();
-        if (isAsKnown)
-            text.append(m_content, known->second.at, known->second.length);
+void Config::appendCredentials(std::string& text, std::vector<Written>& all) const {
+    for (Written& one : all) {
+        one.at = text.size();
+        if (one.known != nullptr)
+            text.append(m_content, one.known->at, one.known->length);
         else
-            appendCredentialText(text, *mine, m_userName);
-        written.push_back({mine, at, text.size() - at});
+            appendCredentialText(text, *one.credential, m_userName);
+        one.length = text.size() - one.at;
     }
 }
 
@@ -176,30 +187,37 @@ void Config::rememberFile(const std::string& content) {
 }
 
 void Config::rememberSaved(const std::string& text, const Frame& frame, bool isKnownFile,
-                           const std::vector<Written>& written) {
+                           const std::vector<Written>& all) {
     std::unordered_set<std::int32_t> ids;
-    for (const Written& one : written)
+    ids.reserve(all.size());
+    for (const Written& one : all)
         if (!frame.foreignIds.contains(one.credential->m_id)) ids.insert(one.credential->m_id);
-    const bool areIdsPlain = frame.isWhole() && ids.size() == written.size();
-    if (!isKnownFile || !areIdsPlain) rememberFile(text);
+    const bool areIdsPlain = frame.isWhole() && ids.size() == all.size();
+    const bool isReadAnew = !isKnownFile || !areIdsPlain;
+    if (isReadAnew) rememberFile(text);
     if (!areIdsPlain) return;
-    for (const Written& one : written)
-        rememberWritten(one, text);
-    std::erase_if(m_known, [&](const auto& known) { return !ids.contains(known.first); });
+    for (const Written& one : all)
+        rememberWritten(one, text, isReadAnew);
+    if (m_known.size() > ids.size())
+        std::erase_if(m_known, [&](const auto& known) { return !ids.contains(known.first); });
 }
 
-void Config::rememberWritten(const Written& written, const std::string& text) {
+void Config::rememberWritten(const Written& written, const std::string& text, bool isReadAnew) {
     const Credential& mine = *written.credential;
-    auto known = m_known.find(mine.m_id);
-    if (known == m_known.end() || !holdTheSame(mine, known->second.inMemory)) {
+    Known* known = written.known;
+    if (isReadAnew) {
+        const auto found = m_known.find(mine.m_id);
+        if (found == m_known.end()) return;
+        known = &found->second;
+    } else if (known == nullptr) {
         auto read = asRead(text.substr(written.at, written.length));
         if (!read) return;
-        known = m_known.insert_or_assign(mine.m_id, Known{std::move(*read), mine}).first;
+        known = &m_known.insert_or_assign(mine.m_id, Known{std::move(*read), mine}).first->second;
     }
-    known->second.inFile.m_priority = mine.m_priority < 0 ? CRED_PRIORITY_LOWEST : mine.m_priority;
-    known->second.inMemory.m_priority = mine.m_priority;
-    known->second.at = written.at;
-    known->second.length = written.length;
+    known->inFile.m_priority = mine.m_priority < 0 ? CRED_PRIORITY_LOWEST : mine.m_priority;
+    known->inMemory.m_priority = mine.m_priority;
+    known->at = written.at;
+    known->length = written.length;
 }
 
 // The credential that the next reading finds in this text.

@@ -55,6 +55,12 @@ bool isComplete(const Credential& credential) {
     return credential.m_eapMethod == kEapMethodTls;
 }
 
+bool fits(const Credential& credential, const RealmInfo& offer) {
+    if (static_cast<std::uint32_t>(credential.m_eapMethod) == offer.m_eapType) return isComplete(credential);
+    Log(3, "\t###Realm match, but EAP method doesn't match.###");
+    return false;
+}
+
 }  // namespace
 
 CredentialMatcher::CredentialMatcher(const CredentialTable& table) {
@@ -66,36 +72,25 @@ CredentialMatcher::CredentialMatcher(const CredentialTable& table) {
         m_byRealm[m_candidates[i].realm].push_back(i);
 }
 
+// There are many realms in the air and few that a credential is for.
 std::vector<Credential*> CredentialMatcher::findCredentialsForNetwork(const Hs20Network& network) const {
-    std::vector<Credential*> found;
-    for (const Offer& offer : offersOf(network)) {
-        Credential* const credential = m_candidates[offer.candidate].credential;
-        if (fits(offer) && (found.empty() || found.back() != credential)) found.push_back(credential);
+    std::vector<bool> isFitting(m_candidates.size());
+    bool isAnyFitting = false;
+    for (const RealmInfo& realm : network.m_realms) {
+        const auto candidates = m_byRealm.find(realm.m_realm);
+        if (candidates == m_byRealm.end()) continue;
+        for (const std::size_t candidate : candidates->second)
+            if (fits(*m_candidates[candidate].credential, realm)) isAnyFitting = isFitting[candidate] = true;
     }
-    std::stable_sort(found.begin(), found.end(),
-                     [](const Credential* a, const Credential* b) { return a->m_priority < b->m_priority; });
+    std::vector<Credential*> found;
+    for (std::size_t candidate = 0; isAnyFitting && candidate < m_candidates.size(); ++candidate)
+        if (isFitting[candidate]) found.push_back(m_candidates[candidate].credential);
+    const auto isBefore = [](const Credential* a, const Credential* b) {
+        return a->m_priority < b->m_priority;
+    };
+    if (!std::is_sorted(found.begin(), found.end(), isBefore))
+        std::stable_sort(found.begin(), found.end(), isBefore);
     return found;
-}
-
-// Candidate by candidate, and those of one in the order of the network's realms. There are many realms in the
-// air and few that a credential is for.
-std::vector<CredentialMatcher::Offer> CredentialMatcher::offersOf(const Hs20Network& network) const {
-    std::vector<Offer> offers;
-    for (const RealmInfo& realm : network.m_realms)
-        if (const auto candidates = m_byRealm.find(realm.m_realm); candidates != m_byRealm.end())
-            for (const std::size_t candidate : candidates->second)
-                offers.push_back({candidate, &realm});
-    std::stable_sort(offers.begin(), offers.end(),
-                     [](const Offer& a, const Offer& b) { return a.candidate < b.candidate; });
-    return offers;
-}
-
-bool CredentialMatcher::fits(const Offer& offer) const {
-    const Credential& credential = *m_candidates[offer.candidate].credential;
-    if (static_cast<std::uint32_t>(credential.m_eapMethod) == offer.realm->m_eapType)
-        return isComplete(credential);
-    Log(3, "\t###Realm match, but EAP method doesn't match.###");
-    return false;
 }
 
 bool isHomeSpNetwork(const CredentialTable& table, const ByteBuffer& domainNames) {

@@ -28,14 +28,6 @@ private:
         Credential* credential;
         std::string realm;
     };
-    /// A realm of a network, and the place of a candidate for it.
-    struct Offer {
-        std::size_t candidate;
-        const RealmInfo* realm;
-    };
-    std::vector<Offer> offersOf(const Hs20Network& network) const;
-    bool fits(const Offer& offer) const;
-
     std::vector<Candidate> m_candidates;  // in the order of the table
     std::unordered_map<std::string_view, std::vector<std::size_t>> m_byRealm;
 };

@@ -72,6 +72,8 @@ std::optional<std::string> readFile(const std::wstring& path) {
     const Descriptor file = openFile(hostPath(path), O_RDONLY);
     if (!file) return std::nullopt;
     std::string content;
+    struct stat status {};
+    if (::fstat(file.get(), &status) == 0) content.reserve(static_cast<std::size_t>(status.st_size));
     std::array<char, 65536> buffer{};
     for (;;) {
         const ssize_t count = ::read(file.get(), buffer.data(), buffer.size());
