@@ -140,18 +140,8 @@ std::string optionNames(const CommandText& command) {
 /// Succeeds for each option that takes a value, and each argument.
 void appendKinds(std::ostream& out, const CommandText& program) {
     out << "\n_vexa_kind() {\n    kind=''\n    case $1 in\n";
-    const auto append = [&out](const std::string& word, const OptionText& option) {
-        out << "        '" << word << "') kind='" << kindText(option) << "' ;;\n";
-    };
-    for (const CommandText* command : allCommands(program)) {
-        for (const OptionText& option : command->options) {
-            for (const std::string& name : option.names) {
-                if (!option.value.empty()) append(command->path + " " + name, option);
-            }
-        }
-        for (std::size_t i = 0; i < command->arguments.size(); ++i)
-            append(command->path + " " + std::to_string(i + 1), command->arguments[i]);
-    }
+    for (const auto& [words, option] : valuePlaces(program))
+        out << "        '" << words << "') kind='" << kindText(*option) << "' ;;\n";
     out << "        *) return 1 ;;\n    esac\n}\n";
 }
 

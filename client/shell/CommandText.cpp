@@ -84,4 +84,18 @@ std::vector<const CommandText*> allCommands(const CommandText& command) {
     return all;
 }
 
+std::vector<ValuePlace> valuePlaces(const CommandText& command) {
+    std::vector<ValuePlace> places;
+    for (const CommandText* one : allCommands(command)) {
+        for (const OptionText& option : one->options) {
+            for (const std::string& name : option.names) {
+                if (!option.value.empty()) places.push_back({one->path + " " + name, &option});
+            }
+        }
+        for (std::size_t i = 0; i < one->arguments.size(); ++i)
+            places.push_back({one->path + " " + std::to_string(i + 1), &one->arguments[i]});
+    }
+    return places;
+}
+
 }  // namespace vexa::client

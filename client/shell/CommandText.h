@@ -44,4 +44,14 @@ CommandText describe(const CLI::App& app);
 /// The command and all below it, each before those below it.
 std::vector<const CommandText*> allCommands(const CommandText& command);
 
+/// Where a command line has a value: behind an option, as `scan --port`, or in a place of a command's own, as
+/// `connect 1`.
+struct ValuePlace {
+    std::string words;
+    const OptionText* option;
+};
+
+/// All of the command and of those below it, as long as it lives.
+std::vector<ValuePlace> valuePlaces(const CommandText& command);
+
 }  // namespace vexa::client

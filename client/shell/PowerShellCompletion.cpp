@@ -75,18 +75,8 @@ void appendTable(std::ostream& out, const char* name, const CommandText& program
 
 void appendValues(std::ostream& out, const CommandText& program) {
     out << "    $values = @{\n";
-    const auto append = [&out](const std::string& key, const OptionText& option) {
-        out << "        " << quoted(key) << " = " << kindText(option) << '\n';
-    };
-    for (const CommandText* command : allCommands(program)) {
-        for (const OptionText& option : command->options) {
-            for (const std::string& name : option.names) {
-                if (!option.value.empty()) append(command->path + " " + name, option);
-            }
-        }
-        for (std::size_t i = 0; i < command->arguments.size(); ++i)
-            append(command->path + " " + std::to_string(i + 1), command->arguments[i]);
-    }
+    for (const auto& [words, option] : valuePlaces(program))
+        out << "        " << quoted(words) << " = " << kindText(*option) << '\n';
     out << "    }\n";
 }
 

@@ -59,11 +59,11 @@ void appendOption(std::ostream& out, const OptionText& option) {
     const std::string value = option.value.empty() ? "" : ":" + option.value + ":" + action(option);
     const std::string description = "[" + escapedText(option.description, "[]:\\") + "]";
     for (const std::string& name : option.names) {
-        std::string spec = exclusion + name;
-        if (!option.value.empty() && name.starts_with("--")) spec += '=';
-        spec += description;
-        spec += value;
-        out << " \\\n        " << quoted(spec);
+        std::string entry = exclusion + name;
+        if (!option.value.empty() && name.starts_with("--")) entry += '=';
+        entry += description;
+        entry += value;
+        out << " \\\n        " << quoted(entry);
     }
 }
 
