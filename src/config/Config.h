@@ -127,6 +127,7 @@ private:
     ResultCode readCredentials(Reading& reading, bool& isChanged) REQUIRES(g_hs20Lock);
     void readCredential(Node node, Reading& reading) REQUIRES(g_hs20Lock);
     static std::int32_t followingId(std::int32_t id);
+    bool isForeign(std::int32_t access, const std::wstring& creator) const REQUIRES(g_hs20Lock);
     bool isForeign(Node node) REQUIRES(g_hs20Lock);
     bool repairIds(const Reading& reading) REQUIRES(g_hs20Lock);
     ResultCode readUsers(Reading& reading, bool& isChanged) REQUIRES(g_hs20Lock);

@@ -47,9 +47,12 @@ ResultCode Config::readCredentials(Reading& reading, bool& isChanged) {
 }
 
 // Seen by its creator alone, who is somebody else.
+bool Config::isForeign(std::int32_t access, const std::wstring& creator) const {
+    return access == CRED_ACCESS_PER_USER && creator != m_userName;
+}
+
 bool Config::isForeign(Node node) {
-    return accessFromText(textOf(node, "accesstype", kInvalid)) == CRED_ACCESS_PER_USER &&
-           textOf(node, "creator", kInvalid) != m_userName;
+    return isForeign(accessFromText(textOf(node, "accesstype", kInvalid)), textOf(node, "creator", kInvalid));
 }
 
 void Config::readCredential(Node node, Reading& reading) {
@@ -62,7 +65,7 @@ void Config::readCredential(Node node, Reading& reading) {
     const std::int32_t type = typeFromText(textOf(node, "type", kInvalid));
     const std::int32_t access = accessFromText(textOf(node, "accesstype", kInvalid));
     const std::wstring creator = textOf(node, "creator", kInvalid);
-    const bool isOthers = isForeign(node);
+    const bool isOthers = isForeign(access, creator);
     if (isOthers) reading.foreignIds.insert(id);
     if (type == 0 || access == 0 || isOthers) return;
 
