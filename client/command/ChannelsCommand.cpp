@@ -17,7 +17,7 @@ namespace vexa::client {
 
 namespace {
 
-constexpr std::chrono::seconds kAnswerLimit{10};
+constexpr std::chrono::seconds kChannelLimit{10};
 
 struct ChannelsOptions {
     PortOption port{Half::Spectral};
@@ -26,7 +26,7 @@ struct ChannelsOptions {
 
 bool waitForList(SpectralScan& scan, Signals& signals) {
     EventLoop loop(signals);
-    const Deadline deadline = Deadline::in(kAnswerLimit);
+    const Deadline deadline = Deadline::in(kChannelLimit);
     while (!scan.view().hasChannelList()) {
         if (deadline.isOver()) throw ClientError("the service did not answer");
         if (!loop.wait(scan.polled(), deadline)) return false;

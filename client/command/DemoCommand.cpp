@@ -18,7 +18,7 @@ namespace vexa::client {
 namespace {
 
 constexpr int kDefaultSeconds = 20;
-constexpr std::chrono::seconds kAnswerLimit{10};
+constexpr std::chrono::seconds kDemoLimit{10};
 
 // A service may sleep for ten seconds before it looks whether it is to stop. The user has seen all by then.
 constexpr std::chrono::milliseconds kStopPatience{500};
@@ -35,7 +35,7 @@ SpectrumOutput::Form formOf(const DemoOptions& options) {
 }
 
 CredentialList storedCredentials(const ServicePorts& ports, Signals& signals) {
-    HotspotPort hotspot(ports.hs20, signals, kAnswerLimit);
+    HotspotPort hotspot(ports.hs20, signals, kDemoLimit);
     return storeDemoCredentials(hotspot);
 }
 

@@ -15,7 +15,7 @@ namespace vexa::client {
 namespace {
 
 constexpr const char* kFormat = "vexa-credentials";
-constexpr int kVersion = 1;
+constexpr int kFormatVersion = 1;
 
 struct TextMember {
     const char* name;
@@ -105,7 +105,7 @@ private:
 std::string ownFormat(const CredentialList& list, Passwords passwords) {
     Json::Value object(Json::objectValue);
     object["format"] = kFormat;
-    object["version"] = kVersion;
+    object["version"] = kFormatVersion;
     object["credentials"] = credentialsJson(list, passwords);
     for (Json::Value& entry : object["credentials"]) {
         for (const char* member : {"position", "id", "creator"})
@@ -121,7 +121,7 @@ CredentialFile readOwnFormat(const std::string& text) {
     const auto object = parseJsonObject(text);
     if (!object || (*object)["format"] != kFormat)
         throw ClientError("the file is no JSON that `vexa credential export` writes");
-    if ((*object)["version"] != kVersion)
+    if ((*object)["version"] != kFormatVersion)
         throw ClientError("the file is of a version that is not known: " + jsonLine((*object)["version"]));
     const Json::Value& entries = (*object)["credentials"];
     if (!entries.isArray()) throw ClientError("credentials is no array");

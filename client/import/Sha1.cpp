@@ -8,7 +8,7 @@ namespace vexa::client {
 
 namespace {
 
-constexpr std::size_t kBlock = 64;
+constexpr std::size_t kSha1Block = 64;
 
 using State = std::array<std::uint32_t, 5>;
 
@@ -57,7 +57,7 @@ void take(State& state, std::string_view block) {
 std::string ending(std::string_view rest, std::size_t length) {
     std::string text(rest);
     text += '\x80';
-    text.resize((text.size() + 8 + kBlock - 1) / kBlock * kBlock - 8, '\0');
+    text.resize((text.size() + 8 + kSha1Block - 1) / kSha1Block * kSha1Block - 8, '\0');
     for (int shift = 56; shift >= 0; shift -= 8)
         text += static_cast<char>(std::uint64_t{length} * 8 >> shift);
     return text;
@@ -68,11 +68,11 @@ std::string ending(std::string_view rest, std::size_t length) {
 std::array<std::uint8_t, 20> sha1(std::string_view bytes) {
     State state{0x67452301, 0xEFCDAB89, 0x98BADCFE, 0x10325476, 0xC3D2E1F0};
     std::size_t at = 0;
-    for (; bytes.size() - at >= kBlock; at += kBlock)
-        take(state, bytes.substr(at, kBlock));
+    for (; bytes.size() - at >= kSha1Block; at += kSha1Block)
+        take(state, bytes.substr(at, kSha1Block));
     const std::string last = ending(bytes.substr(at), bytes.size());
-    for (std::size_t i = 0; i < last.size(); i += kBlock)
-        take(state, std::string_view(last).substr(i, kBlock));
+    for (std::size_t i = 0; i < last.size(); i += kSha1Block)
+        take(state, std::string_view(last).substr(i, kSha1Block));
     std::array<std::uint8_t, 20> digest{};
     for (std::size_t i = 0; i < digest.size(); ++i)
         digest[i] = static_cast<std::uint8_t>(state[i / 4] >> (24 - i % 4 * 8));

@@ -12,7 +12,7 @@ namespace {
 // How long a command may stay without an event before we ask whether the service has gone past it.
 constexpr milliseconds kFirstCheck{200};
 constexpr milliseconds kStartLimit{5000};
-constexpr milliseconds kGoodbyeLimit{2000};
+constexpr milliseconds kHandoverLimit{2000};
 
 constexpr const char* kAnswer = "an answer of the service";
 
@@ -105,7 +105,7 @@ std::optional<Event> HotspotPort::next(Deadline deadline) {
 }
 
 void HotspotPort::close() {
-    m_client.close(kGoodbyeLimit);
+    m_client.close(kHandoverLimit);
 }
 
 bool acceptsAny(const Json::Value& /*payload*/) {

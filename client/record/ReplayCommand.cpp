@@ -19,7 +19,7 @@ namespace {
 using std::chrono::milliseconds;
 
 // How often it is looked whether clients have come or gone, and what they wanted.
-constexpr milliseconds kBetweenLooks{100};
+constexpr milliseconds kBetweenClientLooks{100};
 // A client that comes at the beginning asks before the recorder's own questions are answered.
 constexpr RecordedTime kBeginning{1000};
 
@@ -92,14 +92,15 @@ private:
             ++m_eventCount;
         }
         // A recording that is over at once is not played again at once.
-        return waitUntil(reader.duration()) && waitFor(kBetweenLooks);
+        return waitUntil(reader.duration()) && waitFor(kBetweenClientLooks);
     }
 
     bool waitUntil(RecordedTime time) {
         using Exact = std::chrono::duration<double, std::milli>;
         const auto due = m_start + std::chrono::ceil<milliseconds>(Exact(time) / m_options.speed);
         for (auto now = std::chrono::steady_clock::now(); now < due; now = std::chrono::steady_clock::now()) {
-            if (!waitFor(std::min(std::chrono::ceil<milliseconds>(due - now), kBetweenLooks))) return false;
+            if (!waitFor(std::min(std::chrono::ceil<milliseconds>(due - now), kBetweenClientLooks)))
+                return false;
         }
         return true;
     }
@@ -107,7 +108,7 @@ private:
     template <class Condition>
     bool waitWhile(Condition holds) {
         while (holds()) {
-            if (!waitFor(kBetweenLooks)) return false;
+            if (!waitFor(kBetweenClientLooks)) return false;
         }
         return true;
     }

@@ -9,15 +9,15 @@ namespace {
 using Change = SpectralView::Change;
 
 // The values of one scan come in one burst.
-constexpr RecordedTime kBurst{200};
-constexpr int kTopLevel = 100;
+constexpr RecordedTime kOneScan{200};
+constexpr int kFullLevel = 100;
 
 // Samples whose bins are all alike are told as 7 more than their power.
 constexpr int kInterferenceOfPowerZero = 7;
 
 // The service smooths a congestion and rounds it down at each scan: from below it stays one short of a level.
 int levelFor(int before, int congestion) {
-    return std::min(before > 0 && congestion > before ? congestion + 1 : congestion, kTopLevel);
+    return std::min(before > 0 && congestion > before ? congestion + 1 : congestion, kFullLevel);
 }
 
 }  // namespace
@@ -45,7 +45,7 @@ void SpectrumScenario::takeList() {
 void SpectrumScenario::takeSample(RecordedTime at, const SpectralView::Update& update) {
     const auto number = m_view.numberOf(update.order);
     if (!number) return;
-    const bool isNew = m_levels.empty() || at - m_levels.rbegin()->first > kBurst;
+    const bool isNew = m_levels.empty() || at - m_levels.rbegin()->first > kOneScan;
     Json::Value& level = (isNew ? m_levels[at] : m_levels.rbegin()->second)[std::to_string(*number)];
     if (update.change == Change::Interference) {
         level["power"] = update.value - kInterferenceOfPowerZero;

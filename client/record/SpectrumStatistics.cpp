@@ -9,7 +9,7 @@ namespace {
 constexpr int kTopLevel = 100;
 
 // Both values of a channel come in one burst.
-constexpr RecordedTime kBurst{500};
+constexpr RecordedTime kWholeScan{500};
 
 }  // namespace
 
@@ -59,7 +59,7 @@ double LevelTimes::shareAbove(int limit) const {
 
 // One that was not told when the other one was has been 0 since then.
 void SpectrumStatistics::Level::tell(std::optional<int> value) {
-    if (value && !m_value && m_untold > kBurst) m_times.add(0, m_untold);
+    if (value && !m_value && m_untold > kWholeScan) m_times.add(0, m_untold);
     if (value) m_untold = {};
     m_value = value;
 }

@@ -40,13 +40,13 @@ end
 complete -c vexa -f
 )fish";
 
-std::string quoted(const std::string& text) {
+std::string fishQuoted(const std::string& text) {
     return "'" + escapedText(text, "'\\") + "'";
 }
 
 /// What is offered as a value.
 std::string offered(const OptionText& option) {
-    if (option.kind == ValueKind::Choice) return " -a " + quoted(joined(option.choices, " "));
+    if (option.kind == ValueKind::Choice) return " -a " + fishQuoted(joined(option.choices, " "));
     if (option.kind == ValueKind::Directory) return " -a '(__fish_complete_directories)'";
     if (option.kind == ValueKind::File) return " -F";
     const std::string names = askedNames(option.kind);
@@ -57,20 +57,20 @@ void appendCommand(std::ostream& out, const CommandText& command) {
     const std::string begin = "complete -c vexa -n ";
     const std::string here = "__vexa_at \"" + command.path + "\"";
     for (const CommandText& below : command.commands)
-        out << begin << quoted(here + " 1") << " -a " << below.name() << " -d " << quoted(below.description)
-            << '\n';
+        out << begin << fishQuoted(here + " 1") << " -a " << below.name() << " -d "
+            << fishQuoted(below.description) << '\n';
     for (const OptionText& option : command.options) {
-        out << begin << quoted(here);
+        out << begin << fishQuoted(here);
         for (const std::string& name : option.names)
             out << (name.starts_with("--") ? " -l " + name.substr(2) : " -s " + name.substr(1));
-        out << (option.value.empty() ? "" : " -r") << offered(option) << " -d " << quoted(option.description)
-            << '\n';
+        out << (option.value.empty() ? "" : " -r") << offered(option) << " -d "
+            << fishQuoted(option.description) << '\n';
     }
     for (std::size_t i = 0; i < command.arguments.size(); ++i) {
         const OptionText& argument = command.arguments[i];
         if (!offered(argument).empty())
-            out << begin << quoted(here + " " + std::to_string(i + 1)) << offered(argument) << " -d "
-                << quoted(argument.description) << '\n';
+            out << begin << fishQuoted(here + " " + std::to_string(i + 1)) << offered(argument) << " -d "
+                << fishQuoted(argument.description) << '\n';
     }
 }
 
@@ -81,12 +81,12 @@ std::string fishCompletion(const CommandText& program) {
     out << "# Completes the command line of vexa in fish, made by `vexa completion fish`.\n\n"
            "set -g __vexa_commands";
     for (const CommandText* command : allCommands(program))
-        out << (command->path.empty() ? "" : " " + quoted(command->path));
+        out << (command->path.empty() ? "" : " " + fishQuoted(command->path));
     out << "\nset -g __vexa_valued";
     for (const CommandText* command : allCommands(program)) {
         for (const OptionText& option : command->options) {
             for (const std::string& name : option.names)
-                out << (option.value.empty() ? "" : " " + quoted(command->path + " " + name));
+                out << (option.value.empty() ? "" : " " + fishQuoted(command->path + " " + name));
         }
     }
     out << '\n' << kFunctions;

@@ -6,14 +6,14 @@ namespace vexa::client {
 
 namespace {
 
-constexpr const char* kHead =
+constexpr const char* kPowerShellHead =
     R"ps(# Completes the command line of vexa in PowerShell, made by `vexa completion powershell`.
 
 Register-ArgumentCompleter -Native -CommandName vexa, vexa.exe -ScriptBlock {
     param($wordToComplete, $commandAst, $cursorPosition)
 )ps";
 
-constexpr const char* kTail = R"ps(
+constexpr const char* kPowerShellTail = R"ps(
     $all = @($commandAst.CommandElements | Where-Object { $_.Extent.EndOffset -lt $cursorPosition } | ForEach-Object {
             if ($_ -is [System.Management.Automation.Language.StringConstantExpressionAst]) { $_.Value }
             else { $_.Extent.Text }
@@ -49,15 +49,15 @@ constexpr const char* kTail = R"ps(
 }
 )ps";
 
-std::string quoted(const std::string& text) {
+std::string powerShellQuoted(const std::string& text) {
     return "'" + escapedText(text, "'", "'") + "'";
 }
 
 std::string kindText(const OptionText& option) {
-    if (option.kind != ValueKind::Choice) return "@(" + quoted(askedNames(option.kind)) + ")";
+    if (option.kind != ValueKind::Choice) return "@(" + powerShellQuoted(askedNames(option.kind)) + ")";
     std::string text = "@('words'";
     for (const std::string& choice : option.choices)
-        text += ", " + quoted(choice);
+        text += ", " + powerShellQuoted(choice);
     return text + ")";
 }
 
@@ -66,7 +66,7 @@ template <typename Append>
 void appendTable(std::ostream& out, const char* name, const CommandText& program, Append append) {
     out << "    $" << name << " = @{\n";
     for (const CommandText* command : allCommands(program)) {
-        out << "        " << quoted(command->path) << " = [ordered]@{";
+        out << "        " << powerShellQuoted(command->path) << " = [ordered]@{";
         append(*command);
         out << " }\n";
     }
@@ -76,7 +76,7 @@ void appendTable(std::ostream& out, const char* name, const CommandText& program
 void appendValues(std::ostream& out, const CommandText& program) {
     out << "    $values = @{\n";
     for (const auto& [words, option] : valuePlaces(program))
-        out << "        " << quoted(words) << " = " << kindText(*option) << '\n';
+        out << "        " << powerShellQuoted(words) << " = " << kindText(*option) << '\n';
     out << "    }\n";
 }
 
@@ -84,9 +84,9 @@ void appendValues(std::ostream& out, const CommandText& program) {
 
 std::string powerShellCompletion(const CommandText& program) {
     std::ostringstream out;
-    out << kHead;
+    out << kPowerShellHead;
     const auto append = [&out](const std::string& word, const std::string& description) {
-        out << " " << quoted(word) << " = " << quoted(description) << ";";
+        out << " " << powerShellQuoted(word) << " = " << powerShellQuoted(description) << ";";
     };
     appendTable(out, "commands", program, [&](const CommandText& command) {
         for (const CommandText& below : command.commands)
@@ -99,7 +99,7 @@ std::string powerShellCompletion(const CommandText& program) {
         }
     });
     appendValues(out, program);
-    out << kTail;
+    out << kPowerShellTail;
     return out.str();
 }
 

@@ -6,7 +6,7 @@ namespace vexa::client {
 
 namespace {
 
-constexpr const char* kHead = R"zsh(#compdef vexa
+constexpr const char* kZshHead = R"zsh(#compdef vexa
 # Completes the command line of vexa in zsh, made by `vexa completion zsh`.
 
 # Names of the kind $1, from the service that the line means.
@@ -17,7 +17,7 @@ _vexa_names() {
 }
 )zsh";
 
-constexpr const char* kTail = R"zsh(
+constexpr const char* kZshTail = R"zsh(
 _vexa() {
     local -a vexa_line
     vexa_line=("${(@)words[1,CURRENT]}")
@@ -32,7 +32,7 @@ fi
 )zsh";
 
 /// In single quotes.
-std::string quoted(const std::string& text) {
+std::string zshQuoted(const std::string& text) {
     return "'" + escapedText(text, "'", "'\\'") + "'";
 }
 
@@ -54,7 +54,7 @@ std::string action(const OptionText& option) {
                          : " _vexa_names " + names;  // without the blank it gets options before the kind
 }
 
-void appendOption(std::ostream& out, const OptionText& option) {
+void appendZshOption(std::ostream& out, const OptionText& option) {
     const std::string exclusion = option.names.size() > 1 ? "(" + joined(option.names, " ") + ")" : "";
     const std::string value = option.value.empty() ? "" : ":" + option.value + ":" + action(option);
     const std::string description = "[" + escapedText(option.description, "[]:\\") + "]";
@@ -63,7 +63,7 @@ void appendOption(std::ostream& out, const OptionText& option) {
         if (!option.value.empty() && name.starts_with("--")) entry += '=';
         entry += description;
         entry += value;
-        out << " \\\n        " << quoted(entry);
+        out << " \\\n        " << zshQuoted(entry);
     }
 }
 
@@ -73,12 +73,12 @@ void appendFunction(std::ostream& out, const CommandText& command) {
     if (hasCommands) out << "    local curcontext=$curcontext state line\n    local -A opt_args\n";
     out << "    _arguments " << (hasCommands ? "-C " : "") << "-s";
     for (const OptionText& option : command.options)
-        appendOption(out, option);
+        appendZshOption(out, option);
     for (std::size_t i = 0; i < command.arguments.size(); ++i) {
         const OptionText& argument = command.arguments[i];
         out << " \\\n        "
-            << quoted(std::to_string(i + 1) + (argument.isRequired ? ":" : "::") + argument.value + ":" +
-                      action(argument));
+            << zshQuoted(std::to_string(i + 1) + (argument.isRequired ? ":" : "::") + argument.value + ":" +
+                         action(argument));
     }
     if (!hasCommands) {
         out << "\n}\n";
@@ -86,7 +86,7 @@ void appendFunction(std::ostream& out, const CommandText& command) {
     }
     out << " \\\n        '1: :->commands' \\\n        '*:: :->rest'\n    local -a commands=(\n";
     for (const CommandText& below : command.commands)
-        out << "        " << quoted(below.name() + ":" + escapedText(below.description, ":\\")) << '\n';
+        out << "        " << zshQuoted(below.name() + ":" + escapedText(below.description, ":\\")) << '\n';
     out << "    )\n    case $state in\n        commands) _describe command commands ;;\n"
            "        rest)\n            case $words[1] in\n";
     for (const CommandText& below : command.commands)
@@ -98,10 +98,10 @@ void appendFunction(std::ostream& out, const CommandText& command) {
 
 std::string zshCompletion(const CommandText& program) {
     std::ostringstream out;
-    out << kHead;
+    out << kZshHead;
     for (const CommandText* command : allCommands(program))
         appendFunction(out, *command);
-    out << kTail;
+    out << kZshTail;
     return out.str();
 }
 

@@ -8,11 +8,10 @@ namespace vexa::simulation {
 
 namespace {
 
-constexpr std::uint32_t kSignature = 0x03C45E00;
 constexpr std::size_t kHeaderSize = 16;
 constexpr std::size_t kReservedAt = 4;
 constexpr std::size_t kSubtypeAt = 8;
-constexpr std::size_t kPayloadLengthAt = 12;
+constexpr std::size_t kHotspotLengthAt = 12;
 constexpr std::size_t kPlainRequestSize = 20;
 constexpr std::size_t kBssidSize = 6;
 
@@ -60,7 +59,7 @@ bool isHotspotRequest(IhvRequest kind, std::span<const std::uint8_t> request) {
     const std::size_t size = hasRecord ? kHeaderSize + kBssRecordSize : kPlainRequestSize;
     const std::size_t payload = hasRecord ? kBssRecordSize : 0;
     return request.size() == size && loadU32(request, kReservedAt) == 0 &&
-           loadU32(request, kPayloadLengthAt) == payload;
+           loadU32(request, kHotspotLengthAt) == payload;
 }
 
 std::span<const std::uint8_t> bssidOfRequest(std::span<const std::uint8_t> request) {
@@ -106,9 +105,9 @@ Bytes anqpInfo(const Network& network) {
 
 Bytes hotspotMessage(HotspotEvent event, const Bytes& payload) {
     Bytes message(kHeaderSize);
-    storeU32(message, 0, kSignature);
+    storeU32(message, 0, kHotspotSignature);
     storeU32(message, kSubtypeAt, static_cast<std::uint32_t>(event));
-    storeU32(message, kPayloadLengthAt, static_cast<std::uint32_t>(payload.size()));
+    storeU32(message, kHotspotLengthAt, static_cast<std::uint32_t>(payload.size()));
     message.insert(message.end(), payload.begin(), payload.end());
     return message;
 }

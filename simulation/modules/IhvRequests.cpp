@@ -7,7 +7,6 @@ namespace vexa::simulation {
 
 namespace {
 
-constexpr std::uint32_t kHotspotSignature = 0x03C45E00;
 constexpr std::size_t kHotspotHeader = 16;
 constexpr std::size_t kHotspotSubtypeAt = 8;
 

@@ -8,6 +8,9 @@
 
 namespace vexa::simulation {
 
+/// With which the messages of the hotspot module begin.
+inline constexpr std::uint32_t kHotspotSignature = 0x03C45E00;
+
 /// The requests that the maker's two modules know.
 enum class IhvRequest { BssList, AnqpInfo, AnqpQuery, Scan, ChannelList, Unknown };
 

@@ -10,7 +10,7 @@ namespace {
 
 // Requests.
 constexpr std::size_t kMethodAt = 0;
-constexpr std::size_t kPayloadLengthAt = 12;
+constexpr std::size_t kSpectralLengthAt = 12;
 constexpr std::size_t kScanControlSize = 32;
 constexpr std::size_t kEnableAt = 24;
 constexpr std::size_t kObjectHeaderAt = 24;
@@ -26,7 +26,7 @@ constexpr std::uint32_t kObjectHeader = 0x00100180;
 constexpr std::uint32_t kChannelBuffer = 2056;
 
 // Notifications.
-constexpr std::uint32_t kSignature = 0x06C45E00;
+constexpr std::uint32_t kSpectralSignature = 0x06C45E00;
 constexpr std::uint32_t kMagic = 23602;
 constexpr std::uint32_t kSamples = 1;
 constexpr std::uint32_t kCompleted = 2;
@@ -40,12 +40,12 @@ bool hasHeader(std::span<const std::uint8_t> request, std::uint32_t method, std:
                std::size_t size) {
     return request.size() == size && loadU32(request, kMethodAt) == method &&
            loadU32(request, kControlCodeAt) == code &&
-           loadU32(request, kPayloadLengthAt) == size - kSpectralHeaderSize;
+           loadU32(request, kSpectralLengthAt) == size - kSpectralHeaderSize;
 }
 
 Bytes message(std::uint32_t subtype, std::size_t size) {
     Bytes block(size);
-    storeU32(block, 0, kSignature);
+    storeU32(block, 0, kSpectralSignature);
     storeU32(block, 8, subtype);
     storeU32(block, 12, kMagic);
     return block;

@@ -6,7 +6,7 @@ namespace vexa::simulation {
 
 namespace {
 
-constexpr std::pair<DWORD, std::u16string_view> kTexts[] = {
+constexpr std::pair<DWORD, std::u16string_view> kReasonTexts[] = {
     {kSucceeded, u"The operation was successful."},
     {kUserDisconnected, u"The user disconnected."},
     {kConnectionLost, u"The connection was lost."},
@@ -18,7 +18,7 @@ constexpr std::pair<DWORD, std::u16string_view> kTexts[] = {
 }  // namespace
 
 std::u16string_view reasonText(DWORD reason) {
-    for (const auto& [code, text] : kTexts) {
+    for (const auto& [code, text] : kReasonTexts) {
         if (code == reason) return text;
     }
     return u"The reason is unknown.";

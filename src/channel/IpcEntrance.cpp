@@ -20,7 +20,7 @@ constexpr std::size_t kMaxOutside = 16;
 constexpr std::chrono::milliseconds kGrace{100};
 
 // How long a stranger has to take the answer.
-constexpr std::chrono::milliseconds kRefusedQuiet{500};
+constexpr std::chrono::milliseconds kStrangerQuiet{500};
 
 constexpr std::chrono::milliseconds kAcceptPause{100};
 
@@ -105,7 +105,7 @@ void IpcEntrance::begin(const Arrival& arrival) {
 void IpcEntrance::turnAway(const Arrival& arrival) {
     if (m_outside.size() >= kMaxOutside) return arrival.connection->reset();
     m_outside.emplace(arrival.id, arrival);
-    arrival.connection->refuse(kRefusedQuiet);
+    arrival.connection->refuse(kStrangerQuiet);
 }
 
 bool IpcEntrance::dropNewestRefused() {

@@ -16,7 +16,7 @@ using boost::system::error_code;
 
 namespace {
 
-constexpr std::chrono::milliseconds kShortagePause{100};
+constexpr std::chrono::milliseconds kLookupPause{100};
 
 // Ports that no connection has where it has just ended.
 platform::PeerPorts portsOf(const tcp::socket& connection) {
@@ -60,7 +60,7 @@ void IpcOwnerLookup::answer(const std::vector<platform::PeerPorts>& connections,
         });
     };
     while (!withinMemory(ask))
-        std::this_thread::sleep_for(kShortagePause);
+        std::this_thread::sleep_for(kLookupPause);
 }
 
 }  // namespace vexa

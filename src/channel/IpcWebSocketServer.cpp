@@ -38,7 +38,7 @@ using ClientId = IpcWebSocketServer::ClientId;
 
 constexpr std::uint16_t kGoingAway = 1001;
 constexpr std::chrono::milliseconds kFarewellLimit{500};
-constexpr std::chrono::milliseconds kShortagePause{10};
+constexpr std::chrono::milliseconds kBeginningPause{10};
 
 }  // namespace
 
@@ -130,7 +130,7 @@ void IpcWebSocketServer::Impl::beginAnew() {
         m_isStopped ? m_io.stop() : m_entrance.acceptAnew();
     };
     do
-        std::this_thread::sleep_for(kShortagePause);
+        std::this_thread::sleep_for(kBeginningPause);
     while (!withinMemory([&] { asio::post(m_inout, begin); }));
 }
 

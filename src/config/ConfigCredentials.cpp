@@ -11,7 +11,7 @@ namespace vexa {
 
 namespace {
 
-constexpr std::int32_t kLargest = std::numeric_limits<std::int32_t>::max();
+constexpr std::int32_t kLargestId = std::numeric_limits<std::int32_t>::max();
 
 std::int32_t typeFromText(const std::wstring& text) {
     if (text == L"eapttls") return CRED_TYPE_EAP_TTLS;
@@ -88,7 +88,7 @@ void Config::readCredential(Node node, Reading& reading) {
 }
 
 std::int32_t Config::followingId(std::int32_t id) {
-    return id == kLargest ? id : id + 1;
+    return id == kLargestId ? id : id + 1;
 }
 
 // The next id is above all ids in the file, other users' included, whatever the file says; it never goes
@@ -98,7 +98,7 @@ bool Config::repairIds(const Reading& reading) {
     std::unordered_set<std::int32_t> taken = reading.foreignIds;
     bool isChanged = false;
     for (Credential* credential : reading.table.copyCredentialPointers()) {
-        if (taken.insert(credential->m_id).second || next == kLargest) continue;
+        if (taken.insert(credential->m_id).second || next == kLargestId) continue;
         if (reading.trace == Trace::Yes)
             Log(6, "ERROR: Found duplicate credential id=%d, new id=%d", credential->m_id, next);
         if (reading.foreignIds.contains(credential->m_id)) m_renamed[credential->m_id] = next;

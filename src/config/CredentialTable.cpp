@@ -12,7 +12,7 @@ namespace vexa {
 
 namespace {
 
-constexpr std::int32_t kLargest = std::numeric_limits<std::int32_t>::max();
+constexpr std::int32_t kLargestPriority = std::numeric_limits<std::int32_t>::max();
 
 bool isPlaced(const Credential& credential) {
     return credential.m_priority != 0 && credential.m_priority != CRED_PRIORITY_LOWEST;
@@ -75,7 +75,7 @@ ResultCode CredentialTable::addCredential(const CredentialInput& input, std::int
         Log(6, "ERROR: Invalid credential creator.");
         return kFailure;
     }
-    if (nextId == kLargest) {
+    if (nextId == kLargestPriority) {
         Log(6, "ERROR: No credential id is left.");
         return kFailure;
     }
@@ -103,7 +103,7 @@ void CredentialTable::insertCredential(std::unique_ptr<Credential> record) {
 bool CredentialTable::shiftPlacedDown() {
     for (const auto& credential : m_list) {
         if (!isPlaced(*credential)) continue;
-        if (credential->m_priority == kLargest) return false;
+        if (credential->m_priority == kLargestPriority) return false;
         ++credential->m_priority;
     }
     return true;
@@ -167,7 +167,7 @@ void CredentialTable::moveTowardsTop(const Credential& moved, std::int32_t targe
     for (const auto& credential : m_list) {
         if (credential.get() == &moved) return;
         isShifting = isShifting || credential->m_priority == target;
-        if (isShifting && credential->m_priority < kLargest) ++credential->m_priority;
+        if (isShifting && credential->m_priority < kLargestPriority) ++credential->m_priority;
     }
 }
 

@@ -20,7 +20,7 @@ using platform::LockGuard;
 
 constexpr DWORD kReasonCapacity = 64;
 
-const char* onOrOff(bool on) {
+const char* onOrOffInCapitals(bool on) {
     return on ? "ON" : "OFF";
 }
 
@@ -256,7 +256,7 @@ ResultCode Supplicant::onRadioStateChanged(const WLAN_PHY_RADIO_STATE* data) {
     const bool isOn = data->dot11SoftwareRadioState == dot11_radio_state_on;
     if (isOn == m_bRadioOn) {
         Log(3, "Supplicant already set radio state to %s while requested to set radio state to %s",
-            onOrOff(isOn), onOrOff(isOn));
+            onOrOffInCapitals(isOn), onOrOffInCapitals(isOn));
         return kSuccess;
     }
     setRadioState(isOn);

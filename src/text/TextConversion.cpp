@@ -10,7 +10,7 @@ namespace vexa {
 
 namespace {
 
-constexpr std::wstring_view kWhiteSpace = L" \t\n\v\f\r";
+constexpr std::wstring_view kBlanksBeforeNumbers = L" \t\n\v\f\r";
 
 constexpr bool kIsUtf16 = sizeof(wchar_t) == 2;
 
@@ -143,7 +143,7 @@ NarrowText narrowByLocale(std::wstring_view text) {
 
 std::int32_t leadingInteger(std::wstring_view text) {
     using Limits = std::numeric_limits<std::int32_t>;
-    text.remove_prefix(std::min(text.find_first_not_of(kWhiteSpace), text.size()));
+    text.remove_prefix(std::min(text.find_first_not_of(kBlanksBeforeNumbers), text.size()));
     const bool isNegative = !text.empty() && text.front() == L'-';
     if (isNegative || (!text.empty() && text.front() == L'+')) text.remove_prefix(1);
     std::int64_t value = 0;
