@@ -1,0 +1,72 @@
+import { CredentialsView } from '../credentials/CredentialsView';
+import { NetworksView } from '../networks/NetworksView';
+import { RecordView } from '../record/RecordView';
+import { SpectrumView } from '../spectrum/SpectrumView';
+import { Notices } from './notices';
+import { ServiceContext } from './service';
+import { shownSource, type Source } from './source';
+import { StatusLine } from './StatusLine';
+import { useStore } from './store';
+import { TabList, useTab, type Tab } from './Tabs';
+import { nextTheme, theme } from './theme';
+import './base.css';
+import './app.css';
+
+const TABS: readonly Tab[] = [
+    { id: 'spectrum', label: 'Spectrum' },
+    { id: 'networks', label: 'Networks' },
+    { id: 'credentials', label: 'Credentials' },
+    { id: 'record', label: 'Record' },
+];
+
+const THEME_NAMES = { auto: 'Auto', light: 'Light', dark: 'Dark' };
+
+function ThemeButton() {
+    const chosen = useStore(theme, (value) => value);
+    return (
+        <button
+            type="button"
+            class="button quiet theme-button"
+            onClick={nextTheme}
+            title="Light, dark, or as the system is"
+        >
+            <span class="theme-word">Theme: </span>
+            {THEME_NAMES[chosen]}
+        </button>
+    );
+}
+
+// A view is there only while its tab is: what it has to keep lives outside of it.
+function View({ tab, source }: { tab: string; source: Source }) {
+    switch (tab) {
+        case 'networks':
+            return <NetworksView />;
+        case 'credentials':
+            return <CredentialsView />;
+        case 'record':
+            return <RecordView />;
+        default:
+            return <SpectrumView key={source.epoch} source={source} />;
+    }
+}
+
+export function App({ live }: { live: Source }) {
+    const [tab, choose] = useTab(TABS);
+    const source = useStore(shownSource, (shown) => shown) ?? live;
+    return (
+        <ServiceContext.Provider value={source.service}>
+            <header class="head">
+                <h1 class="brand">Vexa</h1>
+                <TabList tabs={TABS} current={tab} onChoose={choose} />
+                <ThemeButton />
+            </header>
+            <StatusLine isLive={source === live} />
+            <main>
+                <div class="view" id="view" role="tabpanel" aria-labelledby={`tab-${tab}`} tabIndex={-1}>
+                    <View tab={tab} source={source} />
+                </div>
+            </main>
+            <Notices />
+        </ServiceContext.Provider>
+    );
+}

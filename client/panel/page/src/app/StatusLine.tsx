@@ -1,0 +1,76 @@
+import { useServiceState } from './service';
+import type { State } from './state';
+import { durationText, printable } from './text';
+import './status.css';
+
+type Mood = 'good' | 'bad' | 'off' | 'unknown';
+
+interface Item {
+    label: string;
+    value: string;
+    mood: Mood;
+}
+
+function flag(label: string, value: boolean | null, yes: string, no: string): Item {
+    if (value === null) return { label, value: 'not known', mood: 'unknown' };
+    return { label, value: value ? yes : no, mood: value ? 'good' : 'off' };
+}
+
+function serviceItem(state: State, isLive: boolean): Item {
+    const label = 'Service';
+    if (!isLive) return { label, value: 'recorded', mood: 'unknown' };
+    if (state.link === 'connecting') return { label, value: 'connecting', mood: 'unknown' };
+    if (state.link === 'lost') return { label, value: 'panel lost, reconnecting', mood: 'bad' };
+    if (state.running === null) return { label, value: 'not known', mood: 'unknown' };
+    return state.running
+        ? { label, value: 'running', mood: 'good' }
+        : { label, value: 'lost, looking for it', mood: 'bad' };
+}
+
+function connectionItem({ networks, internet, currentChannel }: State): Item {
+    const label = 'Connection';
+    if (networks === null) return { label, value: 'not known', mood: 'unknown' };
+    const connected = networks.find((network) => network.isConnected);
+    if (!connected) return { label, value: 'none', mood: 'off' };
+    const parts = [printable(connected.name)];
+    if (currentChannel) parts.push(`channel ${currentChannel}`);
+    parts.push(internet ? 'internet' : 'no internet');
+    return { label, value: parts.join(' · '), mood: 'good' };
+}
+
+/** What the status line says of a state. */
+export function statusItems(state: State, isLive: boolean): Item[] {
+    return [
+        serviceItem(state, isLive),
+        flag('Adapter', state.adapter, 'in', 'out'),
+        flag('Radio', state.radio, 'on', 'off'),
+        flag('Hotspot', state.hotspot, 'on', 'off'),
+        connectionItem(state),
+    ];
+}
+
+/** How things stand, in one line; a change is read out. */
+export function StatusLine({ isLive }: { isLive: boolean }) {
+    const state = useServiceState((all) => all);
+    const { recording } = state;
+    return (
+        <div class="status">
+            <div class="status-told" role="status" aria-label="Status">
+                <dl class="status-items">
+                    {statusItems(state, isLive).map(({ label, value, mood }) => (
+                        <div key={label} class={`status-item ${mood} is-${label.toLowerCase()}`}>
+                            <dt>{label}</dt>
+                            <dd title={value}>{value}</dd>
+                        </div>
+                    ))}
+                </dl>
+            </div>
+            {recording?.active && (
+                <div class="status-item bad is-recording">
+                    <span class="status-label">Recording</span>{' '}
+                    <span class="figures">{durationText(recording.elapsed)}</span>
+                </div>
+            )}
+        </div>
+    );
+}

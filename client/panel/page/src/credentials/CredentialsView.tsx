@@ -1,0 +1,4 @@
+/** The stored credentials. */
+export function CredentialsView() {
+    return <h2>Credentials</h2>;
+}

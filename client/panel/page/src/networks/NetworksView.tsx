@@ -1,0 +1,4 @@
+/** The networks in range. */
+export function NetworksView() {
+    return <h2>Networks</h2>;
+}
