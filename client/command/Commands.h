@@ -31,6 +31,7 @@ void addCredentialImport(CLI::App& parent, int& exitCode);
 void addCredentialList(CLI::App& parent, int& exitCode);
 void addCredentialMove(CLI::App& parent, int& exitCode);
 void addRecordCommand(CLI::App& app, int& exitCode);
+void addPanelCommand(CLI::App& app, int& exitCode);
 void addReloadCommand(CLI::App& app, int& exitCode);
 void addLogCommand(CLI::App& app, int& exitCode);
 void addScenarioCommand(CLI::App& app, int& exitCode);

@@ -24,7 +24,7 @@ constexpr std::array kCommands{
     &addEnableCommand,     &addDisableCommand,  &addRefreshCommand, &addCredentialsCommand,
     &addCredentialCommand, &addReloadCommand,   &addWatchCommand,   &addLogCommand,
     &addDoctorCommand,     &addSendCommand,     &addListenCommand,  &addRecordCommand,
-    &addStatsCommand,      &addScenarioCommand, &addShellCommands};
+    &addStatsCommand,      &addScenarioCommand, &addPanelCommand,   &addShellCommands};
 
 int report(const std::exception& error, int exitCode) {
     std::cerr << "vexa: " << error.what() << '\n';

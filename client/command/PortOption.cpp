@@ -57,6 +57,11 @@ void PortOption::addPortTo(CLI::App& command, const std::string& alias) {
         ->envname(names.variable);
 }
 
+void PortOption::setMachine(const std::string& folder) {
+    m_machine = folder;
+    m_port = 0;
+}
+
 std::uint16_t PortOption::find() const {
     if (m_port != 0) return m_port;
     const MachineFolder folder(m_machine);

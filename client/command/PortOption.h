@@ -25,6 +25,9 @@ public:
     /// Adds the ports of both halves, of one machine.
     static void addBothTo(CLI::App& command, PortOption& spectral, PortOption& hotspot);
 
+    /// The service of this machine is meant, whatever was given.
+    void setMachine(const std::string& folder);
+
     /// The port that was given; else that of the environment; else what the parent left in the machine's
     /// folder. Throws ClientError if none tells.
     std::uint16_t find() const;

@@ -9,31 +9,8 @@ namespace vexa::client {
 
 namespace {
 
-constexpr const char* kPassword = "Password";
 constexpr const char* kSpectralName = "sa";
 constexpr const char* kHotspotName = "hs20";
-
-void maskPasswords(Json::Value& value) {
-    if (!value.isArray() && !value.isObject()) return;
-    for (Json::Value& member : value)
-        maskPasswords(member);
-    if (!value.isObject() || !value.isMember(kPassword)) return;
-    Json::Value& password = value[kPassword];
-    if (!password.isString() || !password.asString().empty()) password = kHiddenPassword;
-}
-
-// Data that can't be looked through is left out.
-void maskData(Json::Value& envelope) {
-    if (!envelope["Data"].isString()) return;
-    const std::string data = envelope["Data"].asString();
-    if (data.find(kPassword) == std::string::npos) return;
-    if (auto payload = parseJson(data)) {
-        maskPasswords(*payload);
-        envelope["Data"] = jsonLine(*payload);
-    } else {
-        envelope.removeMember("Data");
-    }
-}
 
 std::optional<RecordedTime> timeOf(const Json::Value& object) {
     const Json::Value& value = object["ms"];
@@ -67,7 +44,7 @@ std::optional<std::string> recordedLine(RecordedTime at, RecordedPort port, cons
                                         bool showPasswords) {
     auto envelope = parseJsonObject(text);
     if (!envelope || !eventOf(*envelope)) return std::nullopt;
-    if (!showPasswords) maskData(*envelope);
+    if (!showPasswords) hidePasswords(*envelope);
     Json::Value object = timed(at);
     object["port"] = port == RecordedPort::Spectral ? kSpectralName : kHotspotName;
     object["event"] = *envelope;

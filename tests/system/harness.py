@@ -143,10 +143,10 @@ def open_connection(port, timeout=PATIENCE, receive_buffer=None):
     return connection
 
 
-def handshake(host):
+def handshake(host, target="/", headers=""):
     """A request that the ports let in, if nothing else is wrong with it."""
-    upgrade = "Upgrade: websocket\r\nConnection: Upgrade\r\nSec-WebSocket-Version: 13\r\n"
-    return f"GET / HTTP/1.1\r\nHost: {host}\r\n{upgrade}Sec-WebSocket-Key: {KEY.decode()}\r\n\r\n".encode()
+    upgrade = f"Upgrade: websocket\r\nConnection: Upgrade\r\nSec-WebSocket-Version: 13\r\n{headers}"
+    return f"GET {target} HTTP/1.1\r\nHost: {host}\r\n{upgrade}Sec-WebSocket-Key: {KEY.decode()}\r\n\r\n".encode()
 
 
 def accepted(key):
@@ -202,16 +202,16 @@ def frame(opcode, payload, final=True, mask=None):
 class WebSocket:
     """One client of one port. A thread collects what comes in, so that a test that does not look holds up nobody."""
 
-    def __init__(self, port, host=None, reads=True, receive_buffer=None):
+    def __init__(self, port, host=None, reads=True, receive_buffer=None, target="/", headers=""):
         self.received = collections.deque()
         self.close_code = None
         self._arrival = threading.Condition()
         self._sending = threading.Lock()
         self.socket = open_connection(port, receive_buffer=receive_buffer)
         self.input = self.socket.makefile("rb")
-        self.socket.sendall(handshake(host or f"127.0.0.1:{port}"))
-        status, headers = read_head(self.input)
-        if headers.get(b"sec-websocket-accept") != accepted(KEY):
+        self.socket.sendall(handshake(host or f"127.0.0.1:{port}", target, headers))
+        status, self.headers = read_head(self.input)
+        if self.headers.get(b"sec-websocket-accept") != accepted(KEY):
             self.socket.close()
             raise ConnectionError(f"not let in: {status!r}")
         self.socket.settimeout(None)

@@ -1,0 +1,16 @@
+# Writes the files of the page as a source: cmake -DBUNDLE=FOLDER -DOUTPUT=FILE -P embed.cmake
+set(source "#include \"client/panel/PanelFiles.h\"\n\nnamespace vexa::client {\n\nnamespace {\n")
+foreach(name html css js)
+    set(file_html index.html)
+    set(file_css panel.css)
+    set(file_js panel.js)
+    file(READ ${BUNDLE}/${file_${name}} bytes HEX)
+    string(REGEX REPLACE "(..)" "0x\\1," bytes "${bytes}")
+    string(APPEND source "\nconstexpr unsigned char k_${name}[] = {${bytes}};\n")
+endforeach()
+string(APPEND source "\nstd::string_view textOf(const unsigned char* bytes, std::size_t size) {\n"
+    "    return {reinterpret_cast<const char*>(bytes), size};\n}\n\n}  // namespace\n\n")
+foreach(name html css js)
+    string(APPEND source "std::string_view panel_page::${name}() { return textOf(k_${name}, sizeof k_${name}); }\n")
+endforeach()
+file(WRITE ${OUTPUT} "${source}\n}  // namespace vexa::client\n")
