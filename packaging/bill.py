@@ -6,6 +6,7 @@ number comes from its content: the same build gives the same bytes."""
 import datetime, json, os, pathlib, subprocess, sys, urllib.parse, uuid
 
 TABLE = pathlib.Path(__file__).with_name("libraries")
+LOCK = pathlib.Path(__file__).parents[1] / "client/panel/page/package-lock.json"
 PACKAGE = "${source:Package} ${source:Version} ${Package} ${Version} ${Architecture}"
 
 
@@ -18,6 +19,10 @@ def rows(system):
 
 def package_url(package):
     """The URL of a package, and its version."""
+    if package.startswith("npm:"):
+        name = package.removeprefix("npm:")
+        version = json.loads(LOCK.read_text())["packages"][f"node_modules/{name}"]["version"]
+        return f"pkg:npm/{name}@{version}", version
     told = subprocess.run(["dpkg-query", "-W", "-f", PACKAGE, package.removeprefix("src:")], check=True,
                           capture_output=True, text=True).stdout.split()
     name, version, architecture = (*told[:2], "source") if package.startswith("src:") else told[2:]

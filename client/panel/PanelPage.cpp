@@ -34,7 +34,7 @@ void PanelPage::open(const PanelRequest& request, const PanelAnswers& answers) {
     m_stream.set_option(kTimeouts);
     m_stream.set_option(websocket::stream_base::decorator([&answers](websocket::response_type& response) {
         answers.addHeaders(response);
-        response.erase(http::field::server);
+        response.set(http::field::server, "vexa");  // else it tells of libraries
     }));
     m_stream.read_message_max(kMostMessage);
     m_stream.text(true);

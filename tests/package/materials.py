@@ -10,6 +10,7 @@ import subprocess
 import unittest
 
 BUILD, BILL = (pathlib.Path(os.environ[name]).resolve() for name in ("VEXA_BUILD", "VEXA_BILL"))
+LOCK = pathlib.Path(__file__).parents[2] / "client/panel/page/package-lock.json"
 PROGRAMS = ("vexa", "vexa-service")
 # Of what is built for Windows from source packages, by what its files are called.
 FROM_SOURCES = {"json": "libjsoncpp", "pugi": "pugixml", "zlib": "zlib", "zconf": "zlib"}
@@ -50,6 +51,13 @@ def libraries():
     return {os.path.realpath(path) for path in re.findall(r"^(/\S+\.a)\(", maps, re.M)}
 
 
+def packages_of_page():
+    """What of npm the bundle of the panel's page may hold: all that is not there for building alone."""
+    known = json.loads(LOCK.read_text())["packages"]
+    return {(path.removeprefix("node_modules/"), package["version"]) for path, package in known.items()
+            if path and not package.get("dev")}  # fmt: skip
+
+
 def installer():
     """The source package of the program that an installer is, if there is one."""
     return {"nsis" for setup in BUILD.glob("*-setup.exe") if b"NSIS.exehead" in setup.read_bytes()}
@@ -60,7 +68,10 @@ class Bill(unittest.TestCase):
         self.bill = json.loads(BILL.read_text())
 
     def test_it_names_all_that_is_in_the_programs_and_nothing_else(self):
-        urls = (re.fullmatch(r"pkg:deb/debian/(\S+)@\S+\?arch=(\w+)", part["purl"]) for part in self.bill["components"])
+        purls = [part["purl"] for part in self.bill["components"]]
+        of_page = {f"pkg:npm/{name}@{version}" for name, version in packages_of_page()}
+        self.assertEqual({purl for purl in purls if purl.startswith("pkg:npm/")}, of_page)
+        urls = (re.fullmatch(r"pkg:deb/debian/(\S+)@\S+\?arch=(\w+)", purl) for purl in purls if purl not in of_page)
         named = [(url[1].replace("%2B", "+"), url[2] == "source") for url in urls]
         told = {name for name, is_source in named if is_source}
         told |= sources_of(name for name, is_source in named if not is_source)

@@ -74,6 +74,7 @@ class Forms(ConnectStory):
         for words, texts in (
             (("listen", port), ["EventId"]),
             (("start", "--machine", folder), ["control"]),
+            (("panel", "--no-open", "--machine", self.machine.folder), ["url"]),
             (("demo",), ["CommandId", '"file"']),
         ):
             program = self.running(*words, "--json")

@@ -1,5 +1,6 @@
 """`vexa panel`: who gets in, what passes between a page and the service, and how it ends."""
 
+import gzip
 import json
 import os
 import random
@@ -197,7 +198,8 @@ class Door(PanelStory):
         answers.append((101, {k.decode(): v.decode() for k, v in self.page(browser).headers.items()}))
         for status, headers in answers:
             self.assertEqual({name: headers.get(name) for name in wanted}, wanted, status)
-            self.assertFalse({name for name in headers if name.startswith("access-control") or name == "server"})
+            self.assertFalse({name for name in headers if name.startswith("access-control")})
+            self.assertIn(headers.get("server", "vexa"), "vexa")
 
     def test_methods_and_paths(self):
         self.browser.enter()
@@ -281,13 +283,12 @@ class Relay(PanelStory):
 
     def test_no_password_reaches_a_page(self):
         browser, page = self.open()
-        theirs = self.machine.hs20()
         for name, password in (("Roam", SECRET), ("Lines", f"one\n{SECRET}\n"), ("None", "")):
-            data = user(name, password, RealName="roam.example" if name == "Roam" else name)
+            data = user(name, password, RealName="roam.example" if name == "Lines" else name)
             page.credentials("ADD_CREDENTIAL", data)
-        stored = {entry["CredentialName"]: entry for entry in theirs.credentials()}
+        self.assertIn(SECRET, str(self.machine.hs20().credentials()))
         self.assertEqual({entry["CredentialName"]: entry["Password"] for entry in page.credentials()},
-                         {name: MASK if entry["Password"] else "" for name, entry in stored.items()})  # fmt: skip
+                         {"Roam": MASK, "Lines": MASK, "None": ""})  # fmt: skip
         self.control.do("reportNetworks")
         page.command("hotspot", "CONNECT_NETWORK", {"NetWorkName": "Airport"})
         seen = page.wait("panel", "log", lambda message: any("password=" in line for line in message["lines"]))
@@ -301,16 +302,15 @@ class Relay(PanelStory):
 
     def test_an_edit_keeps_a_password_that_it_does_not_know(self):
         _, page = self.open()
-        theirs = self.machine.hs20()
         (stored,) = page.credentials("ADD_CREDENTIAL", user("Roam", SECRET))
         page.credentials("EDIT_CREDENTIAL", {**user("Other", MASK), "Id": stored["Id"]})
         page.credentials("EDIT_CREDENTIAL", {**user("Third", MASK), "Id": stored["Id"]})
-        (edited,) = theirs.credentials()
+        (edited,) = self.machine.hs20().credentials()
         self.assertEqual((edited["CredentialName"], edited["Password"]), ("Third", SECRET))
         page.command("hotspot", "EDIT_CREDENTIAL", {**user("Fourth", MASK), "Id": 99})
         self.assertIn("password is not known", page.wait("panel", "failure")["text"])
         page.credentials("EDIT_CREDENTIAL", {**user("Fifth", "new"), "Id": stored["Id"]})
-        (edited,) = theirs.credentials()
+        (edited,) = self.machine.hs20().credentials()
         self.assertEqual((edited["CredentialName"], edited["Password"]), ("Fifth", "new"))
 
     def test_only_commands_that_the_port_knows_pass(self):
@@ -326,8 +326,8 @@ class Relay(PanelStory):
             page.send_frame(TEXT, text)
         page.say("spectral", CommandId="GET_CURRENT_CHANNEL", More="x")
         page.wait("spectral", "SPECTRAL_ANALYSER_CURRENT_CHANNEL_DATA")
-        told = self.machine.output()[len(before) :]
-        self.assertEqual(told, "Service request from client : request id = GET_CURRENT_CHANNEL\n")
+        told = re.findall("request id = (.*)\n", self.machine.output()[len(before) :])
+        self.assertEqual(told, ["GET_CURRENT_CHANNEL"])
         page.send_frame(TEXT, b" " * ((1 << 20) + 1))
         self.assertEqual(page.wait_closed(), 1009)
 
@@ -380,7 +380,7 @@ class Relay(PanelStory):
         self.assertEqual((path.read_bytes(), path.stat().st_mode & 0o777), (content, 0o600))
         told = json.loads(self.done("stats", path, "--json"))["channels"]
         self.assertEqual([entry["channel"] for entry in told], [6, 36])
-        self.assertNotIn("5ecret", os.popen(f"gzip -dc {path}").read())
+        self.assertNotIn("5ecret", gzip.decompress(path.read_bytes()).decode())
         self.folder.joinpath(name).unlink()
         os.rmdir(self.folder)
         page.say("panel", command="startRecording")
@@ -397,7 +397,7 @@ class End(PanelStory):
         self.assertEqual(self.process.stop(signal.SIGINT), 130)
         self.assertEqual(page.wait_closed(), 1001)
         (path,) = self.folder.iterdir()
-        self.assertIn('"end":true', os.popen(f"gzip -dc {path}").read())
+        self.assertIn('"end":true', gzip.decompress(path.read_bytes()).decode())
 
     def test_when_the_last_page_has_been_away_for_a_while(self):
         browser = self.panel("--no-open", "--linger", "1", machine="/nonexistent")
