@@ -53,7 +53,7 @@ void Panel::tick() {
 PanelPage::Events Panel::pageEvents() {
     return {[this](const std::shared_ptr<PanelPage>& page) { enter(page); },
             [this](std::string_view message) { takeFromPage(message); },
-            [this](const PanelPage* page) { leave(page); }};
+            [this](const PanelPage* page, bool isClosed) { leave(page, isClosed); }};
 }
 
 void Panel::enter(const std::shared_ptr<PanelPage>& page) {
@@ -69,10 +69,11 @@ void Panel::enter(const std::shared_ptr<PanelPage>& page) {
     tell("recordings", recordings());
 }
 
-void Panel::leave(const PanelPage* page) {
+// Browsers let a page that nobody sees sleep: it is open nevertheless.
+void Panel::leave(const PanelPage* page, bool isClosed) {
     std::erase_if(m_pages, [page](const auto& known) { return known.get() == page; });
     if (!m_pages.empty()) return;
-    m_leftSince = Deadline::Clock::now();
+    if (isClosed) m_leftSince = Deadline::Clock::now();
     if (!m_recorder.isActive()) stopScan();
 }
 

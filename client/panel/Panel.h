@@ -43,7 +43,7 @@ public:
 
 private:
     void enter(const std::shared_ptr<PanelPage>& page);
-    void leave(const PanelPage* page);
+    void leave(const PanelPage* page, bool isClosed);
     void takeFromPage(std::string_view message);
     void takeFromService(RecordedPort port, const std::string& message);
     void serviceChanged(bool isRunning);

@@ -117,8 +117,7 @@ void addPanelCommand(CLI::App& app, int& exitCode) {
                       "Open no browser; the address that is printed lets in once");
     command
         ->add_option("--recordings", options->recordings, "Folder for recordings; default: the present one")
-        ->type_name("DIR")
-        ->check(CLI::ExistingDirectory);
+        ->type_name("DIR");
     command
         ->add_option("--linger", options->linger,
                      "Go on for so long after the last page was closed; default 30")

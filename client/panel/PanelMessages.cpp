@@ -5,6 +5,7 @@
 
 #include "client/port/JsonLine.h"
 #include "client/port/Passwords.h"
+#include "client/terminal/Text.h"
 #include "contract/Ports.h"
 
 namespace vexa::client {
@@ -37,8 +38,9 @@ bool isOneOf(const std::array<const char*, Count>& names, const std::string& nam
     return std::any_of(names.begin(), names.end(), [&](const char* known) { return name == known; });
 }
 
+// What is no UTF-8 would cost the page its connection.
 std::string wrapped(std::string_view port, const Json::Value& message) {
-    return "{\"port\":\"" + std::string(port) + "\",\"message\":" + jsonLine(message) + "}";
+    return "{\"port\":\"" + std::string(port) + "\",\"message\":" + asUtf8(jsonLine(message)) + "}";
 }
 
 std::optional<PageCommand> commandOf(RecordedPort port, const Json::Value& message) {

@@ -61,7 +61,8 @@ void PanelPage::send(Text text) {
     m_waitingBytes += text->size();
     m_waiting.push_back(std::move(text));
     if (m_waiting.size() == 1) return write();
-    if (m_waitingBytes - m_waiting.front()->size() > kMostWaiting) beast::get_lowest_layer(m_stream).close();
+    m_isTooSlow = m_waitingBytes - m_waiting.front()->size() > kMostWaiting;
+    if (m_isTooSlow) beast::get_lowest_layer(m_stream).close();
 }
 
 void PanelPage::write() {
@@ -83,7 +84,7 @@ void PanelPage::close() {
 }
 
 void PanelPage::leave() {
-    if (std::exchange(m_isOpen, false)) m_events.left(this);
+    if (std::exchange(m_isOpen, false)) m_events.left(this, !m_isTooSlow);
 }
 
 }  // namespace vexa::client

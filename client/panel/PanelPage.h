@@ -24,8 +24,9 @@ public:
     struct Events {
         std::function<void(const std::shared_ptr<PanelPage>& page)> entered;
         std::function<void(std::string_view message)> told;
-        /// Called once, if it has entered.
-        std::function<void(const PanelPage* page)> left;
+        /// Called once, if it has entered. `isClosed`: not for its slowness; else it is there still, and may
+        /// come back when it reads again.
+        std::function<void(const PanelPage* page, bool isClosed)> left;
     };
 
     PanelPage(boost::beast::tcp_stream stream, Events events);
@@ -50,6 +51,7 @@ private:
     std::size_t m_waitingBytes = 0;
     bool m_isOpen = false;
     bool m_isClosing = false;
+    bool m_isTooSlow = false;
 };
 
 }  // namespace vexa::client

@@ -45,7 +45,10 @@ std::string nameOfNow() {
 }  // namespace
 
 PanelRecordings::PanelRecordings(const std::string& folder)
-    : m_folder(folder.empty() ? fs::current_path() : fs::absolute(recordingPath(folder))) {}
+    : m_folder(folder.empty() ? fs::current_path() : fs::absolute(recordingPath(folder))) {
+    std::error_code error;
+    if (!fs::is_directory(m_folder, error)) throw ClientError("there is no folder " + inQuotes(folder));
+}
 
 // Another panel may begin one in the same second.
 std::string PanelRecordings::create() const {

@@ -12,7 +12,7 @@ namespace vexa::client {
 /// The folder of the recordings that the panel has made, now or earlier. A file of another name is none.
 class PanelRecordings {
 public:
-    /// Empty: the folder of the process.
+    /// Empty: the folder of the process. Throws ClientError if there is none.
     explicit PanelRecordings(const std::string& folder);
 
     /// Makes an empty file for a recording that begins now, for its owner alone; gives its name. Throws
