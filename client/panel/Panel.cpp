@@ -101,10 +101,10 @@ void Panel::forward(PageCommand command) {
         if (!data) return fail("The credential was not changed: its stored password is not known.");
         command.data = *data;
     }
-    send(std::move(command));
+    send(command);
 }
 
-void Panel::send(PageCommand command) {
+void Panel::send(const PageCommand& command) {
     if (command.id == contract::kFullScan) m_nextScan = Deadline::in(kScanPatience);
     if (command.id == contract::kStopScan) m_nextScan = Deadline::never();
     if (!m_relay.send(command.port, serviceText(command)))

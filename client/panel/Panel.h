@@ -53,7 +53,7 @@ private:
     void stopRecording();
     template <class Work>
     void record(Work work);
-    void send(PageCommand command);
+    void send(const PageCommand& command);
     void ask(RecordedPort port, const char* question);
     void askForRecording();
     void stopScan();

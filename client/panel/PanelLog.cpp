@@ -35,8 +35,8 @@ void PanelLog::follow(const std::optional<MachineFolder>& machine) {
 
 std::optional<Json::Value> PanelLog::takeNews() {
     std::deque<std::string> news;
-    for (LogFiles::Line& line : m_files ? m_files->takeLines() : std::vector<LogFiles::Line>()) {
-        if (auto text = withoutSecrets(std::move(line.text))) news.push_back(std::move(*text));
+    for (const LogFiles::Line& line : m_files ? m_files->takeLines() : std::vector<LogFiles::Line>()) {
+        if (auto text = withoutSecrets(line.text)) news.push_back(std::move(*text));
     }
     if (news.empty() && std::exchange(m_isTold, true)) return std::nullopt;
     keepEnd(news);
@@ -60,7 +60,7 @@ Json::Value PanelLog::told(const std::deque<std::string>& lines) const {
 }
 
 // A password may have lines of its own, and then goes on up to the next entry.
-std::optional<std::string> PanelLog::withoutSecrets(std::string line) {
+std::optional<std::string> PanelLog::withoutSecrets(const std::string& line) {
     const auto head = findEntryHead(line, 0);
     if (m_isWithinSecret && !(head && head->begin == 0)) return std::nullopt;
     std::string shown = withoutPassword(line);

@@ -26,7 +26,7 @@ public:
 
 private:
     Json::Value told(const std::deque<std::string>& lines) const;
-    std::optional<std::string> withoutSecrets(std::string line);
+    std::optional<std::string> withoutSecrets(const std::string& line);
 
     std::filesystem::path m_folder;
     std::optional<LogFiles> m_files;

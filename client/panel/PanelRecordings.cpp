@@ -55,8 +55,7 @@ std::string PanelRecordings::create() const {
     const std::string first = nameOfNow();
     std::error_code error;
     for (int number = 1; number < kMostOfOneSecond; ++number) {
-        const std::string name =
-            first + (number == 1 ? "" : "-" + std::to_string(number)) + std::string(kSuffix);
+        std::string name = first + (number == 1 ? "" : "-" + std::to_string(number)) + std::string(kSuffix);
         if (fs::exists(fs::symlink_status(pathOf(name), error))) continue;
         createOwnerFile(pathOf(name), "");
         return name;
