@@ -5,6 +5,7 @@
 
 #include "client/hotspot/HotspotNarrator.h"
 #include "client/port/Event.h"
+#include "client/port/JsonLine.h"
 #include "client/terminal/ClientError.h"
 #include "contract/Ports.h"
 
@@ -120,12 +121,13 @@ void Panel::stopScan() {
 }
 
 void Panel::takeFromService(RecordedPort port, const std::string& message) {
-    if (port == RecordedPort::Spectral) {
-        if (m_nextScan < Deadline::never()) m_nextScan = Deadline::in(kScanPatience);
-    } else if (const auto event = parseEvent(message)) {
-        m_passwords.take(*event);
-    }
-    if (auto text = pageMessage(port, message)) tellAll(std::move(*text));
+    auto envelope = parseJsonObject(message);
+    const auto event = envelope ? eventOf(*envelope) : std::nullopt;
+    if (!event) return;
+    if (port == RecordedPort::Hotspot) m_passwords.take(*event);
+    if (port == RecordedPort::Spectral && m_nextScan < Deadline::never())
+        m_nextScan = Deadline::in(kScanPatience);
+    if (!m_pages.empty()) tellAll(pageMessage(port, std::move(*envelope)));
     record([&] { m_recorder.add(port, message); });
 }
 

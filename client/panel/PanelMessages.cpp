@@ -61,11 +61,9 @@ std::optional<PanelWish> wishOf(const Json::Value& message) {
 
 }  // namespace
 
-std::optional<std::string> pageMessage(RecordedPort port, const std::string& text) {
-    auto envelope = parseJsonObject(text);
-    if (!envelope || !eventOf(*envelope)) return std::nullopt;
-    hidePasswords(*envelope);
-    return wrapped(port == RecordedPort::Spectral ? kSpectralName : kHotspotName, *envelope);
+std::string pageMessage(RecordedPort port, Json::Value envelope) {
+    hidePasswords(envelope);
+    return wrapped(port == RecordedPort::Spectral ? kSpectralName : kHotspotName, envelope);
 }
 
 std::string panelMessage(const char* event, Json::Value members) {

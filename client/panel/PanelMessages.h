@@ -14,8 +14,8 @@ namespace vexa::client {
 // The messages between a page and the panel; each is a JSON object with the name of a port and what was said
 // there.
 
-/// An event of the service, without passwords. Nothing if the text is none.
-std::optional<std::string> pageMessage(RecordedPort port, const std::string& text);
+/// An event of the service, without passwords.
+std::string pageMessage(RecordedPort port, Json::Value envelope);
 
 /// An event of the panel's own.
 std::string panelMessage(const char* event, Json::Value members = Json::Value(Json::objectValue));
