@@ -1,4 +1,5 @@
 import { render } from 'preact';
+import { keepScan, RESUMED } from '../spectrum/scan';
 import { SpectrumHistory } from '../spectrum/SpectrumHistory';
 import { App } from './App';
 import { Link } from './link';
@@ -8,9 +9,12 @@ import { Service } from './service';
 import type { Source } from './source';
 import { startTheme } from './theme';
 
+// A scan that tells nothing for so long has ended, or nothing stirs on any channel.
+const SILENCE = 5000;
+
 function startLive(): Source {
     const service = new Service((port, message) => link.send(port, message));
-    const spectrum = new SpectrumHistory();
+    const spectrum = new SpectrumHistory(SILENCE);
     const link = new Link(`ws://${location.host}/socket`, {
         onState: (state) => service.takeLink(state),
         onEvent: (event) => service.takeEvent(event),
@@ -21,8 +25,10 @@ function startLive(): Source {
     });
     service.onEvent((event) => spectrum.take(event));
     askWhenNeeded(service);
+    const scan = keepScan(service, spectrum);
+    scan.resumed.subscribe(() => notify(RESUMED));
     link.open();
-    return { service, spectrum, now: () => performance.now(), epoch: performance.timeOrigin };
+    return { service, spectrum, now: () => performance.now(), epoch: performance.timeOrigin, scan };
 }
 
 startTheme();

@@ -1,5 +1,6 @@
-import { SpectrumHistory } from '../spectrum/SpectrumHistory';
-import { Service } from './service';
+import type { ScanKeeper } from '../spectrum/scan';
+import type { SpectrumHistory } from '../spectrum/SpectrumHistory';
+import type { Service } from './service';
 import { Store } from './store';
 
 /** Where what is shown comes from: the live service, or a recording. */
@@ -10,6 +11,8 @@ export interface Source {
     now(): number;
     /** The epoch time of 0. */
     epoch: number;
+    /** Null where nothing can be asked. */
+    scan: ScanKeeper | null;
 }
 
 /** The source that is shown. */
