@@ -32,7 +32,7 @@ export function StatisticsTable({ channels, figures, quantity, drawn, currentCha
                             <th scope="col" class="number">
                                 Channel
                             </th>
-                            <th scope="col" class="number">
+                            <th scope="col" class="number mhz">
                                 MHz
                             </th>
                             {['Now', 'Mean', 'Max', 'Min'].map((heading) => (
@@ -63,15 +63,15 @@ export function StatisticsTable({ channels, figures, quantity, drawn, currentCha
                                             <span class="unseen">Draw channel {number}</span>
                                         </label>
                                     </td>
-                                    <th
-                                        scope="row"
-                                        class="number"
-                                        title={number === currentChannel ? 'The adapter is connected here' : undefined}
-                                    >
-                                        {number === currentChannel && <span class="connected">connected</span>}
+                                    <th scope="row" class="number">
+                                        {number === currentChannel && (
+                                            <span class="connected" title="The adapter is connected here">
+                                                <span class="unseen">connected, </span>
+                                            </span>
+                                        )}
                                         {number}
                                     </th>
-                                    <td class="number muted">{frequencyOf(number)}</td>
+                                    <td class="number muted mhz">{frequencyOf(number)}</td>
                                     <td class="number">{figure(quantity, figures.now[quantity][column] ?? NONE)}</td>
                                     <td class="number">{figure(quantity, mean, 1)}</td>
                                     <td class="number">{figure(quantity, greatest)}</td>

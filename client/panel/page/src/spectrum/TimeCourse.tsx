@@ -74,6 +74,7 @@ function plotOptions(quantity: Quantity, channels: readonly number[], width: num
         axes: [
             {
                 ...axis(),
+                size: 30,
                 values: (_, ticks) => ticks.map((tick) => new Date(tick * 1000).toLocaleTimeString('en-GB')),
                 space: 90,
             },
