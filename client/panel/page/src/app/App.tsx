@@ -1,6 +1,7 @@
 import { CredentialsView } from '../credentials/CredentialsView';
 import { NetworksView } from '../networks/NetworksView';
 import { RecordView } from '../record/RecordView';
+import { Transport } from '../record/Transport';
 import { SpectrumView } from '../spectrum/SpectrumView';
 import { Notices } from './notices';
 import { ServiceContext } from './service';
@@ -36,17 +37,21 @@ function ThemeButton() {
     );
 }
 
-// A view is there only while its tab is: what it has to keep lives outside of it.
-function View({ tab, source }: { tab: string; source: Source }) {
+// Recordings are made of the live service, also while one is played. A view is there only while its tab is: what it has to keep lives outside of it.
+function View({ tab, source, live }: { tab: string; source: Source; live: Source }) {
     switch (tab) {
         case 'networks':
             return <NetworksView />;
         case 'credentials':
             return <CredentialsView />;
         case 'record':
-            return <RecordView />;
+            return (
+                <ServiceContext.Provider value={live.service}>
+                    <RecordView />
+                </ServiceContext.Provider>
+            );
         default:
-            return <SpectrumView key={source.epoch} source={source} />;
+            return <SpectrumView key={source === live ? 'live' : 'played'} source={source} />;
     }
 }
 
@@ -61,9 +66,10 @@ export function App({ live }: { live: Source }) {
                 <ThemeButton />
             </header>
             <StatusLine isLive={source === live} />
+            <Transport />
             <main>
                 <div class="view" id="view" role="tabpanel" aria-labelledby={`tab-${tab}`} tabIndex={-1}>
-                    <View tab={tab} source={source} />
+                    <View tab={tab} source={source} live={live} />
                 </div>
             </main>
             <Notices />

@@ -124,7 +124,7 @@ class Drawing {
     #currentImage(): WaterfallImage {
         const { source, quantity, length, pausedStep } = this.props;
         const rows = this.#image?.rows;
-        const fits = rows?.isOfHistory && rows.rowTime === WaterfallRows.rowTimeOf(length);
+        const fits = rows?.isOf(source.spectrum) && rows.rowTime === WaterfallRows.rowTimeOf(length);
         if (this.#image && fits && this.#image.quantity === quantity) return this.#image;
         const next = rows && fits ? rows : new WaterfallRows(source.spectrum, length);
         if (next !== rows) {

@@ -172,6 +172,7 @@ export class SpectrumHistory {
         this.#isRadioOn = this.#isCardIn = true;
         this.told = 0;
         this.lastTold = -Infinity;
+        this.#endStep = -1;
         this.#begin();
     }
 
@@ -190,7 +191,7 @@ export class SpectrumHistory {
     #begin(): void {
         const columns = this.channels.length;
         this.generation++;
-        this.#firstStep = this.#endStep = -1;
+        this.#firstStep = this.#endStep;
         this.#levels = { congestion: new Levels(columns), interference: new Levels(columns) };
         this.#toldStep = new Float64Array(columns).fill(-1);
         this.#columns = new Map(this.channels.map(({ order }, column) => [order, column]));

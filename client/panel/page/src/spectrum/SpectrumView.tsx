@@ -129,7 +129,7 @@ export function SpectrumView({ source }: { source: Source }) {
     const readout = useRef<HTMLElement>(null);
     const figures = useMemo(
         () => takeFigures(history, window.length, pausedStep ?? undefined),
-        [ticks, window, pausedStep, history.generation],
+        [ticks, window, pausedStep, history, history.generation],
     );
     const drawn = chosen.drawn ?? busiest(history, figures, FIRST_DRAWN);
     const isSettled = history.endStep - history.firstStep > SETTLED && drawn.length > 0;
@@ -153,15 +153,19 @@ export function SpectrumView({ source }: { source: Source }) {
     return (
         <div class="spectrum">
             <div class="bar spectrum-bar">
-                <ScanButton source={source} />
-                <button
-                    type="button"
-                    class="button"
-                    aria-pressed={pausedStep !== null}
-                    onClick={() => setPausedStep(pausedStep === null ? history.endStep : null)}
-                >
-                    Pause
-                </button>
+                {source.scan && (
+                    <>
+                        <ScanButton source={source} />
+                        <button
+                            type="button"
+                            class="button"
+                            aria-pressed={pausedStep !== null}
+                            onClick={() => setPausedStep(pausedStep === null ? history.endStep : null)}
+                        >
+                            Pause
+                        </button>
+                    </>
+                )}
                 <Choices
                     label="What is shown"
                     choices={QUANTITIES.map((value) => ({ value, label: SCALES[value].name }))}
@@ -174,9 +178,11 @@ export function SpectrumView({ source }: { source: Source }) {
                     chosen={window}
                     onChoose={(value) => change({ window: value })}
                 />
-                <button type="button" class="button" onClick={() => history.clear()} disabled={pausedStep !== null}>
-                    Clear
-                </button>
+                {source.scan && (
+                    <button type="button" class="button" onClick={() => history.clear()} disabled={pausedStep !== null}>
+                        Clear
+                    </button>
+                )}
                 <span class="muted scan-hint" role="status">
                     {pausedStep === null
                         ? hintOf(source, isOn, { adapter, radio })

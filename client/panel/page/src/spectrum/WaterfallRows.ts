@@ -35,9 +35,9 @@ export class WaterfallRows {
         return Math.min(length, LONGEST) / ROWS;
     }
 
-    /** False: the history has begun anew, and this one ends. */
-    get isOfHistory(): boolean {
-        return this.#history.generation === this.#generation;
+    /** False: it is another history, or has begun anew. */
+    isOf(history: SpectrumHistory): boolean {
+        return history === this.#history && history.generation === this.#generation;
     }
 
     /** The place of a row in the ring, backwards, so that going up in the ring is going back in time. */
