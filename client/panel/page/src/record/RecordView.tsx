@@ -87,13 +87,14 @@ function OpenButton() {
 
 function RecordingList() {
     const files = useServiceState((state) => state.recordings);
+    const newestFirst = [...files].sort((a, b) => (a.name < b.name ? 1 : -1));
     return (
         <section class="card" aria-labelledby="recordings-title">
             <div class="card-head">
                 <h2 id="recordings-title">Recordings</h2>
+                <ReadingBar />
                 <OpenButton />
             </div>
-            <ReadingBar />
             <div class="scroll">
                 <table class="table">
                     <thead>
@@ -108,7 +109,7 @@ function RecordingList() {
                         </tr>
                     </thead>
                     <tbody>
-                        {files.map(({ name, bytes }) => (
+                        {newestFirst.map(({ name, bytes }) => (
                             <tr key={name}>
                                 <td class="recording-name">{printable(name)}</td>
                                 <td class="number">{bytesText(bytes)}</td>

@@ -5,7 +5,11 @@ export type Progress = (bytes: number) => void;
 
 const NO_RECORDING = 'It is no recording of vexa.';
 const LONGEST_LINE = 64 << 20;
+// One of these may unpack to a hundred times as much, in one go.
+const PIECE = 16384;
+// The page goes on after so many milliseconds; the time is looked at after so many lines.
 const TURN = 12;
+const LINES_OF_LOOK = 256;
 
 const isGzip = (bytes: Uint8Array) => bytes[0] === 0x1f && bytes[1] === 0x8b;
 
@@ -17,7 +21,7 @@ async function* piecesOf(stream: ReadableStream<Uint8Array<ArrayBuffer>>, progre
             transform(piece, controller) {
                 bytes += piece.length;
                 progress(bytes);
-                controller.enqueue(piece);
+                for (let at = 0; at < piece.length; at += PIECE) controller.enqueue(piece.subarray(at, at + PIECE));
             },
         }),
         { signal },
@@ -106,10 +110,11 @@ export async function readRecording(
             count++;
             if (index === null) index = begin(line);
             else if (!index.add(line)) throw new Error(`Line ${count} is no line of a recording.`);
+            if (count % LINES_OF_LOOK !== 0 || performance.now() - turn < TURN) continue;
+            await nextTurn();
+            signal.throwIfAborted();
+            turn = performance.now();
         }
-        if (performance.now() - turn < TURN) continue;
-        await nextTurn();
-        turn = performance.now();
     }
     if (lines.remainder !== '') {
         if (index === null) index = begin(lines.remainder);

@@ -105,18 +105,15 @@ export function TimeCourse(props: Props) {
     const latest = useRef(props);
     latest.current = props;
     useEffect(() => {
+        const element = box.current!;
         let plot: uPlot | null = null;
         const make = () => {
             plot?.destroy();
-            plot = new uPlot(
-                plotOptions(quantity, channels, box.current!.clientWidth),
-                dataOf(latest.current),
-                box.current!,
-            );
+            plot = new uPlot(plotOptions(quantity, channels, element.clientWidth), dataOf(latest.current), element);
         };
-        const observer = new ResizeObserver(() => plot?.setSize({ width: box.current!.clientWidth, height: HEIGHT }));
+        const observer = new ResizeObserver(() => plot?.setSize({ width: element.clientWidth, height: HEIGHT }));
         make();
-        observer.observe(box.current!);
+        observer.observe(element);
         const forget = look.subscribe(make);
         const timer = pausedStep === null ? setInterval(() => plot?.setData(dataOf(latest.current)), REDRAW) : 0;
         return () => {
