@@ -3,6 +3,8 @@ import type { State } from './state';
 import { durationText, printable } from './text';
 import './status.css';
 
+const UNKNOWN = 'not known';
+
 type Mood = 'good' | 'bad' | 'off' | 'unknown';
 
 interface Item {
@@ -12,7 +14,7 @@ interface Item {
 }
 
 function flag(label: string, value: boolean | null, yes: string, no: string): Item {
-    if (value === null) return { label, value: 'not known', mood: 'unknown' };
+    if (value === null) return { label, value: UNKNOWN, mood: 'unknown' };
     return { label, value: value ? yes : no, mood: value ? 'good' : 'off' };
 }
 
@@ -21,7 +23,7 @@ function serviceItem(state: State, isLive: boolean): Item {
     if (!isLive) return { label, value: 'recorded', mood: 'unknown' };
     if (state.link === 'connecting') return { label, value: 'connecting', mood: 'unknown' };
     if (state.link === 'lost') return { label, value: 'panel lost, reconnecting', mood: 'bad' };
-    if (state.running === null) return { label, value: 'not known', mood: 'unknown' };
+    if (state.running === null) return { label, value: UNKNOWN, mood: 'unknown' };
     return state.running
         ? { label, value: 'running', mood: 'good' }
         : { label, value: 'lost, looking for it', mood: 'bad' };
@@ -29,7 +31,7 @@ function serviceItem(state: State, isLive: boolean): Item {
 
 function connectionItem({ networks, internet, currentChannel }: State): Item {
     const label = 'Connection';
-    if (networks === null) return { label, value: 'not known', mood: 'unknown' };
+    if (networks === null) return { label, value: UNKNOWN, mood: 'unknown' };
     const connected = networks.find((network) => network.isConnected);
     if (!connected) return { label, value: 'none', mood: 'off' };
     const parts = [printable(connected.name)];
@@ -49,6 +51,16 @@ export function statusItems(state: State, isLive: boolean): Item[] {
     ];
 }
 
+// A dash takes no more room than what comes in its place.
+function Unknown() {
+    return (
+        <>
+            <span aria-hidden="true">&ndash;</span>
+            <span class="unseen">{UNKNOWN}</span>
+        </>
+    );
+}
+
 /** How things stand, in one line; a change is read out. */
 export function StatusLine({ isLive }: { isLive: boolean }) {
     const state = useServiceState((all) => all);
@@ -60,7 +72,7 @@ export function StatusLine({ isLive }: { isLive: boolean }) {
                     {statusItems(state, isLive).map(({ label, value, mood }) => (
                         <div key={label} class={`status-item ${mood} is-${label.toLowerCase()}`}>
                             <dt>{label}</dt>
-                            <dd title={value}>{value}</dd>
+                            <dd title={value}>{value === UNKNOWN ? <Unknown /> : value}</dd>
                         </div>
                     ))}
                 </dl>

@@ -137,7 +137,7 @@ export function SpectrumView({ source }: { source: Source }) {
         if (isSettled && chosen.drawn === null) change({ drawn });
     }, [isSettled]);
     const onToggle = (channel: number) => change({ drawn: toggled(drawn, channel) });
-    const label = window.length === Infinity ? 'all the time' : window.label;
+    const label = window.length === Infinity ? 'the whole time' : window.label;
 
     const peaks = figures.window[quantity];
     const bars = (): Bars => {

@@ -131,12 +131,12 @@ export function needsRadarDetection({ channels }: Block): boolean {
     return channels.some((number) => number >= FIRST_WITH_RADAR && number <= LAST_WITH_RADAR);
 }
 
-const percent = (level: number) => `${Math.round(level)} %`;
+const percent = (level: number) => `${Math.round(level)}\u00a0%`;
 
 /** Why the first of the ranked blocks is the best, in one sentence. */
 export function reasonFor(ranked: readonly RatedBlock[]): string {
     const [best, next] = ranked;
-    const level = `${signed(Math.round(best.interference) - 120)} dBm`;
+    const level = `${signed(Math.round(best.interference) - 120)}\u00a0dBm`;
     const parts =
         best.covered.length === 1
             ? `congestion was ${percent(best.mean)} on average and is ${percent(best.now)} now`

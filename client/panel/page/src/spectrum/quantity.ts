@@ -36,5 +36,5 @@ export function figure(quantity: Quantity, level: number, digits = 0): string {
 
 /** With its unit. */
 export function levelText(quantity: Quantity, level: number): string {
-    return level === NONE ? 'not known' : `${figure(quantity, level)} ${SCALES[quantity].unit}`;
+    return level === NONE ? 'not known' : `${figure(quantity, level)}\u00a0${SCALES[quantity].unit}`;
 }
