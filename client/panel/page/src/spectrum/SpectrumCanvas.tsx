@@ -1,6 +1,7 @@
 import { useEffect, useRef } from 'preact/hooks';
 import { announce } from '../app/notices';
 import type { Source } from '../app/source';
+import { clockText } from '../app/text';
 import { look } from '../app/theme';
 import type { Quantity } from './quantity';
 import { readoutText } from './readout';
@@ -109,7 +110,8 @@ class Drawing {
         if (!isNew && !isTold && !this.#isDirty) return;
         this.#isDirty = false;
         this.#told = source.spectrum.told;
-        this.#picture.draw(image, this.props.bars(), this.#spot);
+        const newest = isPaused ? clockText(source.epoch + image.rows.end * image.rows.rowTime) : 'now';
+        this.#picture.draw(image, this.props.bars(), this.#spot, newest);
         if (this.props.readout.current) this.props.readout.current.textContent = this.#words() ?? UNREAD;
     }
 

@@ -81,7 +81,8 @@ export class SpectrumPicture {
         return { column, age: Math.min(Math.max(age, -1), ROWS - 1) };
     }
 
-    draw(image: WaterfallImage, bars: Bars, spot: Spot | null): void {
+    /** `newest` says when the first row of the waterfall was. */
+    draw(image: WaterfallImage, bars: Bars, spot: Spot | null, newest: string): void {
         const context = this.#context;
         context.setTransform(this.#scale, 0, 0, this.#scale, 0, 0);
         context.clearRect(0, 0, this.#width, this.#height);
@@ -91,7 +92,7 @@ export class SpectrumPicture {
         this.#drawScale(image.quantity);
         this.#drawBars(bars);
         this.#drawChannels();
-        this.#drawTimes(image.rows.rowTime * ROWS);
+        this.#drawTimes(image.rows.rowTime * ROWS, newest);
         if (spot) this.#drawSpot(spot);
     }
 
@@ -192,7 +193,7 @@ export class SpectrumPicture {
         return labels;
     }
 
-    #drawTimes(length: number): void {
+    #drawTimes(length: number, newest: string): void {
         const context = this.#context;
         context.textAlign = 'right';
         context.textBaseline = 'middle';
@@ -200,7 +201,7 @@ export class SpectrumPicture {
         for (let mark = 0; mark <= TIME_MARKS; mark++) {
             const share = mark / TIME_MARKS;
             const y = this.#waterfallTop + share * this.#waterfallHeight;
-            const text = mark === 0 ? 'now' : `\u2212${durationText(length * share)}`;
+            const text = mark === 0 ? newest : `\u2212${durationText(length * share)}`;
             context.fillText(text, LEFT - 8, Math.min(y, this.#height - BOTTOM - 6) + (mark === 0 ? 6 : 0));
         }
     }

@@ -221,7 +221,9 @@ export function SpectrumView({ source }: { source: Source }) {
             </section>
             <section class="card course-card" aria-labelledby="course-title">
                 <div class="card-head">
-                    <h2 id="course-title">{SCALES[quantity].name} over time</h2>
+                    <h2 id="course-title">
+                        {SCALES[quantity].name} over time, {SCALES[quantity].unit}
+                    </h2>
                     <ul class="course-legend">
                         {drawn.map((number, place) => (
                             <li key={number}>

@@ -24,7 +24,7 @@ export function StatisticsTable({ channels, figures, quantity, drawn, currentCha
                 </h2>
                 <span class="muted">over {label}</span>
             </div>
-            <div class="scroll" tabIndex={0} role="region" aria-labelledby="statistics-title">
+            <div class="scroll" tabIndex={0} role="region" aria-label="Table of the channels">
                 <table class="table">
                     <thead>
                         <tr>

@@ -9,6 +9,8 @@ import { STEP, type SpectrumHistory } from './SpectrumHistory';
 const POINTS = 300;
 const REDRAW = 250;
 const HEIGHT = 184;
+// As wide as what is beside the picture above.
+const LEFT = 58;
 const LONGEST = 600_000;
 const DASHES = [[], [6, 3], [2, 3], [10, 3, 2, 3], [4, 4], [12, 4]];
 
@@ -63,7 +65,6 @@ function axis(): uPlot.Axis {
 }
 
 function plotOptions(quantity: Quantity, channels: readonly number[], width: number): uPlot.Options {
-    const { unit } = SCALES[quantity];
     return {
         width,
         height: HEIGHT,
@@ -80,9 +81,9 @@ function plotOptions(quantity: Quantity, channels: readonly number[], width: num
             },
             {
                 ...axis(),
-                size: 58,
+                size: LEFT,
                 splits: () => [0, 25, 50, 75, 100],
-                values: (_, levels) => levels.map((level) => `${figure(quantity, level)} ${unit}`),
+                values: (_, levels) => levels.map((level) => figure(quantity, level)),
             },
         ],
         series: [
