@@ -1,4 +1,4 @@
-import { useEffect, useRef } from 'preact/hooks';
+import { useLayoutEffect, useRef } from 'preact/hooks';
 import { announce } from '../app/notices';
 import type { Source } from '../app/source';
 import { clockText } from '../app/text';
@@ -143,7 +143,7 @@ class Drawing {
 /** The picture, with its pointer and keys. */
 export function SpectrumCanvas(props: Props) {
     const drawing = useRef<Drawing | null>(null);
-    useEffect(() => {
+    useLayoutEffect(() => {
         const canvas = props.canvas.current!;
         const made = new Drawing(canvas);
         made.props = props;
@@ -159,7 +159,7 @@ export function SpectrumCanvas(props: Props) {
             forget();
         };
     }, []);
-    useEffect(() => {
+    useLayoutEffect(() => {
         drawing.current!.props = props;
         drawing.current!.touch();
     });
