@@ -1,5 +1,5 @@
 import { useServiceState } from './service';
-import type { State } from './state';
+import { INITIAL_STATE, type State } from './state';
 import { durationText, printable } from './text';
 import './status.css';
 
@@ -40,8 +40,9 @@ function connectionItem({ networks, internet, currentChannel }: State): Item {
     return { label, value: parts.join(' · '), mood: 'good' };
 }
 
-/** What the status line says of a state. */
-export function statusItems(state: State, isLive: boolean): Item[] {
+/** What the status line says of a state. Without the panel nobody knows how things stand now. */
+export function statusItems(told: State, isLive: boolean): Item[] {
+    const state = isLive && told.link === 'lost' ? { ...INITIAL_STATE, link: told.link } : told;
     return [
         serviceItem(state, isLive),
         flag('Adapter', state.adapter, 'in', 'out'),
@@ -77,7 +78,7 @@ export function StatusLine({ isLive }: { isLive: boolean }) {
                     ))}
                 </dl>
             </div>
-            {recording?.active && (
+            {recording?.active && state.link === 'open' && (
                 <div class="status-item bad is-recording">
                     <span class="status-label">Recording</span>{' '}
                     <span class="figures">{durationText(recording.elapsed)}</span>

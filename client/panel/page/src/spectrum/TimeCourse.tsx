@@ -99,8 +99,7 @@ function plotOptions(quantity: Quantity, channels: readonly number[], width: num
     };
 }
 
-/** The levels of some channels over time. */
-export function TimeCourse(props: Props) {
+function Plot(props: Props) {
     const { quantity, channels, length, pausedStep, source } = props;
     const box = useRef<HTMLDivElement>(null);
     const latest = useRef(props);
@@ -126,4 +125,27 @@ export function TimeCourse(props: Props) {
     }, [quantity, channels.join(), length, pausedStep, source]);
     const names = channels.length > 0 ? `channels ${channels.join(', ')}` : 'no channel';
     return <div class="course" ref={box} role="img" aria-label={`${SCALES[quantity].name} over time: ${names}`} />;
+}
+
+/** The levels of some channels over time. */
+export function TimeCourse(props: Props) {
+    const { name, unit } = SCALES[props.quantity];
+    return (
+        <section class="card course-card" aria-labelledby="course-title">
+            <div class="card-head">
+                <h2 id="course-title">
+                    {name} over time, {unit}
+                </h2>
+                <ul class="course-legend" aria-label="Channels that are drawn">
+                    {props.channels.map((number, place) => (
+                        <li key={number}>
+                            <span class={`swatch series-${place + 1}`} />
+                            {number}
+                        </li>
+                    ))}
+                </ul>
+            </div>
+            <Plot {...props} />
+        </section>
+    );
 }

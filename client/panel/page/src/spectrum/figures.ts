@@ -1,6 +1,7 @@
 import { NONE, QUANTITIES, type Quantity } from './quantity';
 import type { SpectrumHistory } from './SpectrumHistory';
 import { statisticsOf, type LevelStatistics } from './statistics';
+import type { Bars } from './SpectrumPicture';
 import type { ChannelLoad } from './blocks';
 
 /** What the table, the bars and the choice of a channel go by, taken at one moment. By column. */
@@ -9,13 +10,29 @@ export interface Figures {
     window: Record<Quantity, LevelStatistics[]>;
 }
 
-export function takeFigures(history: SpectrumHistory, length: number, end = history.endStep): Figures {
+/** As they are now, or where the time stands still: one behind the last step that counts. */
+export function takeFigures(history: SpectrumHistory, length: number, pausedStep: number | null): Figures {
     const of = <T>(value: (quantity: Quantity) => T) =>
         Object.fromEntries(QUANTITIES.map((quantity) => [quantity, value(quantity)])) as Record<Quantity, T>;
+    const level = (quantity: Quantity, column: number) =>
+        pausedStep === null ? history.current(quantity, column) : history.level(quantity, pausedStep - 1, column);
     return {
-        now: of((quantity) => history.channels.map((_, column) => history.current(quantity, column))),
-        window: of((quantity) => statisticsOf(history, quantity, length, end)),
+        now: of((quantity) => history.channels.map((_, column) => level(quantity, column))),
+        window: of((quantity) => statisticsOf(history, quantity, length, pausedStep ?? history.endStep)),
     };
+}
+
+/** The bars at this moment, with the highest that the figures tell. */
+export function barsOf(history: SpectrumHistory, figures: Figures, quantity: Quantity, isPaused: boolean): Bars {
+    const now = isPaused
+        ? figures.now[quantity]
+        : history.channels.map((_, column) => history.current(quantity, column));
+    const peak = now.map((level, column) => {
+        const greatest = figures.window[quantity][column]?.greatest ?? NONE;
+        if (greatest === NONE || level === NONE) return Math.min(greatest, level);
+        return Math.max(greatest, level);
+    });
+    return { now, peak };
 }
 
 export function loadsOf(history: SpectrumHistory, { now, window }: Figures): ChannelLoad[] {
