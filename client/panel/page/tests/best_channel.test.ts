@@ -56,6 +56,7 @@ test('the best block comes first', () => {
         ['of equals the lower', { 44: [20], 36: [20] }, 20, ['36', '44']],
         ['interference decides between like ones', { 36: [20, 20, 100], 40: [20, 20, 5] }, 20, ['40', '36']],
         ['what is not known is left out', { 36: [NaN], 40: [10] }, 20, ['40']],
+        ['where nothing is told now the mean counts', { 36: [20, 90], 40: [20, NaN] }, 20, ['40', '36']],
         ['a block with an unknown channel, too', { 36: [NaN], 40: [10] }, 40, []],
     ];
     for (const [name, loads, width, expected] of cases)
@@ -74,6 +75,7 @@ test('the reason is a sentence', () => {
             40,
             /^On 52\u201356 its busiest channel, 56, was at 20.%.*15.%.*20.%.*radar\.$/,
         ],
+        [{ 36: [10, NaN, 25] }, 20, /^On 36 congestion was 10.% on average, interference \u221295.dBm\.$/],
     ];
     for (const [loads, width, expected] of cases) assert.match(reasonFor(rankOf(loads, width)), expected);
     assert.equal(needsRadarDetection(blocksOf(EUROPE, 80)[0]), false);

@@ -49,7 +49,7 @@ export function BestChannel({ loads, width, label }: { loads: readonly ChannelLo
                         {Array.from({ length: SHOWN }, (_, place) => {
                             const block = ranked[place];
                             const cell = (level: number | undefined) =>
-                                level === undefined ? '\u2013' : `${Math.round(level)} %`;
+                                level === undefined || Number.isNaN(level) ? '\u2013' : `${Math.round(level)} %`;
                             return (
                                 <tr key={place} class={place === 0 && block ? 'is-best' : ''}>
                                     <th scope="row">{block ? blockName(block) : '\u2013'}</th>

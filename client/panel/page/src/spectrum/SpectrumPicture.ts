@@ -26,7 +26,9 @@ const BARS = 104;
 const AXIS = 40;
 const BOTTOM = 6;
 const GAP = 12;
-const FONT = '11px system-ui, -apple-system, "Segoe UI", sans-serif';
+const FONT = 'system-ui, -apple-system, "Segoe UI", sans-serif';
+// Of the page's own size.
+const FONT_SHARE = 0.79;
 const LABEL_WIDTH = 24;
 const GRID_LEVELS = [0, 50, 100];
 const TIME_MARKS = 4;
@@ -48,6 +50,7 @@ export class SpectrumPicture {
     #width = 0;
     #height = 0;
     #scale = 1;
+    #fontSize = 11;
     #colours = themeColours();
 
     constructor(canvas: HTMLCanvasElement) {
@@ -59,6 +62,7 @@ export class SpectrumPicture {
         this.#width = width;
         this.#height = height;
         this.#scale = scale;
+        this.#fontSize = FONT_SHARE * parseFloat(getComputedStyle(document.documentElement).fontSize);
         this.#canvas.width = Math.round(width * scale);
         this.#canvas.height = Math.round(height * scale);
         this.#place();
@@ -86,7 +90,7 @@ export class SpectrumPicture {
         const context = this.#context;
         context.setTransform(this.#scale, 0, 0, this.#scale, 0, 0);
         context.clearRect(0, 0, this.#width, this.#height);
-        context.font = FONT;
+        context.font = `${this.#fontSize}px ${FONT}`;
         this.#drawGrounds();
         image.draw(context, this.#groups, this.#waterfallTop, this.#waterfallHeight);
         this.#drawScale(image.quantity);

@@ -10,7 +10,7 @@ export interface ChannelLoad {
     number: number;
     /** The mean congestion over the window. */
     mean: number;
-    /** The congestion now. */
+    /** The congestion now; not a number where it is not known. */
     now: number;
     /** The mean interference over the window. */
     interference: number;
@@ -97,8 +97,9 @@ function rate(block: Block, loads: ReadonlyMap<number, ChannelLoad>): RatedBlock
     const worst = all.reduce((a, b) => (b.mean > a.mean ? b : a));
     const mean = average((load) => load.mean);
     const now = Math.max(...all.map((load) => load.now));
+    const expected = Number.isNaN(now) ? mean : now;
     const interference = average((load) => (Number.isNaN(load.interference) ? 0 : load.interference));
-    const cost = 0.5 * worst.mean + 0.3 * mean + 0.2 * now + 0.05 * interference;
+    const cost = 0.5 * worst.mean + 0.3 * mean + 0.2 * expected + 0.05 * interference;
     return { ...block, worst: worst.mean, worstChannel: worst.number, mean, now, interference, cost };
 }
 
@@ -137,11 +138,12 @@ const percent = (level: number) => `${Math.round(level)}\u00a0%`;
 export function reasonFor(ranked: readonly RatedBlock[]): string {
     const [best, next] = ranked;
     const level = `${signed(Math.round(best.interference) - 120)}\u00a0dBm`;
+    const isNowKnown = !Number.isNaN(best.now);
     const parts =
         best.covered.length === 1
-            ? `congestion was ${percent(best.mean)} on average and is ${percent(best.now)} now`
-            : `its busiest channel, ${best.worstChannel}, was at ${percent(best.worst)} on average, ` +
-              `all it covers at ${percent(best.mean)}, and now it is at most ${percent(best.now)}`;
+            ? `congestion was ${percent(best.mean)} on average${isNowKnown ? ` and is ${percent(best.now)} now` : ''}`
+            : `its busiest channel, ${best.worstChannel}, was at ${percent(best.worst)} on average and all it covers at ` +
+              `${percent(best.mean)}${isNowKnown ? `, now it is at most ${percent(best.now)}` : ''}`;
     const rival = next
         ? `; ${blockName(next)} comes next with ${percent(next.covered.length === 1 ? next.mean : next.worst)}`
         : '';

@@ -39,7 +39,7 @@ export function loadsOf(history: SpectrumHistory, { now, window }: Figures): Cha
     return history.channels.map(({ number }, column) => ({
         number,
         mean: window.congestion[column]?.mean ?? NaN,
-        now: now.congestion[column] === NONE ? (window.congestion[column]?.mean ?? NaN) : now.congestion[column],
+        now: now.congestion[column] === NONE ? NaN : now.congestion[column],
         interference: window.interference[column]?.mean ?? NaN,
     }));
 }
