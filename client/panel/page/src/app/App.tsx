@@ -65,7 +65,7 @@ export function App({ live }: { live: Source }) {
                 <TabList tabs={TABS} current={tab} onChoose={choose} />
                 <ThemeButton />
             </header>
-            <StatusLine isLive={source === live} />
+            <StatusLine live={live.service} isLive={source === live} />
             <Transport />
             <main>
                 <div class="view" id="view" role="tabpanel" aria-labelledby={`tab-${tab}`} tabIndex={-1}>

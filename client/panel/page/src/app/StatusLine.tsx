@@ -1,5 +1,6 @@
-import { useServiceState } from './service';
+import { useServiceState, type Service } from './service';
 import { INITIAL_STATE, type State } from './state';
+import { useStore } from './store';
 import { durationText, printable } from './text';
 import './status.css';
 
@@ -62,10 +63,10 @@ function Unknown() {
     );
 }
 
-/** How things stand, in one line; a change is read out. */
-export function StatusLine({ isLive }: { isLive: boolean }) {
+/** How things stand, in one line; a change is read out. What is recorded is the live service, whatever is shown. */
+export function StatusLine({ live, isLive }: { live: Service; isLive: boolean }) {
     const state = useServiceState((all) => all);
-    const { recording } = state;
+    const recording = useStore(live.state, ({ link, recording }) => (link === 'open' ? recording : null));
     return (
         <div class="status">
             <div class="status-told" role="status" aria-label="Status">
@@ -78,7 +79,7 @@ export function StatusLine({ isLive }: { isLive: boolean }) {
                     ))}
                 </dl>
             </div>
-            {recording?.active && state.link === 'open' && (
+            {recording?.active && (
                 <div class="status-item bad is-recording">
                     <span class="status-label">Recording</span>{' '}
                     <span class="figures">{durationText(recording.elapsed)}</span>

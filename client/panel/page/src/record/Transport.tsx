@@ -38,10 +38,11 @@ function Bar({ playing }: { playing: Player }) {
             <span class="transport-time figures">
                 {clockText(header.started + position)} <span class="muted">{time}</span>
             </span>
-            <label class="bar">
-                <span class="muted">Speed</span>
+            <label class="bar transport-speed">
+                <span class="muted transport-word">Speed</span>
                 <select
                     class="select"
+                    aria-label="Speed"
                     value={String(speed)}
                     onChange={(event) => playing.setSpeed(Number(event.currentTarget.value))}
                 >
