@@ -25,8 +25,9 @@ const list = (at = 0, channels: unknown = CHANNELS) =>
 const congestion = (at: number, order: number, value: number) =>
     spectral('SPECTRAL_ANALYSER_SAMPLE_DATA_CONGESTION', at, { congestion_value: value, order });
 
-function historyOf(events: ReturnType<typeof spectral>[], end: number, patience?: number): SpectrumHistory {
-    const history = new SpectrumHistory(patience);
+function historyOf(events: ReturnType<typeof spectral>[], end: number, patience = Infinity): SpectrumHistory {
+    const history = new SpectrumHistory();
+    history.patience = patience;
     history.advance(0);
     for (const event of events) history.take(event);
     history.advance(end);

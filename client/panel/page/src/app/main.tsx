@@ -9,12 +9,9 @@ import { Service } from './service';
 import type { Source } from './source';
 import { startTheme } from './theme';
 
-// A scan that tells nothing for so long has ended, or nothing stirs on any channel.
-const SILENCE = 5000;
-
 function startLive(): Source {
     const service = new Service((port, message) => link.send(port, message));
-    const spectrum = new SpectrumHistory(SILENCE);
+    const spectrum = new SpectrumHistory();
     const link = new Link(`ws://${location.host}/socket`, {
         onState: (state) => service.takeLink(state),
         onEvent: (event) => service.takeEvent(event),
@@ -26,10 +23,12 @@ function startLive(): Source {
     service.onEvent((event) => spectrum.take(event));
     askWhenNeeded(service);
     const scan = keepScan(service, spectrum);
-    scan.resumed.subscribe(() => notify(RESUMED));
+    scan.resumed.subscribe(() => scan.resumed.get() && notify(RESUMED));
     link.open();
     return { service, spectrum, now: () => performance.now(), epoch: performance.timeOrigin, scan };
 }
 
 startTheme();
-render(<App live={startLive()} />, document.getElementById('page')!);
+const page = document.getElementById('page')!;
+page.replaceChildren();
+render(<App live={startLive()} />, page);

@@ -74,6 +74,8 @@ export interface State {
 }
 
 export const LOG_LINES = 4000;
+// No adapter tells more to the service.
+const MOST_CHANNELS = 256;
 
 const NOTHING_OF_SERVICE = {
     adapter: null,
@@ -141,11 +143,12 @@ function withNetworks(state: State, data: unknown): State {
     return { ...state, networks, hotspot: Array.isArray(data) ? true : state.hotspot };
 }
 
-function withChannels(state: State, data: unknown): State {
-    const channels = rows(data)
+/** The channels of a list, by number. */
+export function channelsOf(data: unknown): Channel[] {
+    return rows(data)
+        .slice(0, MOST_CHANNELS)
         .map((row) => ({ number: number(row.Channel), order: number(row.Order) }))
         .sort((a, b) => a.number - b.number);
-    return { ...state, channels };
 }
 
 /** The state after an event. */
@@ -170,7 +173,7 @@ export function afterEvent(state: State, event: ServiceEvent): State {
         case 'GET_ALL_CREDENTIAL_LIST':
             return data === undefined ? state : { ...state, credentials: rows(data).map(credentialOf) };
         case 'SPECTRAL_ANALYSER_CHANNEL_LIST_DATA_2G5G':
-            return data === undefined ? state : withChannels(state, data);
+            return data === undefined ? state : { ...state, channels: channelsOf(data) };
         case 'SPECTRAL_ANALYSER_CURRENT_CHANNEL_DATA':
             return typeof data === 'number' ? { ...state, currentChannel: data } : state;
         default:

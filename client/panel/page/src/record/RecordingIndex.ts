@@ -21,6 +21,8 @@ interface Keyframe {
 
 const FORMAT = 1;
 const KEYFRAME_TIME = 30_000;
+// Orders count from 1, and a list has at most 256.
+const LAST_ORDER = 256;
 const INTERFERENCE = 0x80;
 const CHANNEL_LIST = 'SPECTRAL_ANALYSER_CHANNEL_LIST_DATA_2G5G';
 const MARKS = new Set([CHANNEL_LIST, 'RADIO_ON', 'RADIO_OFF', 'CARD_PLUG_IN', 'CARD_PLUG_OUT']);
@@ -80,7 +82,7 @@ export class RecordingIndex {
     readonly #orders = new Column(Uint16Array);
     readonly #levels = new Column(Uint8Array);
     readonly #keyframes: Keyframe[] = [];
-    #standing = new Uint8Array(128).fill(NONE);
+    readonly #standing = new Uint8Array(2 * (LAST_ORDER + 1)).fill(NONE);
 
     readonly #eventTimes = new Column(Uint32Array);
     readonly #lines = new LineStore();
@@ -175,20 +177,12 @@ export class RecordingIndex {
     }
 
     #addSample(at: number, quantity: Quantity, order: number, level: number): void {
-        if (!(order >= 0 && order < 65536 && level >= 0 && level <= 100)) return;
+        if (!(order >= 0 && order <= LAST_ORDER && level >= 0 && level <= 100)) return;
         this.#addKeyframe(at);
         this.#sampleTimes.push(at);
         this.#orders.push(order);
         this.#levels.push(quantity === 'interference' ? level | INTERFERENCE : level);
-        const place = 2 * order + (quantity === 'interference' ? 1 : 0);
-        if (place >= this.#standing.length) this.#widen(place + 1);
-        this.#standing[place] = level;
-    }
-
-    #widen(length: number): void {
-        const wider = new Uint8Array(2 * length).fill(NONE);
-        wider.set(this.#standing);
-        this.#standing = wider;
+        this.#standing[2 * order + (quantity === 'interference' ? 1 : 0)] = level;
     }
 
     #addKeyframe(at: number): void {

@@ -41,7 +41,8 @@ function useHint(source: Source, isPaused: boolean): string {
     if (source.spectrum.channels.length === 0) return 'The adapter has told no channels yet.';
     if (!source.scan) return '';
     const isTold = source.now() - source.spectrum.lastTold < FRESH;
-    if (isOn) return isTold ? 'Scanning.' : 'Scanning; no values come.';
+    if (isOn && !isTold) return source.spectrum.told === 0 ? 'Scanning; no values yet.' : 'Scanning; nothing changes.';
+    if (isOn) return 'Scanning.';
     return isTold ? 'Another client scans.' : 'No scan is running.';
 }
 

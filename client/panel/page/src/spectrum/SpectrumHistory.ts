@@ -1,5 +1,5 @@
 import type { ServiceEvent } from '../app/protocol';
-import type { Channel } from '../app/state';
+import { channelsOf, type Channel } from '../app/state';
 import { NONE, type Quantity } from './quantity';
 
 /** The time of one row, in milliseconds. */
@@ -41,14 +41,6 @@ function isSameList(a: readonly Channel[], b: readonly Channel[]): boolean {
     return a.length === b.length && a.every((one, i) => one.number === b[i].number && one.order === b[i].order);
 }
 
-function channelList(data: unknown): Channel[] | null {
-    if (data === null) return [];
-    if (!Array.isArray(data)) return null;
-    return data
-        .map(({ Channel, Order }) => ({ number: Number(Channel), order: Number(Order) }))
-        .sort((a, b) => a.number - b.number);
-}
-
 /**
  * What the spectral analyser told, as rows of equal time: a level of each channel, which stands until another is
  * told. Rows are named by their step, the time divided by STEP. The last KEPT_STEPS are kept, and sums of all.
@@ -62,6 +54,11 @@ export class SpectrumHistory {
     told = 0;
     /** When the last one was told. */
     lastTold = -Infinity;
+    /**
+     * After so many milliseconds in which nothing was told a value is none any more. The service tells only what
+     * changes: while a scan runs a value stands however long.
+     */
+    patience = Infinity;
 
     #levels: Record<Quantity, Levels> = { congestion: new Levels(0), interference: new Levels(0) };
     #toldStep = new Float64Array(0);
@@ -72,12 +69,6 @@ export class SpectrumHistory {
     #isCardIn = true;
     #firstStep = -1;
     #endStep = -1;
-    readonly #patience: number;
-
-    /** Values that nobody confirmed for `patience` milliseconds are none any more: a scan has ended. */
-    constructor(patience = Infinity) {
-        this.#patience = patience;
-    }
 
     /** The first step that is kept. */
     get firstStep(): number {
@@ -178,8 +169,8 @@ export class SpectrumHistory {
 
     // Values speak of orders. Those that came before the first list belong to it; another list makes them void.
     #takeList(data: unknown): void {
-        const channels = channelList(data);
-        if (!channels) return;
+        if (data === undefined) return;
+        const channels = channelsOf(data);
         const isSame = isSameList(channels, this.channels);
         if (this.#hasList && !isSame) this.#values.clear();
         this.#hasList = true;
@@ -204,7 +195,7 @@ export class SpectrumHistory {
     }
 
     #isPresent(now: number): boolean {
-        return this.#isRadioOn && this.#isCardIn && now - this.lastTold <= this.#patience;
+        return this.#isRadioOn && this.#isCardIn && now - this.lastTold <= this.patience;
     }
 
     // The service tells no value that is 0 from the start: where one was told, the other is 0. Both come in one burst.

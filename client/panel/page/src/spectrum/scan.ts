@@ -5,6 +5,8 @@ import type { SpectrumHistory } from './SpectrumHistory';
 const PATIENCE = 1500;
 const LONGEST_PATIENCE = 10_000;
 const LOOK = 250;
+// Where another client scans, nobody tells that it has stopped.
+const SILENCE = 5000;
 
 export const RESUMED = 'No values came for a while: another client may have stopped the scan, it was asked for again.';
 
@@ -14,8 +16,8 @@ export const RESUMED = 'No values came for a while: another client may have stop
  */
 export class ScanKeeper {
     readonly isOn = new Store(false);
-    /** Counts how often values came back after the scan was asked for again. */
-    readonly resumed = new Store(0);
+    /** Values have come back after the scan was asked for again. */
+    readonly resumed = new Store(false);
     readonly #service: Pick<Service, 'ask'>;
     readonly #history: Pick<SpectrumHistory, 'told' | 'lastTold'>;
     #toldBefore = 0;
@@ -31,6 +33,7 @@ export class ScanKeeper {
 
     start(now: number): void {
         this.#hasValues = this.#isRenewed = false;
+        this.resumed.set(false);
         this.#patience = PATIENCE;
         this.isOn.set(true);
         this.#ask(now);
@@ -52,7 +55,7 @@ export class ScanKeeper {
         this.#toldBefore = this.#history.told;
         if (!this.#hasValues) this.#patience = Math.max(PATIENCE, 2 * (this.#history.lastTold - this.#asked));
         this.#hasValues = true;
-        if (this.#isRenewed) this.resumed.update((count) => count + 1);
+        if (this.#isRenewed) this.resumed.set(true);
         this.#isRenewed = false;
     }
 
@@ -74,6 +77,9 @@ export function keepScan(service: Service, history: SpectrumHistory): ScanKeeper
     const keeper = new ScanKeeper(service, history);
     const isUp = () => service.state.get().link === 'open' && service.state.get().running === true;
     let wasUp = isUp();
+    const trust = () => (history.patience = keeper.isOn.get() ? Infinity : SILENCE);
+    keeper.isOn.subscribe(trust);
+    trust();
     service.state.subscribe(() => {
         if (isUp() && !wasUp && keeper.isOn.get()) keeper.start(performance.now());
         if (!isUp() && wasUp) history.forget();
