@@ -1,4 +1,4 @@
-import { useEffect } from 'preact/hooks';
+import { useEffect, useRef } from 'preact/hooks';
 import { useStore } from '../app/store';
 import { clockText, durationText, printable } from '../app/text';
 import { closeRecording, player } from './playback';
@@ -7,9 +7,24 @@ import './record.css';
 
 const SLIDER_STEP = 1000;
 
+/** Seeks at most once a frame, however quickly the slider is moved. */
+function useSeek(playing: Player): (position: number) => void {
+    const wanted = useRef<number | null>(null);
+    return (position) => {
+        if (wanted.current === null) {
+            requestAnimationFrame(() => {
+                void playing.seek(wanted.current!);
+                wanted.current = null;
+            });
+        }
+        wanted.current = position;
+    };
+}
+
 function Bar({ playing }: { playing: Player }) {
     const { position, isPlaying, speed } = useStore(playing.state, (state) => state);
     const { duration, header } = playing.index;
+    const seek = useSeek(playing);
     useEffect(() => () => playing.pause(), [playing]);
     const time = `${durationText(position)} of ${durationText(duration)}`;
     return (
@@ -33,7 +48,7 @@ function Bar({ playing }: { playing: Player }) {
                 value={position}
                 aria-label="Time"
                 aria-valuetext={time}
-                onInput={(event) => void playing.seek(Number(event.currentTarget.value))}
+                onInput={(event) => seek(Number(event.currentTarget.value))}
             />
             <span class="transport-time figures">
                 {clockText(header.started + position)} <span class="muted">{time}</span>

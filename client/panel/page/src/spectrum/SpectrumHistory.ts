@@ -85,6 +85,14 @@ export class SpectrumHistory {
         return this.#levels[quantity].rows[(step % KEPT_STEPS) * this.channels.length + column];
     }
 
+    /** The rows of a stretch that is kept, one after the other: `levels` has those of the columns from `begin` on. */
+    eachRow(quantity: Quantity, first: number, end: number, visit: (levels: Uint8Array, begin: number) => void): void {
+        const { rows } = this.#levels[quantity];
+        const last = Math.min(end, this.#endStep);
+        for (let step = Math.max(first, this.firstStep); step < last; step++)
+            visit(rows, (step % KEPT_STEPS) * this.channels.length);
+    }
+
     /** The level that stands now. */
     current(quantity: Quantity, column: number): number {
         return this.#isPresent(this.#endStep * STEP) ? this.#standing(quantity, column, this.#endStep) : NONE;

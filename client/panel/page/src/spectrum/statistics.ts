@@ -26,8 +26,10 @@ export interface LevelStatistics {
 
 const UNKNOWN: LevelStatistics = { mean: NaN, least: NONE, greatest: NONE };
 
-function ofAll(history: SpectrumHistory, quantity: Quantity): LevelStatistics[] {
-    const { sum, count, least, greatest } = history.totals(quantity);
+function statistics(
+    history: SpectrumHistory,
+    { sum, count, least, greatest }: ReturnType<SpectrumHistory['totals']>,
+): LevelStatistics[] {
     return history.channels.map((_, column) =>
         count[column] === 0
             ? UNKNOWN
@@ -35,20 +37,23 @@ function ofAll(history: SpectrumHistory, quantity: Quantity): LevelStatistics[] 
     );
 }
 
-function ofColumn(history: SpectrumHistory, quantity: Quantity, column: number, begin: number, end: number) {
-    let sum = 0;
-    let count = 0;
-    let least = NONE;
-    let greatest = 0;
-    for (let step = begin; step < end; step++) {
-        const level = history.level(quantity, step, column);
-        if (level === NONE) continue;
-        sum += level;
-        count++;
-        if (level < least) least = level;
-        if (level > greatest) greatest = level;
-    }
-    return count === 0 ? UNKNOWN : { mean: sum / count, least, greatest };
+function ofRows(history: SpectrumHistory, quantity: Quantity, first: number, end: number): LevelStatistics[] {
+    const columns = history.channels.length;
+    const sum = new Float64Array(columns);
+    const count = new Float64Array(columns);
+    const least = new Uint8Array(columns).fill(NONE);
+    const greatest = new Uint8Array(columns);
+    history.eachRow(quantity, first, end, (levels, begin) => {
+        for (let column = 0; column < columns; column++) {
+            const level = levels[begin + column];
+            if (level === NONE) continue;
+            sum[column] += level;
+            count[column]++;
+            if (level < least[column]) least[column] = level;
+            if (level > greatest[column]) greatest[column] = level;
+        }
+    });
+    return statistics(history, { sum, count, least, greatest });
 }
 
 /** By column, for the rows of the window that ends before `end`. */
@@ -58,7 +63,6 @@ export function statisticsOf(
     length: number,
     end = history.endStep,
 ): LevelStatistics[] {
-    if (length === Infinity) return ofAll(history, quantity);
-    const begin = Math.max(history.firstStep, end - length / STEP);
-    return history.channels.map((_, column) => ofColumn(history, quantity, column, begin, end));
+    if (length === Infinity) return statistics(history, history.totals(quantity));
+    return ofRows(history, quantity, end - length / STEP, end);
 }
