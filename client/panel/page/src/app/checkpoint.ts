@@ -1,0 +1,33 @@
+import type { Service } from './service';
+import type { ServiceEvent } from './protocol';
+
+const QUESTION = 'GET_IS_CARD_IN';
+// The answer to somebody else's question looks like the answer to ours.
+const ENOUGH = 2;
+
+/**
+ * Tells when the service has certainly gone past a command that was sent before: it handles commands in order, and
+ * answers this question whatever its state.
+ */
+export class Checkpoint {
+    #answers = 0;
+
+    /** Asks behind the command. */
+    constructor(private readonly ask: () => void) {
+        ask();
+    }
+
+    static behind(service: Service): Checkpoint {
+        return new Checkpoint(() => service.ask('hotspot', QUESTION));
+    }
+
+    get isPassed(): boolean {
+        return this.#answers >= ENOUGH;
+    }
+
+    take(event: ServiceEvent): void {
+        if (this.isPassed || event.port !== 'hotspot' || !event.id.startsWith('CARD_PLUG_')) return;
+        this.#answers++;
+        if (!this.isPassed) this.ask();
+    }
+}
