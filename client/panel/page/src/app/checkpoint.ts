@@ -31,3 +31,23 @@ export class Checkpoint {
         if (!this.isPassed) this.ask();
     }
 }
+
+/** When the service has gone past all commands that were sent until now; false if it is lost first. */
+export function handled(service: Service): Promise<boolean> {
+    return new Promise((resolve) => {
+        const end = (isHandled: boolean) => {
+            stopEvents();
+            stopState();
+            resolve(isHandled);
+        };
+        const stopEvents = service.onEvent((event) => {
+            checkpoint.take(event);
+            if (checkpoint.isPassed) end(true);
+        });
+        const stopState = service.state.subscribe(() => {
+            const { link, running } = service.state.get();
+            if (link !== 'open' || running !== true) end(false);
+        });
+        const checkpoint = Checkpoint.behind(service);
+    });
+}

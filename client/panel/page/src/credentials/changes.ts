@@ -1,5 +1,4 @@
-import { Checkpoint } from '../app/checkpoint';
-import type { ServiceEvent } from '../app/protocol';
+import { handled } from '../app/checkpoint';
 import type { Service } from '../app/service';
 import type { Credential } from '../app/state';
 import { clashOf } from './form';
@@ -15,6 +14,7 @@ export interface Change {
 
 export type Result = { isDone: true } | { isDone: false; why: string };
 
+const LOST = 'The service was lost: whether the change was made is not known.';
 const UNKNOWN = 'the service refused it; its log may say why';
 
 const byId = (list: readonly Credential[], id: number) => list.find((credential) => credential.Id === id);
@@ -93,27 +93,15 @@ export function move(credential: Credential, order: number): Change {
  * Sends it and waits for what comes of it. A refusal is not told: no list up to the point where the service has gone
  * past the command shows what was wanted. Other clients' lists may come in between.
  */
-export function carryOut(service: Service, change: Change): Promise<Result> {
-    return new Promise((resolve) => {
-        const end = (result: Result) => {
-            stopEvents();
-            stopState();
-            resolve(result);
-        };
-        const look = (event: ServiceEvent) => {
-            checkpoint.take(event);
-            const { credentials } = service.state.get();
-            if (event.id === 'GET_ALL_CREDENTIAL_LIST' && credentials && change.isShown(credentials))
-                end({ isDone: true });
-            else if (checkpoint.isPassed) end({ isDone: false, why: change.whyNot(credentials ?? []) });
-        };
-        const stopEvents = service.onEvent(look);
-        const stopState = service.state.subscribe(() => {
-            const { link, running } = service.state.get();
-            if (link === 'open' && running === true) return;
-            end({ isDone: false, why: 'The service was lost: whether the change was made is not known.' });
-        });
-        service.ask('hotspot', change.command, change.data);
-        const checkpoint = Checkpoint.behind(service);
+export async function carryOut(service: Service, change: Change): Promise<Result> {
+    let isShown = false;
+    const list = () => service.state.get().credentials ?? [];
+    const stop = service.onEvent((event) => {
+        if (event.id === 'GET_ALL_CREDENTIAL_LIST') isShown ||= change.isShown(list());
     });
+    service.ask('hotspot', change.command, change.data);
+    const isHandled = await handled(service);
+    stop();
+    if (isShown) return { isDone: true };
+    return { isDone: false, why: isHandled ? change.whyNot(list()) : LOST };
 }
