@@ -5,7 +5,7 @@ import { useCanCommand, useService, useServiceState } from '../app/service';
 import type { Credential } from '../app/state';
 import { addition, carryOut, edit } from './changes';
 import { closeDialog, type OpenDialog } from './dialogs';
-import { fieldsOf, objectionsTo, wantedOf, warningOf, type Field, type Objections } from './form';
+import { fieldsOf, objectionsTo, wantedOf, type Field, type Objections } from './form';
 import { ALL_USERS, nameOf, THIS_USER, TYPE_CERTIFICATE, TYPE_USER } from './words';
 
 const LABELS: Record<Field, string> = {
@@ -156,7 +156,6 @@ export function CredentialDialog({ open: { before, form: first } }: { open: Open
     };
     const hint = (field: Field) =>
         field === 'Password' && before?.Password ? 'Empty: the stored one stays' : HINTS[field];
-    const warning = warningOf(form);
     return (
         <Frame title={before ? `Edit ${nameOf(before)}` : 'Add a credential'}>
             <form ref={shape} onSubmit={submit} noValidate>
@@ -177,7 +176,7 @@ export function CredentialDialog({ open: { before, form: first } }: { open: Open
                         field={field}
                         value={form[field]}
                         objection={objections[field]}
-                        hint={field === 'RealName' && warning ? warning : hint(field)}
+                        hint={hint(field)}
                         realms={realms}
                         onInput={(value) => change({ [field]: value })}
                     />

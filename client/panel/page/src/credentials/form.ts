@@ -95,12 +95,8 @@ export function objectionsTo(form: Credential, all: readonly Credential[], befor
         const objection = wanted[field] === '' ? MISSING[field] : textObjection(field, wanted[field]);
         if (objection) found[field] = objection;
     }
+    if (!found.RealName && realmBytes(wanted.RealName) === null)
+        found.RealName = 'holds a character beyond Latin-1: the service can compare it with no network';
     if (form.Password === HIDDEN_PASSWORD) found.Password = 'cannot be eight asterisks here: they stand for the stored one';
     return found;
-}
-
-/** What will be stored, and yet is likely a mistake. */
-export function warningOf(form: Credential): string | null {
-    const realm = form.RealName.trim();
-    return realm !== '' && realmBytes(realm) === null ? 'No network can announce a realm with these characters.' : null;
 }

@@ -67,7 +67,7 @@ function JoinButton({ network, request, canCommand }: Props) {
     return (
         <button
             type="button"
-            class="button small act"
+            class="button small"
             disabled={!canCommand || (isBusy && !isLeave) || request?.state === 'leaving'}
             aria-label={`${isLeave ? 'Leave' : 'Join'} ${printable(network.name)}`}
             onClick={() => void (isLeave ? leave : join)(service, network)}
