@@ -12,12 +12,12 @@ const list = (connected: string | null, names = ['Café', 'Gate'], at = 0): Told
     names.map((name) => ({ NetWorkName: name, IsConnected: name === connected })),
     at,
 ];
-const PASSED: Told[] = [['CARD_PLUG_IN'], ['CARD_PLUG_IN']];
+const PASSED: Told[] = [['CARD_PLUG_IN']];
 const result = (value: number): Told => ['CONNECT_DISCONNECT', value];
 const REPORT: Told = ['GET_IS_INTERNET_ACCESS', false];
 
 function outcomeOf(Kind: typeof JoinJudge | typeof LeaveJudge, events: Told[]): Outcome {
-    const judge = new Kind('Café', new Checkpoint(() => {}), () => {});
+    const judge = new Kind('Café', new Checkpoint(() => {}, 1), () => {});
     let state = INITIAL_STATE;
     let outcome: Outcome = 'open';
     for (const [EventId, data, at] of events) {

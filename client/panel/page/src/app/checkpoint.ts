@@ -3,7 +3,7 @@ import type { ServiceEvent } from './protocol';
 
 const QUESTION = 'GET_IS_CARD_IN';
 // The answer to somebody else's question looks like the answer to ours.
-const ENOUGH = 2;
+const SURE = 2;
 
 /**
  * Tells when the service has certainly gone past a command that was sent before: it handles commands in order, and
@@ -12,17 +12,20 @@ const ENOUGH = 2;
 export class Checkpoint {
     #answers = 0;
 
-    /** Asks behind the command. */
-    constructor(private readonly ask: () => void) {
+    /** Asks behind the command; `enough`: how many answers are waited for. */
+    constructor(
+        private readonly ask: () => void,
+        private readonly enough = SURE,
+    ) {
         ask();
     }
 
-    static behind(service: Service): Checkpoint {
-        return new Checkpoint(() => service.ask('hotspot', QUESTION));
+    static behind(service: Service, enough = SURE): Checkpoint {
+        return new Checkpoint(() => service.ask('hotspot', QUESTION), enough);
     }
 
     get isPassed(): boolean {
-        return this.#answers >= ENOUGH;
+        return this.#answers >= this.enough;
     }
 
     take(event: ServiceEvent): void {

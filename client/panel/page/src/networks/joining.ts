@@ -142,6 +142,7 @@ export function follow(service: Service, network: string, isJoin: boolean, limit
         const timer = setTimeout(() => end('open'), limit);
         service.ask('hotspot', isJoin ? 'CONNECT_NETWORK' : 'DISCONNECT_NETWORK', { NetWorkName: network });
         const Kind = isJoin ? JoinJudge : LeaveJudge;
-        const judge = new Kind(network, Checkpoint.behind(service), askForList);
+        // The first answer comes before an attempt can have ended, the second may come behind its end.
+        const judge = new Kind(network, Checkpoint.behind(service, 1), askForList);
     });
 }
