@@ -98,6 +98,7 @@ test('the switch turns the hotspot function, and a changed file is read again', 
     await page.locator('button[aria-pressed="true"]', { hasText: 'Off' }).waitFor();
     await status(page, 'Hotspot', 'off');
     assert.match(await machine.vexa(['networks']), /No hotspot networks/);
+    await until(async () => /Hotspot +disabled/.test(await machine.vexa(['status'])), 'the switch, written down');
     await page.getByRole('button', { name: 'On' }).click();
     await page.locator('button[aria-pressed="true"]', { hasText: 'On' }).waitFor();
     await page.getByRole('button', { name: 'Reload' }).click();

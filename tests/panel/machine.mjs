@@ -39,7 +39,10 @@ class Running {
 
     async stop() {
         this.process.kill('SIGTERM');
+        const timer = setTimeout(() => this.process.kill('SIGKILL'), PATIENCE);
         await this.ended;
+        clearTimeout(timer);
+        if (this.process.signalCode === 'SIGKILL') throw new Error(`${this.process.spawnargs[1]} did not end by itself`);
     }
 }
 

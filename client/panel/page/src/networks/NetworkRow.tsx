@@ -123,7 +123,7 @@ export class NetworkRow extends Component<Props> {
                             aria-label={`Details of ${shownName}`}
                             onClick={onToggle}
                         >
-                            {isOpen ? 'Close' : 'Details'}
+                            Details
                         </button>
                     </span>
                 </div>
