@@ -41,7 +41,8 @@ export function TabList({ tabs, current, onChoose }: Props) {
         const step = STEPS[event.key];
         if (!step || event.ctrlKey || event.altKey || event.metaKey) return;
         event.preventDefault();
-        const at = tabs.findIndex((tab) => tab.id === current);
+        // A key may come before the one before it has led to another view.
+        const at = tabs.findIndex((tab) => `tab-${tab.id}` === document.activeElement?.id);
         const next = tabs[step(at, tabs.length)];
         onChoose(next.id);
         list.current?.querySelector<HTMLElement>(`#tab-${next.id}`)?.focus();
