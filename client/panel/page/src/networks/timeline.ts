@@ -1,5 +1,8 @@
 // What the diagnostic log tells of how networks are chosen and joined.
 
+import { printable } from '../app/text';
+import { quoted } from '../credentials/words';
+
 export type Mood = 'plain' | 'good' | 'bad';
 
 export interface Step {
@@ -114,7 +117,7 @@ class Reader {
         for (const [network, look] of this.story.looks) {
             const id = this.#candidates.get(network);
             if (network !== chosen && id !== undefined && chosen !== null)
-                look.reasons.push(`${this.name(id)} fits; “${chosen}” was chosen before it.`);
+                look.reasons.push(`${this.name(id)} fits; ${quoted(chosen)} was chosen before it.`);
             else if (id === undefined && look.reasons.length === 0) look.reasons.push('No stored credential fits it.');
         }
     }
@@ -154,7 +157,7 @@ class Reader {
 
     /** Behind a result that is told to clients, and behind the end of a connection. */
     reason(text: string): void {
-        const words = text.length >= REASON_LENGTH ? `${text}…` : text;
+        const words = printable(text) + (text.length >= REASON_LENGTH ? '…' : '');
         if (this.#isDisconnected) this.#endConnection(words);
         else if (this.#open && text !== SUCCESS) this.finish(`Given up: ${words}`, 'failed');
         this.#isDisconnected = false;
