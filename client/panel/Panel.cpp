@@ -4,6 +4,7 @@
 #include <utility>
 
 #include "client/hotspot/HotspotNarrator.h"
+#include "client/machine/MachineRegistry.h"
 #include "client/port/Event.h"
 #include "client/port/JsonLine.h"
 #include "client/terminal/ClientError.h"
@@ -107,6 +108,7 @@ void Panel::forward(PageCommand command) {
 
 void Panel::send(const PageCommand& command) {
     if (command.id == contract::kFullScan) m_nextScan = Deadline::in(kScanPatience);
+    if (command.id == contract::kSetHotspotAutoConnect) m_isSwitchTurned = true;
     if (command.id == contract::kStopScan) m_nextScan = Deadline::never();
     if (!m_relay.send(command.port, serviceText(command)))
         fail("The service takes no commands: " + command.id + " was not sent.");
@@ -125,10 +127,20 @@ void Panel::takeFromService(RecordedPort port, const std::string& message) {
     const auto event = envelope ? eventOf(*envelope) : std::nullopt;
     if (!event) return;
     if (port == RecordedPort::Hotspot) m_passwords.take(*event);
+    if (event->id == contract::kSetHotspotAutoConnect) keepSwitch(*event);
     if (port == RecordedPort::Spectral && m_nextScan < Deadline::never())
         m_nextScan = Deadline::in(kScanPatience);
     if (!m_pages.empty()) tellAll(pageMessage(port, std::move(*envelope)));
     record([&] { m_recorder.add(port, message); });
+}
+
+// The service reads the switch when it starts, and leaves it to those who turn it to write it down.
+void Panel::keepSwitch(const Event& event) {
+    const Json::Value isOn = payloadOf(event);
+    if (!std::exchange(m_isSwitchTurned, false) || !isOn.isBool()) return;
+    const auto machine = m_relay.machine();
+    if (!machine || !writeHotspotSwitch(*machine, isOn.asBool()))
+        fail("The switch was turned, but it cannot be written down for the next start.");
 }
 
 void Panel::serviceChanged(bool isRunning) {

@@ -57,6 +57,7 @@ private:
     void ask(RecordedPort port, const char* question);
     void askForRecording();
     void stopScan();
+    void keepSwitch(const Event& event);
 
     void tellAll(std::string text);
     void tellAll(const char* event, Json::Value members) { tellAll(panelMessage(event, std::move(members))); }
@@ -72,6 +73,8 @@ private:
     const PanelRecordings& m_recordings;
     PanelRecorder m_recorder;
     PanelPasswords m_passwords;
+    /// A page turns the hotspot switch; the service will tell that it has.
+    bool m_isSwitchTurned = false;
     PanelLog m_log;
     std::set<std::shared_ptr<PanelPage>> m_pages;
     boost::asio::steady_timer m_tick;

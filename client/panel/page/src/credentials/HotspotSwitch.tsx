@@ -9,6 +9,8 @@ const WORDS: [boolean, string][] = [
 export function HotspotSwitch() {
     const service = useService();
     const canCommand = useCanCommand();
+    // Without one the service answers, and turns nothing.
+    const hasAdapter = useServiceState((state) => state.adapter === true);
     const isOn = useServiceState((state) => state.hotspot);
     return (
         <div class="bar" role="group" aria-label="Hotspot networks" title="Off ends a connection to a hotspot">
@@ -22,7 +24,7 @@ export function HotspotSwitch() {
                         type="button"
                         class="button"
                         aria-pressed={isOn === value}
-                        disabled={!canCommand}
+                        disabled={!canCommand || !hasAdapter}
                         onClick={() => service.ask('hotspot', 'SET_HOTSPOT_AUTO_CONNECT', value)}
                     >
                         {word}

@@ -98,7 +98,7 @@ export class NetworkRow extends Component<Props> {
         const shownName = printable(network.name);
         return (
             <>
-                <div class={`grid-row ${network.isConnected ? 'connected' : ''}`} role="row">
+                <div class={`grid-row ${network.isConnected ? 'is-connected' : ''}`} role="row">
                     <span role="rowheader" class="name">
                         {shownName}
                     </span>
