@@ -108,3 +108,14 @@ test('what a change came to is read from the list that answers', async () => {
         else assert.deepEqual(result, { isDone: true }, name);
     }
 });
+
+test('a change of a service that is away, or goes on the way, is not known to be made', async () => {
+    const service = new Service(() => {});
+    const change = deletion(user(1));
+    assert.match(String(Object.values(await carryOut(service, change))), /lost/);
+    service.takeLink('open');
+    service.takePanelMessage({ event: 'service', running: true });
+    const result = carryOut(service, change);
+    service.takePanelMessage({ event: 'service', running: false });
+    assert.match(String(Object.values(await result)), /lost/);
+});

@@ -35,8 +35,14 @@ export class Checkpoint {
     }
 }
 
+export function isUp(service: Service): boolean {
+    const { link, running } = service.state.get();
+    return link === 'open' && running === true;
+}
+
 /** When the service has gone past all commands that were sent until now; false if it is lost first. */
 export function handled(service: Service): Promise<boolean> {
+    if (!isUp(service)) return Promise.resolve(false);
     return new Promise((resolve) => {
         const end = (isHandled: boolean) => {
             stopEvents();
@@ -48,8 +54,7 @@ export function handled(service: Service): Promise<boolean> {
             if (checkpoint.isPassed) end(true);
         });
         const stopState = service.state.subscribe(() => {
-            const { link, running } = service.state.get();
-            if (link !== 'open' || running !== true) end(false);
+            if (!isUp(service)) end(false);
         });
         const checkpoint = Checkpoint.behind(service);
     });

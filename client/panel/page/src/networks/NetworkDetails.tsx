@@ -1,4 +1,4 @@
-import { useServiceState } from '../app/service';
+import { useService, useServiceState } from '../app/service';
 import type { Credential, Network } from '../app/state';
 import { openAddition } from '../credentials/dialogs';
 import { METHOD_TLS } from '../credentials/matching';
@@ -48,8 +48,10 @@ function AttemptPart({ attempt }: { attempt: Attempt }) {
 }
 
 function Attempts({ network, story }: Props) {
+    const { isLive } = useService();
     const isOn = useServiceState((state) => state.log.on);
     const attempts = story?.attempts.filter((attempt) => attempt.network === network.name) ?? [];
+    if (!isLive) return <p class="muted">A recording has no log, and only it knows how an attempt went.</p>;
     if (!isOn && attempts.length === 0)
         return (
             <p class="muted">

@@ -1,4 +1,4 @@
-import { Checkpoint } from '../app/checkpoint';
+import { Checkpoint, isUp } from '../app/checkpoint';
 import type { ServiceEvent } from '../app/protocol';
 import type { Service } from '../app/service';
 import type { Network } from '../app/state';
@@ -134,8 +134,7 @@ export function follow(service: Service, network: string, isJoin: boolean, limit
             if (outcome !== 'open') end(outcome);
         });
         const stopState = service.state.subscribe(() => {
-            const { link, running } = service.state.get();
-            if (link !== 'open' || running !== true) end(null);
+            if (!isUp(service)) end(null);
         });
         // Some outcomes are told by nothing but the list.
         const asking = setInterval(askForList, 1000);
