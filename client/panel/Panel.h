@@ -11,10 +11,10 @@
 
 #include "client/panel/PanelLog.h"
 #include "client/panel/PanelMessages.h"
-#include "client/panel/PanelPage.h"
 #include "client/panel/PanelPasswords.h"
 #include "client/panel/PanelRecorder.h"
 #include "client/panel/PanelRelay.h"
+#include "client/panel/web/PanelPage.h"
 #include "client/terminal/Deadline.h"
 
 namespace vexa::client {

@@ -5,7 +5,7 @@
 #include <memory>
 #include <string>
 
-#include "client/panel/PanelRecordings.h"
+#include "client/panel/web/PanelRecordings.h"
 #include "client/record/RecordingWriter.h"
 
 namespace vexa::client {

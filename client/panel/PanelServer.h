@@ -8,10 +8,10 @@
 #include <memory>
 
 #include "client/panel/Panel.h"
-#include "client/panel/PanelAnswers.h"
-#include "client/panel/PanelDoor.h"
-#include "client/panel/PanelRecordings.h"
-#include "client/panel/PanelSession.h"
+#include "client/panel/web/PanelAnswers.h"
+#include "client/panel/web/PanelDoor.h"
+#include "client/panel/web/PanelRecordings.h"
+#include "client/panel/web/PanelSession.h"
 
 namespace vexa::client {
 

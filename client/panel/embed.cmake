@@ -1,5 +1,5 @@
 # Writes the files of the page as a source: cmake -DBUNDLE=FOLDER -DOUTPUT=FILE -P embed.cmake
-set(source "#include \"client/panel/PanelFiles.h\"\n\nnamespace vexa::client {\n\nnamespace {\n")
+set(source "#include \"client/panel/web/PanelFiles.h\"\n\nnamespace vexa::client {\n\nnamespace {\n")
 foreach(name html css js)
     set(file_html index.html)
     set(file_css panel.css)

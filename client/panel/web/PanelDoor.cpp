@@ -1,4 +1,4 @@
-#include "client/panel/PanelDoor.h"
+#include "client/panel/web/PanelDoor.h"
 
 #include <algorithm>
 #include <array>

@@ -1,4 +1,4 @@
-#include "client/panel/PanelAnswers.h"
+#include "client/panel/web/PanelAnswers.h"
 
 #include <boost/beast/core/file_base.hpp>
 #include <boost/beast/http/field.hpp>

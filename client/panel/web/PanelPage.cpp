@@ -1,4 +1,4 @@
-#include "client/panel/PanelPage.h"
+#include "client/panel/web/PanelPage.h"
 
 #include <boost/asio/ip/tcp.hpp>
 #include <chrono>

@@ -1,4 +1,4 @@
-#include "client/panel/PanelRecordings.h"
+#include "client/panel/web/PanelRecordings.h"
 
 #include <algorithm>
 #include <ctime>

@@ -7,7 +7,7 @@
 #include <string>
 #include <string_view>
 
-#include "client/panel/PanelHttp.h"
+#include "client/panel/web/PanelHttp.h"
 
 namespace vexa::client {
 

@@ -1,4 +1,4 @@
-#include "client/panel/PanelSession.h"
+#include "client/panel/web/PanelSession.h"
 
 #include <boost/asio/buffer.hpp>
 #include <boost/asio/ip/tcp.hpp>
@@ -7,7 +7,7 @@
 #include <chrono>
 #include <utility>
 
-#include "client/panel/PanelFiles.h"
+#include "client/panel/web/PanelFiles.h"
 
 namespace vexa::client {
 

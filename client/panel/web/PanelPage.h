@@ -10,8 +10,8 @@
 #include <string>
 #include <string_view>
 
-#include "client/panel/PanelAnswers.h"
-#include "client/panel/PanelHttp.h"
+#include "client/panel/web/PanelAnswers.h"
+#include "client/panel/web/PanelHttp.h"
 
 namespace vexa::client {
 

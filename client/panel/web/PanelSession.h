@@ -9,9 +9,9 @@
 #include <optional>
 #include <string_view>
 
-#include "client/panel/PanelAnswers.h"
-#include "client/panel/PanelDoor.h"
-#include "client/panel/PanelRecordings.h"
+#include "client/panel/web/PanelAnswers.h"
+#include "client/panel/web/PanelDoor.h"
+#include "client/panel/web/PanelRecordings.h"
 
 namespace vexa::client {
 

@@ -1,4 +1,4 @@
-#include "client/panel/PanelFiles.h"
+#include "client/panel/web/PanelFiles.h"
 
 #include <algorithm>
 #include <array>
