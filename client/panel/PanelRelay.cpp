@@ -9,7 +9,7 @@ namespace vexa::client {
 
 namespace {
 
-constexpr std::chrono::milliseconds kBetweenLooks{300};
+constexpr std::chrono::milliseconds kBetweenTries{300};
 
 }  // namespace
 
@@ -59,7 +59,7 @@ void PanelRelay::lost() {
 }
 
 void PanelRelay::openLater() {
-    m_pause.expires_after(kBetweenLooks);
+    m_pause.expires_after(kBetweenTries);
     m_pause.async_wait([this](boost::system::error_code cancelled) {
         if (!cancelled) open();
     });

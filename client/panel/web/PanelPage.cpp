@@ -16,8 +16,8 @@ using beast::error_code;
 namespace {
 
 // What a page says is short. It gets a whole log at its start, and some lists.
-constexpr std::size_t kMostMessage = std::size_t{1} << 20;
-constexpr std::size_t kMostWaiting = std::size_t{8} << 20;
+constexpr std::size_t kMostFromPage = std::size_t{1} << 20;
+constexpr std::size_t kMostForPage = std::size_t{8} << 20;
 
 // A page that is in no window any more answers nothing.
 constexpr websocket::stream_base::timeout kTimeouts{std::chrono::seconds(10), std::chrono::seconds(30), true};
@@ -36,7 +36,7 @@ void PanelPage::open(const PanelRequest& request, const PanelAnswers& answers) {
         answers.addHeaders(response);
         response.set(http::field::server, "vexa");  // else it tells of libraries
     }));
-    m_stream.read_message_max(kMostMessage);
+    m_stream.read_message_max(kMostFromPage);
     m_stream.text(true);
     m_stream.async_accept(request, [self = shared_from_this()](error_code error) {
         if (error) return;
@@ -61,7 +61,7 @@ void PanelPage::send(Text text) {
     m_waitingBytes += text->size();
     m_waiting.push_back(std::move(text));
     if (m_waiting.size() == 1) return write();
-    m_isTooSlow = m_waitingBytes - m_waiting.front()->size() > kMostWaiting;
+    m_isTooSlow = m_waitingBytes - m_waiting.front()->size() > kMostForPage;
     if (m_isTooSlow) beast::get_lowest_layer(m_stream).close();
 }
 
