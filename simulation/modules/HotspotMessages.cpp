@@ -29,26 +29,23 @@ void appendByte(Bytes& out, std::size_t value) {
     out.push_back(static_cast<std::uint8_t>(value));
 }
 
-// One NAI Realm Data entry: its methods come without authentication parameters.
-Bytes realmData(const NetworkRealm& realm) {
+// One NAI Realm Data entry behind its length: its methods come without authentication parameters.
+void appendRealmData(Bytes& list, const NetworkRealm& realm) {
     const std::string names = joinedNames(realm);
-    Bytes data = {0};  // the encoding: names as in a network access identifier
-    appendByte(data, names.size());
-    data.insert(data.end(), names.begin(), names.end());
-    appendByte(data, realm.eapMethods.size());
+    appendU16(list, 3 + names.size() + 3 * realm.eapMethods.size());
+    appendByte(list, 0);  // the encoding: names as in a network access identifier
+    appendByte(list, names.size());
+    list.insert(list.end(), names.begin(), names.end());
+    appendByte(list, realm.eapMethods.size());
     for (const std::uint8_t method : realm.eapMethods)
-        data.insert(data.end(), {2, method, 0});
-    return data;
+        list.insert(list.end(), {2, method, 0});
 }
 
 Bytes realmList(const std::vector<NetworkRealm>& realms) {
     Bytes list;
     appendU16(list, realms.size());
-    for (const NetworkRealm& realm : realms) {
-        const Bytes data = realmData(realm);
-        appendU16(list, data.size());
-        list.insert(list.end(), data.begin(), data.end());
-    }
+    for (const NetworkRealm& realm : realms)
+        appendRealmData(list, realm);
     return list;
 }
 

@@ -29,22 +29,40 @@ std::string timestamp() {
     return text;
 }
 
+// What is not data.
+constexpr std::size_t kUsualSize = 200;
+
+void appendEnd(std::string& event, std::string_view eventId, std::string_view source) {
+    event += "   \"EventId\" : ";
+    appendQuoted(event, eventId);
+    event += ",\n   \"Source\" : ";
+    appendQuoted(event, source);
+    event += ",\n   \"Timestamp\" : ";
+    appendQuoted(event, timestamp());
+    event += "\n}\n";
+}
+
 }  // namespace
 
 std::string buildEnvelope(std::string_view eventId, std::string_view source,
                           const std::optional<std::string_view>& data) {
+    if (data)
+        return buildEnvelope(eventId, source, data->size() * 5 / 4,
+                             [&](std::string& event) { appendQuoted(event, *data); });
+    std::string event = "{\n";
+    appendEnd(event, eventId, source);
+    return event;
+}
+
+std::string buildEnvelope(std::string_view eventId, std::string_view source, std::size_t usualSize,
+                          const std::function<void(std::string&)>& appendData) {
     std::string event;
-    event.reserve(data.value_or("").size() * 5 / 4 + 200);
-    event += "{";
-    const auto member = [&event](std::string_view name, std::string_view value) {
-        event.append(event.size() == 1 ? "\n   " : ",\n   ").append(name).append(" : ");
-        appendQuoted(event, value);
-    };
-    if (data) member("\"Data\"", *data);
-    member("\"EventId\"", eventId);
-    member("\"Source\"", source);
-    member("\"Timestamp\"", timestamp());
-    return event += "\n}\n";
+    event.reserve(usualSize + kUsualSize);
+    event += "{\n   \"Data\" : ";
+    appendData(event);
+    event += ",\n";
+    appendEnd(event, eventId, source);
+    return event;
 }
 
 }  // namespace vexa

@@ -165,6 +165,7 @@ void IpcSession::onOwner(bool isOurs) {
 // One who is let in misses nothing that is sent once he has the answer. Behind a goodbye nothing may follow.
 void IpcSession::protocolWrites(std::string bytes) {
     const auto text = std::make_shared<const std::string>(std::move(bytes));
+    if (isCloseFrame(*text)) m_events.leaves();
     if (m_hasSaidGoodbye) return;
     if (isPongFrame(*text)) {
         m_connection->queuePong(text);
@@ -246,6 +247,7 @@ void IpcSession::leave() {
 
 // Who has answered our goodbye has read it; nobody else can be known to have read ours.
 void IpcSession::ended(error_code ec) {
+    m_events.leaves();
     leave();
     const bool isEndOfProtocol = ec.category() == error_code(websocket::error::closed).category();
     if (!isEndOfProtocol || (m_isDropped && m_connection->isAllWritten())) return m_connection->reset();

@@ -23,6 +23,8 @@ public:
     public:
         /// The answer that lets him in goes out: from now on he gets all that is sent.
         virtual void entered(std::shared_ptr<IpcSession> session) = 0;
+        /// He ends it, or breaks the protocol: what is queued is still to be sent to him.
+        virtual void leaves() = 0;
         /// From now on he gets nothing more, although his connection may still be there. Also for one who was
         /// never in, and more than once.
         virtual void left(ClientId client) = 0;

@@ -40,6 +40,11 @@ constexpr std::uint16_t kGoingAway = 1001;
 constexpr std::chrono::milliseconds kFarewellLimit{500};
 constexpr std::chrono::milliseconds kBeginningPause{10};
 
+// What is queued in a rush of messages is gathered for so long, and so much of it: one write for many
+// answers.
+constexpr std::chrono::milliseconds kGatheringTime{1};
+constexpr std::size_t kMostGathered = std::size_t{64} << 10;
+
 }  // namespace
 
 /// What the server and its clients share. All but the atomics, the outbox and the inbox is touched on the
@@ -72,6 +77,7 @@ private:
     };
 
     void entered(std::shared_ptr<IpcSession> session) override;
+    void leaves() override { flushOutbox(); }
     void left(ClientId client) override;
     void received(std::shared_ptr<IpcSession> session, std::string message) override;
     bool isHandlerSlow() const override { return m_standby.isHelping(); }
@@ -79,6 +85,8 @@ private:
     void run();
     void beginAnew();
     void flushOutbox();
+    void flushUnlessGathering();
+    void lookForRush();
     void dispatch();
     void passOn(const Handled& handled);
     Handled handleFirst();
@@ -93,11 +101,14 @@ private:
     asio::steady_timer m_farewell{m_inout};
     IpcEntrance m_entrance{m_inout, *this, [this] { m_io.stop(); }};
     std::map<ClientId, std::shared_ptr<IpcSession>> m_clients;
+    bool m_isRush = false;  // a message waited when another had been handled
 
     std::atomic<std::size_t> m_clientCount{0};
     std::atomic<bool> m_isStopped{false};
     std::mutex m_outboxMutex;
     std::vector<Outgoing> m_outbox;
+    std::size_t m_outboxBytes = 0;
+    std::chrono::steady_clock::time_point m_outboxSince;  // when the first of it came
     bool m_isFlushPosted = false;
     std::mutex m_inboxMutex;
     std::deque<Incoming> m_inbox;  // in front the message that is being handled
@@ -145,13 +156,15 @@ void IpcWebSocketServer::Impl::left(ClientId client) {
     m_clientCount = m_clients.size();
 }
 
-// What a handler sends is written when it returns, by its own thread, or by the standby once the handler is
-// slow. Posted, not deferred: who sends may go on for long.
+// What a handler sends is written when it has returned, by its own thread, or by the standby once the handler
+// is slow. Posted, not deferred: who sends may go on for long.
 void IpcWebSocketServer::Impl::queue(ClientId client, std::string_view message) {
     Outgoing outgoing{client, std::make_shared<const std::string>(textFrame(message))};
     {
         const std::lock_guard lock(m_outboxMutex);
+        if (m_outbox.empty()) m_outboxSince = std::chrono::steady_clock::now();
         m_outbox.push_back(std::move(outgoing));
+        m_outboxBytes += m_outbox.back().frame->size();
         const bool isByHandler = m_handlerThread == std::this_thread::get_id() && !m_standby.isHelping();
         if (isByHandler || std::exchange(m_isFlushPosted, true)) return;
     }
@@ -165,6 +178,7 @@ void IpcWebSocketServer::Impl::flushOutbox() {
     {
         const std::lock_guard lock(m_outboxMutex);
         outgoing.swap(m_outbox);
+        m_outboxBytes = 0;
         m_isFlushPosted = false;
     }
     if (outgoing.empty()) return;
@@ -175,6 +189,25 @@ void IpcWebSocketServer::Impl::flushOutbox() {
             if (client == 0 || client == session->id()) session->send(frame);
         session->flush();
     }
+}
+
+void IpcWebSocketServer::Impl::flushUnlessGathering() {
+    bool isGathering = m_isRush;
+    if (isGathering) {
+        const std::lock_guard lock(m_outboxMutex);
+        isGathering = m_outboxBytes < kMostGathered &&
+                      std::chrono::steady_clock::now() - m_outboxSince < kGatheringTime;
+    }
+    if (!isGathering) flushOutbox();
+}
+
+// The client's next message has been read meanwhile, if it was there.
+void IpcWebSocketServer::Impl::lookForRush() {
+    {
+        const std::lock_guard lock(m_inboxMutex);
+        m_isRush = !m_inbox.empty();
+    }
+    flushUnlessGathering();
 }
 
 // The clock of a simulated machine must not run past a message that nobody has handled yet; the whole backlog
@@ -199,12 +232,13 @@ void IpcWebSocketServer::Impl::dispatch() {
     }
 }
 
-// What was queued for sending meanwhile, by whomever, is written before the next message is handled, and
-// before the client's next one is read.
+// What was queued for sending meanwhile, by whomever, is written before the client's next message is read; in
+// a rush, when no further one waits.
 void IpcWebSocketServer::Impl::passOn(const Handled& handled) {
     const bool isPassedOn = withinMemory([&] {
-        flushOutbox();
+        flushUnlessGathering();
         handled.session->messageHandled(handled.size);
+        asio::post(m_inout, [this] { lookForRush(); });
         if (!handled.isLast) asio::post(m_io, [this] { dispatch(); });
     });
     if (isPassedOn) return;

@@ -15,7 +15,8 @@ namespace vexa {
 /// without an `Origin`; everyone else gets HTTP 403, or a reset in a crowd.
 ///
 /// One thread runs the input and output of all clients and the handler, so that an answer need not wait for
-/// another thread to wake up. Between two messages that are handled, what is queued for sending is written.
+/// another thread to wake up. What a handler queues for sending waits for that of the messages behind it, for
+/// a millisecond at most, and is written with it; what others queue, between two messages that are handled.
 /// While a handler is slow, a second thread runs the input and output: it takes over within some 2 ms. So
 /// neither a slow handler nor a run of quick ones holds up the writing of queued messages or the reading of
 /// others.

@@ -7,6 +7,7 @@
 
 #include <json/writer.h>
 
+#include <algorithm>
 #include <array>
 #include <cstddef>
 #include <utility>
@@ -172,6 +173,19 @@ void appendQuoted(std::string& out, std::string_view text) {
     }
     out.append(text, written);
     out += '"';
+}
+
+void appendQuotedTwice(std::string& out, std::string_view text) {
+    const auto isPlain = [](char c) { return kEscapes[static_cast<unsigned char>(c)] == kPlain; };
+    if (std::all_of(text.begin(), text.end(), isPlain)) {
+        out.append(R"(\")").append(text).append(R"(\")");
+        return;
+    }
+    std::string once;
+    appendQuoted(once, text);
+    std::string twice;
+    appendQuoted(twice, once);
+    out.append(twice, 1, twice.size() - 2);
 }
 
 }  // namespace vexa

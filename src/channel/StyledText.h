@@ -14,4 +14,7 @@ std::string toStyledText(const Json::Value& value);
 /// Appends `text` as JSON shows a string: in quotes, and all but ASCII escaped.
 void appendQuoted(std::string& out, std::string_view text);
 
+/// The same as it stands within a string: in JSON that is a text of other JSON.
+void appendQuotedTwice(std::string& out, std::string_view text);
+
 }  // namespace vexa

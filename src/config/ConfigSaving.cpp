@@ -188,18 +188,22 @@ void Config::rememberFile(const std::string& content) {
 
 void Config::rememberSaved(const std::string& text, const Frame& frame, bool isKnownFile,
                            const std::vector<Written>& all) {
-    std::unordered_set<std::int32_t> ids;
+    std::vector<std::int32_t> ids;
     ids.reserve(all.size());
     for (const Written& one : all)
-        if (!frame.foreignIds.contains(one.credential->m_id)) ids.insert(one.credential->m_id);
-    const bool areIdsPlain = frame.isWhole() && ids.size() == all.size();
+        if (!frame.foreignIds.contains(one.credential->m_id)) ids.push_back(one.credential->m_id);
+    std::sort(ids.begin(), ids.end());
+    const bool areIdsPlain = frame.isWhole() && ids.size() == all.size() &&
+                             std::adjacent_find(ids.begin(), ids.end()) == ids.end();
     const bool isReadAnew = !isKnownFile || !areIdsPlain;
     if (isReadAnew) rememberFile(text);
     if (!areIdsPlain) return;
     for (const Written& one : all)
         rememberWritten(one, text, isReadAnew);
     if (m_known.size() > ids.size())
-        std::erase_if(m_known, [&](const auto& known) { return !ids.contains(known.first); });
+        std::erase_if(m_known, [&](const auto& known) {
+            return !std::binary_search(ids.begin(), ids.end(), known.first);
+        });
 }
 
 void Config::rememberWritten(const Written& written, const std::string& text, bool isReadAnew) {

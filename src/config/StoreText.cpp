@@ -122,10 +122,9 @@ void appendUserText(std::string& text, const std::wstring& userName,
     appendElement(text, "username", userName);
     text.append("<credentials>");
     for (const Credential* credential : credentials) {
-        text.append("<credential>");
-        appendElement(text, "id", credential->m_id);
-        appendElement(text, "priority", credential->m_priority);
-        text.append("</credential>");
+        text.append("<credential><id>").append(std::to_string(credential->m_id));
+        text.append("</id><priority>").append(std::to_string(credential->m_priority));
+        text.append("</priority></credential>");
     }
     text.append("</credentials></user>");
 }

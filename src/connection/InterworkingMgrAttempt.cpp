@@ -18,6 +18,12 @@ std::string narrow(const std::wstring& text) {
     return narrowFromWide(text);
 }
 
+void logCandidate(const Credential& credential) {
+    if (!DiagnosticLog::isEnabled()) return;
+    Log(3, "\tChecking credential with id=%d name=%s, realm=%s, priority=%d", credential.m_id,
+        narrow(credential.m_credName).c_str(), narrow(credential.m_realm).c_str(), credential.m_priority);
+}
+
 void logChoice(const NetworkChoice& best, const NetworkChoice& next) {
     if (best.network == nullptr)
         Log(3, "\tSelecting credential with id=%d name=%s and bss with ssid=%s", next.credential->m_id,
@@ -39,9 +45,7 @@ Credential* InterworkingMgr::selectCredential(const Hs20Network& network,
     Log(3, "\tChecking found credentials...");
     const CredentialTable& credentials = m_engine.m_config.credentials();
     for (Credential* credential : found) {
-        Log(3, "\tChecking credential with id=%d name=%s, realm=%s, priority=%d", credential->m_id,
-            narrow(credential->m_credName).c_str(), narrow(credential->m_realm).c_str(),
-            credential->m_priority);
+        logCandidate(*credential);
         if (!credential->m_bAutoConnect) {
             Log(3, "Credential is not configured as auto-connect, skipping...");
             continue;

@@ -28,19 +28,6 @@ bool isPair(std::int32_t credId, std::string_view ssid) {
     return credId >= 1 && !ssid.empty();
 }
 
-template <class Entry>
-bool isEntryOf(const Entry& entry, std::int32_t credId, std::string_view ssid) {
-    return entry.credId == credId && entry.ssid == textOf(ssid);
-}
-
-// Null if the pair has no entry.
-template <class Entries>
-auto* entryOf(Entries& entries, std::int32_t credId, std::string_view ssid) {
-    const auto found = std::find_if(entries.begin(), entries.end(),
-                                    [&](const auto& entry) { return isEntryOf(entry, credId, ssid); });
-    return found == entries.end() ? nullptr : &*found;
-}
-
 }  // namespace
 
 bool NetworkRetryHelper::isRetryAllowed(const CredentialTable& credentials, std::int32_t credId,
@@ -53,28 +40,38 @@ bool NetworkRetryHelper::isRetryAllowed(const CredentialTable& credentials, std:
     return getNumRetries(credId, ssid) < limitOf(*credential);
 }
 
+// Null if the pair has none.
+NetworkRetryHelper::Entry* NetworkRetryHelper::entryOf(std::int32_t credId, std::string_view ssid) {
+    const auto entries = m_cred2ssid.find(credId);
+    if (entries == m_cred2ssid.end()) return nullptr;
+    const auto entry = entries->second.find(textOf(ssid));
+    return entry == entries->second.end() ? nullptr : &entry->second;
+}
+
 std::uint32_t NetworkRetryHelper::getNumRetries(std::int32_t credId, std::string_view ssid) const {
-    const auto* const entry = entryOf(m_cred2ssid, credId, ssid);
-    return entry == nullptr ? 0 : entry->numRetries;
+    const auto entries = m_cred2ssid.find(credId);
+    if (entries == m_cred2ssid.end()) return 0;
+    const auto entry = entries->second.find(textOf(ssid));
+    return entry == entries->second.end() ? 0 : entry->second.numRetries;
 }
 
 void NetworkRetryHelper::setNumRetries(std::int32_t credId, std::string_view ssid, std::uint32_t count) {
     if (!isPair(credId, ssid)) return;
-    if (auto* const entry = entryOf(m_cred2ssid, credId, ssid)) {
+    if (Entry* const entry = entryOf(credId, ssid)) {
         entry->numRetries = count;
         return;
     }
-    const std::string text(textOf(ssid));
+    std::string text(textOf(ssid));
     Log(3, "Not found cred2ssid entry: credId=%d, ssid=%s, adding a new entry with numRetries=0", credId,
         text.c_str());
-    m_cred2ssid.push_back({credId, text, count});
+    m_cred2ssid[credId].emplace(std::move(text), Entry{count, ++m_lastNumber});
 }
 
 void NetworkRetryHelper::increaseNumRetries(std::int32_t credId, std::string_view ssid) {
     const std::string text(textOf(ssid));
     Log(3, "Increase retry numbers for cred id=%d, ssid=%s", credId, text.c_str());
     if (!isPair(credId, ssid)) return;
-    if (auto* const entry = entryOf(m_cred2ssid, credId, ssid)) {
+    if (Entry* const entry = entryOf(credId, ssid)) {
         Log(3, "\tIncrease cred2ssid num retries: credId=%d, ssid=%s, numRetries=%d\n", credId, text.c_str(),
             static_cast<int>(entry->numRetries));
         ++entry->numRetries;
@@ -85,24 +82,29 @@ void NetworkRetryHelper::increaseNumRetries(std::int32_t credId, std::string_vie
 }
 
 void NetworkRetryHelper::removeNumRetryEntries(std::int32_t credId, std::string_view ssid) {
-    if (!isPair(credId, ssid)) return;
-    std::erase_if(m_cred2ssid, [&](const Cred2SsidEntry& entry) { return isEntryOf(entry, credId, ssid); });
+    const auto entries = m_cred2ssid.find(credId);
+    if (!isPair(credId, ssid) || entries == m_cred2ssid.end()) return;
+    const auto entry = entries->second.find(textOf(ssid));
+    if (entry != entries->second.end()) entries->second.erase(entry);
 }
 
 void NetworkRetryHelper::removeAllCredNumRetryEntries(std::int32_t credId) {
     Log(3, "removeAllCredNumRetryEntries for CredId=%d", credId);
-    std::erase_if(m_cred2ssid, [credId](const Cred2SsidEntry& entry) { return entry.credId == credId; });
+    m_cred2ssid.erase(credId);
 }
 
 void NetworkRetryHelper::resetNumRetries(std::int32_t credId) {
-    for (Cred2SsidEntry& entry : m_cred2ssid)
-        if (entry.credId == credId) entry.numRetries = 0;
+    const auto entries = m_cred2ssid.find(credId);
+    if (entries == m_cred2ssid.end()) return;
+    for (auto& [ssid, entry] : entries->second)
+        entry.numRetries = 0;
 }
 
 void NetworkRetryHelper::resetAllNumRetries() {
     Log(3, "Enter resetAllNumRetries.");
-    for (Cred2SsidEntry& entry : m_cred2ssid)
-        entry.numRetries = 0;
+    for (auto& [credId, entries] : m_cred2ssid)
+        for (auto& [ssid, entry] : entries)
+            entry.numRetries = 0;
 }
 
 // Names are compared as everywhere: it is enough that one begins with what is looked for. In order, all of
@@ -111,13 +113,18 @@ void NetworkRetryHelper::eraseUnavailableNetworks(const Hs20NetworkList& network
     std::set<std::string_view> names;
     for (const Hs20Network* network : networks.copyPointers())
         names.emplace(network->m_ssid.data(), network->m_ssid.size());
-    std::erase_if(m_cred2ssid, [&](const Cred2SsidEntry& entry) {
-        const auto next = names.lower_bound(entry.ssid);
-        if (!entry.ssid.empty() && next != names.end() && next->starts_with(entry.ssid)) return false;
+    std::map<std::uint64_t, std::string> gone;
+    for (auto& [credId, entries] : m_cred2ssid)
+        std::erase_if(entries, [&](const auto& item) {
+            const auto& [ssid, entry] = item;
+            const auto next = names.lower_bound(ssid);
+            if (!ssid.empty() && next != names.end() && next->starts_with(ssid)) return false;
+            gone.emplace(entry.number, ssid);
+            return true;
+        });
+    for (const auto& [number, ssid] : gone)
         Log(3, "BSS with ssid=%s is no longer available, erase the corresponding retry history",
-            entry.ssid.c_str());
-        return true;
-    });
+            ssid.c_str());
 }
 
 }  // namespace vexa

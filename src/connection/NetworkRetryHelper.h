@@ -1,9 +1,11 @@
 #pragma once
 
 #include <cstdint>
+#include <functional>
+#include <map>
 #include <string>
 #include <string_view>
-#include <vector>
+#include <unordered_map>
 
 #include "base/NetworkListLock.h"
 
@@ -33,12 +35,16 @@ public:
     void resetAllNumRetries() REQUIRES(g_hs20Lock);
 
 private:
-    struct Cred2SsidEntry {
-        std::int32_t credId;
-        std::string ssid;
+    struct Entry {
         std::uint32_t numRetries;
+        std::uint64_t number;  // counts the entries, in the order in which they were made
     };
-    std::vector<Cred2SsidEntry> m_cred2ssid GUARDED_BY(g_hs20Lock);
+    using EntriesBySsid = std::map<std::string, Entry, std::less<>>;
+
+    Entry* entryOf(std::int32_t credId, std::string_view ssid) REQUIRES(g_hs20Lock);
+
+    std::unordered_map<std::int32_t, EntriesBySsid> m_cred2ssid GUARDED_BY(g_hs20Lock);
+    std::uint64_t m_lastNumber GUARDED_BY(g_hs20Lock) = 0;
 };
 
 }  // namespace vexa

@@ -68,6 +68,9 @@ CredentialMatcher::CredentialMatcher(const CredentialTable& table) {
         auto realm = credential->m_realm.empty() ? std::nullopt : contract::realmBytes(credential->m_realm);
         if (realm) m_candidates.push_back({credential, std::move(*realm)});
     }
+    std::stable_sort(m_candidates.begin(), m_candidates.end(), [](const Candidate& a, const Candidate& b) {
+        return a.credential->m_priority < b.credential->m_priority;
+    });
     for (std::size_t i = 0; i < m_candidates.size(); ++i)
         m_byRealm[m_candidates[i].realm].push_back(i);
 }
@@ -85,11 +88,6 @@ std::vector<Credential*> CredentialMatcher::findCredentialsForNetwork(const Hs20
     std::vector<Credential*> found;
     for (std::size_t candidate = 0; isAnyFitting && candidate < m_candidates.size(); ++candidate)
         if (isFitting[candidate]) found.push_back(m_candidates[candidate].credential);
-    const auto isBefore = [](const Credential* a, const Credential* b) {
-        return a->m_priority < b->m_priority;
-    };
-    if (!std::is_sorted(found.begin(), found.end(), isBefore))
-        std::stable_sort(found.begin(), found.end(), isBefore);
     return found;
 }
 

@@ -28,7 +28,7 @@ private:
         Credential* credential;
         std::string realm;
     };
-    std::vector<Candidate> m_candidates;  // in the order of the table
+    std::vector<Candidate> m_candidates;  // in the order in which they are found
     std::unordered_map<std::string_view, std::vector<std::size_t>> m_byRealm;
 };
 

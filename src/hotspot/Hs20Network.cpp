@@ -1,6 +1,7 @@
 #include "hotspot/Hs20Network.h"
 
 #include <algorithm>
+#include <cstring>
 #include <new>
 #include <utility>
 
@@ -46,14 +47,15 @@ void Hs20Network::parseRealmList() try {
 }
 
 void Hs20Network::takeRealmList(Bytes data) {
-    const bool isKnown = std::equal(data.begin(), data.end(), m_anqpNaiRealm.begin(), m_anqpNaiRealm.end());
+    const bool isKnown = data.size() == m_anqpNaiRealm.size() &&
+                         std::memcmp(data.data(), m_anqpNaiRealm.data(), data.size()) == 0;
     if (isKnown && m_isParsed && !DiagnosticLog::isEnabled()) return;
     m_isParsed = false;
     m_anqpNaiRealm.assign(data.begin(), data.end());
     parseRealmList();
 }
 
-void Hs20Network::takeRealmsOfAll(std::vector<RealmInfo> realms) {
+void Hs20Network::takeRealmsOfAll(RealmList realms) {
     m_isParsed = false;
     m_realms = std::move(realms);
 }

@@ -8,7 +8,7 @@
 
 #include "base/NetworkListLock.h"
 #include "hotspot/IhvMessages.h"
-#include "hotspot/NaiRealmParser.h"
+#include "hotspot/RealmList.h"
 #include "platform/WlanApi.h"
 
 namespace vexa {
@@ -39,7 +39,7 @@ public:
     /// Stores the data and parses it. What is known already is only parsed to be told to the log.
     void takeRealmList(Bytes data) REQUIRES(g_hs20Lock);
     /// Those of all networks that share the SSID.
-    void takeRealmsOfAll(std::vector<RealmInfo> realms) REQUIRES(g_hs20Lock);
+    void takeRealmsOfAll(RealmList realms) REQUIRES(g_hs20Lock);
 
     bool m_bHs20;
     MacAddress m_macAddress;
@@ -47,7 +47,7 @@ public:
     std::array<char, kMaxSsidLength> m_ssid{};
     std::uint32_t m_networkType;
     std::uint32_t m_internetAccess;
-    std::vector<RealmInfo> m_realms;
+    RealmList m_realms;
     ByteBuffer m_anqpNaiRealm;
 
     // Read by the matching of credentials; nothing fills them yet.

@@ -1,7 +1,7 @@
 #include "hotspot/IhvMessages.h"
 
 #include <algorithm>
-#include <cstdio>
+#include <string_view>
 
 namespace vexa {
 
@@ -28,9 +28,12 @@ std::vector<std::byte> message(IhvRequest subtype, std::size_t size, std::size_t
 }  // namespace
 
 std::string toText(const MacAddress& mac) {
-    char text[18];
-    std::snprintf(text, sizeof text, "%02x:%02x:%02x:%02x:%02x:%02x", mac[0], mac[1], mac[2], mac[3], mac[4],
-                  mac[5]);
+    constexpr std::string_view kDigits = "0123456789abcdef";
+    std::string text;
+    for (const std::uint8_t octet : mac) {
+        if (!text.empty()) text += ':';
+        text.append({kDigits[octet >> 4], kDigits[octet & 15]});
+    }
     return text;
 }
 

@@ -130,9 +130,8 @@ bool parseNaiRealm(NaiRealm& realm, Reader& reader) {
     }
     const Bytes name = entry.take(realmLength);
     LogBytes(2, "\tNAI Realm=", name.data(), static_cast<std::int64_t>(name.size()), true);
-    const auto end = std::find(name.begin(), name.end(), std::byte{0});
-    realm.realm.assign(reinterpret_cast<const char*>(name.data()),
-                       static_cast<std::size_t>(end - name.begin()));
+    realm.realm = {reinterpret_cast<const char*>(name.data()), name.size()};
+    realm.realm = realm.realm.substr(0, realm.realm.find('\0'));
     return parseMethods(realm, entry);
 }
 

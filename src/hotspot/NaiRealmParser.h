@@ -3,6 +3,7 @@
 #include <cstdint>
 #include <optional>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "text/LittleEndian.h"
@@ -21,7 +22,7 @@ struct NaiRealmEap {
 /// One NAI Realm Data entry of an ANQP NAI Realm list.
 struct NaiRealm {
     std::uint8_t encoding = 0;
-    std::string realm;  ///< One or more names, separated by ";".
+    std::string_view realm;  ///< One or more names, separated by ";".
     std::vector<NaiRealmEap> eap;
 };
 
@@ -36,7 +37,8 @@ struct RealmInfo {
 };
 
 /// Takes an ANQP NAI Realm list apart (IEEE 802.11u). Nothing if it is empty, or bad at any place: one bad
-/// entry loses the whole list. No read goes beyond the bytes, whatever they claim.
+/// entry loses the whole list. No read goes beyond the bytes, whatever they claim. What it gives points into
+/// them.
 std::optional<std::vector<NaiRealm>> parseNaiRealmList(Bytes list);
 
 /// One entry for each name of each realm and each of its methods, as many as a network keeps; methods other

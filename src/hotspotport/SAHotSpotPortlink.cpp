@@ -49,7 +49,10 @@ void SAHotSpotPortlink::updateCardState() {
 }
 
 bool SAHotSpotPortlink::SendData(const std::string& data, const std::string& eventId) {
-    const std::string text = buildEnvelope(eventId, contract::kHotspotSource, data);
+    return SendEvent(buildEnvelope(eventId, contract::kHotspotSource, data));
+}
+
+bool SAHotSpotPortlink::SendEvent(const std::string& text) {
     const IpcHandle ipc = m_hIpc;
     if (ipc == 0) {
         Log(6, "ERROR: IPC handle is NULL in SAHotSpotPortlink::SendData.");

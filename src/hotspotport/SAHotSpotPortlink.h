@@ -41,6 +41,8 @@ public:
 
     /// Sends one event to all clients; true if one took it. A message that could not be sent is lost.
     bool SendData(const std::string& data, const std::string& eventId);
+    /// The same of one that is whole already.
+    bool SendEvent(const std::string& text);
     void SendRadioState();
     /// Tells the card state as it was last asked for.
     void SendCardState();

@@ -3,6 +3,7 @@
 
 #include "base/DiagnosticLog.h"
 #include "base/NetworkListLock.h"
+#include "channel/Envelope.h"
 #include "channel/StyledText.h"
 #include "connection/Supplicant.h"
 #include "contract/Ports.h"
@@ -23,43 +24,53 @@ int internetAccessCode(const Supplicant& supplicant, const Hs20Network& network,
     return supplicant.hasInternetAccess() ? kNoWarning : kConnectedWithoutAccess;
 }
 
-// What they take in the list, with names of usual length.
-constexpr std::size_t kNetworkTextSize = 256;
-constexpr std::size_t kRealmTextSize = 128;
+// What they take in the event, with names of usual length.
+constexpr std::size_t kNetworkTextSize = 320;
+constexpr std::size_t kRealmTextSize = 160;
 
-// A list can have some 50,000 realms, each of which would be a dozen allocations as a Json::Value: it is
-// written straight away, in the styled form.
-void appendRealms(std::string& json, const Hs20Network& network) {
-    const char* before = "[\n";
+// A list can have some 50,000 realms, each of which would be a dozen allocations as a Json::Value, and the
+// list is a text within the event. So it is written as it stands there: styled, and already quoted.
+void appendRealms(std::string& event, const Hs20Network& network) {
+    const char* before = R"([\n)";
     for (const RealmInfo& realm : network.m_realms) {
-        json += std::exchange(before, ",\n");
-        json += "         {\n            \"CredentialEapMethod\" : ";
-        json += std::to_string(realm.m_eapType);
-        json += ",\n            \"RealmName\" : ";
-        appendQuoted(json, realm.m_realm);
-        json += "\n         }";
+        event += std::exchange(before, R"(,\n)");
+        event += R"(         {\n            \"CredentialEapMethod\" : )";
+        event += std::to_string(realm.m_eapType);
+        event += R"(,\n            \"RealmName\" : )";
+        appendQuotedTwice(event, realm.m_realm);
+        event += R"(\n         })";
     }
-    json += "\n      ]";
+    event += R"(\n      ])";
 }
 
-void appendNetwork(std::string& json, const Supplicant& supplicant, const Hs20Network& network,
+void appendNetwork(std::string& event, const Supplicant& supplicant, const Hs20Network& network,
                    bool isConnected) {
     const auto asText = [](bool flag) { return flag ? "true" : "false"; };
-    json += "   {\n      \"IsConnected\" : ";
-    json += asText(isConnected);
-    json += ",\n      \"IsInternetAccess\" : ";
-    json += std::to_string(internetAccessCode(supplicant, network, isConnected));
-    json += ",\n      \"NetWorkName\" : ";
-    appendQuoted(json, shownName(network.ssidText()));
-    json += ",\n      \"NetworkType\" : ";
-    json += std::to_string(network.m_networkType);
-    json += ",\n      \"RealmFetched\" : ";
-    json += asText(network.hasRealmData());
+    event += R"(   {\n      \"IsConnected\" : )";
+    event += asText(isConnected);
+    event += R"(,\n      \"IsInternetAccess\" : )";
+    event += std::to_string(internetAccessCode(supplicant, network, isConnected));
+    event += R"(,\n      \"NetWorkName\" : )";
+    appendQuotedTwice(event, shownName(network.ssidText()));
+    event += R"(,\n      \"NetworkType\" : )";
+    event += std::to_string(network.m_networkType);
+    event += R"(,\n      \"RealmFetched\" : )";
+    event += asText(network.hasRealmData());
     if (network.hasRealmData() && !network.m_realms.empty()) {
-        json += ",\n      \"SupportRealmList\" : ";
-        appendRealms(json, network);
+        event += R"(,\n      \"SupportRealmList\" : )";
+        appendRealms(event, network);
     }
-    json += "\n   }";
+    event += R"(\n   })";
+}
+
+void appendNetworks(std::string& event, const Supplicant& supplicant,
+                    const std::vector<Hs20Network*>& networks, const Hs20Network* connected) {
+    const char* before = R"("[\n)";
+    for (const Hs20Network* network : networks) {
+        event += std::exchange(before, R"(,\n)");
+        appendNetwork(event, supplicant, *network, network == connected);
+    }
+    event += networks.empty() ? R"("null\n")" : R"(\n]\n")";
 }
 
 std::size_t usualSize(const std::vector<Hs20Network*>& networks) {
@@ -81,16 +92,13 @@ void SAHotSpotPortlink::SendNetworkList(Supplicant* supplicant) {
     const bool isEnabled = supplicant->isHs20Enabled();
     const Hs20Network* const connected = supplicant->getConnectedBss(false);
     if (!listed) return;
-    std::string text;
-    text.reserve(usualSize(listed->networks().copyPointers()));
-    if (supplicant->isRadioOnCached() && isEnabled)
-        for (const Hs20Network* network : listed->networks().copyPointers()) {
-            text += text.empty() ? "[\n" : ",\n";
-            appendNetwork(text, *supplicant, *network, network == connected);
-        }
-    text += text.empty() ? "null\n" : "\n]\n";
-    Log(0, "GET_ALL_NETWORK_LIST=%s", text.c_str());
-    SendData(text, contract::kGetAllNetworkList);
+    std::vector<Hs20Network*> shown;
+    if (supplicant->isRadioOnCached() && isEnabled) shown = listed->networks().copyPointers();
+    const std::string event =
+        buildEnvelope(contract::kGetAllNetworkList, contract::kHotspotSource, usualSize(shown),
+                      [&](std::string& text) { appendNetworks(text, *supplicant, shown, connected); });
+    Log(0, "GET_ALL_NETWORK_LIST=%s", event.c_str());
+    SendEvent(event);
 }
 
 }  // namespace vexa

@@ -1,6 +1,7 @@
 #include "text/TextConversion.h"
 
 #include <algorithm>
+#include <iterator>
 #include <limits>
 #include <type_traits>
 
@@ -114,6 +115,7 @@ std::wstring cutToUtf16Units(std::wstring_view text, std::size_t units) {
 
 std::u16string utf16FromWide(std::wstring_view text) {
     std::u16string units;
+    units.reserve(text.size());
     for (std::size_t i = 0; i < text.size(); ++i)
         appendUtf16(units, unitAt(text, i));
     return units;
@@ -137,8 +139,11 @@ std::wstring wideFromNarrow(std::string_view text) {
 NarrowText narrowByLocale(std::wstring_view text) {
     const auto end = std::find_if(text.begin(), text.end(),
                                   [](wchar_t unit) { return static_cast<std::uint32_t>(unit) > 0xFF; });
-    const auto length = static_cast<std::size_t>(end - text.begin());
-    return {narrowFromWide(text.substr(0, length)), length == text.size()};
+    std::string narrow;
+    narrow.reserve(text.size());
+    std::transform(text.begin(), end, std::back_inserter(narrow),
+                   [](wchar_t unit) { return static_cast<char>(unit); });
+    return {std::move(narrow), end == text.end()};
 }
 
 std::int32_t leadingInteger(std::wstring_view text) {

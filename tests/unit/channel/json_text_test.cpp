@@ -23,6 +23,19 @@ TEST(JsonText, AMemberThatIsTrueOrFalseReadsAsTheText) {
     EXPECT_EQ(readText(object, "no"), "false");
 }
 
+TEST(StyledText, QuotedTwiceIsAStringWithinAString) {
+    for (const char* text :
+         {"", "a.example", "\"a\\b\"\n\t/", "\xC3\xA9 \xE2\x82\xAC \xF0\x9F\x98\x80", "\x01\xFF"}) {
+        std::string once;
+        appendQuoted(once, text);
+        std::string twice = "before";
+        appendQuoted(twice, once);
+        std::string written = "before\"";
+        appendQuotedTwice(written, text);
+        EXPECT_EQ(written + '"', twice);
+    }
+}
+
 TEST(StyledText, IsToTheByteWhatTheLibraryWrites) {
     std::vector<Json::Value> values;
     for (const char* text :

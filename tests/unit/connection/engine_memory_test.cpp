@@ -183,13 +183,19 @@ TEST_F(EngineMemory, RetriesAreCountedForEachPairAloneAndToldTheLog) {
 }
 
 TEST_F(EngineMemory, RetriesEndWithTheirNetworkUnlessALongerNameBeginsLikeIt) {
-    for (const char* ssid : {"cafe", "hotel", "bar"})
-        m_retries.setNumRetries(1, ssid, 2);
+    for (const std::int32_t id : {2, 1})
+        for (const char* ssid : {"cafe", "hotel", "bar", "airport"})
+            m_retries.setNumRetries(id, ssid, 2);
     inRange({"cafeteria", "bar"});
     LogCapture log;
     m_retries.eraseUnavailableNetworks(m_networks);
-    EXPECT_EQ(log.text(),
-              "BSS with ssid=hotel is no longer available, erase the corresponding retry history\n");
+    std::string wanted;
+    for (const char* ssid : {"hotel", "airport", "hotel", "airport"})
+        wanted += std::string("BSS with ssid=") + ssid +
+                  " is no longer available, erase the corresponding retry history\n";
+    EXPECT_EQ(log.text(), wanted);
+    EXPECT_EQ(m_retries.getNumRetries(1, "hotel"), 0U);
+    EXPECT_EQ(m_retries.getNumRetries(2, "cafe"), 2U);
 }
 
 }  // namespace

@@ -73,13 +73,16 @@ TEST(NetworkList, OfOneNameTheFirstKnownNetworkStaysOrElseTheFirst) {
 TEST(NetworkList, ManyAccessPointsOfOneNameHaveNoMoreRealmsThanOne) {
     Hs20NetworkList list;
     list.replace({bss(1, "x"), bss(2, "x"), bss(3, "x")});
-    for (Hs20Network* network : list.copyPointers())
+    for (Hs20Network* network : list.copyPointers()) {
+        std::vector<RealmInfo> realms;
         for (int i = 0; i < 100; ++i)
-            network->m_realms.push_back({1, std::to_string(network->m_macAddress[5] * 100 + i)});
+            realms.push_back({1, std::to_string(network->m_macAddress[5] * 100 + i)});
+        network->m_realms = std::move(realms);
+    }
     LogCapture log;
     list.processDuplicatedHs20Networks({});
     EXPECT_EQ(list.copyPointers()[0]->m_realms.size(), 256U);
-    EXPECT_EQ(list.copyPointers()[0]->m_realms.back(), (RealmInfo{1, "355"}));
+    EXPECT_EQ(*std::prev(list.copyPointers()[0]->m_realms.end()), (RealmInfo{1, "355"}));
     EXPECT_NE(log.text().find("\tMacAddress=02:00:00:00:00:03\n"
                               "\tThis network announces too many realms, only the first 256 are kept.\n"
                               "This network with index=0"),

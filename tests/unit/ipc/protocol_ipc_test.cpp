@@ -143,6 +143,59 @@ TEST(Ipc, ManyMessagesInOneRushAreHandledInOrderAndNoneIsLost) {
     sending.get();
 }
 
+// The first answer goes at once, the second with those that are ready within a millisecond: of most rushes
+// few, whatever else the processor has to do.
+TEST(Ipc, AnAnswerWaitsForThoseOfCommandsBehindItButNotLong) {
+    constexpr int kCount = 200;
+    std::string commands;
+    for (int i = 0; i < kCount; ++i)
+        commands += std::string("\x81\x80\0\0\0\0", 6);
+    std::atomic<int> handled{0};
+    std::promise<IpcWebSocketServer*> ipc;
+    const Server server([&, future = ipc.get_future().share()](ClientId client, std::string_view) {
+        for (const auto end = Clock::now() + std::chrono::microseconds(500); Clock::now() < end;) {
+        }
+        ++handled;
+        future.get()->sendTo(client, "");
+    });
+    ipc.set_value(server.ipc.get());
+    RawClient client(server.port);
+    client.send(handshakeRequest("localhost"));
+    client.receiveHead();
+    int quickRushes = 0;
+    for (int rush = 0; rush < 7; ++rush) {
+        handled = 0;
+        client.send(commands);
+        ASSERT_EQ(client.receive(4), std::string("\x81\0\x81\0", 4));
+        if (handled < kCount / 10) ++quickRushes;
+        ASSERT_EQ(client.receive(2 * kCount - 4).size(), std::size_t{2 * kCount - 4});
+    }
+    EXPECT_GT(quickRushes, 2);
+}
+
+// But for a thread that happens to stand still for some milliseconds.
+TEST(Ipc, WhoLeavesRightBehindHisCommandsStillGetsTheirAnswers) {
+    const std::string commands("\x81\x81\0\0\0\0a\x81\x81\0\0\0\0b\x81\x81\0\0\0\0c", 21);
+    const std::string answers = "\x81\1a\x81\1b\x81\1c";
+    const std::string goodbye("\x88\x80\0\0\0\0", 6);
+    EchoServer echo;
+    int heard = 0;
+    for (int i = 0; i < 10; ++i) {
+        RawClient polite(echo.port);
+        RawClient curt(echo.port);
+        for (RawClient* client : {&polite, &curt}) {
+            client->send(handshakeRequest("localhost"));
+            client->receiveHead();
+        }
+        polite.send(commands + goodbye);
+        if (polite.receiveToEnd() == answers + "\x88\2\3\xE8") ++heard;
+        curt.send(commands);
+        curt.endSending();
+        if (curt.receiveToEnd() == answers) ++heard;
+    }
+    EXPECT_GT(heard, 15);
+}
+
 TEST(Ipc, AClientThatOnlyEndsItsHalfIsLetGo) {
     EchoServer echo;
     RawClient client(echo.port);
