@@ -37,7 +37,8 @@ public:
             throw ClientError("the service on port " + std::to_string(port) + " lets us not in");
         }
         if (error)
-            throw ClientError("no service answers on port " + std::to_string(port) + ": " + error.message());
+            throw ClientError("no service answers on port " + std::to_string(port) + ": " + error.message() +
+                              "; `vexa start` starts one");
         m_open = true;
         m_stream.read_message_max(kMaxMessage);
         m_stream.text(true);

@@ -19,6 +19,9 @@ namespace {
 
 constexpr milliseconds kBetweenDrawings{100};
 
+// How things stand, and the names of the columns.
+constexpr std::size_t kHeadingRows = 2;
+
 std::string secondsSince(steady_clock::time_point start) {
     std::ostringstream out;
     out << std::fixed << std::setprecision(2) << std::setw(7)
@@ -85,7 +88,7 @@ Deadline SpectrumOutput::refresh(const SpectralView& view) {
     if (!m_nextDrawing.isOver()) return m_nextDrawing;
     auto lines = picture(view);
     lines.front() += "   (q or Ctrl-C ends)";
-    m_screen->draw(lines);
+    m_screen->draw(std::move(lines), m_note.empty() ? kHeadingRows : kHeadingRows + 1);
     m_changed = false;
     m_nextDrawing = Deadline::in(kBetweenDrawings);
     return Deadline::never();

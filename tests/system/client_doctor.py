@@ -66,8 +66,12 @@ class Doctor(CredentialStory):
                 self.wait_shut(names, *words)
         self.done("connect", "Café")
         self.assertIn("Nothing is in the way of a connection.\n", self.done("doctor"))
-        self.machine.stop()
-        self.wait_shut("service", "no service")
+        for command, state in (("enable", "fine"), ("disable", "inTheWay")):
+            self.done(command)
+            self.machine.stop()
+            result, gates = self.found()
+            self.assertEqual((gates["switch"]["state"], "no service" in gates["service"]["seen"]), (state, True))
+            self.start(folder=self.machine.folder, **self.scenario)
 
     def test_what_only_the_log_knows_is_not_known_without_it(self):
         self.machine.stop()

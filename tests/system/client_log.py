@@ -9,7 +9,7 @@ import signal
 import time
 import unicodedata
 
-from harness import STORE, Story, run_client, wait_until
+from harness import STORE, Story, program, run_client, wait_until
 
 LINE = re.compile(r"\[\d+\] \d\d/\d\d \d\d:\d\d:\d\d  ")
 TEXT = r'"(?:[^"\\]|\\.)*"'
@@ -106,6 +106,18 @@ class OfFiles(Story):
         self.write("a.txt", "\none\ntwo\n")
         self.assertEqual(self.lines("-n", "2"), ["one", "two"])
         self.assertLess(resource.getrusage(resource.RUSAGE_CHILDREN).ru_maxrss, 1 << 18, "KiB, as much as it holds")
+
+    def test_a_long_log_is_not_kept_in_memory(self):
+        self.set_config("true")
+        for _ in range(1 << 7):
+            self.write("a.txt", entry(1, "x" * 1000) * (1 << 10))
+        self.write("a.txt", entry(2, "y"))
+        for options in (["--grep", "y"], ["--grep", "x", "-n", "1"], ["--level", "6"], []):
+            log = os.posix_spawn(program("vexa"), ["vexa", "log", *options, "--machine", self.folder], os.environ, file_actions=[
+                (os.POSIX_SPAWN_OPEN, 1, "/dev/null", os.O_WRONLY, 0)])  # fmt: skip
+            _, status, usage = os.wait4(log, 0)
+            self.assertEqual(status, 0)
+            self.assertLess(usage.ru_maxrss, 1 << 16, "KiB, half of what it holds")
 
     def test_bytes_of_any_kind_become_text(self):
         self.set_config("true")
