@@ -21,6 +21,7 @@ namespace vexa::client {
 namespace {
 
 constexpr std::chrono::milliseconds kBetweenLooks{200};
+constexpr int kMostLines = 1000000000;
 
 struct LogOptions {
     std::string machine;
@@ -118,7 +119,7 @@ void addLogCommand(CLI::App& app, int& exitCode) {
         command->add_option("--machine", options->machine, "Folder of the machine")->type_name("DIR");
     CLI::Option* lines =
         command->add_option("-n,--lines", options->lines, "The last lines alone; default: all");
-    lines->type_name("LINES")->check(CLI::NonNegativeNumber);
+    lines->type_name("LINES")->check(CLI::Range(0, kMostLines));
     command->add_flag("-f,--follow", options->follow, "Go on with what is written, until Ctrl-C");
     options->wish.addTo(*command);
     options->output.addTo(*command, {{{"file", "File"}, {"line", "Line"}}}, "Print JSON, an object a line");

@@ -41,9 +41,15 @@ SpectrumOutput::SpectrumOutput(Form form, const SideShow* side)
     : m_form(form), m_side(side), m_start(steady_clock::now()) {
     if (form == Form::Readable && TerminalScreen::isUsable()) {
         m_screen.emplace();
-    } else if (m_side != nullptr) {
-        printLines(m_side->opening(form == Form::Json));
+        return;
     }
+    if (TerminalKeys::isUsable()) m_keys.emplace();
+    if (m_side != nullptr) printLines(m_side->opening(form == Form::Json));
+}
+
+TerminalMode* SpectrumOutput::terminal() {
+    if (m_screen) return &*m_screen;
+    return m_keys ? &*m_keys : nullptr;
 }
 
 void SpectrumOutput::show(const std::vector<SpectralScan::Told>& told, const SpectralView& view) {
@@ -95,6 +101,7 @@ Deadline SpectrumOutput::refresh(const SpectralView& view) {
 }
 
 void SpectrumOutput::finish(const SpectralView& view) {
+    m_keys.reset();
     if (m_screen) {
         const auto lines = picture(view);
         m_screen.reset();

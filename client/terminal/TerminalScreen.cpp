@@ -115,10 +115,12 @@ void TerminalScreen::paint() {
     rows.insert(rows.end(), m_lines.begin() + static_cast<std::ptrdiff_t>(part.first),
                 m_lines.begin() + static_cast<std::ptrdiff_t>(part.last));
     if (rows.size() < m_lines.size()) rows.push_back(hiddenRows(part));
+    // Behind a row that fills its line the cursor still stands on the last character.
     std::string frame = kHome;
     for (std::size_t i = 0; i < rows.size(); ++i)
-        frame += (i > 0 ? "\r\n" : "") + rows[i] + kClearLine;
-    std::cout << frame << kClearBelow << std::flush;
+        frame +=
+            (i > 0 ? "\r\n" : "") + std::string(i + 1 < rows.size() ? kClearLine : kClearBelow) + rows[i];
+    std::cout << frame << std::flush;
     m_needsDrawing = false;
 }
 

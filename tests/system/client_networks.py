@@ -85,7 +85,7 @@ class Looking(NetworkStory):
             terminal = self.terminal(*command, columns=99, rows=4, LC_ALL=locale)
             terminal.read_until(rb"(?s)3 networks .*Airport Free.*2 below; arrows, ")
             terminal.resize(28, 6)
-            terminal.read_until(f"(?s)Airport Free +no +[a-z]*{re.escape(rest)}\x1b.*Later".encode())
+            terminal.read_until(f"(?s)Airport Free +no +[a-z]*{re.escape(rest)}\r.*Later".encode())
             self.hide(NETWORKS[1]["bssid"])
             terminal.read_until(b"2 networks")
             terminal.press(b"q")
@@ -96,7 +96,7 @@ class Looking(NetworkStory):
     def test_keys_move_what_does_not_fit_below_the_heading(self):
         terminal = self.terminal("networks", "--watch", "--machine", self.machine.folder, columns=99, rows=4)
         terminal.read_until(b"2 below; arrows, PageUp")
-        first, second, third = "Airport Free .*K\\s+2 below; ", "Café .*K\\s+1 above, 1 below; ", "Later .*K\\s+2 above; "
+        first, second, third = "Airport Free .*\\x1b\\[J2 below; ", "Café .*\\x1b\\[J1 above, 1 below; ", "Later .*\\x1b\\[J2 above; "
         for key, shown in (
             ("[B", second), ("[1;5B", third), ("OB", third), ("[A", second), ("OA", first), ("[A", first),
             ("[F", third), ("[H", first), ("OF", third), ("OH", first), ("[4~", third), ("[1~", first),
@@ -104,7 +104,7 @@ class Looking(NetworkStory):
         ):  # fmt: skip
             terminal.screen = b""
             terminal.press(b"\x1b" + key.encode())
-            terminal.read_until(rf"(?s)\x1b\[H3 networks [^\n]*\n   Network [^\n]*\n...{shown}".encode())
+            terminal.read_until(rf"(?s)\x1b\[H\x1b\[K3 networks [^\n]*\n\x1b\[K   Network [^\n]*\n\x1b\[K...{shown}".encode())
         terminal.press(b"q")
         self.assertEqual(terminal.finish(), 0)
 
