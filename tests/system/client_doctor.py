@@ -79,6 +79,8 @@ class Doctor(CredentialStory):
         _, gates = self.found()
         unknown = [gate for gate in GATES if "set enabledump to true" in gates[gate]["seen"]]
         self.assertEqual(unknown, ["session", "retries", "blocked", "outcome"])
+        lines = self.vexa("doctor").stdout.splitlines()
+        self.assertEqual([sum(text in line for line in lines) for text in ("set enabledump", "see session")], [1, 3])
         _, gates = self.found("--hs20-port", self.machine.hs20_port, VEXA_MACHINE="/nonexistent")
         self.assertEqual(gates["switch"]["state"], "notKnown")
         self.assertIn("no service runs", run_client("doctor", VEXA_MACHINE=self.new_folder()).stdout)

@@ -105,6 +105,7 @@ class OfFiles(Story):
         os.truncate(self.folder / STORE / "Dump" / "a.txt", 1 << 28)
         self.write("a.txt", "\none\ntwo\n")
         self.assertEqual(self.lines("-n", "2"), ["one", "two"])
+        self.assertIn("not in range 0 to 1000000000", self.refused(2, "log", "-n", "-1"))
         self.assertLess(resource.getrusage(resource.RUSAGE_CHILDREN).ru_maxrss, 1 << 18, "KiB, as much as it holds")
 
     def test_a_long_log_is_not_kept_in_memory(self):

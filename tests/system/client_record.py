@@ -116,6 +116,10 @@ class Statistics(Story):
         self.assertEqual(interference.split(), ["6", "interference", "10", *["60"] * 5, "100", "%"])
         _, first, _ = self.stats("--csv", "--above", "80").splitlines()
         self.assertEqual(first, "6,congestion,10,20,44,20,80,80,0")
+        for share, p95 in ((4, 20), (6, 80)):
+            late = sample(11000 - 100 * share, "CONGESTION", congestion_value=80)
+            _, first, _ = self.stats("--csv", lines=[*WRITTEN[:4], late, WRITTEN[-1]]).splitlines()
+            self.assertEqual(first.split(",")[6], str(p95), f"above for {share} % of the time")
         (told,) = json.loads(self.stats("--json"))["channels"]
         self.assertEqual((told["channel"], told["congestion"]["mean"], told["interference"]["p95"]), (6, 44, 60))
 
