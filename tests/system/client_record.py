@@ -1,7 +1,9 @@
 """`vexa record`, and what is made of a recording: statistics, a replay, a scenario."""
 
 import json
+import os
 import signal
+import subprocess
 import zlib
 
 from client_credentials import CredentialStory
@@ -98,6 +100,13 @@ class Recording(RecordStory):
         printed = self.vexa("record", "-", "--for", "1s", "--passive")
         self.assertTrue(all(map(json.loads, printed.stdout.splitlines())))
         self.assertRegex(printed.stderr, r"\ARecorded \d+ events in 1")
+        pipe = self.new_folder() / "pipe"
+        os.mkfifo(pipe)
+        pipe.chmod(0o640)
+        with subprocess.Popen(["cat", pipe], stdout=subprocess.PIPE) as reader:
+            self.done("record", pipe, "--for", "1s", "--passive")
+            self.assertGreater(len(reader.stdout.readlines()), 2)
+        self.assertEqual(pipe.stat().st_mode & 0o777, 0o640, "what is no file keeps its rights")
         recorder = self.record("b.rec")
         self.wait_events(LIST)
         self.machine.stop()
