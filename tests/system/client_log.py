@@ -195,6 +195,10 @@ class OfFiles(Story):
         then = time.localtime(time.time() - 2 * 3600)
         for since in ("90m", "2h", time.strftime("%H:%M", then), time.strftime("%Y-%m-%d %H:%M", then)):
             self.assertEqual(self.lines("--since", since), [*one, *three, *two], since)
+        yesterday = time.strftime("%H:%M", time.localtime(time.time() + 600))
+        self.assertEqual(self.lines("--since", yesterday)[0], old[:-1])
+        self.write("b.txt", entry(8, "of last year", -2 * 24 * 3600))
+        self.assertNotIn("of last year", str(self.lines("--since", "1h")))
         self.assertEqual(self.lines("--grep", "one"), [*old.splitlines(), *one])
         self.assertEqual(self.lines("--grep", "one", "--since", "1h"), one)
         self.assertEqual(self.lines("--level", "3", "--grep", "new", "-n", "2"), three + two)
