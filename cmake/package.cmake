@@ -14,17 +14,15 @@ add_custom_target(vexa_package_notes
     VERBATIM)
 
 # Completion scripts and manual pages, these compressed, as they lie below /usr/share.
-if(TARGET vexa_shell_files)
-    add_custom_target(vexa_package_share
-        COMMAND ${CMAKE_COMMAND} -E rm -rf ${notes}/share
-        COMMAND ${CMAKE_COMMAND} -E copy_directory ${CMAKE_BINARY_DIR}/share ${notes}/share
-        COMMAND gzip -9nr ${notes}/share/man
-        VERBATIM)
-    add_dependencies(vexa_package_share vexa_shell_files)
-    add_dependencies(vexa_package_notes vexa_package_share)
-    # PowerShell has no folder of its own for them here.
-    install(DIRECTORY ${notes}/share/ DESTINATION ${CMAKE_INSTALL_DATADIR} PATTERN vexa.ps1 EXCLUDE)
-endif()
+add_custom_target(vexa_package_share
+    COMMAND ${CMAKE_COMMAND} -E rm -rf ${notes}/share
+    COMMAND ${CMAKE_COMMAND} -E copy_directory ${CMAKE_BINARY_DIR}/share ${notes}/share
+    COMMAND gzip -9nr ${notes}/share/man
+    VERBATIM)
+add_dependencies(vexa_package_share vexa_shell_files)
+add_dependencies(vexa_package_notes vexa_package_share)
+# PowerShell has no folder of its own for them here.
+install(DIRECTORY ${notes}/share/ DESTINATION ${CMAKE_INSTALL_DATADIR} PATTERN vexa.ps1 EXCLUDE)
 
 install(TARGETS vexa RUNTIME DESTINATION ${CMAKE_INSTALL_BINDIR})
 install(TARGETS vexa-service RUNTIME DESTINATION ${CMAKE_INSTALL_LIBEXECDIR}/vexa)

@@ -5,6 +5,7 @@
 #include "client/command/HotspotOptions.h"
 #include "client/command/Output.h"
 #include "client/doctor/Diagnosis.h"
+#include "client/hotspot/HotspotQuestions.h"
 #include "client/terminal/ClientError.h"
 
 namespace vexa::client {
@@ -21,6 +22,7 @@ Observations observed(const HotspotOptions& options) {
         Observations seen;
         seen.serviceTrouble = error.what();
         seen.whyNoLog = "the service was not asked";
+        seen.isHotspotOn = hotspotSwitch(options.port.machine());
         return seen;
     }
     return observe(port, signals, options.limit(), options.port.machine());
@@ -30,7 +32,9 @@ int runDoctor(const HotspotOptions& options) {
     const auto findings = diagnose(observed(options));
     auto lines = diagnosisLines(findings);
     const std::string names = namesInTheWay(findings);
-    if (names.empty()) lines.emplace_back("Nothing is in the way of a connection.");
+    if (names.empty())
+        lines.emplace_back(isAllKnown(findings) ? "Nothing is in the way of a connection."
+                                                : "Nothing that is known is in the way of a connection.");
     print(options, diagnosisJson(findings), lines);
     if (!names.empty()) throw ClientError("in the way of a connection: " + names);
     return kExitOk;

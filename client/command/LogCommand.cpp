@@ -1,5 +1,7 @@
 #include <CLI/CLI.hpp>
+#include <deque>
 #include <iostream>
+#include <iterator>
 #include <memory>
 
 #include "client/command/Commands.h"
@@ -19,6 +21,7 @@ namespace vexa::client {
 namespace {
 
 constexpr std::chrono::milliseconds kBetweenLooks{200};
+constexpr int kMostLines = 1000000000;
 
 struct LogOptions {
     std::string machine;
@@ -35,20 +38,51 @@ std::string shown(const LogFiles::Line& line, const OutputOptions& options) {
     return printable(line.text, Tabs::Kept);
 }
 
-void print(std::vector<LogFiles::Line> lines, std::size_t from, const LogOptions& options) {
-    for (std::size_t i = from; i < lines.size(); ++i) {
-        LogFiles::Line& line = lines[i];
-        if (options.redact) line.text = withoutPassword(std::move(line.text));
-        std::cout << shown(line, options.output) << '\n';
-    }
-    std::cout << std::flush;
-}
+/// What goes out of the log: all of it at once, or its end alone.
+class Outlet {
+public:
+    Outlet(const LogOptions& options, bool isLimited) : m_options(options), m_isLimited(isLimited) {}
 
-void follow(LogFiles& files, LogFilter& filter, const LogOptions& options) {
+    void take(LogFilter::Lines lines) {
+        for (LogFiles::Line& line : lines) {
+            if (!m_isLimited)
+                print(std::move(line));
+            else
+                keep(std::move(line));
+        }
+    }
+
+    /// What was kept of the end; from now on everything goes out.
+    void open() {
+        m_isLimited = false;
+        take({std::make_move_iterator(m_kept.begin()), std::make_move_iterator(m_kept.end())});
+        m_kept.clear();
+        std::cout << std::flush;
+    }
+
+private:
+    void keep(LogFiles::Line line) {
+        m_kept.push_back(std::move(line));
+        if (m_kept.size() > m_options.lines) m_kept.pop_front();
+    }
+
+    void print(LogFiles::Line line) {
+        if (m_options.redact) line.text = withoutPassword(std::move(line.text));
+        std::cout << shown(line, m_options.output) << '\n';
+    }
+
+    const LogOptions& m_options;
+    bool m_isLimited;
+    std::deque<LogFiles::Line> m_kept;
+};
+
+void follow(LogFiles& files, LogFilter& filter, Outlet& outlet) {
     Signals signals;
     EventLoop loop(signals);
-    while (std::cout && loop.wait(Deadline::in(kBetweenLooks)))
-        print(filter.take(files.takeLines()), 0, options);
+    while (std::cout && loop.wait(Deadline::in(kBetweenLooks))) {
+        outlet.take(filter.take(files.takeLines()));
+        std::cout << std::flush;
+    }
 }
 
 void explainSilence(const std::string& reason, bool hasFile, bool goesOn) {
@@ -59,24 +93,20 @@ void explainSilence(const std::string& reason, bool hasFile, bool goesOn) {
     std::cerr << "vexa: " << line << '\n';
 }
 
-void append(LogFilter::Lines& lines, const LogFilter::Lines& more) {
-    lines.insert(lines.end(), more.begin(), more.end());
-}
-
 int runLog(const LogOptions& options, bool isLimited) {
     const MachineFolder machine(options.machine);
     LogFiles files(machine.dumpFolder());
     explainSilence(whyLogIsOff(machine), files.any(), options.follow);
     if (isLimited && !options.wish.isAny()) files.skipToLast(options.lines);
     LogFilter filter(options.wish, std::time(nullptr));
-    auto lines = filter.take(files.takeLines());
+    Outlet outlet(options, isLimited);
+    files.takeLines([&](LogFilter::Lines&& lines) { outlet.take(filter.take(lines)); });
     if (!options.follow) {
-        append(lines, filter.take(files.takeRest()));
-        append(lines, filter.takeRest());
+        outlet.take(filter.take(files.takeRest()));
+        outlet.take(filter.takeRest());
     }
-    const bool isCut = isLimited && lines.size() > options.lines;
-    print(lines, isCut ? lines.size() - options.lines : 0, options);
-    if (options.follow) follow(files, filter, options);
+    outlet.open();
+    if (options.follow) follow(files, filter, outlet);
     return kExitOk;
 }
 
@@ -89,7 +119,7 @@ void addLogCommand(CLI::App& app, int& exitCode) {
         command->add_option("--machine", options->machine, "Folder of the machine")->type_name("DIR");
     CLI::Option* lines =
         command->add_option("-n,--lines", options->lines, "The last lines alone; default: all");
-    lines->type_name("LINES")->check(CLI::NonNegativeNumber);
+    lines->type_name("LINES")->check(CLI::Range(0, kMostLines));
     command->add_flag("-f,--follow", options->follow, "Go on with what is written, until Ctrl-C");
     options->wish.addTo(*command);
     options->output.addTo(*command, {{{"file", "File"}, {"line", "Line"}}}, "Print JSON, an object a line");

@@ -40,6 +40,9 @@ void explain(HotspotPort& port, const HotspotOptions& options) {
     }
 }
 
+// How many there are, and the names of the columns.
+constexpr std::size_t kHeadingRows = 2;
+
 /// Only its own words are drawn.
 bool isDrawn(const OutputOptions& options) {
     return !options.json && !options.terse && options.chosen.empty() && TerminalScreen::isUsable();
@@ -88,7 +91,7 @@ private:
         auto lines = m_list ? linesOf(*m_list) : std::vector<std::string>{kNoAdapter};
         lines.insert(lines.begin(),
                      counted(m_list.value_or(NetworkList()).size(), "network") + "   (q or Ctrl-C ends)");
-        m_screen->show(std::move(lines));
+        m_screen->show(std::move(lines), kHeadingRows);
     }
 
     HotspotPort& m_port;

@@ -75,8 +75,9 @@ std::uint16_t PortOption::find() const {
 
 std::optional<MachineFolder> PortOption::machine() const try {
     MachineFolder folder(m_machine);
+    if (m_port == 0) return folder;
     const auto ports = readPortsFile(folder.portsFile());
-    if (!ports || (*ports).*namesOf(m_half).port != find()) return std::nullopt;
+    if (!ports || (*ports).*namesOf(m_half).port != m_port) return std::nullopt;
     return folder;
 } catch (const ClientError&) {  // nothing tells of a folder
     return std::nullopt;

@@ -32,8 +32,8 @@ public:
     /// folder. Throws ClientError if none tells.
     std::uint16_t find() const;
 
-    /// The machine whose service has that port; nothing if it is not the one that was given or the default
-    /// one.
+    /// The machine that was given, or the default one; nothing if a port was given that its service has not
+    /// got.
     std::optional<MachineFolder> machine() const;
 
 private:

@@ -11,6 +11,8 @@ namespace vexa::client {
 
 namespace {
 
+constexpr int kHighestPort = 65535;
+
 struct StartOptions {
     StartRequest request;
     std::uint16_t controlPort = 0;
@@ -38,7 +40,8 @@ CLI::Option* addMachineOptions(CLI::App& command, StartOptions& options) {
     return command
         .add_option("--control-port", options.controlPort,
                     "Open the machine's control channel; 0 picks a free port")
-        ->type_name("N");
+        ->type_name("N")
+        ->check(CLI::Range(0, kHighestPort));
 }
 
 }  // namespace
@@ -50,9 +53,11 @@ void addStartCommand(CLI::App& app, int& exitCode) {
                                         : "Start the service, and stop it at the end");
     StartRequest& request = options->request;
     command->add_option("--sa-port", request.saPort, "Port of the spectral analyser; 0 picks a free one")
-        ->type_name("N");
+        ->type_name("N")
+        ->check(CLI::Range(0, kHighestPort));
     command->add_option("--hs20-port", request.hs20Port, "Port of the hotspot half; 0 picks a free one")
-        ->type_name("N");
+        ->type_name("N")
+        ->check(CLI::Range(0, kHighestPort));
     command
         ->add_option("--service", request.service,
                      "The service's executable; default: the one that came with this program")

@@ -245,10 +245,19 @@ std::string namesInTheWay(const std::vector<Finding>& findings) {
     return names;
 }
 
+bool isAllKnown(const std::vector<Finding>& findings) {
+    return std::none_of(findings.begin(), findings.end(),
+                        [](const Finding& finding) { return finding.state == State::NotKnown; });
+}
+
 std::vector<std::string> diagnosisLines(const std::vector<Finding>& findings) {
     std::vector<std::vector<std::string>> rows;
+    const Finding* reason = nullptr;
     for (const Finding& finding : findings) {
-        rows.push_back({nameOfState(finding.state).mark, finding.gate, finding.seen});
+        const bool isTold = reason != nullptr && finding.seen == reason->seen;
+        if (finding.state == State::NotKnown && !isTold) reason = &finding;
+        rows.push_back({nameOfState(finding.state).mark, finding.gate,
+                        isTold ? "not known: see " + reason->gate : finding.seen});
         if (!finding.advice.empty()) rows.push_back({"", "", finding.advice});
     }
     return alignedLines(rows);

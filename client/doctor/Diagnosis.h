@@ -27,7 +27,11 @@ std::vector<Finding> diagnose(const Observations& seen);
 /// The gates that are in the way: "radio, networks"; empty for none.
 std::string namesInTheWay(const std::vector<Finding>& findings);
 
-/// A line for each, with another one for what to do. Lines have no line end.
+/// No gate is left out for want of knowledge.
+bool isAllKnown(const std::vector<Finding>& findings);
+
+/// A line for each, with another one for what to do; a reason for not knowing is told once. Lines have no
+/// line end.
 std::vector<std::string> diagnosisLines(const std::vector<Finding>& findings);
 
 Json::Value diagnosisJson(const std::vector<Finding>& findings);

@@ -105,7 +105,7 @@ void LogFilter::takeLine(Place& place, const LogFiles::Line& line, Lines& wanted
     const auto head = lastHead(text);
     release(place, head ? "" : text, wanted);
     if (head) {
-        place.time = timeOf(*head, m_now);
+        if (m_wish.since) place.time = timeOf(*head, m_now);
         if (head->end == text.size()) {
             place.held = line;
             return;

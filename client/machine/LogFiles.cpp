@@ -85,6 +85,13 @@ void LogFiles::skipToLast(std::size_t lines) {
 
 std::vector<LogFiles::Line> LogFiles::takeLines() {
     std::vector<Line> lines;
+    takeLines(
+        [&](std::vector<Line>&& more) { std::move(more.begin(), more.end(), std::back_inserter(lines)); });
+    return lines;
+}
+
+void LogFiles::takeLines(const std::function<void(std::vector<Line>&&)>& take) {
+    std::string block(kBlock, '\0');
     for (const fs::path& path : filesByTime()) {
         const std::string name = path.filename().string();
         Place& place = m_places[name];
@@ -92,14 +99,23 @@ std::vector<LogFiles::Line> LogFiles::takeLines() {
         const std::uintmax_t size = fs::file_size(path, error);
         if (error) continue;
         if (size < place.offset) place = Place();  // somebody has emptied it
-        const std::string added = readFrom(path, place.offset);
-        place.offset += added.size();
-        place.rest += added;
-        std::size_t begin = 0;
-        for (std::size_t end = 0; (end = place.rest.find('\n', begin)) != std::string::npos; begin = end + 1)
-            lines.push_back({name, withoutCarriageReturn(place.rest.substr(begin, end - begin))});
-        place.rest.erase(0, begin);
+        std::ifstream file(path, std::ios::binary);
+        file.seekg(static_cast<std::streamoff>(place.offset));
+        while (file.read(block.data(), static_cast<std::streamsize>(block.size())) || file.gcount() > 0) {
+            const auto count = static_cast<std::size_t>(file.gcount());
+            place.offset += count;
+            place.rest.append(block, 0, count);
+            if (block.find('\n') < count) take(wholeLines(name, place));
+        }
     }
+}
+
+std::vector<LogFiles::Line> LogFiles::wholeLines(const std::string& name, Place& place) {
+    std::vector<Line> lines;
+    std::size_t begin = 0;
+    for (std::size_t end = 0; (end = place.rest.find('\n', begin)) != std::string::npos; begin = end + 1)
+        lines.push_back({name, withoutCarriageReturn(place.rest.substr(begin, end - begin))});
+    place.rest.erase(0, begin);
     return lines;
 }
 

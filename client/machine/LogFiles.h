@@ -5,6 +5,7 @@
 #include <cstddef>
 #include <cstdint>
 #include <filesystem>
+#include <functional>
 #include <map>
 #include <string>
 #include <vector>
@@ -32,6 +33,9 @@ public:
     /// The whole lines that are new: file by file, the one that was written last at the end.
     std::vector<Line> takeLines();
 
+    /// The same, some at a time, so that a long log does not have to fit into memory.
+    void takeLines(const std::function<void(std::vector<Line>&&)>& take);
+
     /// What the files end with and no line end follows yet.
     std::vector<Line> takeRest();
 
@@ -44,6 +48,7 @@ private:
         std::string rest;
     };
 
+    static std::vector<Line> wholeLines(const std::string& name, Place& place);
     std::vector<std::filesystem::path> filesByTime() const;
 
     std::filesystem::path m_folder;

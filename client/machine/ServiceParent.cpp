@@ -190,11 +190,14 @@ bool ServiceParent::portIsBusy() const {
     return std::any_of(wanted.begin(), wanted.end(), [&](std::uint16_t port) { return table.isBusy(port); });
 }
 
+// The service finishes what it is at, which can take it some seconds.
 bool ServiceParent::waitForExit(milliseconds limit) {
     const Deadline deadline = Deadline::in(limit);
+    WaitNotice notice("the service to end", WaitNotice::kNoWayOut);
     while (!m_process->exitCode()) {
         if (deadline.isOver()) return false;
-        m_stop.wait(deadline);
+        notice.tick();
+        m_stop.wait(std::min(deadline, notice.due()));
     }
     return true;
 }

@@ -34,10 +34,12 @@ public:
     explicit Impl(std::uint16_t port) : m_stream(m_context) {
         const error_code error = connect(port);
         if (error == beast::websocket::error::upgrade_declined) {
-            throw ClientError("the service on port " + std::to_string(port) + " lets us not in");
+            throw ClientError("what listens on port " + std::to_string(port) +
+                              " does not let us in: it is no service, or that of another account");
         }
         if (error)
-            throw ClientError("no service answers on port " + std::to_string(port) + ": " + error.message());
+            throw ClientError("no service answers on port " + std::to_string(port) + ": " + error.message() +
+                              "; `vexa start` starts one");
         m_open = true;
         m_stream.read_message_max(kMaxMessage);
         m_stream.text(true);

@@ -3,6 +3,7 @@
 #include <termios.h>
 #include <unistd.h>
 
+#include "client/posix/KeyParser.h"
 #include "client/terminal/Poll.h"
 
 namespace vexa::client {
@@ -10,6 +11,7 @@ namespace vexa::client {
 struct TerminalKeys::State {
     std::optional<termios> before;
     bool isReading = false;
+    KeyParser parser;
 };
 
 TerminalKeys::TerminalKeys() : m_state(std::make_unique<State>()) {
@@ -40,9 +42,9 @@ int TerminalKeys::keyDescriptor() const {
     return m_state->isReading ? kStandardInput : -1;
 }
 
-std::optional<char> TerminalKeys::take() {
-    char key = 0;
-    if (::read(STDIN_FILENO, &key, 1) == 1) return key;
+std::optional<Key> TerminalKeys::take() {
+    char byte = 0;
+    if (::read(STDIN_FILENO, &byte, 1) == 1) return m_state->parser.take(byte);
     // With this terminal mode a readable descriptor without a key is a terminal that has gone.
     m_state->isReading = false;
     return std::nullopt;

@@ -19,6 +19,9 @@ namespace {
 
 constexpr milliseconds kBetweenDrawings{100};
 
+// How things stand, and the names of the columns.
+constexpr std::size_t kHeadingRows = 2;
+
 std::string secondsSince(steady_clock::time_point start) {
     std::ostringstream out;
     out << std::fixed << std::setprecision(2) << std::setw(7)
@@ -38,9 +41,15 @@ SpectrumOutput::SpectrumOutput(Form form, const SideShow* side)
     : m_form(form), m_side(side), m_start(steady_clock::now()) {
     if (form == Form::Readable && TerminalScreen::isUsable()) {
         m_screen.emplace();
-    } else if (m_side != nullptr) {
-        printLines(m_side->opening(form == Form::Json));
+        return;
     }
+    if (TerminalKeys::isUsable()) m_keys.emplace();
+    if (m_side != nullptr) printLines(m_side->opening(form == Form::Json));
+}
+
+TerminalMode* SpectrumOutput::terminal() {
+    if (m_screen) return &*m_screen;
+    return m_keys ? &*m_keys : nullptr;
 }
 
 void SpectrumOutput::show(const std::vector<SpectralScan::Told>& told, const SpectralView& view) {
@@ -85,13 +94,14 @@ Deadline SpectrumOutput::refresh(const SpectralView& view) {
     if (!m_nextDrawing.isOver()) return m_nextDrawing;
     auto lines = picture(view);
     lines.front() += "   (q or Ctrl-C ends)";
-    m_screen->draw(lines);
+    m_screen->draw(std::move(lines), m_note.empty() ? kHeadingRows : kHeadingRows + 1);
     m_changed = false;
     m_nextDrawing = Deadline::in(kBetweenDrawings);
     return Deadline::never();
 }
 
 void SpectrumOutput::finish(const SpectralView& view) {
+    m_keys.reset();
     if (m_screen) {
         const auto lines = picture(view);
         m_screen.reset();

@@ -8,6 +8,7 @@
 #include "client/spectrum/SideShow.h"
 #include "client/spectrum/SpectralScan.h"
 #include "client/terminal/Deadline.h"
+#include "client/terminal/TerminalKeys.h"
 #include "client/terminal/TerminalScreen.h"
 
 namespace vexa::client {
@@ -36,7 +37,7 @@ public:
     void finish(const SpectralView& view);
 
     /// The mode that the terminal is in until finish(); null if it is in none.
-    TerminalMode* terminal() { return m_screen ? &*m_screen : nullptr; }
+    TerminalMode* terminal();
 
     /// Nobody reads the output any more.
     bool isGone() const;
@@ -49,6 +50,7 @@ private:
     Form m_form;
     const SideShow* m_side;
     std::optional<TerminalScreen> m_screen;
+    std::optional<TerminalKeys> m_keys;
     std::chrono::steady_clock::time_point m_start;
     Deadline m_nextDrawing = Deadline::in({});
     bool m_changed = true;

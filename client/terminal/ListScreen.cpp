@@ -8,8 +8,9 @@
 
 namespace vexa::client {
 
-void ListScreen::show(std::vector<std::string> lines) {
+void ListScreen::show(std::vector<std::string> lines, std::size_t heading) {
     m_lines = std::move(lines);
+    m_heading = heading;
     draw();
 }
 
@@ -29,7 +30,7 @@ void ListScreen::draw() {
                    [this](const std::string& line) {
                        return cutToColumns(line, m_screen.columns(), TerminalScreen::ellipsis());
                    });
-    m_screen.draw(lines);
+    m_screen.draw(std::move(lines), m_heading);
 }
 
 }  // namespace vexa::client

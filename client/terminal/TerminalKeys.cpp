@@ -10,8 +10,7 @@ bool TerminalKeys::isUsable() {
 }
 
 bool TerminalKeys::takeQuit() {
-    const auto key = take();
-    return key && (*key == 'q' || *key == 'Q');
+    return take() == Key::Quit;
 }
 
 }  // namespace vexa::client

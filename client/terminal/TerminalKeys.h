@@ -7,6 +7,9 @@
 
 namespace vexa::client {
 
+/// What a user can want of a picture by pressing a key.
+enum class Key { Quit, Up, Down, PageUp, PageDown, Home, End, Other };
+
 /// Keys of the terminal, each at once and without echo. Where standard input is no terminal there are no
 /// keys.
 class TerminalKeys final : public TerminalMode {
@@ -22,9 +25,10 @@ public:
     int keyDescriptor() const override;
     bool takeQuit() override;
 
-private:
-    std::optional<char> take();
+    /// The key that has come; nothing if none has, or only a part of one.
+    std::optional<Key> take();
 
+private:
     struct State;
     std::unique_ptr<State> m_state;
 };

@@ -12,9 +12,14 @@ HANDLE input() {
     return GetStdHandle(STD_INPUT_HANDLE);
 }
 
-wchar_t characterOf(const INPUT_RECORD& record) {
-    if (record.EventType != KEY_EVENT || record.Event.KeyEvent.bKeyDown == 0) return L'\0';
-    return record.Event.KeyEvent.uChar.UnicodeChar;
+/// Nothing for what only changes other keys, as Shift does.
+std::optional<ConsoleKey> keyOf(const INPUT_RECORD& record) {
+    const KEY_EVENT_RECORD& event = record.Event.KeyEvent;
+    if (record.EventType != KEY_EVENT || event.bKeyDown == 0) return std::nullopt;
+    const bool isMoving = event.wVirtualKeyCode >= VK_PRIOR && event.wVirtualKeyCode <= VK_DOWN;
+    const wchar_t character = event.uChar.UnicodeChar;
+    if (character == L'\0' && !isMoving) return std::nullopt;
+    return ConsoleKey{character, event.wVirtualKeyCode};
 }
 
 std::optional<INPUT_RECORD> oldest() {
@@ -35,17 +40,17 @@ void takeOldest() {
 
 bool isKeyWaiting() {
     while (const auto record = oldest()) {
-        if (characterOf(*record) != L'\0') return true;
+        if (keyOf(*record)) return true;
         takeOldest();
     }
     return false;
 }
 
-std::optional<wchar_t> takeKey() {
+std::optional<ConsoleKey> takeKey() {
     if (!isKeyWaiting()) return std::nullopt;
     const auto record = oldest();
     takeOldest();
-    return characterOf(*record);
+    return keyOf(*record);
 }
 
 }  // namespace vexa::client

@@ -23,10 +23,10 @@ std::string lineFromConsole(EventLoop& loop) {
     while (true) {
         waitForInput(loop);
         const auto key = takeKey();
-        if (!key) continue;
-        if (*key == kEnter) return utf8FromWide(line);
-        if (*key != kBackspace)
-            line += *key;
+        if (!key || key->character == L'\0') continue;
+        if (key->character == kEnter) return utf8FromWide(line);
+        if (key->character != kBackspace)
+            line += key->character;
         else if (!line.empty())
             line.pop_back();
     }
@@ -43,7 +43,7 @@ bool isInputTerminal() {
 std::size_t readStandardInput(std::span<char> buffer) {
     if (!isInputTerminal()) return readInput(buffer);
     const auto key = takeKey();
-    buffer[0] = key && *key < 0x80 ? static_cast<char>(*key) : '?';
+    buffer[0] = key && key->character != 0 && key->character < 0x80 ? static_cast<char>(key->character) : '?';
     return 1;
 }
 

@@ -35,10 +35,25 @@ int TerminalKeys::keyDescriptor() const {
     return m_state->before ? kStandardInput : -1;
 }
 
-std::optional<char> TerminalKeys::take() {
+std::optional<Key> TerminalKeys::take() {
     const auto key = takeKey();
-    if (!key || *key >= 0x80) return std::nullopt;
-    return static_cast<char>(*key);
+    if (!key) return std::nullopt;
+    switch (key->code) {
+        case VK_UP:
+            return Key::Up;
+        case VK_DOWN:
+            return Key::Down;
+        case VK_PRIOR:
+            return Key::PageUp;
+        case VK_NEXT:
+            return Key::PageDown;
+        case VK_HOME:
+            return Key::Home;
+        case VK_END:
+            return Key::End;
+        default:
+            return key->character == L'q' || key->character == L'Q' ? Key::Quit : Key::Other;
+    }
 }
 
 }  // namespace vexa::client

@@ -28,7 +28,7 @@ def hide(folder):
 class Package(Story):
     def test_it_has_no_fault_and_works_where_it_is_unpacked_with_the_sources_out_of_reach(self):
         lint = subprocess.run(["lintian", "--profile", "debian", PACKAGE], capture_output=True, text=True)
-        self.assertEqual(lint.returncode, 0, lint.stdout)
+        self.assertEqual((lint.returncode, lint.stdout), (0, ""))
         root = self.new_folder()
         subprocess.run(["dpkg-deb", "-x", PACKAGE, root], check=True)
         hide(SOURCES)

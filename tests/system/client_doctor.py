@@ -66,8 +66,12 @@ class Doctor(CredentialStory):
                 self.wait_shut(names, *words)
         self.done("connect", "Café")
         self.assertIn("Nothing is in the way of a connection.\n", self.done("doctor"))
-        self.machine.stop()
-        self.wait_shut("service", "no service")
+        for command, state in (("enable", "fine"), ("disable", "inTheWay")):
+            self.done(command)
+            self.machine.stop()
+            result, gates = self.found()
+            self.assertEqual((gates["switch"]["state"], "no service" in gates["service"]["seen"]), (state, True))
+            self.start(folder=self.machine.folder, **self.scenario)
 
     def test_what_only_the_log_knows_is_not_known_without_it(self):
         self.machine.stop()
@@ -75,6 +79,8 @@ class Doctor(CredentialStory):
         _, gates = self.found()
         unknown = [gate for gate in GATES if "set enabledump to true" in gates[gate]["seen"]]
         self.assertEqual(unknown, ["session", "retries", "blocked", "outcome"])
+        lines = self.vexa("doctor").stdout.splitlines()
+        self.assertEqual([sum(text in line for line in lines) for text in ("set enabledump", "see session")], [1, 3])
         _, gates = self.found("--hs20-port", self.machine.hs20_port, VEXA_MACHINE="/nonexistent")
         self.assertEqual(gates["switch"]["state"], "notKnown")
         self.assertIn("no service runs", run_client("doctor", VEXA_MACHINE=self.new_folder()).stdout)

@@ -9,7 +9,7 @@ import signal
 import time
 import unicodedata
 
-from harness import STORE, Story, run_client, wait_until
+from harness import STORE, Story, program, run_client, wait_until
 
 LINE = re.compile(r"\[\d+\] \d\d/\d\d \d\d:\d\d:\d\d  ")
 TEXT = r'"(?:[^"\\]|\\.)*"'
@@ -105,7 +105,20 @@ class OfFiles(Story):
         os.truncate(self.folder / STORE / "Dump" / "a.txt", 1 << 28)
         self.write("a.txt", "\none\ntwo\n")
         self.assertEqual(self.lines("-n", "2"), ["one", "two"])
+        self.assertIn("not in range 0 to 1000000000", self.refused(2, "log", "-n", "-1"))
         self.assertLess(resource.getrusage(resource.RUSAGE_CHILDREN).ru_maxrss, 1 << 18, "KiB, as much as it holds")
+
+    def test_a_long_log_is_not_kept_in_memory(self):
+        self.set_config("true")
+        for _ in range(1 << 7):
+            self.write("a.txt", entry(1, "x" * 1000) * (1 << 10))
+        self.write("a.txt", entry(2, "y"))
+        for options in (["--grep", "y"], ["--grep", "x", "-n", "1"], ["--level", "6"], []):
+            log = os.posix_spawn(program("vexa"), ["vexa", "log", *options, "--machine", self.folder], os.environ, file_actions=[
+                (os.POSIX_SPAWN_OPEN, 1, "/dev/null", os.O_WRONLY, 0)])  # fmt: skip
+            _, status, usage = os.wait4(log, 0)
+            self.assertEqual(status, 0)
+            self.assertLess(usage.ru_maxrss, 1 << 16, "KiB, half of what it holds")
 
     def test_bytes_of_any_kind_become_text(self):
         self.set_config("true")
@@ -182,6 +195,10 @@ class OfFiles(Story):
         then = time.localtime(time.time() - 2 * 3600)
         for since in ("90m", "2h", time.strftime("%H:%M", then), time.strftime("%Y-%m-%d %H:%M", then)):
             self.assertEqual(self.lines("--since", since), [*one, *three, *two], since)
+        yesterday = time.strftime("%H:%M", time.localtime(time.time() + 600))
+        self.assertEqual(self.lines("--since", yesterday)[0], old[:-1])
+        self.write("b.txt", entry(8, "of last year", -2 * 24 * 3600))
+        self.assertNotIn("of last year", str(self.lines("--since", "1h")))
         self.assertEqual(self.lines("--grep", "one"), [*old.splitlines(), *one])
         self.assertEqual(self.lines("--grep", "one", "--since", "1h"), one)
         self.assertEqual(self.lines("--level", "3", "--grep", "new", "-n", "2"), three + two)

@@ -83,15 +83,30 @@ class Looking(NetworkStory):
         for locale, rest in (("C.UTF-8", "…"), ("C", "...")):
             command = "networks", "--watch", "--machine", self.machine.folder
             terminal = self.terminal(*command, columns=99, rows=4, LC_ALL=locale)
-            terminal.read_until(rb"(?s)3 networks .*Airport Free.*2 more; enlarge the window\x1b")
+            terminal.read_until(rb"(?s)3 networks .*Airport Free.*2 below; arrows, ")
             terminal.resize(28, 6)
-            terminal.read_until(f"(?s)Airport Free +no +[a-z]*{re.escape(rest)}\x1b.*Later".encode())
+            terminal.read_until(f"(?s)Airport Free +no +[a-z]*{re.escape(rest)}\r.*Later".encode())
             self.hide(NETWORKS[1]["bssid"])
             terminal.read_until(b"2 networks")
             terminal.press(b"q")
             self.assertEqual((terminal.finish(), terminal.last_line().split()[0]), (0, "Later"))
             self.control.do("show", bssid=NETWORKS[1]["bssid"])
             self.all_reported()
+
+    def test_keys_move_what_does_not_fit_below_the_heading(self):
+        terminal = self.terminal("networks", "--watch", "--machine", self.machine.folder, columns=99, rows=4)
+        terminal.read_until(b"2 below; arrows, PageUp")
+        first, second, third = "Airport Free .*\\x1b\\[J2 below; ", "Café .*\\x1b\\[J1 above, 1 below; ", "Later .*\\x1b\\[J2 above; "
+        for key, shown in (
+            ("[B", second), ("[1;5B", third), ("OB", third), ("[A", second), ("OA", first), ("[A", first),
+            ("[F", third), ("[H", first), ("OF", third), ("OH", first), ("[4~", third), ("[1~", first),
+            ("[8~", third), ("[7~", first), ("[6~", second), ("[6;2~", third), ("[5~", second), ("[20~\x1b[Zx\x1b[5~", first),
+        ):  # fmt: skip
+            terminal.screen = b""
+            terminal.press(b"\x1b" + key.encode())
+            terminal.read_until(rf"(?s)\x1b\[H\x1b\[K3 networks [^\n]*\n\x1b\[K   Network [^\n]*\n\x1b\[K...{shown}".encode())
+        terminal.press(b"q")
+        self.assertEqual(terminal.finish(), 0)
 
     def test_watching_waits_for_an_adapter(self):
         self.control.do("pullAdapter")

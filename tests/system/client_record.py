@@ -1,7 +1,9 @@
 """`vexa record`, and what is made of a recording: statistics, a replay, a scenario."""
 
 import json
+import os
 import signal
+import subprocess
 import zlib
 
 from client_credentials import CredentialStory
@@ -95,6 +97,16 @@ class Recording(RecordStory):
         self.assertIn("is there already", self.refused(1, "record", self.file))
         self.assertIn("No space left", self.refused(1, "record", "/dev/full"))
         self.refused(2, "record", "x.rec", "--for", "soon")
+        printed = self.vexa("record", "-", "--for", "1s", "--passive")
+        self.assertTrue(all(map(json.loads, printed.stdout.splitlines())))
+        self.assertRegex(printed.stderr, r"\ARecorded \d+ events in 1")
+        pipe = self.new_folder() / "pipe"
+        os.mkfifo(pipe)
+        pipe.chmod(0o640)
+        with subprocess.Popen(["cat", pipe], stdout=subprocess.PIPE) as reader:
+            self.done("record", pipe, "--for", "1s", "--passive")
+            self.assertGreater(len(reader.stdout.readlines()), 2)
+        self.assertEqual(pipe.stat().st_mode & 0o777, 0o640, "what is no file keeps its rights")
         recorder = self.record("b.rec")
         self.wait_events(LIST)
         self.machine.stop()
@@ -116,6 +128,10 @@ class Statistics(Story):
         self.assertEqual(interference.split(), ["6", "interference", "10", *["60"] * 5, "100", "%"])
         _, first, _ = self.stats("--csv", "--above", "80").splitlines()
         self.assertEqual(first, "6,congestion,10,20,44,20,80,80,0")
+        for share, p95 in ((4, 20), (6, 80)):
+            late = sample(11000 - 100 * share, "CONGESTION", congestion_value=80)
+            _, first, _ = self.stats("--csv", lines=[*WRITTEN[:4], late, WRITTEN[-1]]).splitlines()
+            self.assertEqual(first.split(",")[6], str(p95), f"above for {share} % of the time")
         (told,) = json.loads(self.stats("--json"))["channels"]
         self.assertEqual((told["channel"], told["congestion"]["mean"], told["interference"]["p95"]), (6, 44, 60))
 

@@ -84,7 +84,7 @@ class WithService(Story):
     def test_what_can_not_be_printed_has_failed(self):
         environment = clean_environment(VEXA_MACHINE=str(self.machine.folder))
         for command in ("status", "scan", "scan --watch", "channels --json", "networks", "networks --watch", "watch",
-                        "credentials", "send sa GET_CHANNEL_LIST", "--version", "scan --help"):  # fmt: skip
+                        "credentials", "credential export", "send sa GET_CHANNEL_LIST", "--version", "scan --help"):  # fmt: skip
             with self.subTest(command), open("/dev/full", "w") as full:
                 arguments = [program("vexa"), *command.split()]
                 told = subprocess.run(arguments, env=environment, stdout=full, stderr=subprocess.PIPE, timeout=60)

@@ -46,7 +46,8 @@ int runExport(const ExportOptions& options) {
     const std::string text = ownFormat(list, options.withPasswords ? Passwords::Shown : Passwords::Hidden);
     if (options.file.empty()) {
         std::cout << text << std::flush;
-        return std::cout ? kExitOk : kExitFailed;
+        if (!std::cout) throw ClientError("standard output cannot be written");
+        return kExitOk;
     }
     createOwnerFile(options.file, text);
     Json::Value object(Json::objectValue);

@@ -66,6 +66,7 @@ TEST(SpectrumStatistics, NothingStandsWithoutRadioAdapterOrChannel) {
     EXPECT_EQ(channel.congestion.percentile(0.5), 80);
     EXPECT_EQ(channel.congestion.least(), 40);
     EXPECT_EQ(channel.interference.greatest(), 0);  // never told, so it never changed from 0
+    EXPECT_EQ(channel.interference.total(), RecordedTime(3000));
 }
 
 TEST(SpectrumStatistics, AValueThatIsToldLateWas0BeforeAndOneToldLastStoodForAMoment) {
