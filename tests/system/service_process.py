@@ -154,7 +154,9 @@ class WithParent(Story):
     def test_equal_ports_leave_one_channel(self):
         (port,) = free_ports(1)
         machine = self.start(arguments=["--sa-port", f"{port}", "--hs20-port", f"{port}"])
-        self.assertEqual(machine.output(), HOTSPOT.format(port) + NO_SPECTRAL)
+        expected = HOTSPOT.format(port) + NO_SPECTRAL
+        wait_until(lambda: len(machine.output()) >= len(expected), "what comes of both ports")
+        self.assertEqual(machine.output(), expected)
         told = [f"vexa: both halves have the port {port}: the spectral analyser cannot be reached"]
         self.assertEqual(machine.parent.errors, told)
         client = machine.hs20()
