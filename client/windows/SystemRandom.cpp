@@ -1,5 +1,3 @@
-// Before the header that it changes: rand_s() takes from the system's source.
-#define _CRT_RAND_S
 #include <stdlib.h>
 
 #include "client/machine/SystemRandom.h"
