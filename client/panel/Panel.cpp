@@ -4,6 +4,7 @@
 #include <utility>
 
 #include "client/hotspot/HotspotNarrator.h"
+#include "client/hotspot/HotspotQuestions.h"
 #include "client/machine/MachineRegistry.h"
 #include "client/port/Event.h"
 #include "client/port/JsonLine.h"
@@ -168,8 +169,9 @@ void Panel::startRecording() {
 
 // A recording begins with how things stand.
 void Panel::askForRecording() {
-    ask(RecordedPort::Spectral, contract::kGetChannelList);
-    ask(RecordedPort::Spectral, contract::kFullScan);
+    for (const char* const question :
+         {contract::kGetChannelList, contract::kGetCurrentChannel, contract::kFullScan})
+        ask(RecordedPort::Spectral, question);
     for (const char* const question : HotspotNarrator::firstQuestions())
         ask(RecordedPort::Hotspot, question);
 }
@@ -213,9 +215,12 @@ Json::Value Panel::recordings() const {
     return members;
 }
 
+// Nobody can ask the service for its switch.
 Json::Value Panel::service() const {
     Json::Value members(Json::objectValue);
     members["running"] = m_relay.isRunning();
+    const auto isSwitchedOn = m_relay.isRunning() ? hotspotSwitch(m_relay.machine()) : std::nullopt;
+    if (isSwitchedOn) members["hotspot"] = *isSwitchedOn;
     return members;
 }
 

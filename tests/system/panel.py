@@ -271,7 +271,9 @@ class Relay(PanelStory):
         return browser, page
 
     def test_events_of_both_ports_come_as_they_are(self):
-        _, page = self.open()
+        browser, page = self.open()
+        running = {"event": "service", "running": True, "hotspot": True}
+        self.assertEqual(json.loads(self.page(browser).take())["message"], running)
         page.command("spectral", "GET_CHANNEL_LIST")
         listed = page.wait("spectral", CHANNEL_LIST)
         self.assertEqual({entry["Channel"] for entry in json.loads(listed["Data"])}, {6, 36})

@@ -87,6 +87,10 @@ test('a service that is lost takes what it told along, and the log begins anew w
     state = afterPanelMessage(state, { event: 'log', on: true, lines: ['new'] });
     assert.equal(state.log.lines.length, LOG_LINES);
     assert.equal(state.log.lines.at(-1), 'new');
+    state = afterPanelMessage(state, { event: 'service', running: true, hotspot: false });
+    assert.equal(state.hotspot, false);
+    state = afterPanelMessage(state, { event: 'service', running: true });
+    assert.equal(state.hotspot, false);
     state = afterPanelMessage(state, { event: 'service', running: false });
     assert.deepEqual([state.adapter, state.running, state.log.lines.length], [null, false, LOG_LINES]);
     assert.equal(afterLink(state, 'open').log.lines.length, 0);

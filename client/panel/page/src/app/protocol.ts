@@ -28,7 +28,7 @@ export interface RecordingFile {
 
 /** What the relay tells of itself. */
 export type PanelMessage =
-    | { event: 'service'; running: boolean }
+    | { event: 'service'; running: boolean; hotspot?: boolean }
     | { event: 'log'; on: boolean; lines: string[] }
     | ({ event: 'recording' } & RecordingState)
     | { event: 'recordings'; files: RecordingFile[] }

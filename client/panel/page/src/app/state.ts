@@ -58,7 +58,7 @@ export interface State {
     running: boolean | null;
     adapter: boolean | null;
     radio: boolean | null;
-    /** The hotspot switch. The service tells it when it is turned; a list of networks tells that it is on. */
+    /** The hotspot switch, as it is written down; it is told when it is turned, and by a list of networks. */
     hotspot: boolean | null;
     internet: boolean | null;
     /** As listed; empty with the radio or the hotspot switch off. */
@@ -185,7 +185,9 @@ export function afterEvent(state: State, event: ServiceEvent): State {
 export function afterPanelMessage(state: State, message: PanelMessage): State {
     switch (message.event) {
         case 'service':
-            return message.running ? { ...state, running: true } : { ...state, ...NOTHING_OF_SERVICE, running: false };
+            return message.running
+                ? { ...state, running: true, hotspot: message.hotspot ?? state.hotspot }
+                : { ...state, ...NOTHING_OF_SERVICE, running: false };
         case 'log':
             return {
                 ...state,

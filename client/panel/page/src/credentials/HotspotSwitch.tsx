@@ -5,7 +5,7 @@ const WORDS: [boolean, string][] = [
     [false, 'Off'],
 ];
 
-/** Whether the service looks for hotspots and joins them. The service tells it only when it is turned. */
+/** Whether the service looks for hotspots and joins them. */
 export function HotspotSwitch() {
     const service = useService();
     const canCommand = useCanCommand();
