@@ -462,8 +462,9 @@ class Terminal:
         return termios.tcgetattr(self._theirs)
 
     def last_line(self):
-        # A terminal that echoes shows the pressed Ctrl-C.
-        return self.screen.decode().rstrip().splitlines()[-1].removeprefix("^C")
+        # A terminal that echoes shows the pressed Ctrl-C. With Ctrl-Z it drops what it has not shown yet, in the middle
+        # of a character too.
+        return self.screen.decode(errors="replace").rstrip().splitlines()[-1].removeprefix("^C")
 
     def close(self):
         if self.process.poll() is None:
