@@ -72,7 +72,8 @@ Var PathEntry
     IntOp $9 $8 * 2
     System::Call 'ntdll::RtlMoveMemory(p r5, p r7, p r9)'
     IntPtrOp $5 $5 + $9
-    System::Call '*$5(&i2 0)'
+    ; Where nothing else was, no text may stand behind the first semicolon either.
+    System::Call '*$5(&i2 0, &i2 0)'
     !insertmacro WritePath
   ${EndIf}
   System::Free $PathBuffer

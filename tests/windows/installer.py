@@ -32,9 +32,9 @@ def path():
 
 
 class Installer(unittest.TestCase):
-    def install(self):
+    def install(self, *arguments):
         (setup,) = wine.BUILD.glob("vexa-*-setup.exe")
-        return silently(setup)
+        return silently(setup, *arguments)
 
     def files(self):
         return {file.relative_to(self.folder): file.read_bytes() for file in self.folder.rglob("*") if file.is_file()}
@@ -86,3 +86,14 @@ class Installer(unittest.TestCase):
         self.assertEqual([str(file) for file in self.files()], ["mine.txt"])
         self.assertEqual(path(), ("EXPAND_SZ", PATH))
         self.assertTrue((wine.USERS / STORE / "config.xml").exists())
+
+    def test_a_folder_of_ones_own_choice_and_a_path_without_anything_else(self):
+        wine.run("reg", "delete", "HKCU\\Environment", "/f", "/v", "Path")
+        self.addCleanup(shutil.rmtree, wine.PREFIX / "drive_c" / "Tools", ignore_errors=True)
+        self.assertEqual(self.install("/D=C:\\Tools\\Vexa"), 0)
+        self.assertEqual(path(), ("EXPAND_SZ", "C:\\Tools\\Vexa"))
+        client = wine.PREFIX / "drive_c" / "Tools" / "Vexa" / "vexa.exe"
+        self.assertEqual(wine.run(client, "--version").returncode, 0)
+        silently(client.with_name("uninstall.exe"))
+        wait_until(lambda: not registry(ENTRY), "the end of the removal")
+        self.assertIsNone(path())
