@@ -1,6 +1,7 @@
-// Makes the page: `node build.mjs OUTDIR` writes index.html, panel.css and panel.js.
+// Makes the page: `node build.mjs OUTDIR` writes index.html, panel.css and panel.js, and in page.d what they are made of,
+// for the build to know when they are stale.
 import { build } from 'esbuild';
-import { copyFile, mkdir } from 'node:fs/promises';
+import { copyFile, mkdir, writeFile } from 'node:fs/promises';
 import { dirname, join } from 'node:path';
 import { fileURLToPath } from 'node:url';
 
@@ -12,7 +13,7 @@ if (!folder) {
 }
 
 await mkdir(folder, { recursive: true });
-await build({
+const { metafile } = await build({
     entryPoints: { panel: join(here, 'src/app/main.tsx') },
     absWorkingDir: here,
     outdir: folder,
@@ -22,6 +23,11 @@ await build({
     target: 'es2022',
     charset: 'utf8',
     legalComments: 'none',
+    metafile: true,
     logLevel: 'warning',
 });
-await copyFile(join(here, 'src/app/index.html'), join(folder, 'index.html'));
+const html = 'src/app/index.html';
+await copyFile(join(here, html), join(folder, 'index.html'));
+const paths = [join(folder, 'index.html'), ...[html, ...Object.keys(metafile.inputs)].map((source) => join(here, source))];
+const [output, ...inputs] = paths.map((path) => path.replaceAll(' ', '\\ '));
+await writeFile(join(folder, 'page.d'), `${output}: ${inputs.join(' ')}\n`);
