@@ -20,9 +20,6 @@ namespace {
 constexpr int kDefaultSeconds = 20;
 constexpr std::chrono::seconds kDemoLimit{10};
 
-// A service may sleep for ten seconds before it looks whether it is to stop. The user has seen all by then.
-constexpr std::chrono::milliseconds kStopPatience{500};
-
 struct DemoOptions {
     int seconds = kDefaultSeconds;
     std::string service;
@@ -56,19 +53,16 @@ bool showAll(const DemoOptions& options, const ServicePorts& ports, const Machin
 int runDemo(const DemoOptions& options) {
     Signals signals;
     const TemporaryMachine machine;
-    const MachineFolder folder(machine.path().string());
-    prepareDemoMachine(folder);
+    StartRequest request = prepareDemoMachine(machine);
+    const MachineFolder folder(request.machine);
     StopSource stop(signals, false);
-    StartRequest request;
-    request.machine = machine.path().string();
-    request.builtInScenario = true;
     request.service = options.service;
     ServiceParent parent(request, stop);
     const auto state = parent.waitUntilReady();
     if (state == ServiceParent::State::Ended) return kExitFailed;
     if (state == ServiceParent::State::Ready && showAll(options, parent.ports(), folder, signals))
-        return parent.stopSoon(kStopPatience);
-    parent.stopSoon(kStopPatience);
+        return parent.stopSoon(kDemoStopPatience);
+    parent.stopSoon(kDemoStopPatience);
     std::cout << (options.json ? jsonLine(summaryJson(SpectralView())) : summaryText(SpectralView())) << '\n';
     return kExitOk;
 }

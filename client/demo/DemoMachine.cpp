@@ -22,12 +22,17 @@ std::string configurationWithLog() {
 
 }  // namespace
 
-void prepareDemoMachine(const MachineFolder& machine) {
+StartRequest prepareDemoMachine(const TemporaryMachine& temporary) {
+    StartRequest request;
+    request.machine = temporary.path().string();
+    request.builtInScenario = true;
+    const MachineFolder machine(request.machine);
     std::error_code error;
     std::filesystem::create_directories(machine.configFile().parent_path(), error);
     if (error || !replaceOwnerFile(machine.configFile(), configurationWithLog()))
         throw ClientError("the machine of the demo cannot be written to " + machine.path().string(),
                           kExitNotStarted);
+    return request;
 }
 
 }  // namespace vexa::client

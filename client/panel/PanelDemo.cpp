@@ -8,17 +8,12 @@ namespace vexa::client {
 
 namespace {
 
-constexpr std::chrono::milliseconds kStopPatience{500};
 constexpr std::chrono::seconds kAnswerLimit{10};
 
 int serveDemo(PanelOptions& options, Signals& signals) {
     const TemporaryMachine machine;
-    const MachineFolder folder(machine.path().string());
-    prepareDemoMachine(folder);
+    const StartRequest request = prepareDemoMachine(machine);
     StopSource stop(signals, false);
-    StartRequest request;
-    request.machine = machine.path().string();
-    request.builtInScenario = true;
     ServiceParent parent(request, stop);
     const auto state = parent.waitUntilReady();
     if (state == ServiceParent::State::Ended) return kExitFailed;
@@ -33,7 +28,7 @@ int serveDemo(PanelOptions& options, Signals& signals) {
         } catch (const StoppedByUser&) {  // before there was anything to see
         }
     }
-    parent.stopSoon(kStopPatience);
+    parent.stopSoon(kDemoStopPatience);
     return kExitOk;
 }
 
