@@ -78,7 +78,7 @@ ServiceParent::ServiceParent(const StartRequest& request, StopSource& stop)
 
 ServiceParent::~ServiceParent() {
     try {
-        if (m_process && !m_process->exitCode()) stop();
+        if (m_process && !m_process->exitCode()) stopSoon(kStopLimit);
     } catch (const std::exception&) {  // the process kills what still runs when it goes
     }
 }

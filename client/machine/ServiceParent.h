@@ -41,7 +41,7 @@ public:
     /// must outlive it.
     ServiceParent(const StartRequest& request, StopSource& stop);
 
-    /// Stops a service that still runs.
+    /// Stops a service that still runs, without a word: what went wrong is told already, or is on its way.
     ~ServiceParent();
     ServiceParent(const ServiceParent&) = delete;
     ServiceParent& operator=(const ServiceParent&) = delete;

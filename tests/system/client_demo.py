@@ -5,6 +5,7 @@ import os
 import re
 import signal
 import subprocess
+import sys
 
 from harness import PATIENCE, Story, child_of, clean_environment, is_running, program, wait_until
 
@@ -27,6 +28,15 @@ ENTERED, LEFT = b"\x1b[?1049h", b"\x1b[?1049l"
 STORED = ["Work", "Airport Lounge", "City Wi-Fi"]
 COLOUR = re.compile(rb"\x1b\[3\dm")
 BAR = "█".encode()
+# A service that lets nobody in, and is killed as soon as it is asked to stop.
+CLOSING = f"""#!{sys.executable}
+import os, signal, socket, sys, time
+sa, hs20 = (socket.create_server(("127.0.0.1", int(port))) for port in sys.argv[1:])
+hs20.accept()[0].close()
+while os.path.exists(os.path.join(os.environ["VEXA_MACHINE"], "ports.json")):
+    time.sleep(0.01)
+os.kill(os.getpid(), signal.SIGKILL)
+"""
 FOR_LONG = ["demo", "--seconds", "600"]
 
 
@@ -125,6 +135,14 @@ class InPipe(DemoStory):
         demo = self.demo("--seconds", "600")
         demo.wait_line("congestion")
         os.kill(child_of(demo.process.pid), signal.SIGKILL)
+        self.assertEqual((demo.wait(), len(demo.errors)), (1, 1), demo.errors)
+        self.assert_nothing_is_left()
+
+    def test_a_lost_connection_is_told_and_not_what_becomes_of_the_service(self):
+        service = self.new_folder() / "closing"
+        service.write_text(CLOSING)
+        service.chmod(0o700)
+        demo = self.demo("--service", service)
         self.assertEqual((demo.wait(), len(demo.errors)), (1, 1), demo.errors)
         self.assert_nothing_is_left()
 

@@ -585,7 +585,7 @@ class Story(unittest.TestCase):
     def done(self, *arguments, stdin=None, **variables):
         """What a command of `vexa` prints that does what it is asked for, on this machine if no other is named."""
         result = self.vexa(*arguments, stdin=stdin, **variables)
-        self.assertEqual((result.returncode, result.stderr), (0, ""), arguments)
+        self.assertEqual((result.returncode, result.stderr), (0, ""), (arguments, result.stdout))
         return result.stdout
 
     def refused(self, exit_code, *arguments, stdin=None, **variables):
