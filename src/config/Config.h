@@ -139,10 +139,10 @@ private:
     void rememberFile(const std::string& content) REQUIRES(g_hs20Lock);
     void takeOver(const Reading& stored) REQUIRES(g_hs20Lock);
     void takeOverDeletions(const CredentialTable& stored) REQUIRES(g_hs20Lock);
-    void giveNewId(Credential& credential) REQUIRES(g_hs20Lock);
-    Credential takeOverKnown(const Credential& theirs, const Known& before, Credential* mine)
+    void giveNewId(const Credential& credential) REQUIRES(g_hs20Lock);
+    Credential takeOverKnown(const Credential& theirs, const Known& before, const Credential* mine)
         REQUIRES(g_hs20Lock);
-    Credential takeOverNew(const Credential& theirs, Credential* mine) REQUIRES(g_hs20Lock);
+    Credential takeOverNew(const Credential& theirs, const Credential* mine) REQUIRES(g_hs20Lock);
     void takeOverPlaces(const CredentialTable& stored) REQUIRES(g_hs20Lock);
 
     ResultCode saveInto(const std::string& content, bool& isSaved) REQUIRES(g_hs20Lock);

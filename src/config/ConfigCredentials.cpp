@@ -2,6 +2,7 @@
 #include <limits>
 #include <memory>
 #include <string>
+#include <utility>
 
 #include "base/DiagnosticLog.h"
 #include "config/Config.h"
@@ -97,12 +98,14 @@ bool Config::repairIds(const Reading& reading) {
     std::int32_t next = std::max(readNumber("/*/global/nextcredid"), followingId(reading.highestId));
     std::unordered_set<std::int32_t> taken = reading.foreignIds;
     bool isChanged = false;
-    for (Credential* credential : reading.table.copyCredentialPointers()) {
+    for (const Credential* credential : reading.table.copyCredentialPointers()) {
         if (taken.insert(credential->m_id).second || next == kLargestId) continue;
         if (reading.trace == Trace::Yes)
             Log(6, "ERROR: Found duplicate credential id=%d, new id=%d", credential->m_id, next);
         if (reading.foreignIds.contains(credential->m_id)) m_renamed[credential->m_id] = next;
-        credential->m_id = next;
+        Credential renumbered = *credential;
+        renumbered.m_id = next;
+        reading.table.replace(*credential, std::move(renumbered));
         next = followingId(next);
         isChanged = true;
     }

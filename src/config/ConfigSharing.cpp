@@ -19,7 +19,7 @@ bool isTheSame(Credential a, const Credential& b) {
     return holdTheSame(a, b);
 }
 
-Credential* find(const std::unordered_map<std::int32_t, Credential*>& byId, std::int32_t id) {
+const Credential* find(const std::unordered_map<std::int32_t, const Credential*>& byId, std::int32_t id) {
     const auto found = byId.find(id);
     return found == byId.end() ? nullptr : found->second;
 }
@@ -77,13 +77,13 @@ void Config::takeOver(const Reading& stored) {
     // No service takes a list of a user away: this file has been made anew, and others have deleted nothing.
     if (m_hadUser && !stored.hasUser) m_known.clear();
     takeOverDeletions(stored.table);
-    for (Credential* mine : m_credentials.copyCredentialPointers())
+    for (const Credential* mine : m_credentials.copyCredentialPointers())
         if (stored.foreignIds.contains(mine->m_id)) giveNewId(*mine);
     const auto inMemory = m_credentials.credentialsById();
     std::unordered_map<std::int32_t, Known> known;
     for (const Credential* theirs : stored.table.copyCredentialPointers()) {
         const auto before = m_known.find(theirs->m_id);
-        Credential* const mine = find(inMemory, theirs->m_id);
+        const Credential* const mine = find(inMemory, theirs->m_id);
         Credential now = before == m_known.end() ? takeOverNew(*theirs, mine)
                                                  : takeOverKnown(*theirs, before->second, mine);
         known.try_emplace(theirs->m_id, Known{*theirs, std::move(now)});
@@ -103,26 +103,25 @@ void Config::takeOverDeletions(const CredentialTable& stored) {
     }
 }
 
-void Config::giveNewId(Credential& credential) {
+void Config::giveNewId(const Credential& credential) {
     if (m_nextCredId == followingId(m_nextCredId)) return;
     Log(6, "ERROR: Found duplicate credential id=%d, new id=%d", credential.m_id, m_nextCredId);
     m_renamed[credential.m_id] = m_nextCredId;
-    credential.m_id = m_nextCredId;
+    Credential renumbered = credential;
+    renumbered.m_id = m_nextCredId;
+    m_credentials.replace(credential, std::move(renumbered));
     advanceNextCredId();
 }
 
 // This and the next give what memory held when it last agreed with the file.
-Credential Config::takeOverKnown(const Credential& theirs, const Known& before, Credential* mine) {
+Credential Config::takeOverKnown(const Credential& theirs, const Known& before, const Credential* mine) {
     if (mine == nullptr || !holdTheSame(*mine, before.inMemory)) return before.inMemory;
-    if (holdTheSame(theirs, before.inFile)) return *mine;
-    Credential now = theirs;
-    now.m_priority = mine->m_priority;
-    *mine = std::move(now);
-    return theirs;
+    if (!holdTheSame(theirs, before.inFile)) m_credentials.replace(*mine, theirs);
+    return *mine;
 }
 
 // One that could not be saved may have the id that another was given meanwhile.
-Credential Config::takeOverNew(const Credential& theirs, Credential* mine) {
+Credential Config::takeOverNew(const Credential& theirs, const Credential* mine) {
     if (mine != nullptr && isTheSame(*mine, theirs)) return theirs;
     if (mine != nullptr) giveNewId(*mine);
     m_credentials.appendUnplaced(std::make_unique<Credential>(theirs));
@@ -140,7 +139,8 @@ void Config::takeOverPlaces(const CredentialTable& stored) {
     if (isChanged && !m_bUnsaved) {
         const auto inMemory = m_credentials.credentialsById();
         for (const Credential* theirs : all)
-            if (Credential* const mine = find(inMemory, theirs->m_id)) mine->m_priority = theirs->m_priority;
+            if (const Credential* const mine = find(inMemory, theirs->m_id))
+                CredentialTable::setPriority(*mine, theirs->m_priority);
     }
     m_credentials.placeUnplacedCredentials();
 }

@@ -54,7 +54,7 @@ bool Config::applyReferences(const std::vector<Node>& references, const Reading&
         if (priority < 0) continue;
         const auto found = present.find(id);
         if (found != present.end()) {
-            found->second->m_priority = priority;
+            CredentialTable::setPriority(*found->second, priority);
             if (isTraced) Log(2, "\t\t\tid=%d, priority=%d", id, priority);
         } else {
             isChanged = true;

@@ -14,7 +14,7 @@ bool holdTheSame(const Credential& a, const Credential& b) {
                         one.m_realm, one.m_credName, one.m_username, one.m_password, one.m_caCert,
                         one.m_clientCert, one.m_creator, one.m_roamingConsortium, one.m_homeSpFqdn);
     };
-    return all(a) == all(b);
+    return (a.m_edition != 0 && a.m_edition == b.m_edition) || all(a) == all(b);
 }
 
 }  // namespace vexa

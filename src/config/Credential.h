@@ -40,6 +40,10 @@ struct Credential {
     std::wstring m_caCert;    // EAP-TLS
     std::wstring m_clientCert;
     std::wstring m_homeSpFqdn;  // nothing fills it yet
+
+    /// Given by a table to what it takes in, and kept by copies: two that have one in common hold the same.
+    /// 0: no table has had it yet.
+    std::uint64_t m_edition = 0;
 };
 
 /// Whether they are equal but for the place, which is not of the credential but of the user's list.

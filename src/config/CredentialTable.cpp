@@ -18,6 +18,12 @@ bool isPlaced(const Credential& credential) {
     return credential.m_priority != 0 && credential.m_priority != CRED_PRIORITY_LOWEST;
 }
 
+// Behind the lock of all tables: a copy may be compared with what another one holds.
+std::uint64_t nextEdition() REQUIRES(g_hs20Lock) {
+    static std::uint64_t last = 0;
+    return ++last;
+}
+
 // Null if memory runs out.
 std::unique_ptr<Credential> makeRecord(std::int32_t id, const std::wstring& creator, std::int32_t type,
                                        std::int32_t accessType) {
@@ -48,7 +54,7 @@ bool applyTexts(Credential& credential, const CredentialInput& input, const std:
 }  // namespace
 
 bool CredentialTable::isDuplicate(const CredentialInput& input, const std::wstring& name) const {
-    Credential* found = nullptr;
+    const Credential* found = nullptr;
     if (findCredentialByTypeAndRealm(input.type, input.realm, found) == kSuccess) {
         Log(6, "ERROR: Credential already existed.");
         return true;
@@ -94,6 +100,7 @@ ResultCode CredentialTable::addCredential(const CredentialInput& input, std::int
 
 void CredentialTable::insertCredential(std::unique_ptr<Credential> record) {
     m_list.reserve(m_list.size() + 1);
+    record->m_edition = nextEdition();
     record->m_priority = CRED_PRIORITY_HIGHEST;
     makeRoomAtTop();
     m_list.push_back(std::move(record));
@@ -115,7 +122,7 @@ void CredentialTable::makeRoomAtTop() {
 
 ResultCode CredentialTable::updateCredential(const CredentialInput& input) {
     if (input.id < 1) return kInvalidArgument;
-    Credential* const credential = findCredentialById(input.id);
+    const Credential* const credential = findCredentialById(input.id);
     if (credential == nullptr) return kFailure;
     const bool isTtls = credential->m_type == CRED_TYPE_EAP_TTLS;
     const bool isTls = credential->m_type == CRED_TYPE_EAP_TLS;
@@ -127,7 +134,7 @@ ResultCode CredentialTable::updateCredential(const CredentialInput& input) {
     if (isTtls && (input.username.empty() || input.password.empty())) return kFailure;
     Credential changed = *credential;
     applyTexts(changed, input, input.credName);
-    *credential = std::move(changed);
+    replace(*credential, std::move(changed));
     return kSuccess;
 }
 
@@ -150,14 +157,14 @@ bool CredentialTable::setCredentialPosition(std::int32_t id, std::int32_t positi
     std::int32_t target = std::max(position, m_list.front()->m_priority);
     target = std::min(target, m_list.back()->m_priority);
     if (target == 0) return false;
-    Credential* const moved = findCredentialById(id);
+    const Credential* const moved = findCredentialById(id);
     if (moved == nullptr) return false;
     if (moved->m_priority == target) return true;
     if (moved->m_priority > target)
         moveTowardsTop(*moved, target);
     else
         moveTowardsEnd(*moved, target);
-    moved->m_priority = target;
+    setPriority(*moved, target);
     sortByPriority();
     return true;
 }
@@ -182,7 +189,7 @@ void CredentialTable::moveTowardsEnd(const Credential& moved, std::int32_t targe
     }
 }
 
-ResultCode CredentialTable::findCredentialByName(const std::wstring& name, Credential*& out) const {
+ResultCode CredentialTable::findCredentialByName(const std::wstring& name, const Credential*& out) const {
     const auto found = std::find_if(m_list.begin(), m_list.end(),
                                     [&](const auto& credential) { return credential->m_credName == name; });
     out = found == m_list.end() ? nullptr : found->get();
@@ -190,7 +197,7 @@ ResultCode CredentialTable::findCredentialByName(const std::wstring& name, Crede
 }
 
 ResultCode CredentialTable::findCredentialByTypeAndRealm(std::int32_t type, const std::wstring& realm,
-                                                         Credential*& out) const {
+                                                         const Credential*& out) const {
     const auto found = std::find_if(m_list.begin(), m_list.end(), [&](const auto& credential) {
         return credential->m_type == type && credential->m_realm == realm;
     });
@@ -198,29 +205,45 @@ ResultCode CredentialTable::findCredentialByTypeAndRealm(std::int32_t type, cons
     return out == nullptr ? kNotFound : kSuccess;
 }
 
-Credential* CredentialTable::findCredentialById(std::int32_t id) const {
+const Credential* CredentialTable::findCredentialById(std::int32_t id) const {
     const auto found = std::find_if(m_list.begin(), m_list.end(),
                                     [id](const auto& credential) { return credential->m_id == id; });
     return found == m_list.end() ? nullptr : found->get();
 }
 
-std::vector<Credential*> CredentialTable::copyCredentialPointers() const {
-    std::vector<Credential*> pointers;
+std::vector<const Credential*> CredentialTable::copyCredentialPointers() const {
+    std::vector<const Credential*> pointers;
     pointers.reserve(m_list.size());
     for (const auto& credential : m_list)
         pointers.push_back(credential.get());
     return pointers;
 }
 
-std::unordered_map<std::int32_t, Credential*> CredentialTable::credentialsById() const {
-    std::unordered_map<std::int32_t, Credential*> byId;
+std::unordered_map<std::int32_t, const Credential*> CredentialTable::credentialsById() const {
+    std::unordered_map<std::int32_t, const Credential*> byId;
     for (const auto& credential : m_list)
         byId.try_emplace(credential->m_id, credential.get());
     return byId;
 }
 
+// Others may only look at what a table holds: what is changed gets its edition here.
+Credential& CredentialTable::own(const Credential& stored) {
+    return const_cast<Credential&>(stored);
+}
+
+void CredentialTable::replace(const Credential& stored, Credential by) {
+    by.m_priority = stored.m_priority;
+    by.m_edition = nextEdition();
+    own(stored) = std::move(by);
+}
+
+void CredentialTable::setPriority(const Credential& stored, std::int32_t priority) {
+    own(stored).m_priority = priority;
+}
+
 void CredentialTable::appendUnplaced(std::unique_ptr<Credential> record) {
     record->m_priority = CRED_PRIORITY_LOWEST;
+    record->m_edition = nextEdition();
     m_list.push_back(std::move(record));
 }
 

@@ -31,14 +31,18 @@ public:
     bool setCredentialPosition(std::int32_t id, std::int32_t position) REQUIRES(g_hs20Lock);
 
     /// `out` is null where the result is kNotFound.
-    ResultCode findCredentialByName(const std::wstring& name, Credential*& out) const REQUIRES(g_hs20Lock);
+    ResultCode findCredentialByName(const std::wstring& name, const Credential*& out) const
+        REQUIRES(g_hs20Lock);
     ResultCode findCredentialByTypeAndRealm(std::int32_t type, const std::wstring& realm,
-                                            Credential*& out) const REQUIRES(g_hs20Lock);
-    Credential* findCredentialById(std::int32_t id) const REQUIRES(g_hs20Lock);
+                                            const Credential*& out) const REQUIRES(g_hs20Lock);
+    const Credential* findCredentialById(std::int32_t id) const REQUIRES(g_hs20Lock);
 
     /// In order. Valid until the next delete or read.
-    std::vector<Credential*> copyCredentialPointers() const REQUIRES(g_hs20Lock);
-    std::unordered_map<std::int32_t, Credential*> credentialsById() const REQUIRES(g_hs20Lock);
+    std::vector<const Credential*> copyCredentialPointers() const REQUIRES(g_hs20Lock);
+    std::unordered_map<std::int32_t, const Credential*> credentialsById() const REQUIRES(g_hs20Lock);
+
+    /// `stored`, which is of this table, becomes `by`, but keeps its place and its address.
+    void replace(const Credential& stored, Credential by) REQUIRES(g_hs20Lock);
     std::size_t size() const REQUIRES(g_hs20Lock) { return m_list.size(); }
 
     // Steps of reading the file.
@@ -46,12 +50,15 @@ public:
     void clear() REQUIRES(g_hs20Lock) { m_list.clear(); }
     /// Unplaced and unsorted.
     void appendUnplaced(std::unique_ptr<Credential> record) REQUIRES(g_hs20Lock);
+    /// Of one of this table, which stays where it is until it is sorted.
+    static void setPriority(const Credential& stored, std::int32_t priority) REQUIRES(g_hs20Lock);
     /// Credentials without a place come first, in their order. False if a priority would overflow.
     bool placeUnplacedCredentials() REQUIRES(g_hs20Lock);
     void sortByPriority() REQUIRES(g_hs20Lock);
     void dumpCredentials() const REQUIRES(g_hs20Lock);
 
 private:
+    static Credential& own(const Credential& stored) REQUIRES(g_hs20Lock);
     bool isDuplicate(const CredentialInput& input, const std::wstring& name) const REQUIRES(g_hs20Lock);
     void insertCredential(std::unique_ptr<Credential> record) REQUIRES(g_hs20Lock);
     bool shiftPlacedDown() REQUIRES(g_hs20Lock);

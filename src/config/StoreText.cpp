@@ -117,7 +117,7 @@ void appendCredentialText(std::string& text, const Credential& credential, const
 }
 
 void appendUserText(std::string& text, const std::wstring& userName,
-                    const std::vector<Credential*>& credentials) {
+                    const std::vector<const Credential*>& credentials) {
     text.append("<user>");
     appendElement(text, "username", userName);
     text.append("<credentials>");

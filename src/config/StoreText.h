@@ -17,6 +17,6 @@ void appendCredentialText(std::string& text, const Credential& credential, const
 
 /// The user's own list: which credentials he sees, in which places.
 void appendUserText(std::string& text, const std::wstring& userName,
-                    const std::vector<Credential*>& credentials);
+                    const std::vector<const Credential*>& credentials);
 
 }  // namespace vexa

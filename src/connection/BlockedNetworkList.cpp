@@ -12,8 +12,8 @@ namespace {
 
 constexpr std::uint32_t kRecentLimit = 800;  // milliseconds
 
-Credential* credentialOf(std::int32_t credId, const CredentialTable& credentials) REQUIRES(g_hs20Lock) {
-    Credential* const credential = credId == 0 ? nullptr : credentials.findCredentialById(credId);
+const Credential* credentialOf(std::int32_t credId, const CredentialTable& credentials) REQUIRES(g_hs20Lock) {
+    const Credential* const credential = credId == 0 ? nullptr : credentials.findCredentialById(credId);
     if (credential == nullptr) Log(6, "ERROR: Cannot get credential.");
     return credential;
 }

@@ -20,7 +20,7 @@ struct EngineState;
 /// A network and the credential to join it with; both null if there is none.
 struct NetworkChoice {
     Hs20Network* network = nullptr;
-    Credential* credential = nullptr;
+    const Credential* credential = nullptr;
 };
 
 /// The network connecting thread: the only place where the system decides by itself to connect. It sleeps on
@@ -57,8 +57,8 @@ private:
     /// One attempt: chooses, finds or builds the profile, and asks for the connection.
     ConnectOutcome connectNetwork() EXCLUDES(g_hs20Lock);
     NetworkChoice findBestMatchBssAndCredential() REQUIRES(g_hs20Lock);
-    Credential* selectCredential(const Hs20Network& network, const std::vector<Credential*>& found)
-        REQUIRES(g_hs20Lock);
+    const Credential* selectCredential(const Hs20Network& network,
+                                       const std::vector<const Credential*>& found) REQUIRES(g_hs20Lock);
     NetworkProfile* profileFor(const NetworkChoice& choice, const std::wstring& name) REQUIRES(g_hs20Lock);
     NetworkProfile* reusableProfile(const NetworkChoice& choice, const std::wstring& name)
         REQUIRES(g_hs20Lock);

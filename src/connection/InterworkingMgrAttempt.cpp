@@ -39,12 +39,12 @@ void logChoice(const NetworkChoice& best, const NetworkChoice& next) {
 }  // namespace
 
 // The first credential by priority that may be used for auto-connect and has attempts left.
-Credential* InterworkingMgr::selectCredential(const Hs20Network& network,
-                                              const std::vector<Credential*>& found) {
+const Credential* InterworkingMgr::selectCredential(const Hs20Network& network,
+                                                    const std::vector<const Credential*>& found) {
     Log(3, "\n\tFound %d credentials", static_cast<int>(found.size()));
     Log(3, "\tChecking found credentials...");
     const CredentialTable& credentials = m_engine.m_config.credentials();
-    for (Credential* credential : found) {
+    for (const Credential* credential : found) {
         logCandidate(*credential);
         if (!credential->m_bAutoConnect) {
             Log(3, "Credential is not configured as auto-connect, skipping...");

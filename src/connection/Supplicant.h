@@ -162,7 +162,7 @@ private:
     ResultCode disconnectedBSS(Leave what) REQUIRES(g_hs20Lock);
     const char* reasonNotToBlock() const REQUIRES(g_hs20Lock);
     /// Null if there is none.
-    Credential* findCredential(std::int32_t id) REQUIRES(g_hs20Lock);
+    const Credential* findCredential(std::int32_t id) REQUIRES(g_hs20Lock);
 
     SupplicantMgr& m_mgr;
     EngineState m_engine;

@@ -9,7 +9,7 @@ using platform::LockGuard;
 
 }  // namespace
 
-Credential* Supplicant::findCredential(std::int32_t id) {
+const Credential* Supplicant::findCredential(std::int32_t id) {
     return id < 1 ? nullptr : m_engine.m_config.credentials().findCredentialById(id);
 }
 

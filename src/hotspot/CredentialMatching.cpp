@@ -64,7 +64,7 @@ bool fits(const Credential& credential, const RealmInfo& offer) {
 }  // namespace
 
 CredentialMatcher::CredentialMatcher(const CredentialTable& table) {
-    for (Credential* credential : table.copyCredentialPointers()) {
+    for (const Credential* credential : table.copyCredentialPointers()) {
         auto realm = credential->m_realm.empty() ? std::nullopt : contract::realmBytes(credential->m_realm);
         if (realm) m_candidates.push_back({credential, std::move(*realm)});
     }
@@ -76,7 +76,8 @@ CredentialMatcher::CredentialMatcher(const CredentialTable& table) {
 }
 
 // There are many realms in the air and few that a credential is for.
-std::vector<Credential*> CredentialMatcher::findCredentialsForNetwork(const Hs20Network& network) const {
+std::vector<const Credential*> CredentialMatcher::findCredentialsForNetwork(
+    const Hs20Network& network) const {
     std::vector<bool> isFitting(m_candidates.size());
     bool isAnyFitting = false;
     for (const RealmInfo& realm : network.m_realms) {
@@ -85,7 +86,7 @@ std::vector<Credential*> CredentialMatcher::findCredentialsForNetwork(const Hs20
         for (const std::size_t candidate : candidates->second)
             if (fits(*m_candidates[candidate].credential, realm)) isAnyFitting = isFitting[candidate] = true;
     }
-    std::vector<Credential*> found;
+    std::vector<const Credential*> found;
     for (std::size_t candidate = 0; isAnyFitting && candidate < m_candidates.size(); ++candidate)
         if (isFitting[candidate]) found.push_back(m_candidates[candidate].credential);
     return found;
@@ -111,11 +112,11 @@ bool domainNameMatch(const ByteBuffer& domainNames, std::string_view name) {
     });
 }
 
-Credential* findRoamingConsortiumCredential(const CredentialTable& table, const Hs20Network& network) {
+const Credential* findRoamingConsortiumCredential(const CredentialTable& table, const Hs20Network& network) {
     const Bytes element = findElement(network.m_ies, kRoamingConsortiumElement);
     if (element.empty() && network.m_anqpRoamingConsortium.empty()) return nullptr;
-    Credential* best = nullptr;
-    for (Credential* credential : table.copyCredentialPointers()) {
+    const Credential* best = nullptr;
+    for (const Credential* credential : table.copyCredentialPointers()) {
         if (credential->m_roamingConsortium.empty()) continue;
         const auto id = narrowForMatch(credential->m_roamingConsortium);
         if (!id) continue;

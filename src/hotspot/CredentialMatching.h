@@ -21,11 +21,12 @@ public:
     CredentialMatcher& operator=(const CredentialMatcher&) = delete;
 
     /// By ascending priority, table order among equals.
-    std::vector<Credential*> findCredentialsForNetwork(const Hs20Network& network) const REQUIRES(g_hs20Lock);
+    std::vector<const Credential*> findCredentialsForNetwork(const Hs20Network& network) const
+        REQUIRES(g_hs20Lock);
 
 private:
     struct Candidate {
-        Credential* credential;
+        const Credential* credential;
         std::string realm;
     };
     std::vector<Candidate> m_candidates;  // in the order in which they are found
@@ -39,7 +40,7 @@ bool isHomeSpNetwork(const CredentialTable& table, const ByteBuffer& domainNames
 bool domainNameMatch(const ByteBuffer& domainNames, std::string_view name);
 
 /// The credential of the smallest priority whose roaming consortium the network announces; null if none fits.
-Credential* findRoamingConsortiumCredential(const CredentialTable& table, const Hs20Network& network)
+const Credential* findRoamingConsortiumCredential(const CredentialTable& table, const Hs20Network& network)
     REQUIRES(g_hs20Lock);
 
 /// Whether a Roaming Consortium element (id, length, body) names this organisation.

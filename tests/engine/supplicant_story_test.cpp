@@ -140,8 +140,10 @@ STORY(SupplicantStory, TheHomeNetworkGoesFirstAndARoamingConsortiumIsLeftAlone,
         const platform::LockGuard lock(g_hs20Lock);
         const auto supplicant = supplicantOf(kFirst);
         const auto networks = supplicant->networks().copyPointers();
-        Credential& credential = *supplicant->credentials().copyCredentialPointers().at(0);
-        credential.m_homeSpFqdn = credential.m_roamingConsortium = L"ab";
+        CredentialTable& table = SupplicantMgr::instance().config().credentials();
+        Credential now = *table.copyCredentialPointers().at(0);
+        now.m_homeSpFqdn = now.m_roamingConsortium = L"ab";
+        table.replace(*table.copyCredentialPointers().at(0), now);
         networks.at(0)->m_anqpRoamingConsortium = bytesOfHex("026162");
         networks.at(1)->m_anqpDomainName = bytesOfHex("026162");
     }

@@ -20,9 +20,9 @@ CredentialTable tableOf(const std::string& places) {
     for (int priority = 0; pairs >> id >> colon >> priority;) {
         auto record = std::make_unique<Credential>(id, L"c", CRED_TYPE_EAP_TTLS, CRED_ACCESS_ALL_USER);
         record->m_credName = record->m_realm = std::to_wstring(id);
-        Credential* const kept = record.get();
+        const Credential& kept = *record;
         table.appendUnplaced(std::move(record));
-        kept->m_priority = priority;
+        CredentialTable::setPriority(kept, priority);
     }
     table.sortByPriority();
     return table;
@@ -135,7 +135,9 @@ TEST(CredentialTable, AnEditChangesTextsAloneAndNeedsAUserWhereThereIsOne) {
         (incomplete.*text).clear();
         EXPECT_EQ(table.updateCredential(incomplete), kFailure);
     }
-    table.findCredentialById(1)->m_type = CRED_TYPE_EAP_TLS;
+    Credential certificate = *table.findCredentialById(1);
+    certificate.m_type = CRED_TYPE_EAP_TLS;
+    table.replace(*table.findCredentialById(1), certificate);
     CredentialInput ofTls = input(L"s");
     ofTls.id = 1;
     ofTls.username.clear();

@@ -152,8 +152,11 @@ Deed adding(const std::string& realm) {
 Deed editing(int id, const std::string& realm) {
     return [=](StoreMachine& store) {
         store.change([&](CredentialTable& table) {
-            if (Credential* const edited = table.findCredentialById(id))
-                edited->m_realm = wideFromNarrow(realm);
+            const Credential* const edited = table.findCredentialById(id);
+            if (edited == nullptr) return;
+            Credential now = *edited;
+            now.m_realm = wideFromNarrow(realm);
+            table.replace(*edited, std::move(now));
         });
     };
 }
@@ -311,7 +314,7 @@ TEST(Sharing, WhatOthersChangedIsTakenOverAndWhatCouldNotBeSavedStays) {
 void changeAtRandom(Config& config, unsigned kind, std::int32_t id, const std::wstring& text) {
     const auto held = config.beginChange();
     CredentialTable& table = config.credentials();
-    Credential* const one = table.findCredentialById(config.currentId(id));
+    const Credential* const one = table.findCredentialById(config.currentId(id));
     CredentialInput input;
     input.type = kind % 2 == 0 ? CRED_TYPE_EAP_TTLS : CRED_TYPE_EAP_TLS;
     input.realm = input.username = input.caCert = text;
@@ -319,9 +322,11 @@ void changeAtRandom(Config& config, unsigned kind, std::int32_t id, const std::w
     if (kind < 3 && table.addCredential(input, config.nextCredId(), config.userName(), added) == kSuccess)
         config.advanceNextCredId();
     if (kind == 3 && one != nullptr) {
-        if (!text.empty() && id % 3 == 0) one->m_credName = one->m_realm = text;
-        if (id % 3 == 1) one->m_password = text;
-        if (id % 3 == 2) one->m_bAutoConnect = !one->m_bAutoConnect;
+        Credential now = *one;
+        if (!text.empty() && id % 3 == 0) now.m_credName = now.m_realm = text;
+        if (id % 3 == 1) now.m_password = text;
+        if (id % 3 == 2) now.m_bAutoConnect = !now.m_bAutoConnect;
+        table.replace(*one, std::move(now));
     }
     if (kind == 4) table.deleteCredential(config.currentId(id));
     if (kind == 5) table.setCredentialPosition(config.currentId(id), id);
