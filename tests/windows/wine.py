@@ -26,6 +26,8 @@ import harness
 from harness import PATIENCE, STORE, ControlClient, Program, clean_environment, free_ports, is_running, wait_until
 
 STAND_INS = ("wlanapi", "iphlpapi", "wtsapi32", "secur32")
+# All that Wine itself says: why it has ended a program.
+WORDS_OF_WINE = "-all,err+seh,err+virtual,err+thread,err+process,err+module,err+server"
 
 CLONE_NEWNET = 0x40000000
 SIOCGIFFLAGS, SIOCSIFFLAGS, IFF_UP = 0x8913, 0x8914, 1
@@ -56,9 +58,9 @@ def windows_path(path):
 
 
 def environment(**variables):
-    """Without a window, a menu or a word of Wine's own; the stand-ins go first where they stand beside a program."""
+    """Without a window or a menu of Wine's own; the stand-ins go first where they stand beside a program."""
     overrides = ";".join([f"{','.join(STAND_INS)}=n,b", "mscoree,mshtml,winemenubuilder.exe="])
-    return clean_environment(WINEPREFIX=str(PREFIX), WINEDEBUG="-all", WINEDLLOVERRIDES=overrides, **variables)
+    return clean_environment(WINEPREFIX=str(PREFIX), WINEDEBUG=WORDS_OF_WINE, WINEDLLOVERRIDES=overrides, **variables)
 
 
 @functools.cache
