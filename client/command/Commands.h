@@ -11,7 +11,6 @@ namespace vexa::client {
 
 void addStartCommand(CLI::App& app, int& exitCode);
 void addDemoCommand(CLI::App& app, int& exitCode);
-void addReplayCommand(CLI::App& app, int& exitCode);
 
 /// What there is on this kind of machine alone.
 void addHostCommands(CLI::App& app, int& exitCode);
@@ -36,6 +35,7 @@ void addReloadCommand(CLI::App& app, int& exitCode);
 void addLogCommand(CLI::App& app, int& exitCode);
 void addScenarioCommand(CLI::App& app, int& exitCode);
 void addStatsCommand(CLI::App& app, int& exitCode);
+void addReplayCommand(CLI::App& app, int& exitCode);
 void addStatusCommand(CLI::App& app, int& exitCode);
 void addConnectCommand(CLI::App& app, int& exitCode);
 void addDisconnectCommand(CLI::App& app, int& exitCode);

@@ -19,12 +19,13 @@ namespace {
 using namespace vexa::client;
 
 constexpr std::array kCommands{
-    &addStartCommand,      &addHostCommands,    &addStatusCommand,  &addScanCommand,
-    &addChannelsCommand,   &addNetworksCommand, &addConnectCommand, &addDisconnectCommand,
-    &addEnableCommand,     &addDisableCommand,  &addRefreshCommand, &addCredentialsCommand,
-    &addCredentialCommand, &addReloadCommand,   &addWatchCommand,   &addLogCommand,
-    &addDoctorCommand,     &addSendCommand,     &addListenCommand,  &addRecordCommand,
-    &addStatsCommand,      &addScenarioCommand, &addPanelCommand,   &addShellCommands};
+    &addStartCommand,      &addHostCommands,    &addStatusCommand,   &addScanCommand,
+    &addChannelsCommand,   &addNetworksCommand, &addConnectCommand,  &addDisconnectCommand,
+    &addEnableCommand,     &addDisableCommand,  &addRefreshCommand,  &addCredentialsCommand,
+    &addCredentialCommand, &addReloadCommand,   &addWatchCommand,    &addLogCommand,
+    &addDoctorCommand,     &addSendCommand,     &addListenCommand,   &addRecordCommand,
+    &addStatsCommand,      &addReplayCommand,   &addScenarioCommand, &addPanelCommand,
+    &addShellCommands};
 
 int report(const std::exception& error, int exitCode) {
     std::cerr << "vexa: " << error.what() << '\n';

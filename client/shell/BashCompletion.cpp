@@ -8,7 +8,7 @@ namespace {
 
 // Bash splits words at characters such as the colon, and replaces only what stands behind the last of them or
 // behind an open quote. So the line is taken apart here, and what bash leaves standing is cut off the names.
-constexpr const char* kFunctions = R"bash(
+constexpr const char* kBashFunctions = R"bash(
 # Takes $1 apart: `words` without quotes, the last one unfinished; `open`, the quote that it stands in; `kept`, what
 # bash leaves standing of it.
 _vexa_split() {
@@ -105,7 +105,7 @@ _vexa() {
 complete -F _vexa vexa
 )bash";
 
-std::string kindText(const OptionText& option) {
+std::string bashKind(const OptionText& option) {
     if (option.kind == ValueKind::Choice) return "words " + joined(option.choices, " ");
     if (option.kind == ValueKind::Directory) return "directories";
     if (option.kind == ValueKind::File) return "files";
@@ -141,7 +141,7 @@ std::string optionNames(const CommandText& command) {
 void appendKinds(std::ostream& out, const CommandText& program) {
     out << "\n_vexa_kind() {\n    kind=''\n    case $1 in\n";
     for (const auto& [words, option] : valuePlaces(program))
-        out << "        '" << words << "') kind='" << kindText(*option) << "' ;;\n";
+        out << "        '" << words << "') kind='" << bashKind(*option) << "' ;;\n";
     out << "        *) return 1 ;;\n    esac\n}\n";
 }
 
@@ -153,7 +153,7 @@ std::string bashCompletion(const CommandText& program) {
     appendWords(out, "_vexa_words", program, commandNames);
     appendWords(out, "_vexa_options", program, optionNames);
     appendKinds(out, program);
-    out << kFunctions;
+    out << kBashFunctions;
     return out.str();
 }
 

@@ -6,7 +6,7 @@ namespace vexa::client {
 
 namespace {
 
-constexpr const char* kFunctions = R"fish(
+constexpr const char* kFishFunctions = R"fish(
 # Succeeds where the words before the cursor name the command $argv[1]; with $argv[2] only in this place of its
 # arguments.
 function __vexa_at
@@ -89,7 +89,7 @@ std::string fishCompletion(const CommandText& program) {
                 out << (option.value.empty() ? "" : " " + fishQuoted(command->path + " " + name));
         }
     }
-    out << '\n' << kFunctions;
+    out << '\n' << kFishFunctions;
     for (const CommandText* command : allCommands(program))
         appendCommand(out, *command);
     return out.str();
