@@ -57,6 +57,8 @@ int run(int argc, char** argv, Silence& silence) {
     CLI::App app("The Vexa wireless service: start it, look at the air, keep its credentials.", "vexa");
     app.set_version_flag("--version", std::string("vexa ") + vexa::contract::version());
     addJsonVersion(app);
+    // What begins with a slash is a name or a path, on every system.
+    app.allow_windows_style_options(false);
     app.add_subcommand("help", "Tell how to use a command");
     app.require_subcommand(1);
     int exitCode = kExitOk;

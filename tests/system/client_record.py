@@ -7,7 +7,7 @@ import subprocess
 import zlib
 
 from client_credentials import CredentialStory
-from harness import CHANNEL_LIST, Story, network, wait_until
+from harness import CHANNEL_LIST, Story, clean_environment, network, wait_until
 
 NETWORKS = [
     network(1, "Airport", {"roam.example": [21], "corp.example": [13]}),
@@ -47,7 +47,8 @@ class RecordStory(CredentialStory):
 
     def record(self, name, *options):
         self.file = self.new_folder() / name
-        return self.running("record", self.file, "--machine", self.machine.folder, *options)
+        environment = clean_environment(VEXA_MACHINE=str(self.machine.folder))
+        return self.running("record", self.file, *options, environment=environment)
 
     def recorded(self):
         """What can be read now; the file may be cut off anywhere."""
@@ -164,13 +165,18 @@ AIR = [
 ]
 
 
+def replay_of(story, file, *options):
+    """A replay that runs, and its two ports."""
+    replay = story.running("replay", file, *options)
+    words = replay.wait_line("vexa watch").split()
+    return replay, words[words.index("--sa-port") + 1], words[words.index("--hs20-port") + 1]
+
+
 class Replay(Story):
     def replay(self, *options):
         file = self.new_folder() / "air.rec"
         file.write_text(text_of(AIR))
-        replay = self.running("replay", file, *options)
-        words = replay.wait_line("vexa watch").split()
-        return replay, words[words.index("--sa-port") + 1], words[words.index("--hs20-port") + 1]
+        return replay_of(self, file, *options)
 
     def at(self, *command):
         return self.vexa(*command, VEXA_MACHINE="/nonexistent")
@@ -199,6 +205,21 @@ class Replay(Story):
         networks.wait_line('"connected":true', count=3)
         networks.wait_line('"connected":false', count=3)
         self.assertEqual((replay.stop(signal.SIGINT), networks.wait()), (130, 1))
+
+
+class Again(RecordStory):
+    def test_a_replay_tells_what_the_service_told(self):
+        recorder = self.record("a.rec.gz")
+        self.wait_events("SPECTRAL_ANALYSER_SAMPLE_DATA_INTERFERENCE", 2)
+        wait_until(lambda: any("Airport" in told["Data"] for told in self.events(LIST)), "the networks")
+        live = self.told("scan"), self.told("networks")
+        self.assertEqual([len(live[0]["channels"]), len(live[1])], [2, 2])
+        self.assertEqual((recorder.stop(signal.SIGINT), self.machine.stop()), (130, 0))
+        replay, sa, hs20 = replay_of(self, self.file, "--speed", "100")
+        listener = self.running("listen", sa)
+        replay.wait_line("The recording has ended")
+        self.assertEqual((self.told("scan", "--port", sa), self.told("networks", "--hs20-port", hs20)), live)
+        self.assertEqual((listener.stop(signal.SIGINT), replay.wait(), replay.errors), (130, 0, []))
 
 
 class Scenario(RecordStory):

@@ -46,7 +46,7 @@ class Exchange(Story):
             return result, machine.config().read_bytes()
 
     def run_native(self, act):
-        with wine.native_connections():
+        with wine.native_programs():
             return self.run_on(wine.NativeMachine(self.SCENARIO, folder=self.native), act)
 
     def run_windows(self, act, **config):

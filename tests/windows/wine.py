@@ -12,6 +12,7 @@ import functools
 import json
 import os
 import pathlib
+import shlex
 import shutil
 import signal
 import socket
@@ -36,6 +37,7 @@ BUILD, PREFIX = (pathlib.Path(os.environ[name]) for name in ("VEXA_WINDOWS_BUILD
 USERS = PREFIX / "drive_c" / "users"
 
 open_direct = harness.open_connection  # as a process that is not Wine's
+native_program = harness.program
 NativeMachine = harness.Machine
 
 
@@ -80,6 +82,17 @@ def stage():
 def client():
     """The client's executable; the libraries beside it are the system's."""
     return stage() / "plain" / "vexa.exe"
+
+
+@functools.cache
+def program(name):
+    """A program of this host that becomes the one in Wine, for whoever starts it himself."""
+    relay()
+    path = stage() / name
+    settings = [f"{variable}={environment()[variable]}" for variable in ("WINEPREFIX", "WINEDEBUG", "WINEDLLOVERRIDES")]
+    path.write_text(f'#!/bin/sh\nexec env {shlex.join(settings)} wine {stage()}/plain/{name}.exe "$@"\n')
+    path.chmod(0o700)
+    return str(path)
 
 
 def service(simulated=True):
@@ -163,13 +176,13 @@ def open_connection(port, timeout=PATIENCE, receive_buffer=None):
 
 
 @contextlib.contextmanager
-def native_connections():
+def native_programs():
     """For a machine of the native programs, of VEXA_BUILD, beside this one."""
-    harness.open_connection = open_direct
+    harness.open_connection, harness.program = open_direct, native_program
     try:
         yield
     finally:
-        harness.open_connection = open_connection
+        harness.open_connection, harness.program = open_connection, program
 
 
 def service_pid(port):
@@ -246,7 +259,8 @@ class Machine(NativeMachine):
         return path.read_text(encoding="latin-1") if path.exists() else ""
 
 
-harness.open_connection, harness.run_client, harness.Machine = open_connection, run_client, Machine
+harness.open_connection, harness.program = open_connection, program
+harness.run_client, harness.Machine = run_client, Machine
 enter_own_network()
 
 if __name__ == "__main__":
