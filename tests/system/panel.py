@@ -97,12 +97,10 @@ class Page(WebSocket):
 class PanelStory(Story):
     scenario = {"networks": NETWORKS, "spectrum": CHANNELS, "config": config("true")}
 
-    def panel(self, *options, machine=None, **options_of_environment):
-        folder = machine or self.machine.folder
-        environment = clean_environment(**options_of_environment) if options_of_environment else None
+    def panel(self, *options, machine=None, **variables):
+        environment = clean_environment(VEXA_MACHINE=str(machine or self.machine.folder), **variables)
         self.folder = self.new_folder()
-        arguments = ["--machine", folder, "--recordings", self.folder, *options]
-        self.process = self.running("panel", *arguments, environment=environment)
+        self.process = self.running("panel", "--recordings", self.folder, *options, environment=environment)
         return Browser(self.process.wait_line("http://"))
 
     def entered(self, *options):
