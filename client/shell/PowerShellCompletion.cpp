@@ -24,27 +24,36 @@ constexpr const char* kPowerShellTail = R"ps(
     $option = ''
     foreach ($word in $words) {
         if ($option) { $option = '' }
-        elseif ($word.StartsWith('-')) { if ($values.ContainsKey("$path $word")) { $option = $word } }
+        elseif ($word.StartsWith('-', 'Ordinal')) { if ($values.ContainsKey("$path $word")) { $option = $word } }
         elseif ($commands[$path] -and $commands[$path].Contains($word)) { $path = "$path $word".Trim() }
         else { $place++ }
     }
     $key = if ($option) { "$path $option" } else { "$path $place" }
-    $found = [ordered]@{}
-    if (-not $option -and $wordToComplete.StartsWith('-')) { $found = $options[$path] }
+    # Not [ordered], which takes CAFE for Cafe.
+    $found = [System.Collections.Specialized.OrderedDictionary]::new()
+    if (-not $option -and $wordToComplete.StartsWith('-', 'Ordinal')) { $found = $options[$path] }
     elseif ($values.ContainsKey($key)) {
         $kind, $rest = $values[$key]
         if ($kind -eq 'words') { foreach ($name in $rest) { $found[$name] = $name } }
         elseif ($kind) {
-            [Console]::OutputEncoding = [System.Text.Encoding]::UTF8
-            foreach ($name in @(& $all[0] __complete $kind @words 2>$null)) { $found[$name] = $name }
+            $encoding = [Console]::OutputEncoding
+            try {
+                [Console]::OutputEncoding = [System.Text.UTF8Encoding]::new($false)
+                foreach ($name in @(& $all[0] __complete $kind @words 2>$null)) { $found[$name] = $name }
+            }
+            finally { [Console]::OutputEncoding = $encoding }
         }
     }
     elseif ($commands[$path]) { $found = $commands[$path] }
     $typed = $wordToComplete.Trim([char[]]"'""")
-    foreach ($name in $found.Keys) {
-        if (-not $name.StartsWith($typed)) { continue }
-        $text = if ($name -match '^[\w./-]+$') { $name } else { "'" + $name.Replace("'", "''") + "'" }
-        [System.Management.Automation.CompletionResult]::new($text, $name, 'ParameterValue', $found[$name])
+    # Not .Keys, which would be the value of a name that reads so.
+    foreach ($one in $found.GetEnumerator()) {
+        $name = $one.Key
+        if (-not $name -or -not $name.StartsWith($typed, 'OrdinalIgnoreCase')) { continue }
+        # Curly apostrophes end a text, too.
+        $quoted = [System.Management.Automation.Language.CodeGeneration]::EscapeSingleQuotedStringContent($name)
+        $text = if ($name -match '^[\w./-]+$') { $name } else { "'$quoted'" }
+        [System.Management.Automation.CompletionResult]::new($text, $name, 'ParameterValue', $one.Value)
     }
 }
 )ps";
@@ -53,7 +62,7 @@ std::string powerShellQuoted(const std::string& text) {
     return "'" + escapedText(text, "'", "'") + "'";
 }
 
-std::string kindText(const OptionText& option) {
+std::string powerShellKind(const OptionText& option) {
     if (option.kind != ValueKind::Choice) return "@(" + powerShellQuoted(askedNames(option.kind)) + ")";
     std::string text = "@('words'";
     for (const std::string& choice : option.choices)
@@ -76,7 +85,7 @@ void appendTable(std::ostream& out, const char* name, const CommandText& program
 void appendValues(std::ostream& out, const CommandText& program) {
     out << "    $values = @{\n";
     for (const auto& [words, option] : valuePlaces(program))
-        out << "        " << powerShellQuoted(words) << " = " << kindText(*option) << '\n';
+        out << "        " << powerShellQuoted(words) << " = " << powerShellKind(*option) << '\n';
     out << "    }\n";
 }
 
