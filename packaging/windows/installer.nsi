@@ -1,5 +1,5 @@
 ; Installs what is in the zip for the user who runs it, without more rights than he has, and removes what it brought.
-;   makensis -DVERSION=1.2.3 -DSIZE=KILOBYTES -DFILES=LIST -DOUTPUT=FILE installer.nsi
+;   makensis -DVERSION=1.2.3 -DSIZE=KILOBYTES -DLICENCE=TEXT -DFILES=LIST -DOUTPUT=FILE installer.nsi
 ; LIST has the macros InstallFiles and RemoveFiles. Exit codes: 0 done, 1 cancelled, 3 refused because Vexa is running.
 
 Target amd64-unicode
@@ -9,6 +9,7 @@ ManifestDPIAware true
 RequestExecutionLevel user
 
 !include LogicLib.nsh
+!include MUI2.nsh
 !include Util.nsh
 !include WinMessages.nsh
 !include path.nsh
@@ -30,10 +31,28 @@ VIAddVersionKey FileDescription "Vexa, installer"
 VIAddVersionKey CompanyName "Korvane"
 VIAddVersionKey LegalCopyright "Korvane"
 
-Page directory
-Page instfiles
-UninstPage uninstConfirm
-UninstPage instfiles
+!define MUI_ICON "${NSISDIR}/Contrib/Graphics/Icons/orange-install.ico"
+!define MUI_UNICON "${NSISDIR}/Contrib/Graphics/Icons/orange-uninstall.ico"
+!define MUI_WELCOMEFINISHPAGE_BITMAP "${NSISDIR}/Contrib/Graphics/Wizard/orange.bmp"
+!insertmacro MUI_PAGE_LICENSE "${LICENCE}"
+!define MUI_DIRECTORYPAGE_TEXT_TOP "Setup installs Vexa ${VERSION} for you alone: it needs no administrator's rights, and \
+  other users of this computer keep theirs. To install in a different folder, click Browse."
+!insertmacro MUI_PAGE_DIRECTORY
+!insertmacro MUI_PAGE_INSTFILES
+!define MUI_FINISHPAGE_TITLE "Vexa is installed"
+!define MUI_FINISHPAGE_TEXT_LARGE
+!define MUI_FINISHPAGE_TEXT "Open a new Command Prompt or PowerShell.$\r$\n$\r$\n\
+  vexa start$\r$\nstarts the service, until Ctrl-C.$\r$\n$\r$\n\
+  vexa panel$\r$\nin a second window shows all it knows in the browser."
+!define MUI_FINISHPAGE_SHOWREADME "$INSTDIR\README.txt"
+!define MUI_FINISHPAGE_SHOWREADME_TEXT "Read what else there is (README.txt)"
+!insertmacro MUI_PAGE_FINISH
+
+!define MUI_UNCONFIRMPAGE_TEXT_TOP "Vexa ${VERSION} will be removed. What the service has stored stays: settings and \
+  credentials, and its log, in C:\Users\Public\Roaming\Korvane."
+!insertmacro MUI_UNPAGE_CONFIRM
+!insertmacro MUI_UNPAGE_INSTFILES
+!insertmacro MUI_LANGUAGE English
 
 ; A program that runs can't be opened for writing. Nothing has been changed by then.
 !macro RefuseIfInUse program
