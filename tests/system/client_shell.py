@@ -76,6 +76,17 @@ class InShells(CredentialStory):
                     self.assertEqual(self.completed(shell, typed), arguments, (name, typed))
 
 
+class PowerShell(Story):
+    def test_it_can_read_the_tables(self):
+        """It isn't here to be asked. Two keys that differ in case alone are one too many for it, and some versions read
+        what isn't ASCII in a code page."""
+        script = self.done("completion", "powershell", VEXA_MACHINE=None)
+        self.assertTrue(script.isascii())
+        tables = [re.findall(r"[{;] '([^']+)' = '", line.lower()) for line in script.splitlines() if "[ordered]@{" in line]
+        self.assertTrue(any("--machine" in keys for keys in tables))
+        self.assertEqual([keys for keys in tables if len(keys) > len(set(keys))], [])
+
+
 class Asking(Story):
     def test_names_are_not_waited_for(self):
         with socket.create_server(("127.0.0.1", 0)) as mute:
