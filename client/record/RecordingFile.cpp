@@ -11,6 +11,8 @@
 
 namespace vexa::client {
 
+namespace fs = std::filesystem;
+
 namespace {
 
 ByteSource standardInput() {
@@ -28,8 +30,27 @@ std::string recordingName(const std::string& name) {
     return name == kStandardStream ? "the recording" : name;
 }
 
-std::filesystem::path recordingPath(const std::string& name) {
+fs::path recordingPath(const std::string& name) {
     return {std::u8string(name.begin(), name.end())};
+}
+
+// What is no file, as a pipe is, has no content to lose and keeps its rights.
+std::ofstream createFile(const std::string& name) {
+    const fs::path path = recordingPath(name);
+    std::error_code error;
+    const bool isFile = !fs::exists(path, error) || fs::is_regular_file(path, error);
+    if (isFile && fs::file_size(path, error) > 0 && !error)
+        throw ClientError(name + " is there already, and nothing is written over another file");
+    errno = 0;
+    std::ofstream file(path, std::ios::binary | std::ios::app);
+    if (!file) failWriting(name);
+    if (isFile) fs::permissions(path, fs::perms::owner_read | fs::perms::owner_write, error);
+    return file;
+}
+
+void failWriting(const std::string& name) {
+    throw ClientError(recordingName(name) +
+                      " cannot be written: " + std::generic_category().message(errno));
 }
 
 ByteSource openRecording(const std::string& name) {

@@ -2,6 +2,7 @@
 
 #include <cstddef>
 #include <filesystem>
+#include <fstream>
 #include <functional>
 #include <span>
 #include <string>
@@ -16,6 +17,13 @@ std::string recordingName(const std::string& name);
 
 /// Its path; names are UTF-8.
 std::filesystem::path recordingPath(const std::string& name);
+
+/// A new file for its owner alone, or one that is empty, or a pipe and the like as it is. Throws ClientError
+/// if there is another file.
+std::ofstream createFile(const std::string& name);
+
+/// Throws ClientError with the reason in errno.
+[[noreturn]] void failWriting(const std::string& name);
 
 /// Gives the next bytes of something that is read; none at its end.
 using ByteSource = std::function<std::size_t(std::span<char> buffer)>;

@@ -1,20 +1,14 @@
 #include "client/record/RecordingWriter.h"
 
-#include <cerrno>
 #include <ctime>
-#include <filesystem>
 #include <iomanip>
 #include <iostream>
 #include <sstream>
-#include <system_error>
 
 #include "client/record/RecordingFile.h"
-#include "client/terminal/ClientError.h"
 #include "contract/Version.h"
 
 namespace vexa::client {
-
-namespace fs = std::filesystem;
 
 namespace {
 
@@ -27,21 +21,6 @@ std::string universalTime() {
     return text.str();
 }
 
-[[noreturn]] void fail(const std::string& name, int error) {
-    throw ClientError(recordingName(name) + " cannot be written: " + std::generic_category().message(error));
-}
-
-// What is no file, as a pipe is, has no content to lose and keeps its rights.
-void prepare(const fs::path& path, const std::string& name) {
-    std::error_code error;
-    if (fs::exists(path, error) && !fs::is_regular_file(path, error)) return;
-    if (fs::file_size(path, error) > 0 && !error)
-        throw ClientError(name + " is there already, and no recording is written over another file");
-    errno = 0;
-    if (!std::ofstream(path, std::ios::app)) fail(name, errno);
-    fs::permissions(path, fs::perms::owner_read | fs::perms::owner_write, error);
-}
-
 }  // namespace
 
 RecordingWriter::RecordingWriter(const std::string& name, bool showPasswords)
@@ -50,11 +29,7 @@ RecordingWriter::RecordingWriter(const std::string& name, bool showPasswords)
       m_gzip(name.ends_with(".gz") ? std::make_unique<GzipWriter>() : nullptr),
       m_showPasswords(showPasswords),
       m_start(std::chrono::steady_clock::now()) {
-    if (name != kStandardStream) {
-        prepare(recordingPath(name), name);
-        m_file.open(recordingPath(name), std::ios::binary);
-        if (!m_file) fail(name, errno);
-    }
+    if (name != kStandardStream) m_file = createFile(name);
     write(headerLine({kRecordingFormat, contract::version(), universalTime(), showPasswords}));
     flush();
 }
@@ -101,7 +76,7 @@ void RecordingWriter::put(const std::string& bytes) {
 }
 
 void RecordingWriter::requireWritten() {
-    if (!m_output) fail(m_name, errno);
+    if (!m_output) failWriting(m_name);
 }
 
 }  // namespace vexa::client

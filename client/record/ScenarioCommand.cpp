@@ -6,9 +6,9 @@
 #include "client/command/Commands.h"
 #include "client/port/JsonLine.h"
 #include "client/record/AirScenario.h"
+#include "client/record/RecordingFile.h"
 #include "client/record/RecordingReader.h"
 #include "client/record/SpectrumScenario.h"
-#include "client/terminal/ClientError.h"
 
 namespace vexa::client {
 
@@ -78,8 +78,8 @@ int runFrom(const ScenarioOptions& options) {
     if (options.output == kStandardStream) {
         std::cout << text << std::flush;
     } else {
-        std::ofstream file(recordingPath(options.output), std::ios::binary);
-        if (!(file << text << std::flush)) throw ClientError(options.output + " cannot be written");
+        std::ofstream file = createFile(options.output);
+        if (!(file << text << std::flush)) failWriting(options.output);
     }
     for (const std::string& note : made.notes)
         std::cerr << "vexa: " << note << '\n';
@@ -96,7 +96,7 @@ void addScenarioCommand(CLI::App& app, int& exitCode) {
         "from", "Make one of a recording; on standard error, what in it is approximated or unknown");
     command->add_option("FILE", options->file, "The recording; -: standard input")->required();
     CLI::Option* output =
-        command->add_option("-o,--output", options->output, "File of the scenario; default: standard output");
+        command->add_option("-o,--output", options->output, "A new file; default: standard output");
     output->type_name("FILE");
     command->add_flag("--json", options->json, "Print one JSON object: the scenario, and the notes on it")
         ->excludes(output);

@@ -290,6 +290,10 @@ class Scenario(RecordStory):
         file = self.new_folder() / "case.json"
         made = self.vexa("scenario", "from", self.file, "--output", file)
         self.assertEqual((made.returncode, made.stdout), (0, ""))
+        written = file.read_text()
+        self.assertIn("is there already", self.refused(1, "scenario", "from", self.file, "-o", file))
+        self.assertEqual(file.read_text(), written)
+        self.assertIn("No space left", self.refused(1, "scenario", "from", self.file, "-o", "/dev/full"))
         for note in ("an address made up", "the channel of 4 networks", "1 connection as one of", "hotspot function",
                      "by flat samples"):  # fmt: skip
             self.assertIn(note, made.stderr)
