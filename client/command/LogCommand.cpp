@@ -1,11 +1,11 @@
 #include <CLI/CLI.hpp>
 #include <deque>
 #include <iostream>
-#include <iterator>
 #include <memory>
 
 #include "client/command/Commands.h"
 #include "client/log/LogFilter.h"
+#include "client/log/LogPasswords.h"
 #include "client/machine/LogFiles.h"
 #include "client/machine/LogSwitch.h"
 #include "client/machine/MachineFolder.h"
@@ -41,37 +41,47 @@ std::string shown(const LogFiles::Line& line, const OutputOptions& options) {
 /// What goes out of the log: all of it at once, or its end alone.
 class Outlet {
 public:
-    Outlet(const LogOptions& options, bool isLimited) : m_options(options), m_isLimited(isLimited) {}
+    Outlet(const LogOptions& options, LogPasswords passwords, bool isLimited)
+        : m_options(options), m_passwords(std::move(passwords)), m_isLimited(isLimited) {}
 
     void take(LogFilter::Lines lines) {
         for (LogFiles::Line& line : lines) {
-            if (!m_isLimited)
-                print(std::move(line));
-            else
+            if (m_options.redact && !hidePassword(line)) continue;
+            if (m_isLimited)
                 keep(std::move(line));
+            else
+                print(line);
         }
     }
 
     /// What was kept of the end; from now on everything goes out.
     void open() {
         m_isLimited = false;
-        take({std::make_move_iterator(m_kept.begin()), std::make_move_iterator(m_kept.end())});
+        for (const LogFiles::Line& line : m_kept)
+            print(line);
         m_kept.clear();
         std::cout << std::flush;
     }
 
 private:
+    /// False if nothing of the line is left.
+    bool hidePassword(LogFiles::Line& line) {
+        auto shown = m_passwords.shown(line);
+        if (shown) line.text = std::move(*shown);
+        return shown.has_value();
+    }
+
     void keep(LogFiles::Line line) {
         m_kept.push_back(std::move(line));
         if (m_kept.size() > m_options.lines) m_kept.pop_front();
     }
 
-    void print(LogFiles::Line line) {
-        if (m_options.redact) line.text = withoutPassword(std::move(line.text));
+    void print(const LogFiles::Line& line) {
         std::cout << shown(line, m_options.output) << '\n';
     }
 
     const LogOptions& m_options;
+    LogPasswords m_passwords;
     bool m_isLimited;
     std::deque<LogFiles::Line> m_kept;
 };
@@ -97,9 +107,12 @@ int runLog(const LogOptions& options, bool isLimited) {
     const MachineFolder machine(options.machine);
     LogFiles files(machine.dumpFolder());
     explainSilence(whyLogIsOff(machine), files.any(), options.follow);
-    if (isLimited && !options.wish.isAny()) files.skipToLast(options.lines);
+    LogPasswords passwords;
+    if (isLimited && !options.wish.isAny())
+        passwords.beginWithin(
+            files.skipToLast(options.lines + (options.redact ? LogPasswords::kLinesBefore : 0)));
     LogFilter filter(options.wish, std::time(nullptr));
-    Outlet outlet(options, isLimited);
+    Outlet outlet(options, std::move(passwords), isLimited);
     files.takeLines([&](LogFilter::Lines&& lines) { outlet.take(filter.take(lines)); });
     if (!options.follow) {
         outlet.take(filter.take(files.takeRest()));

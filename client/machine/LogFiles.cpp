@@ -7,7 +7,6 @@
 #include <tuple>
 #include <utility>
 
-#include "client/port/Passwords.h"
 #include "client/terminal/Text.h"
 
 namespace vexa::client {
@@ -74,13 +73,17 @@ bool LogFiles::any() const {
     return !filesByTime().empty();
 }
 
-void LogFiles::skipToLast(std::size_t lines) {
+std::string LogFiles::skipToLast(std::size_t lines) {
+    std::string cut;
     const auto files = filesByTime();
     for (auto path = files.rbegin(); path != files.rend(); ++path) {
         const LastLines last = findLastLines(*path, lines);
-        m_places[path->filename().string()] = {last.begin, ""};
+        const std::string name = path->filename().string();
+        m_places[name] = {last.begin, ""};
+        if (last.begin > 0 && cut.empty()) cut = name;
         lines -= last.count;
     }
+    return cut;
 }
 
 std::vector<LogFiles::Line> LogFiles::takeLines() {
@@ -157,14 +160,6 @@ std::vector<fs::path> LogFiles::filesByTime() const {
     for (Found& file : found)
         paths.push_back(std::move(file.path));
     return paths;
-}
-
-// The password stands last, and may hold anything.
-std::string withoutPassword(std::string line) {
-    constexpr std::string_view kBefore = ", password=";
-    const std::size_t found = line.find(kBefore);
-    if (found == std::string::npos) return line;
-    return line.replace(found + kBefore.size(), std::string::npos, kHiddenPassword);
 }
 
 Json::Value lineJson(const LogFiles::Line& line) {

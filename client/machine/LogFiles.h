@@ -27,8 +27,9 @@ public:
     bool any() const;
 
     /// Passes over what is there now but for so many whole lines at its end, which are read next with what
-    /// has no line end yet. What is passed over is not read.
-    void skipToLast(std::size_t lines);
+    /// has no line end yet. What is passed over is not read. Gives the name of the file that is read from
+    /// its middle on, or none.
+    std::string skipToLast(std::size_t lines);
 
     /// The whole lines that are new: file by file, the one that was written last at the end.
     std::vector<Line> takeLines();
@@ -54,9 +55,6 @@ private:
     std::filesystem::path m_folder;
     std::map<std::string, Place> m_places;
 };
-
-/// The line without the password that it may tell.
-std::string withoutPassword(std::string line);
 
 /// The line as a JSON object.
 Json::Value lineJson(const LogFiles::Line& line);

@@ -2,7 +2,6 @@
 
 #include <utility>
 
-#include "client/log/LogTime.h"
 #include "client/machine/LogSwitch.h"
 #include "client/terminal/Text.h"
 
@@ -29,14 +28,14 @@ void PanelLog::follow(const std::optional<MachineFolder>& machine) {
     m_files.reset();
     if (folder.empty()) return;
     m_files.emplace(folder);
-    m_files->skipToLast(kMostLines);
-    m_isWithinSecret = true;  // nobody knows
+    m_passwords = LogPasswords();
+    m_passwords.beginWithin(m_files->skipToLast(kMostLines + LogPasswords::kLinesBefore));
 }
 
 std::optional<Json::Value> PanelLog::takeNews() {
     std::deque<std::string> news;
     for (const LogFiles::Line& line : m_files ? m_files->takeLines() : std::vector<LogFiles::Line>()) {
-        if (auto text = withoutSecrets(line.text)) news.push_back(std::move(*text));
+        if (const auto text = m_passwords.shown(line)) news.push_back(asUtf8(*text));
     }
     if (news.empty() && std::exchange(m_isTold, true)) return std::nullopt;
     keepEnd(news);
@@ -57,15 +56,6 @@ Json::Value PanelLog::told(const std::deque<std::string>& lines) const {
     object["on"] = m_isOn;
     object["lines"] = std::move(texts);
     return object;
-}
-
-// A password may have lines of its own, and then goes on up to the next entry.
-std::optional<std::string> PanelLog::withoutSecrets(const std::string& line) {
-    const auto head = findEntryHead(line, 0);
-    if (m_isWithinSecret && !(head && head->begin == 0)) return std::nullopt;
-    std::string shown = withoutPassword(line);
-    m_isWithinSecret = shown != line;
-    return asUtf8(shown);
 }
 
 }  // namespace vexa::client

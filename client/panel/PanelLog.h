@@ -7,6 +7,7 @@
 #include <optional>
 #include <string>
 
+#include "client/log/LogPasswords.h"
 #include "client/machine/LogFiles.h"
 #include "client/machine/MachineFolder.h"
 
@@ -26,13 +27,12 @@ public:
 
 private:
     Json::Value told(const std::deque<std::string>& lines) const;
-    std::optional<std::string> withoutSecrets(const std::string& line);
 
     std::filesystem::path m_folder;
     std::optional<LogFiles> m_files;
     bool m_isOn = false;
     bool m_isTold = true;
-    bool m_isWithinSecret = false;
+    LogPasswords m_passwords;
     std::deque<std::string> m_lines;
 };
 

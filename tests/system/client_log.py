@@ -142,6 +142,20 @@ class OfFiles(Story):
                                   ([], hidden if runs == self.in_terminal else shown)):  # fmt: skip
                 self.assertRegex(runs(*options), re.escape(told) + r'"?}?\s*$', options)
 
+    def test_a_password_goes_on_up_to_the_next_entry(self):
+        self.set_config("true")
+        head, secret = "[7] 05/17 06:32:17  \tUsername=anna, password=", "\n".join("secret" for _ in range(40))
+        self.write("a.txt", entry(6, "\none") + head + secret + ", 1\n" + entry(8, "\ntwo") + head + secret)
+        self.write("b.txt", "beside\n" + entry(1, "three"), age=-1)
+        one, two, three = (text.splitlines() for text in (entry(6, "\none"), entry(8, "\ntwo"), entry(1, "three")))
+        shown = [*one, head + "********", *two, head + "********", "beside", *three]
+        for count in (3, 4, 5, 99):
+            self.assertEqual(self.lines("--redact", "-n", str(count)), shown[-count:], count)
+        self.assertNotIn("secret", str(self.lines("--redact", "-n", "6")), "what is read begins within a password")
+        self.assertEqual(self.lines("--redact"), shown)
+        self.assertEqual(self.lines("--redact", "--grep", "anna"), [head + "********"] * 2)
+        self.assertEqual(str(self.lines("--no-redact")).count("secret"), 80)
+
     def in_terminal(self, *options):
         terminal = self.terminal("log", *options, "--machine", self.folder)
         terminal.finish()
