@@ -76,9 +76,7 @@ private:
         if (m_kept.size() > m_options.lines) m_kept.pop_front();
     }
 
-    void print(const LogFiles::Line& line) {
-        std::cout << shown(line, m_options.output) << '\n';
-    }
+    void print(const LogFiles::Line& line) { std::cout << shown(line, m_options.output) << '\n'; }
 
     const LogOptions& m_options;
     LogPasswords m_passwords;

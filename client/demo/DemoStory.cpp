@@ -159,7 +159,11 @@ std::vector<std::string> DemoStory::opening(bool json) const {
         object["credentials"] = credentialsJson(m_stored, m_passwords);
         return {jsonLine(object)};
     }
-    auto lines = credentialTable(m_stored, Passwords::Hidden);
+    return credentialLines(std::nullopt);
+}
+
+std::vector<std::string> DemoStory::credentialLines(std::optional<int> columns) const {
+    auto lines = credentialTable(m_stored, Passwords::Hidden, columns);
     lines.insert(lines.begin(),
                  "Stored " + counted(m_stored.size(), "credential") + ", in the order of priority:");
     return lines;
@@ -167,7 +171,7 @@ std::vector<std::string> DemoStory::opening(bool json) const {
 
 std::vector<std::string> DemoStory::lines(const Room& room) const {
     std::vector<std::string> all;
-    if (room.screenRows >= kScreenRowsForCredentials) append(all, opening(false));
+    if (room.screenRows >= kScreenRowsForCredentials) append(all, credentialLines(room.columns - 1));
     append(all, networkTable(m_narrator.networks()));
     for (std::string& line : all)
         line = cutToColumns(line, room.columns - 1, TerminalScreen::ellipsis());

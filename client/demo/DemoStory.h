@@ -39,6 +39,7 @@ private:
     void act(std::vector<Item>& items);
     void say(std::vector<Item>& items, Speaker speaker, std::string json, const std::string& sentence);
     void ask(const std::vector<const char*>& questions);
+    std::vector<std::string> credentialLines(std::optional<int> columns) const;
     std::string paint(const Line& line, const Room& room) const;
 
     WebSocketClient m_client;

@@ -1,5 +1,7 @@
 #include "client/hotspot/CredentialText.h"
 
+#include "client/terminal/TableFit.h"
+#include "client/terminal/TerminalScreen.h"
 #include "client/terminal/Text.h"
 
 namespace vexa::client {
@@ -30,9 +32,11 @@ std::vector<int> keptIds(const CredentialList& list, const CredentialList& other
 
 }  // namespace
 
-std::vector<std::string> credentialTable(const CredentialList& list, Passwords passwords) {
+std::vector<std::string> credentialTable(const CredentialList& list, Passwords passwords,
+                                         std::optional<int> columns) {
+    const std::vector<std::size_t> cut{2, 3, 7, 8};  // name, realm, creator, identity
     std::vector<std::vector<std::string>> rows{
-        {"Position", "Id", "Name", "Realm", "Method", "Access", "Auto-connect", "Creator", "Identity"}};
+        {"Pos", "Id", "Name", "Realm", "Method", "Access", "Auto", "Creator", "Identity"}};
     if (passwords == Passwords::Shown) rows.front().emplace_back("Password");
     for (const auto& credential : list) {
         rows.push_back({std::to_string(rows.size()), std::to_string(credential.id), credential.name,
@@ -40,6 +44,7 @@ std::vector<std::string> credentialTable(const CredentialList& list, Passwords p
                         credential.autoConnect ? "yes" : "no", credential.creator, identity(credential)});
         if (passwords == Passwords::Shown) rows.back().push_back(credential.password);
     }
+    if (columns) fitToColumns(rows, cut, *columns, TerminalScreen::ellipsis());
     return alignedLines(rows);
 }
 

@@ -2,6 +2,7 @@
 
 #include <json/value.h>
 
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -12,8 +13,10 @@ namespace vexa::client {
 
 // Credentials in words. Lines have no line end.
 
-/// One row per credential in the order of priority; a heading first.
-std::vector<std::string> credentialTable(const CredentialList& list, Passwords passwords);
+/// One row per credential in the order of priority; a heading first. What it is known by, except a password,
+/// is shortened where the rows would take more than so many columns.
+std::vector<std::string> credentialTable(const CredentialList& list, Passwords passwords,
+                                         std::optional<int> columns);
 
 /// One credential, with its position from 1.
 Json::Value credentialJson(const Credential& credential, std::size_t position, Passwords passwords);

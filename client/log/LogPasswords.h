@@ -9,8 +9,8 @@
 
 namespace vexa::client {
 
-/// Hides the passwords in the lines of the log. One may have lines of its own, and then goes on up to the next
-/// entry.
+/// Hides the passwords in the lines of the log. One may have lines of its own, and then goes on up to the
+/// next entry.
 class LogPasswords {
 public:
     /// So many lines before the first that is shown are enough to know whether that belongs to a password.

@@ -49,8 +49,7 @@ std::ofstream createFile(const std::string& name) {
 }
 
 void failWriting(const std::string& name) {
-    throw ClientError(recordingName(name) +
-                      " cannot be written: " + std::generic_category().message(errno));
+    throw ClientError(recordingName(name) + " cannot be written: " + std::generic_category().message(errno));
 }
 
 ByteSource openRecording(const std::string& name) {

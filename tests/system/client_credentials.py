@@ -33,7 +33,7 @@ class Listing(CredentialStory):
         self.add_user("Lounge", "--no-auto-connect")
         self.add_certificate("Work", "--per-user", "--ca-cert", "Root", "--creator", "IT")
         heading, *rows = self.done("credentials").splitlines()
-        self.assertEqual(heading.split()[:5], ["Position", "Id", "Name", "Realm", "Method"])
+        self.assertEqual(heading.split()[:5], ["Pos", "Id", "Name", "Realm", "Method"])
         # A column begins where its heading does.
         starts = [heading.index(word) for word in heading.split()] + [None]
         cells = [[row[a:b].strip() for a, b in zip(starts, starts[1:])] for row in rows]
@@ -44,6 +44,16 @@ class Listing(CredentialStory):
                 ["2", "1", "Lounge", "lounge", "TTLS", "all users", "no", "KORVANE-PC\\user", "user anna"],
             ],
         )
+
+    def test_on_a_terminal_the_table_fits_into_its_lines(self):
+        self.add_user("Lounge of a very long name", "--creator", "Headquarters", realm="a.very.long.realm.example")
+        whole = self.done("credentials").splitlines()
+        for columns, shown in ((60, "Loun…  "), (80, "Lounge of…  "), (max(map(len, whole)), whole[1])):
+            terminal = self.terminal("credentials", columns=columns, VEXA_MACHINE=str(self.machine.folder))
+            terminal.finish()
+            rows = terminal.screen.decode().splitlines()
+            self.assertIn(shown, rows[1])
+            self.assertLessEqual(max(map(len, rows)), columns)
 
     def test_passwords_show_only_when_asked_for(self):
         self.add_user("Lounge", password="gEh31m")

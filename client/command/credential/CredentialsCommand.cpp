@@ -8,6 +8,7 @@
 #include "client/hotspot/CredentialStore.h"
 #include "client/hotspot/CredentialText.h"
 #include "client/terminal/ClientError.h"
+#include "client/terminal/TableFit.h"
 #include "client/terminal/Text.h"
 
 namespace vexa::client {
@@ -27,7 +28,7 @@ int runCredentials(const CredentialsOptions& options) {
     const Passwords passwords = options.showPasswords ? Passwords::Shown : Passwords::Hidden;
     print(options.hotspot, credentialsJson(list, passwords),
           list.empty() ? std::vector<std::string>{"No credentials are stored."}
-                       : credentialTable(list, passwords));
+                       : credentialTable(list, passwords, lineRoom()));
     return kExitOk;
 }
 

@@ -1,6 +1,7 @@
 #include <gtest/gtest.h>
 
 #include "client/terminal/Nearest.h"
+#include "client/terminal/TableFit.h"
 #include "client/terminal/Text.h"
 #include "text/Utf8.h"
 
@@ -40,6 +41,17 @@ TEST(Text, RowsAreAlignedByColumns) {
         alignedLines({{"Name", "X"}, {"空港", "1"}, {"long name", ""}, {"a"}});
     EXPECT_EQ(lines, (std::vector<std::string>{"Name       X", "空港       1", "long name", "a"}));
     EXPECT_TRUE(alignedLines({}).empty());
+    const std::vector<std::vector<std::string>> wide{{"X", "Name", "Realm"},
+                                                     {"long", "空港空港", "hall.example"}};
+    for (const auto& [columns, second] :
+         std::vector<std::pair<int, std::string>>{{28, "long  空港空港  hall.example"},
+                                                  {24, "long  空港空港  hall.ex…"},
+                                                  {17, "long  空…   hal…"},
+                                                  {1, "long  空…   hal…"}}) {
+        auto rows = wide;
+        fitToColumns(rows, {1, 2}, columns, "…");
+        EXPECT_EQ(alignedLines(rows).back(), second) << columns;
+    }
 }
 
 }  // namespace
