@@ -20,7 +20,7 @@ interface Notice extends NoticeOptions {
 const LASTS = 8000;
 const MOST = 4;
 
-const notices = new Store<readonly Notice[]>([]);
+export const notices = new Store<readonly Notice[]>([]);
 const spoken = new Store('');
 let lastId = 0;
 
@@ -38,8 +38,9 @@ function expire(id: number): void {
 export function notify(text: string, options: NoticeOptions = {}): () => void {
     const id = ++lastId;
     notices.update((all) => [...all, { ...options, id, text }]);
-    const oldest = notices.get()[0];
-    if (notices.get().length > MOST) expire(oldest.id);
+    // One with an action stays its time: a click on it may be on the way.
+    const oldest = notices.get().find((notice) => !notice.action && notice.id !== id);
+    if (oldest && notices.get().length > MOST) expire(oldest.id);
     return () => expire(id);
 }
 
