@@ -2,15 +2,18 @@
 #include <algorithm>
 #include <array>
 #include <iostream>
+#include <sstream>
 #include <string>
 #include <utility>
 
 #include "client/command/CommandWords.h"
 #include "client/command/Commands.h"
+#include "client/command/HelpText.h"
 #include "client/command/Program.h"
 #include "client/output/Silence.h"
 #include "client/terminal/ClientError.h"
 #include "client/terminal/EventLoop.h"
+#include "client/terminal/TableFit.h"
 #include "client/terminal/Terminal.h"
 #include "contract/Version.h"
 
@@ -70,7 +73,10 @@ int run(int argc, char** argv, Silence& silence) {
         std::reverse(words.begin(), words.end());  // so the parser takes them
         app.parse(std::move(words));
     } catch (const CLI::Success& help) {
-        return app.exit(help);
+        std::ostringstream text;
+        const int code = app.exit(help, text);
+        std::cout << helpText(text.str(), lineRoom());
+        return code;
     } catch (const ClientError& error) {
         exitCode = report(error, error.exitCode());
     }

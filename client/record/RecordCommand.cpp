@@ -113,18 +113,18 @@ End record(Recorder& recorder, RecordingWriter& writer, Deadline end) try {
 // Where the recording itself goes to standard output, it must not stand among its lines.
 void sayEnd(const RecordOptions& options, const RecordingWriter& writer, End end) {
     constexpr std::array kEnds{"time", "user", "service"};
-    const double seconds = std::round(static_cast<double>(writer.elapsed().count()) / 100) / 10;
+    const double lasted = std::round(static_cast<double>(writer.elapsed().count()) / 100) / 10;
     std::ostream& output = options.file == kStandardStream ? std::cerr : std::cout;
     if (options.json) {
         Json::Value object(Json::objectValue);
         object["events"] = static_cast<Json::UInt64>(writer.eventCount());
-        object["seconds"] = seconds;
+        object["seconds"] = lasted;
         object["endedBy"] = kEnds[static_cast<std::size_t>(end)];
         output << jsonLine(object) << std::endl;
         return;
     }
     output << "Recorded " << counted(writer.eventCount(), "event") << " in " << std::fixed
-           << std::setprecision(1) << seconds << " s"
+           << std::setprecision(1) << lasted << " s"
            << (end == End::Service ? "; the service has ended." : ".") << std::endl;
 }
 

@@ -129,6 +129,15 @@ class WithoutService(Story):
         for words in ([], ["scan"], ["credential", "add"]):
             self.assertEqual(run_client("help", *words).stdout, run_client(*words, "--help").stdout)
 
+    def test_help_is_as_wide_as_the_terminal(self):
+        for columns, *words in ((60, "log"), (80, "credential", "add"), (40, "scan"), (80,)):
+            whole, terminal = run_client(*words, "--help").stdout, self.terminal(*words, "--help", columns=columns)
+            self.assertEqual(terminal.finish(), 0)
+            shown = terminal.screen.decode()
+            self.assertLessEqual(max(map(len, shown.splitlines())), columns)
+            self.assertEqual(shown.split(), whole.split())
+            self.assertNotIn("{false}", whole)
+
     def test_each_command_says_so(self):
         folder = str(self.new_folder())
         for command in (

@@ -22,7 +22,7 @@ struct TextOption {
 };
 
 constexpr std::array kTextOptions{
-    TextOption{"--name", "Name to show; of a new one the realm, if not given", &CredentialFields::name,
+    TextOption{"--name", "Name to show; of a new one by default its realm", &CredentialFields::name,
                &Credential::name, 0, false},
     TextOption{"--realm", "Realm of the provider", &CredentialFields::realm, &Credential::realm, 0, true},
     TextOption{"--username", "User name, for TTLS", &CredentialFields::username, &Credential::username,
@@ -48,7 +48,8 @@ void CredentialFields::addTo(CLI::App& command) {
             ->type_name("TEXT");
     }
     CLI::Option* yes = command.add_flag_callback(
-        "--auto-connect", [this] { autoConnect = true; }, "Connect without being asked; the default");
+        "--auto-connect", [this] { autoConnect = true; },
+        "Connect without being asked, as a new one does by default");
     CLI::Option* no = command.add_flag_callback(
         "--no-auto-connect", [this] { autoConnect = false; }, "Connect only when asked");
     yes->excludes(no);
