@@ -7,10 +7,13 @@
 #include "client/doctor/Diagnosis.h"
 #include "client/hotspot/HotspotQuestions.h"
 #include "client/terminal/ClientError.h"
+#include "client/terminal/LineFit.h"
 
 namespace vexa::client {
 
 namespace {
+
+constexpr std::size_t kSeenColumn = 16;  // behind the state and the name of the longest gate
 
 /// Also of a service that has left no port.
 Observations observed(const HotspotOptions& options) {
@@ -28,9 +31,21 @@ Observations observed(const HotspotOptions& options) {
     return observe(port, signals, options.limit(), options.port.machine());
 }
 
+/// As the terminal shows them: what is seen and advised stays in its column.
+std::vector<std::string> shown(const std::vector<std::string>& lines) {
+    const auto columns = lineRoom();
+    if (!columns) return lines;
+    std::vector<std::string> rows;
+    for (const std::string& line : lines) {
+        for (std::string& row : wrapped(line, *columns, kSeenColumn))
+            rows.push_back(std::move(row));
+    }
+    return rows;
+}
+
 int runDoctor(const HotspotOptions& options) {
     const auto findings = diagnose(observed(options));
-    auto lines = diagnosisLines(findings);
+    auto lines = shown(diagnosisLines(findings));
     const std::string names = namesInTheWay(findings);
     if (names.empty())
         lines.emplace_back(isAllKnown(findings) ? "Nothing is in the way of a connection."

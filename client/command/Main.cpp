@@ -13,7 +13,7 @@
 #include "client/output/Silence.h"
 #include "client/terminal/ClientError.h"
 #include "client/terminal/EventLoop.h"
-#include "client/terminal/TableFit.h"
+#include "client/terminal/LineFit.h"
 #include "client/terminal/Terminal.h"
 #include "contract/Version.h"
 

@@ -1,6 +1,6 @@
 #include "client/hotspot/CredentialText.h"
 
-#include "client/terminal/TableFit.h"
+#include "client/terminal/LineFit.h"
 #include "client/terminal/TerminalScreen.h"
 #include "client/terminal/Text.h"
 
@@ -15,10 +15,8 @@ std::string accessName(int access) {
 }
 
 std::string identity(const Credential& credential) {
-    if (credential.type != kTypeCertificate) return "user " + credential.username;
-    std::string text = "certificate " + credential.clientCert;
-    if (!credential.caCert.empty()) text += ", CA " + credential.caCert;
-    return text;
+    if (credential.type != kTypeCertificate) return credential.username;
+    return credential.clientCert + (credential.caCert.empty() ? "" : ", CA " + credential.caCert);
 }
 
 /// The ids of a list, without those that the other one has not.

@@ -40,8 +40,8 @@ class Listing(CredentialStory):
         self.assertEqual(
             cells,
             [
-                ["1", "2", "Work", "work", "TLS", "per user", "yes", "IT", "certificate Anna, CA Root"],
-                ["2", "1", "Lounge", "lounge", "TTLS", "all users", "no", "KORVANE-PC\\user", "user anna"],
+                ["1", "2", "Work", "work", "TLS", "per user", "yes", "IT", "Anna, CA Root"],
+                ["2", "1", "Lounge", "lounge", "TTLS", "all users", "no", "KORVANE-PC\\user", "anna"],
             ],
         )
 

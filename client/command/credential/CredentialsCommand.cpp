@@ -8,7 +8,7 @@
 #include "client/hotspot/CredentialStore.h"
 #include "client/hotspot/CredentialText.h"
 #include "client/terminal/ClientError.h"
-#include "client/terminal/TableFit.h"
+#include "client/terminal/LineFit.h"
 #include "client/terminal/Text.h"
 
 namespace vexa::client {

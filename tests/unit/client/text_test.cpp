@@ -1,7 +1,7 @@
 #include <gtest/gtest.h>
 
+#include "client/terminal/LineFit.h"
 #include "client/terminal/Nearest.h"
-#include "client/terminal/TableFit.h"
 #include "client/terminal/Text.h"
 #include "text/Utf8.h"
 
@@ -52,6 +52,14 @@ TEST(Text, RowsAreAlignedByColumns) {
         fitToColumns(rows, {1, 2}, columns, "…");
         EXPECT_EQ(alignedLines(rows).back(), second) << columns;
     }
+}
+
+TEST(Text, LongLinesBreakAtBlanks) {
+    using Lines = std::vector<std::string>;
+    EXPECT_EQ(wrapped("  --a  one two", 99, 3), (Lines{"  --a  one two"}));
+    EXPECT_EQ(wrapped("  --a  one two three", 10, 3), (Lines{"  --a  one", "   two", "   three"}));
+    EXPECT_EQ(wrapped("空港 空港 toolongaword x", 9, 0), (Lines{"空港 空港", "toolongaword", "x"}));
+    EXPECT_EQ(wrapped("", 9, 2), (Lines{""}));
 }
 
 }  // namespace

@@ -16,4 +16,8 @@ std::optional<int> lineRoom();
 void fitToColumns(std::vector<std::vector<std::string>>& rows, const std::vector<std::size_t>& cut,
                   int columns, const std::string& ellipsis);
 
+/// The text in lines of no more than so many columns, broken at blanks; all but the first stand behind so
+/// many blanks.
+std::vector<std::string> wrapped(const std::string& text, int columns, std::size_t indent);
+
 }  // namespace vexa::client

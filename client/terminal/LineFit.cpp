@@ -1,4 +1,4 @@
-#include "client/terminal/TableFit.h"
+#include "client/terminal/LineFit.h"
 
 #include <algorithm>
 
@@ -34,6 +34,27 @@ void fitToColumns(std::vector<std::vector<std::string>>& rows, const std::vector
                 row[column] = cutToColumns(printable(row[column]), most, ellipsis);
         }
     }
+}
+
+std::vector<std::string> wrapped(const std::string& text, int columns, std::size_t indent) {
+    std::vector<std::string> lines;
+    std::string line;
+    bool hasWord = false;
+    std::size_t begin = 0;
+    while (begin < text.size()) {
+        const std::size_t word = std::min(text.find_first_not_of(' ', begin), text.size());
+        const std::size_t end = std::min(text.find(' ', word), text.size());
+        if (hasWord && columnsOf(line + text.substr(begin, end - begin)) > columns) {
+            lines.push_back(line);
+            line.assign(indent, ' ');
+            begin = word;
+        }
+        line += text.substr(begin, end - begin);
+        hasWord = true;
+        begin = end;
+    }
+    lines.push_back(line);
+    return lines;
 }
 
 }  // namespace vexa::client
