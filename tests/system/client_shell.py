@@ -31,6 +31,7 @@ LINES = [
     ("credential del\tTwo\t", ["credential", "delete", "Two words"]),
     ("credential add --meth\ttt\t", ["credential", "add", "--method", "ttls"]),
     ("status --mach\t/de\t", ["status", "--machine", "/dev"]),
+    ("credential add --realm /de\t", ["credential", "add", "--realm", "/de"]),
     ("completion po\t", ["completion", "powershell"]),
 ]
 
