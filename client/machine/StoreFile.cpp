@@ -7,9 +7,25 @@
 
 namespace vexa::client {
 
+namespace {
+
+/// The element that is missing of those in which the service keeps credentials; it makes none, and then
+/// writes the rest.
+std::string missingPlace(std::string xml) {
+    const std::size_t begin = xml.find("<users");
+    if (begin == std::string::npos) return "users";
+    const std::size_t end = xml.find("</users>", begin);
+    if (end != std::string::npos) xml.erase(begin, end - begin);  // users have elements of the same name
+    return xml.find("<credentials") == std::string::npos ? "credentials" : "";
+}
+
+}  // namespace
+
 bool StoreFile::isWritten() const {
     const auto now = state();
-    return now && now != m_seen;
+    if (!now || now == m_seen) return false;
+    const auto xml = xmlText(now->content);
+    return !xml || missingPlace(*xml).empty();
 }
 
 std::optional<std::string> StoreFile::objection() const {
@@ -20,7 +36,11 @@ std::optional<std::string> StoreFile::objection() const {
 }
 
 std::string StoreFile::whyNotWritten() const {
-    return objection().value_or(m_path.string() + " could not be written");
+    if (const auto objectionToAll = objection()) return *objectionToAll;
+    const auto now = state();
+    const auto xml = now ? xmlText(now->content) : std::nullopt;
+    const std::string missing = xml ? missingPlace(*xml) : "";
+    return m_path.string() + (missing.empty() ? " could not be written" : " lacks an element " + missing);
 }
 
 std::optional<StoreFile::State> StoreFile::state() const {

@@ -17,7 +17,7 @@ public:
     /// From now on isWritten() speaks of what comes.
     void look() { m_seen = state(); }
 
-    /// Somebody has written the file since look().
+    /// Somebody has written the file since look(), and credentials have a place in it.
     bool isWritten() const;
 
     /// Why the service cannot read it, as in "X is not well-formed XML"; nothing if it can.

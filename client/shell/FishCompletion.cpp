@@ -63,8 +63,10 @@ void appendCommand(std::ostream& out, const CommandText& command) {
         out << begin << fishQuoted(here);
         for (const std::string& name : option.names)
             out << (name.starts_with("--") ? " -l " + name.substr(2) : " -s " + name.substr(1));
-        out << (option.value.empty() ? "" : option.kind == ValueKind::File ? " -r" : " -x") << offered(option) << " -d "
-            << fishQuoted(option.description) << '\n';
+        out << (option.value.empty()             ? ""
+                : option.kind == ValueKind::File ? " -r"
+                                                 : " -x")
+            << offered(option) << " -d " << fishQuoted(option.description) << '\n';
     }
     for (std::size_t i = 0; i < command.arguments.size(); ++i) {
         const OptionText& argument = command.arguments[i];

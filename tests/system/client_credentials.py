@@ -227,6 +227,18 @@ class Changing(CredentialStory):
             path.write_bytes(good)
             self.assertEqual(self.done("reload"), "The configuration was read again: 3 credentials.\n")
 
+    def test_a_file_without_a_place_for_them_is_told(self):
+        path, good = self.machine.config(), self.machine.config().read_bytes()
+        users = good.index(b"<users>")
+        for content in (good[:users] + b"</configurations>",
+                        good[: good.index(b"<credentials>")] + good[users:],
+                        b"<configurations><global/></configurations>"):  # fmt: skip
+            path.write_bytes(content)
+            told = self.refused(1, "credential", "add", *Adding.TLS[2:], "D")
+            self.assertRegex(told, rf'kept in memory only: credential \d "D" was added, but {path} lacks an element')
+            path.write_bytes(good)
+            self.done("reload")
+
     def test_reload_takes_what_was_edited_by_hand(self):
         path = self.machine.config()
         path.write_text(path.read_text("utf-8-sig").replace(">A<", ">By hand<"), encoding="utf-8-sig")
