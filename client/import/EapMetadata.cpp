@@ -10,6 +10,7 @@
 #include "client/terminal/ClientError.h"
 #include "client/terminal/Text.h"
 #include "contract/Realm.h"
+#include "text/OneOf.h"
 #include "text/TextConversion.h"
 
 namespace vexa::client {
@@ -140,7 +141,7 @@ private:
         const auto other = childOf(inner, "NonEAPAuthMethod");
         const std::string name = eap ? nameAmong(kEapMethods, textOf(childOf(eap, "Type")))
                                      : nameAmong(kOtherMethods, textOf(childOf(other, "Type")));
-        if (std::find(kPasswordMethods.begin(), kPasswordMethods.end(), name) == kPasswordMethods.end()) {
+        if (!isOneOf(kPasswordMethods, name)) {
             refuse(node, "EAP-TTLS with " + name, "the service has it with PAP and MSCHAPv2");
             return false;
         }
@@ -203,8 +204,7 @@ private:
     std::vector<std::string> realmsOf(const Method& method) const {
         std::vector<std::string> realms;
         const auto append = [&](const std::string& realm) {
-            if (!realm.empty() && std::find(realms.begin(), realms.end(), realm) == realms.end())
-                realms.push_back(realm);
+            if (!realm.empty() && !isOneOf(realms, realm)) realms.push_back(realm);
         };
         append(method.suffix);
         append(method.outerRealm);

@@ -6,6 +6,7 @@
 
 #include "client/import/ForeignXml.h"
 #include "client/terminal/Text.h"
+#include "text/OneOf.h"
 
 namespace vexa::client {
 
@@ -55,10 +56,6 @@ const Known& knownAs(const std::string& name) {
     return found == kKnown.end() ? kOther : *found;
 }
 
-bool isContainer(const std::string& name) {
-    return std::find(kContainers.begin(), kContainers.end(), name) != kContainers.end();
-}
-
 std::string shortened(const std::string& text) {
     return '"' + cutToColumns(printable(text), kWidest, "...") + '"';
 }
@@ -78,7 +75,7 @@ void MetadataNotes::tellRest(pugi::xml_node parent) {
 
 void MetadataNotes::tellElement(pugi::xml_node node) {
     const std::string name = localName(node);
-    if (isContainer(name)) return tellRest(node);
+    if (isOneOf(kContainers, name)) return tellRest(node);
     if (!node.first_child()) return;
     const Known& known = knownAs(name);
     tell(printable(name) + (known.isShown ? " " + shortened(textOf(node)) : ""), known.reason);

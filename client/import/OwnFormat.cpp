@@ -9,6 +9,7 @@
 #include "client/port/JsonLine.h"
 #include "client/terminal/ClientError.h"
 #include "client/terminal/Text.h"
+#include "text/OneOf.h"
 
 namespace vexa::client {
 
@@ -69,9 +70,8 @@ public:
             const bool isText = std::any_of(kTexts.begin(), kTexts.end(), [&](const TextMember& member) {
                 return name == member.name && (member.type == 0 || member.type == credential.type);
             });
-            const bool isOther =
-                std::find(kOtherMembers.begin(), kOtherMembers.end(), name) != kOtherMembers.end();
-            if (!isText && !isOther) found.push_back(m_place + "." + printable(name) + " is not kept");
+            if (!isText && !isOneOf(kOtherMembers, name))
+                found.push_back(m_place + "." + printable(name) + " is not kept");
         }
         return found;
     }

@@ -1,12 +1,12 @@
 #include "client/panel/PanelMessages.h"
 
-#include <algorithm>
 #include <array>
 
 #include "client/port/JsonLine.h"
 #include "client/port/Passwords.h"
 #include "client/terminal/Text.h"
 #include "contract/Ports.h"
+#include "text/OneOf.h"
 
 namespace vexa::client {
 
@@ -32,11 +32,6 @@ constexpr std::array kHotspotCommands{contract::kGetAllNetworkList,
                                       contract::kSetPositionCredential,
                                       contract::kConnectNetwork,
                                       contract::kDisconnectNetwork};
-
-template <std::size_t Count>
-bool isOneOf(const std::array<const char*, Count>& names, const std::string& name) {
-    return std::any_of(names.begin(), names.end(), [&](const char* known) { return name == known; });
-}
 
 // What is no UTF-8 would cost the page its connection.
 std::string wrapped(std::string_view port, const Json::Value& message) {

@@ -2,10 +2,10 @@
 
 #include <json/value.h>
 
-#include <algorithm>
 #include <array>
 
 #include "contract/Ports.h"
+#include "text/OneOf.h"
 
 namespace vexa::client {
 
@@ -20,11 +20,6 @@ constexpr std::array kOtherChanges{kConnectNetwork, kDisconnectNetwork, kSetHots
                                    kUpdateNetworkRealm, kReadCredentialFromFile};
 constexpr std::array kWholes{kGetAllNetworkList, kGetAllCredentialList, kGetIsInternetAccess,
                              kChannelListData, kCurrentChannelData};
-
-template <std::size_t N>
-bool isOneOf(const std::array<const char*, N>& names, const std::string& name) {
-    return std::find(names.begin(), names.end(), name) != names.end();
-}
 
 std::optional<bool> asFlag(const Json::Value& payload) {
     return payload.isBool() ? std::optional(payload.asBool()) : std::nullopt;

@@ -2,6 +2,9 @@
 
 #include <algorithm>
 
+#include "simulation/scenario/FileCalls.h"
+#include "text/OneOf.h"
+
 namespace vexa::simulation {
 
 using platform::LockGuard;
@@ -9,14 +12,12 @@ using platform::Mutex;
 
 namespace {
 
-constexpr std::string_view kFileCalls[] = {"CreateDirectory", "open", "write", "sync", "rename"};
-
 // Files are named by a part of their name, everything else in full.
 bool matches(const FailRule& rule, std::string_view call, std::string_view detail) {
     if (rule.call != call) return false;
     if (!rule.match) return true;
-    const bool isFile = std::find(std::begin(kFileCalls), std::end(kFileCalls), call) != std::end(kFileCalls);
-    return isFile ? detail.find(*rule.match) != std::string_view::npos : detail == *rule.match;
+    return isOneOf(kFileCalls, call) ? detail.find(*rule.match) != std::string_view::npos
+                                     : detail == *rule.match;
 }
 
 template <class Rule>

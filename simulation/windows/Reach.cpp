@@ -3,28 +3,29 @@
 
 #include "simulation/scenario/Reach.h"
 
-#include <algorithm>
 #include <span>
 #include <string_view>
+
+#include "simulation/scenario/FileCalls.h"
+#include "text/OneOf.h"
 
 namespace vexa::simulation {
 
 namespace {
 
 constexpr std::string_view kActionsOnTime[] = {"advance", "shiftTime"};
-constexpr std::string_view kCallsOnFiles[] = {"CreateDirectory", "open", "write", "sync", "rename"};
 
-bool contains(std::span<const std::string_view> names, const Json::Value& name) {
-    return name.isString() && std::find(names.begin(), names.end(), name.asString()) != names.end();
+bool isText(const Json::Value& name, std::span<const std::string_view> known) {
+    return name.isString() && isOneOf(known, name.asString());
 }
 
 }  // namespace
 
 void checkReach(const JsonPlace& action) {
     const JsonPlace name = action.member("do");
-    if (contains(kActionsOnTime, name.value()))
+    if (isText(name.value(), kActionsOnTime))
         name.fail("the service has the clock of Windows, which stays as it is");
-    if (name.value() == "fail" && contains(kCallsOnFiles, action.value()["call"]))
+    if (name.value() == "fail" && isText(action.value()["call"], kFileCalls))
         action.member("call").fail("the service has the files of Windows, which don't fail on request");
 }
 
