@@ -2,6 +2,7 @@
 
 #include <utility>
 
+#include "client/record/RecordingFile.h"
 #include "client/terminal/ClientError.h"
 
 namespace vexa::client {
@@ -20,8 +21,7 @@ void PanelRecorder::orEnd(Work work) {
 void PanelRecorder::start() {
     if (m_writer) return;
     m_name = m_recordings.create();
-    const std::u8string path = m_recordings.pathOf(m_name).u8string();
-    m_writer = std::make_unique<RecordingWriter>(std::string(path.begin(), path.end()), false);
+    m_writer = std::make_unique<RecordingWriter>(utf8Path(m_recordings.pathOf(m_name)), false);
 }
 
 void PanelRecorder::add(RecordedPort port, const std::string& text) {

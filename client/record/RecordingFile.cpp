@@ -34,6 +34,11 @@ fs::path recordingPath(const std::string& name) {
     return {std::u8string(name.begin(), name.end())};
 }
 
+std::string utf8Path(const fs::path& path) {
+    const std::u8string text = path.u8string();
+    return {text.begin(), text.end()};
+}
+
 // What is no file, as a pipe is, has no content to lose and keeps its rights.
 std::ofstream createFile(const std::string& name) {
     const fs::path path = recordingPath(name);

@@ -18,6 +18,9 @@ std::string recordingName(const std::string& name);
 /// Its path; names are UTF-8.
 std::filesystem::path recordingPath(const std::string& name);
 
+/// The path as such a name.
+std::string utf8Path(const std::filesystem::path& path);
+
 /// A new file for its owner alone, or one that is empty, or a pipe and the like as it is. Throws ClientError
 /// if there is another file.
 std::ofstream createFile(const std::string& name);

@@ -6,6 +6,8 @@
 #include <boost/beast/http/string_body.hpp>
 #include <utility>
 
+#include "client/record/RecordingFile.h"
+
 namespace vexa::client {
 
 namespace beast = boost::beast;
@@ -68,8 +70,7 @@ std::optional<PanelAnswer> PanelAnswers::download(const std::filesystem::path& p
                                                   const std::string& name) const {
     http::response<http::file_body> answer(http::status::ok, kVersion);
     beast::error_code error;
-    const std::u8string text = path.u8string();
-    answer.body().open(std::string(text.begin(), text.end()).c_str(), beast::file_mode::scan, error);
+    answer.body().open(utf8Path(path).c_str(), beast::file_mode::scan, error);
     if (error) return std::nullopt;
     addHeaders(answer);
     answer.set(http::field::content_type, "application/gzip");

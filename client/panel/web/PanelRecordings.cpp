@@ -73,8 +73,7 @@ Json::Value PanelRecordings::list() const {
     std::map<std::string, std::uintmax_t> sizes;
     std::error_code error;
     for (fs::directory_iterator entry(m_folder, error), end; !error && entry != end; entry.increment(error)) {
-        const std::u8string text = entry->path().filename().u8string();
-        const std::string name(text.begin(), text.end());
+        const std::string name = utf8Path(entry->path().filename());
         std::error_code gone;
         if (isName(name) && isOwnFile(entry->path())) sizes[name] = fs::file_size(entry->path(), gone);
         if (gone) sizes.erase(name);
