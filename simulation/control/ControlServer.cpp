@@ -1,14 +1,21 @@
 #include "simulation/control/ControlServer.h"
 
-#include <future>
+#include <memory>
 #include <string>
 
+#include "platform/Event.h"
 #include "simulation/control/Performance.h"
 #include "simulation/scenario/JsonText.h"
 
 namespace vexa::simulation {
 
 namespace {
+
+/// The server for its own handler: a client can be faster than create().
+struct Created {
+    platform::Event isKnown{platform::Reset::Manual, "the control server"};
+    IpcWebSocketServer* server = nullptr;
+};
 
 std::string answerTo(Machine& machine, std::string_view message) {
     std::string error;
@@ -23,14 +30,14 @@ std::string answerTo(Machine& machine, std::string_view message) {
 }  // namespace
 
 std::shared_ptr<IpcWebSocketServer> startControlServer(Machine& machine, std::int32_t port) {
-    // A client can be faster than create().
-    std::promise<IpcWebSocketServer*> created;
-    auto server =
-        IpcWebSocketServer::create(port, [&machine, self = created.get_future().share()](
-                                             IpcWebSocketServer::ClientId client, std::string_view message) {
-            self.get()->sendTo(client, answerTo(machine, message));
+    const auto created = std::make_shared<Created>();
+    auto server = IpcWebSocketServer::create(
+        port, [&machine, created](IpcWebSocketServer::ClientId client, std::string_view message) {
+            created->isKnown.wait();
+            created->server->sendTo(client, answerTo(machine, message));
         });
-    created.set_value(server.get());
+    created->server = server.get();
+    created->isKnown.set();
     return server;
 }
 
