@@ -8,6 +8,7 @@
 #include "connection/Supplicant.h"
 #include "contract/Ports.h"
 #include "hotspot/ShownName.h"
+#include "hotspotport/ListText.h"
 #include "hotspotport/SAHotSpotPortlink.h"
 
 namespace vexa {
@@ -28,8 +29,7 @@ int internetAccessCode(const Supplicant& supplicant, const Hs20Network& network,
 constexpr std::size_t kNetworkTextSize = 320;
 constexpr std::size_t kRealmTextSize = 160;
 
-// A list can have some 50,000 realms, each of which would be a dozen allocations as a Json::Value, and the
-// list is a text within the event. So it is written as it stands there: styled, and already quoted.
+// A list can have some 50,000 realms.
 void appendRealms(std::string& event, const Hs20Network& network) {
     const char* before = R"([\n)";
     for (const RealmInfo& realm : network.m_realms) {
@@ -45,32 +45,15 @@ void appendRealms(std::string& event, const Hs20Network& network) {
 
 void appendNetwork(std::string& event, const Supplicant& supplicant, const Hs20Network& network,
                    bool isConnected) {
-    const auto asText = [](bool flag) { return flag ? "true" : "false"; };
-    event += R"(   {\n      \"IsConnected\" : )";
-    event += asText(isConnected);
-    event += R"(,\n      \"IsInternetAccess\" : )";
-    event += std::to_string(internetAccessCode(supplicant, network, isConnected));
-    event += R"(,\n      \"NetWorkName\" : )";
-    appendQuotedTwice(event, shownName(network.ssidText()));
-    event += R"(,\n      \"NetworkType\" : )";
-    event += std::to_string(network.m_networkType);
-    event += R"(,\n      \"RealmFetched\" : )";
-    event += asText(network.hasRealmData());
-    if (network.hasRealmData() && !network.m_realms.empty()) {
-        event += R"(,\n      \"SupportRealmList\" : )";
-        appendRealms(event, network);
-    }
-    event += R"(\n   })";
-}
-
-void appendNetworks(std::string& event, const Supplicant& supplicant,
-                    const std::vector<Hs20Network*>& networks, const Hs20Network* connected) {
-    const char* before = R"("[\n)";
-    for (const Hs20Network* network : networks) {
-        event += std::exchange(before, R"(,\n)");
-        appendNetwork(event, supplicant, *network, network == connected);
-    }
-    event += networks.empty() ? R"("null\n")" : R"(\n]\n")";
+    ObjectText object(event);
+    object.member("IsConnected", isConnected);
+    object.member("IsInternetAccess", internetAccessCode(supplicant, network, isConnected));
+    object.member("NetWorkName", shownName(network.ssidText()));
+    object.member("NetworkType", network.m_networkType);
+    object.member("RealmFetched", network.hasRealmData());
+    if (network.hasRealmData() && !network.m_realms.empty())
+        appendRealms(object.begin("SupportRealmList"), network);
+    object.end();
 }
 
 std::size_t usualSize(const std::vector<Hs20Network*>& networks) {
@@ -94,9 +77,12 @@ void SAHotSpotPortlink::SendNetworkList(Supplicant* supplicant) {
     if (!listed) return;
     std::vector<Hs20Network*> shown;
     if (supplicant->isRadioOnCached() && isEnabled) shown = listed->networks().copyPointers();
-    const std::string event =
-        buildEnvelope(contract::kGetAllNetworkList, contract::kHotspotSource, usualSize(shown),
-                      [&](std::string& text) { appendNetworks(text, *supplicant, shown, connected); });
+    const std::string event = buildEnvelope(
+        contract::kGetAllNetworkList, contract::kHotspotSource, usualSize(shown), [&](std::string& text) {
+            appendListText(text, shown, [&](const Hs20Network& network) {
+                appendNetwork(text, *supplicant, network, &network == connected);
+            });
+        });
     Log(0, "GET_ALL_NETWORK_LIST=%s", event.c_str());
     SendEvent(event);
 }

@@ -335,7 +335,8 @@ void changeAtRandom(Config& config, unsigned kind, std::int32_t id, const std::w
 
 // What a service knows of the file that it saved itself is what one that has just started reads there.
 TEST(Sharing, AServiceOfLongStandingSavesWhatOneThatJustStartedSaves) {
-    const std::wstring texts[] = {L"a", L"", L"<b>&c;]]>", L"\r\n d\t", L"\u00e4\u20ac", L"'\"&#13;"};
+    const std::wstring texts[] = {L"a",       L"", L"<b>&c;]]>", L"\r\n d\t", L"\u00e4\u20ac\U0001F600",
+                                  L"'\"&#13;"};
     for (unsigned seed = 1; seed <= 8; ++seed) {
         std::mt19937 random(seed);
         StoreMachine store;
