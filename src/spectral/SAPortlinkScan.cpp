@@ -5,6 +5,7 @@
 #include "contract/Ports.h"
 #include "platform/DebugOutput.h"
 #include "spectral/SAPortlink.h"
+#include "text/ScopeGuard.h"
 
 namespace vexa {
 
@@ -80,9 +81,9 @@ void SAPortlink::ScanTimerRoutine() {
 void SAPortlink::RunPass() {
     {
         const LockGuard lock(m_cs);
+        const ScopeGuard forget([this]() NO_THREAD_SAFETY_ANALYSIS { m_samples.clear(); });
         ComputeChannelValues();
         PublishChannelValues();
-        m_samples.clear();
     }
     outputDebugString("spectral SAPortlink::HandleFullScanIndication->");
     const LockGuard lock(m_cs);

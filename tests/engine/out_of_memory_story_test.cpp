@@ -221,6 +221,20 @@ TEST_P(OutOfMemory, EndsWhatIsDoneAndNotTheService) {
     });
 }
 
+// Else samples for which a pass lacks the memory would be in the way of every later one.
+TEST(OutOfMemoryOfAPass, ForgetsItsSamples) {
+    EXPECT_STORY(test::Run{}, kAir, [](Story& story) {
+        asking({"GET_CHANNEL_LIST"})(story);
+        story.play({sample(30), kCompleted});
+        const std::string told = noise(story);
+        story.play({sample(60)});
+        g_thread = kNotifications;
+        story.expect("the pass fails", isShortDuring(story, playing({kCompleted}), 0, true), true);
+        story.play({kCompleted});
+        story.expect("the noise", noise(story), told);
+    });
+}
+
 INSTANTIATE_TEST_SUITE_P(In, OutOfMemory, testing::ValuesIn(kShortages),
                          [](const auto& shortage) { return shortage.param.name; });
 
