@@ -7,11 +7,11 @@ import { startPanel } from './machine.mjs';
 const EXECUTABLE = process.env.VEXA_CHROMIUM ?? '/usr/bin/chromium';
 
 /** One browser for the tests of a file; in a container its sandbox can't be made. */
-export function useBrowser(...more) {
+export function useBrowser() {
     const used = {};
     before(async () => {
-        const root = process.getuid() === 0 ? ['--no-sandbox'] : [];
-        used.browser = await chromium.launch({ executablePath: EXECUTABLE, args: [...root, ...more] });
+        const args = process.getuid() === 0 ? ['--no-sandbox'] : [];
+        used.browser = await chromium.launch({ executablePath: EXECUTABLE, args });
     });
     after(() => used.browser.close());
     return used;

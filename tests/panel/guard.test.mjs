@@ -2,9 +2,9 @@ import assert from 'node:assert/strict';
 import { createServer } from 'node:http';
 import { test } from 'node:test';
 import { openPanel, useBrowser } from './browser.mjs';
-import { startMachine, startPanel } from './machine.mjs';
+import { startMachine } from './machine.mjs';
 
-const used = useBrowser('--host-resolver-rules=MAP evil.example 127.0.0.1');
+const used = useBrowser();
 
 /** A stranger's page, on an origin of its own. */
 async function startStranger(t) {
@@ -13,34 +13,6 @@ async function startStranger(t) {
     t.after(() => server.close());
     return `http://127.0.0.1:${server.address().port}/`;
 }
-
-test('the door opens once, to the right token and name', async (t) => {
-    const machine = await startMachine(t);
-    const address = await startPanel(t, machine);
-    const { port, searchParams } = new URL(address);
-    const token = searchParams.get('token');
-    const refused = [
-        `http://127.0.0.1:${port}/`,
-        `http://127.0.0.1:${port}/panel.js`,
-        `http://127.0.0.1:${port}/?token=${token.replace(/^./, (first) => (first === 'a' ? 'b' : 'a'))}`,
-        `http://evil.example:${port}/?token=${token}`,
-        `http://localhost:${port}/?token=${token}`,
-    ];
-    const page = await used.browser.newPage();
-    t.after(() => page.close());
-    for (const url of refused) {
-        const answer = await page.goto(url);
-        assert.ok([403, 404].includes(answer.status()), `${url}: ${answer.status()}`);
-        assert.deepEqual(await page.context().cookies(), [], url);
-    }
-    assert.equal((await page.goto(address)).status(), 200);
-    assert.ok(!page.url().includes('token'), page.url());
-    const [cookie] = await page.context().cookies();
-    assert.deepEqual([cookie.name, cookie.httpOnly, cookie.sameSite], [`vexa-panel-${port}`, true, 'Strict']);
-    const second = await used.browser.newPage();
-    t.after(() => second.close());
-    assert.equal((await second.goto(address)).status(), 403);
-});
 
 test('a page of another origin gets nothing, with the user’s cookie in the same browser', async (t) => {
     const machine = await startMachine(t);
