@@ -1,12 +1,10 @@
-import { useLayoutEffect, useMemo, useRef, useState } from 'preact/hooks';
-import { announce } from '../app/notices';
+import { useMemo, useRef } from 'preact/hooks';
 import { useCanCommand } from '../app/service';
 import type { Credential, Network } from '../app/state';
 import { CredentialRow, type RowActions } from './CredentialRow';
 import { openEdit } from './dialogs';
 import { dragRow } from './drag';
-import { moved } from './order';
-import { nameOf } from './words';
+import { useGrab } from './grab';
 
 interface Props {
     credentials: readonly Credential[];
@@ -15,65 +13,36 @@ interface Props {
     onDelete(credential: Credential): void;
 }
 
-/** The one that is held by the keyboard, and where it would fall. */
-interface Grab {
-    id: number;
-    place: number;
+function Head() {
+    return (
+        <div class="grid-row grid-head" role="row">
+            <span role="columnheader">
+                <span class="unseen">Position</span>
+            </span>
+            <span role="columnheader">Name</span>
+            <span role="columnheader">Realm</span>
+            <span role="columnheader">Identity</span>
+            <span role="columnheader">By itself</span>
+            <span role="columnheader">Taken in range by</span>
+            <span role="columnheader">
+                <span class="unseen">Actions</span>
+            </span>
+        </div>
+    );
 }
-
-const STEPS: Record<string, (place: number, last: number) => number> = {
-    ArrowUp: (place) => Math.max(place - 1, 0),
-    ArrowDown: (place, last) => Math.min(place + 1, last),
-    Home: () => 0,
-    End: (_, last) => last,
-};
 
 /** The credentials in the order of priority, which is changed by their handles. */
 export function CredentialTable({ credentials, taking, onMove, onDelete }: Props) {
     const canCommand = useCanCommand();
-    const [grab, setGrab] = useState<Grab | null>(null);
     const table = useRef<HTMLDivElement>(null);
     const line = useRef<HTMLDivElement>(null);
-    const from = grab ? credentials.findIndex((one) => one.Id === grab.id) : -1;
-    const shown = grab && from >= 0 ? moved(credentials, from, Math.min(grab.place, credentials.length - 1)) : credentials;
+    const { shown, held, press, leave } = useGrab(credentials, table, onMove);
 
-    // A row that takes another place loses the focus on the way.
-    useLayoutEffect(() => {
-        if (grab) table.current?.querySelector<HTMLElement>(`[data-handle="${grab.id}"]`)?.focus();
-    }, [grab]);
-
-    const position = (place: number) => `position ${place + 1} of ${credentials.length}`;
-    const find = (id: number) => credentials.find((one) => one.Id === id)!;
-    const release = (isDropped: boolean) => {
-        if (!grab || from < 0) return setGrab(null);
-        const name = nameOf(find(grab.id));
-        announce(isDropped ? `${name} dropped at ${position(grab.place)}.` : `${name} stays at ${position(from)}.`);
-        if (isDropped && grab.place !== from) onMove(find(grab.id), grab.place);
-        setGrab(null);
-    };
-    const press = (id: number, event: KeyboardEvent) => {
-        const step = STEPS[event.key];
-        if (event.key === ' ' || event.key === 'Enter') {
-            event.preventDefault();
-            if (grab) return release(true);
-            const place = credentials.findIndex((one) => one.Id === id);
-            setGrab({ id, place });
-            announce(`${nameOf(find(id))} grabbed at ${position(place)}. Arrows move it, Space drops it, Escape leaves it.`);
-        } else if (grab && event.key === 'Escape') {
-            event.preventDefault();
-            release(false);
-        } else if (grab && step) {
-            event.preventDefault();
-            const place = step(grab.place, credentials.length - 1);
-            setGrab({ id, place });
-            announce(position(place));
-        }
-    };
     const point = (id: number, event: PointerEvent) => {
-        if (event.button !== 0 || grab) return;
+        if (event.button !== 0 || held !== null) return;
         const rows = [...table.current!.querySelectorAll<HTMLElement>('.credential')];
         const at = credentials.findIndex((one) => one.Id === id);
-        dragRow(event, rows, at, line.current!, (place) => onMove(find(id), place));
+        dragRow(event, rows, at, line.current!, (place) => onMove(credentials[at]!, place));
     };
 
     // The rows keep what they are given first, so that an unchanged one is not drawn anew.
@@ -81,7 +50,7 @@ export function CredentialTable({ credentials, taking, onMove, onDelete }: Props
     latest.current = {
         press,
         point,
-        blur: (event) => event.relatedTarget && release(false),
+        blur: (event) => event.relatedTarget && leave(),
         edit: openEdit,
         delete: onDelete,
     };
@@ -97,19 +66,7 @@ export function CredentialTable({ credentials, taking, onMove, onDelete }: Props
     );
     return (
         <div class="grid-table credential-table" role="table" aria-label="Credentials in the order of priority" ref={table}>
-            <div class="grid-row grid-head" role="row">
-                <span role="columnheader">
-                    <span class="unseen">Position</span>
-                </span>
-                <span role="columnheader">Name</span>
-                <span role="columnheader">Realm</span>
-                <span role="columnheader">Identity</span>
-                <span role="columnheader">By itself</span>
-                <span role="columnheader">Taken in range by</span>
-                <span role="columnheader">
-                    <span class="unseen">Actions</span>
-                </span>
-            </div>
+            <Head />
             {shown.map((credential, place) => (
                 <CredentialRow
                     key={credential.Id}
@@ -118,7 +75,7 @@ export function CredentialTable({ credentials, taking, onMove, onDelete }: Props
                     count={shown.length}
                     networks={taking.get(credential.Id) ?? null}
                     canCommand={canCommand}
-                    isGrabbed={grab?.id === credential.Id}
+                    isGrabbed={held === credential.Id}
                     actions={actions}
                 />
             ))}
