@@ -35,9 +35,39 @@ function useStory(isWanted: boolean) {
     }, [lines, credentials]);
 }
 
+function AskForRealms() {
+    const service = useService();
+    const canCommand = useCanCommand();
+    return (
+        <button
+            type="button"
+            class="button"
+            disabled={!canCommand}
+            title="Ends the connection that there is"
+            onClick={() => service.ask('hotspot', 'UPDATE_NETWORK_REALM')}
+        >
+            Ask for realms again
+        </button>
+    );
+}
+
+function Columns() {
+    return (
+        <div class="grid-row grid-head" role="row">
+            <span role="columnheader">Network</span>
+            <span role="columnheader">State</span>
+            <span role="columnheader">Internet</span>
+            <span role="columnheader">Realms</span>
+            <span role="columnheader">Credentials that fit</span>
+            <span role="columnheader">
+                <span class="unseen">Actions</span>
+            </span>
+        </div>
+    );
+}
+
 /** The networks in range. */
 export function NetworksView() {
-    const service = useService();
     const networks = useServiceState((state) => state.networks) ?? [];
     const credentials = useServiceState((state) => state.credentials);
     const none = useServiceState(whyNone);
@@ -79,30 +109,13 @@ export function NetworksView() {
                     value={filter}
                     onInput={(event) => setFilter(event.currentTarget.value)}
                 />
-                <button
-                    type="button"
-                    class="button"
-                    disabled={!canCommand}
-                    title="Ends the connection that there is"
-                    onClick={() => service.ask('hotspot', 'UPDATE_NETWORK_REALM')}
-                >
-                    Ask for realms again
-                </button>
+                <AskForRealms />
             </div>
             {shown.length === 0 ? (
                 <p class="empty">{networks.length === 0 ? none : 'No network is like that.'}</p>
             ) : (
                 <div class="grid-table network-table" role="table" aria-label="Networks in range">
-                    <div class="grid-row grid-head" role="row">
-                        <span role="columnheader">Network</span>
-                        <span role="columnheader">State</span>
-                        <span role="columnheader">Internet</span>
-                        <span role="columnheader">Realms</span>
-                        <span role="columnheader">Credentials that fit</span>
-                        <span role="columnheader">
-                            <span class="unseen">Actions</span>
-                        </span>
-                    </div>
+                    <Columns />
                     {shown.map((network) => (
                         <NetworkRow
                             key={network.name}

@@ -13,6 +13,46 @@ interface Props {
     onToggle(channel: number): void;
 }
 
+interface RowProps {
+    number: number;
+    /** Its place among the channels. */
+    column: number;
+    figures: Figures;
+    quantity: Quantity;
+    /** Its place among the curves, -1 for none. */
+    place: number;
+    isConnected: boolean;
+    onToggle(channel: number): void;
+}
+
+function Row({ number, column, figures, quantity, place, isConnected, onToggle }: RowProps) {
+    const { mean, greatest, least } = figures.window[quantity][column] ?? { mean: NaN, greatest: NONE, least: NONE };
+    return (
+        <tr>
+            <td>
+                <label class="curve">
+                    <input type="checkbox" checked={place >= 0} onChange={() => onToggle(number)} />
+                    <span class={`swatch series-${place + 1}`} />
+                    <span class="unseen">Draw channel {number}</span>
+                </label>
+            </td>
+            <th scope="row" class="number">
+                {isConnected && (
+                    <span class="connected" title="The adapter is connected here">
+                        <span class="unseen">connected, </span>
+                    </span>
+                )}
+                {number}
+            </th>
+            <td class="number muted mhz">{frequencyOf(number)}</td>
+            <td class="number">{figure(quantity, figures.now[quantity][column] ?? NONE)}</td>
+            <td class="number">{figure(quantity, mean, 1)}</td>
+            <td class="number">{figure(quantity, greatest)}</td>
+            <td class="number">{figure(quantity, least)}</td>
+        </tr>
+    );
+}
+
 /** Mean, greatest and least of each channel over the window, and what it is now. */
 export function StatisticsTable({ channels, figures, quantity, drawn, currentChannel, label, onToggle }: Props) {
     const { name, unit } = SCALES[quantity];
@@ -43,42 +83,18 @@ export function StatisticsTable({ channels, figures, quantity, drawn, currentCha
                         </tr>
                     </thead>
                     <tbody>
-                        {channels.map(({ number }, column) => {
-                            const { mean, greatest, least } = figures.window[quantity][column] ?? {
-                                mean: NaN,
-                                greatest: NONE,
-                                least: NONE,
-                            };
-                            const place = drawn.indexOf(number);
-                            return (
-                                <tr key={number}>
-                                    <td>
-                                        <label class="curve">
-                                            <input
-                                                type="checkbox"
-                                                checked={place >= 0}
-                                                onChange={() => onToggle(number)}
-                                            />
-                                            <span class={`swatch series-${place + 1}`} />
-                                            <span class="unseen">Draw channel {number}</span>
-                                        </label>
-                                    </td>
-                                    <th scope="row" class="number">
-                                        {number === currentChannel && (
-                                            <span class="connected" title="The adapter is connected here">
-                                                <span class="unseen">connected, </span>
-                                            </span>
-                                        )}
-                                        {number}
-                                    </th>
-                                    <td class="number muted mhz">{frequencyOf(number)}</td>
-                                    <td class="number">{figure(quantity, figures.now[quantity][column] ?? NONE)}</td>
-                                    <td class="number">{figure(quantity, mean, 1)}</td>
-                                    <td class="number">{figure(quantity, greatest)}</td>
-                                    <td class="number">{figure(quantity, least)}</td>
-                                </tr>
-                            );
-                        })}
+                        {channels.map(({ number }, column) => (
+                            <Row
+                                key={number}
+                                number={number}
+                                column={column}
+                                figures={figures}
+                                quantity={quantity}
+                                place={drawn.indexOf(number)}
+                                isConnected={number === currentChannel}
+                                onToggle={onToggle}
+                            />
+                        ))}
                     </tbody>
                 </table>
                 {channels.length === 0 && <p class="empty">No channels are known yet.</p>}
