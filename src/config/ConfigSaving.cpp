@@ -13,8 +13,6 @@ namespace vexa {
 
 namespace {
 
-constexpr std::size_t kUsualGrowth = 4096;
-
 // Marks of the holes.
 constexpr char kNextId = 1;
 constexpr char kCredentials = 2;
@@ -149,7 +147,7 @@ bool Config::cutOutUser() {
 // What the file will hold.
 std::string Config::fill(const Frame& frame, std::vector<Written>& all) {
     std::string text;
-    text.reserve(m_content.size() + kUsualGrowth);
+    text.reserve(m_content.size() + XmlDocument::kUsualGrowth);
     for (const std::int32_t id : frame.invalidIds)
         Log(2, "Invalid credential id=%d", id);
     for (const auto& [piece, hole] : frame.pieces) {

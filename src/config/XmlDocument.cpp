@@ -16,7 +16,6 @@ namespace {
 
 constexpr unsigned kParse = (pugi::parse_full | pugi::parse_ws_pcdata) & ~pugi::parse_trim_pcdata;
 constexpr unsigned kFormat = pugi::format_raw | pugi::format_write_bom | pugi::format_no_empty_element_tags;
-constexpr std::size_t kUsualGrowth = 4096;
 
 // A comment that holds nothing but a control character of those that no document that was read can hold.
 constexpr std::string_view kHoleBeginning = "<!--";

@@ -2,6 +2,7 @@
 
 #include <pugixml.hpp>
 
+#include <cstddef>
 #include <optional>
 #include <string>
 #include <vector>
@@ -15,6 +16,9 @@ class XmlDocument {
 public:
     /// An element, or null. Valid while the document lives.
     using Node = pugi::xml_node;
+
+    /// How many bytes a file seldom grows by from one save to the next.
+    static constexpr std::size_t kUsualGrowth = 4096;
 
     void create();
 
