@@ -9,6 +9,7 @@
 #include "client/record/RecordingFile.h"
 #include "client/record/RecordingReader.h"
 #include "client/record/SpectrumScenario.h"
+#include "client/terminal/ClientError.h"
 
 namespace vexa::client {
 
