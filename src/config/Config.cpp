@@ -66,12 +66,14 @@ ResultCode Config::createDefaultFile(const std::wstring& path) {
 }
 
 // Nothing: it can't be opened, or not be read.
-std::optional<std::string> Config::readFile(ResultCode& result) const {
+std::optional<StoredContent> Config::readFile(ResultCode& result) const {
     result = platform::canOpenFile(m_configPath) ? kSuccess : kNotFound;
     if (result != kSuccess) return std::nullopt;
-    auto content = platform::readFile(m_configPath);
-    if (!content) result = kFailure;
-    return content;
+    StoredContent content(m_content);
+    if (platform::readFile(m_configPath, [&](std::string_view piece) { content.take(piece); }))
+        return content;
+    result = kFailure;
+    return std::nullopt;
 }
 
 ResultCode Config::openDocument(const std::string& content) {
@@ -85,15 +87,16 @@ ResultCode Config::readConfig(bool* configChanged) {
     m_content.clear();
     m_frame.reset();
     ResultCode result = kFailure;
-    auto content = readFile(result);
-    if (!content) return result;
-    if (openDocument(*content) != kSuccess) return kFailure;
+    const auto stored = readFile(result);
+    if (!stored) return result;
+    std::string content = stored->text();
+    if (openDocument(content) != kSuccess) return kFailure;
     readGlobalSettings();
     bool isChanged = false;
     Reading reading{.table = m_credentials, .trace = Trace::Yes};
     if (readTable(reading, isChanged) != kSuccess) return kFailure;
     remember(reading.inFile, reading.hasUser);
-    m_content = std::move(*content);
+    m_content = std::move(content);
     m_bUnsaved = false;
     if (configChanged != nullptr) *configChanged = isChanged;
     return kSuccess;

@@ -11,6 +11,7 @@
 #include "base/NetworkListLock.h"
 #include "config/CredentialTable.h"
 #include "config/ResultCodes.h"
+#include "config/StoredContent.h"
 #include "config/XmlDocument.h"
 #include "platform/Files.h"
 
@@ -87,9 +88,9 @@ private:
     /// and as memory held it then.
     struct Known {
         Credential inFile;
-        Credential inMemory;
         std::size_t at = 0;  // its text in a file that this process saved: where, and how long
         std::size_t length = 0;
+        Credential inMemory;  // its place is of no meaning
     };
 
     /// The file without what a save writes, up to the first that it has no place for.
@@ -113,7 +114,7 @@ private:
 
     ResultCode createDefaultFile(const std::wstring& path) REQUIRES(g_hs20Lock);
     ResultCode openDocument(const std::string& content) REQUIRES(g_hs20Lock);
-    std::optional<std::string> readFile(ResultCode& result) const REQUIRES(g_hs20Lock);
+    std::optional<StoredContent> readFile(ResultCode& result) const REQUIRES(g_hs20Lock);
 
     void readGlobalSettings() REQUIRES(g_hs20Lock);
     bool readFlag(const char* xpath, bool missing) REQUIRES(g_hs20Lock);
@@ -145,7 +146,7 @@ private:
     Credential takeOverNew(const Credential& theirs, const Credential* mine) REQUIRES(g_hs20Lock);
     void takeOverPlaces(const CredentialTable& stored) REQUIRES(g_hs20Lock);
 
-    ResultCode saveInto(const std::string& content, bool& isSaved) REQUIRES(g_hs20Lock);
+    ResultCode saveInto(const StoredContent& stored, bool& isSaved) REQUIRES(g_hs20Lock);
     std::vector<Written> whatToWrite(bool isKnownFile) REQUIRES(g_hs20Lock);
     bool areWritable(const std::vector<Written>& all) const REQUIRES(g_hs20Lock);
     bool isUserWritable() const REQUIRES(g_hs20Lock);

@@ -26,8 +26,8 @@ ResultCode Config::saveConfig(const FileLock& held) {
     ResultCode result = kFailure;
     bool isSaved = false;
     const bool isWithinMemory = withinMemory([&]() NO_THREAD_SAFETY_ANALYSIS {
-        const auto content = held ? readFile(result) : std::nullopt;
-        if (content) result = saveInto(*content, isSaved);
+        const auto stored = held ? readFile(result) : std::nullopt;
+        if (stored) result = saveInto(*stored, isSaved);
     });
     if (!isWithinMemory) result = kFailure;
     m_bUnsaved = result != kSuccess || !isSaved;
@@ -37,12 +37,12 @@ ResultCode Config::saveConfig(const FileLock& held) {
 
 // A file that is as this process left it needs no reading: what is not the user's is known, and so is the
 // text of each credential that has not changed.
-ResultCode Config::saveInto(const std::string& content, bool& isSaved) {
-    const bool mayBeKnown = m_frame && content == m_content && isUserWritable();
+ResultCode Config::saveInto(const StoredContent& stored, bool& isSaved) {
+    const bool mayBeKnown = m_frame && stored.isKnown() && isUserWritable();
     auto all = whatToWrite(mayBeKnown);
     const bool isKnownFile = mayBeKnown && areWritable(all);
     if (mayBeKnown && !isKnownFile) all = whatToWrite(false);
-    auto frame = isKnownFile ? std::exchange(m_frame, std::nullopt) : frameOf(content, all);
+    auto frame = isKnownFile ? std::exchange(m_frame, std::nullopt) : frameOf(stored.text(), all);
     if (!frame) return kFailure;
     const ResultCode result = frame->isEnough ? kSuccess : kFailure;
     std::string text = fill(*frame, all);
@@ -160,15 +160,27 @@ std::string Config::fill(const Frame& frame, std::vector<Written>& all) {
     return text;
 }
 
+// What stands in a row in the file is copied in one piece.
 void Config::appendCredentials(std::string& text, std::vector<Written>& all) const {
+    std::size_t from = 0;
+    std::size_t length = 0;
+    const auto appendRow = [&]() NO_THREAD_SAFETY_ANALYSIS {
+        text.append(m_content, from, length);
+        length = 0;
+    };
     for (Written& one : all) {
-        one.at = text.size();
-        if (one.known != nullptr)
-            text.append(m_content, one.known->at, one.known->length);
-        else
+        if (one.known == nullptr || one.known->at != from + length) appendRow();
+        one.at = text.size() + length;
+        if (one.known == nullptr) {
             appendCredentialText(text, *one.credential, m_userName);
-        one.length = text.size() - one.at;
+            one.length = text.size() - one.at;
+            continue;
+        }
+        if (length == 0) from = one.known->at;
+        one.length = one.known->length;
+        length += one.length;
     }
+    appendRow();
 }
 
 // As the next reading will find it.
@@ -214,10 +226,10 @@ void Config::rememberWritten(const Written& written, const std::string& text, bo
     } else if (known == nullptr) {
         auto read = asRead(text.substr(written.at, written.length));
         if (!read) return;
-        known = &m_known.insert_or_assign(mine.m_id, Known{std::move(*read), mine}).first->second;
+        known = &m_known.insert_or_assign(mine.m_id, Known{.inFile = std::move(*read), .inMemory = mine})
+                     .first->second;
     }
     known->inFile.m_priority = mine.m_priority < 0 ? CRED_PRIORITY_LOWEST : mine.m_priority;
-    known->inMemory.m_priority = mine.m_priority;
     known->at = written.at;
     known->length = written.length;
 }

@@ -36,13 +36,15 @@ Config::FileLock Config::beginChange() {
     const ScopeGuard release([this]() NO_THREAD_SAFETY_ANALYSIS { m_xmlDoc.release(); });
     m_renamed.clear();
     ResultCode result = kFailure;
-    auto content = readFile(result);
-    if (!content || *content == m_content || openDocument(*content) != kSuccess) return held;
+    const auto stored = readFile(result);
+    if (!stored || stored->isKnown()) return held;
+    std::string content = stored->text();
+    if (openDocument(content) != kSuccess) return held;
     CredentialTable table;
-    Reading stored{.table = table, .trace = Trace::No};
-    if (!readSilently(stored)) return held;
-    takeOver(stored);
-    m_content = std::move(*content);
+    Reading reading{.table = table, .trace = Trace::No};
+    if (!readSilently(reading)) return held;
+    takeOver(reading);
+    m_content = std::move(content);
     m_frame.reset();
     return held;
 }
@@ -65,7 +67,7 @@ void Config::remember(const std::vector<Credential>& inFile, bool hasUser) {
     std::unordered_map<std::int32_t, Known> known;
     for (const Credential& theirs : inFile) {
         const Credential* const mine = find(inMemory, theirs.m_id);
-        known.try_emplace(theirs.m_id, Known{theirs, mine == nullptr ? theirs : *mine});
+        known.try_emplace(theirs.m_id, Known{.inFile = theirs, .inMemory = mine == nullptr ? theirs : *mine});
     }
     m_known.swap(known);
     m_hadUser = hasUser;
@@ -86,7 +88,7 @@ void Config::takeOver(const Reading& stored) {
         const Credential* const mine = find(inMemory, theirs->m_id);
         Credential now = before == m_known.end() ? takeOverNew(*theirs, mine)
                                                  : takeOverKnown(*theirs, before->second, mine);
-        known.try_emplace(theirs->m_id, Known{*theirs, std::move(now)});
+        known.try_emplace(theirs->m_id, Known{.inFile = *theirs, .inMemory = std::move(now)});
     }
     takeOverPlaces(stored.table);
     m_known = std::move(known);

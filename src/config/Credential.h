@@ -27,6 +27,10 @@ struct Credential {
 
     std::int32_t m_id;
     std::int32_t m_priority = CRED_PRIORITY_LOWEST;  // 1 is first; 0: none, left alone by all shifting
+    /// Given by a table to what it takes in, and kept by copies: two that have one in common hold the same.
+    /// 0: no table has had it yet. It stands with the two above: among thousands, they are all that is looked
+    /// at.
+    std::uint64_t m_edition = 0;
     std::wstring m_creator;
     std::int32_t m_type;
     std::int32_t m_accessType;
@@ -40,10 +44,6 @@ struct Credential {
     std::wstring m_caCert;    // EAP-TLS
     std::wstring m_clientCert;
     std::wstring m_homeSpFqdn;  // nothing fills it yet
-
-    /// Given by a table to what it takes in, and kept by copies: two that have one in common hold the same.
-    /// 0: no table has had it yet.
-    std::uint64_t m_edition = 0;
 };
 
 /// Whether they are equal but for the place, which is not of the credential but of the user's list.

@@ -73,8 +73,9 @@ void XmlDocument::create() {
 
 ResultCode XmlDocument::load(const std::wstring& path) {
     if (!m_document) return kNoDocument;
-    const auto content = platform::readFile(path);
-    return content ? parse(*content) : kFailure;
+    std::string content;
+    const bool isRead = platform::readFile(path, [&](std::string_view piece) { content += piece; });
+    return isRead ? parse(content) : kFailure;
 }
 
 ResultCode XmlDocument::parse(const std::string& content) {

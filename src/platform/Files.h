@@ -1,6 +1,7 @@
 #pragma once
 
 #include <chrono>
+#include <functional>
 #include <memory>
 #include <optional>
 #include <string>
@@ -16,8 +17,9 @@ namespace vexa::platform {
 /// Whether the file can be opened for reading.
 bool canOpenFile(const std::wstring& path);
 
-/// The whole content; nothing if it can't be opened or read.
-std::optional<std::string> readFile(const std::wstring& path);
+/// Gives the whole content, piece by piece. False if it can't be opened or read: then what was given is worth
+/// nothing.
+bool readFile(const std::wstring& path, const std::function<void(std::string_view piece)>& take);
 
 /// True also if the folder exists.
 bool createFolder(const std::wstring& path);

@@ -68,19 +68,15 @@ bool canOpenFile(const std::wstring& path) {
     return static_cast<bool>(openFile(hostPath(path), O_RDONLY));
 }
 
-std::optional<std::string> readFile(const std::wstring& path) {
+bool readFile(const std::wstring& path, const std::function<void(std::string_view piece)>& take) {
     const Descriptor file = openFile(hostPath(path), O_RDONLY);
-    if (!file) return std::nullopt;
-    std::string content;
-    struct stat status {};
-    if (::fstat(file.get(), &status) == 0) content.reserve(static_cast<std::size_t>(status.st_size));
+    if (!file) return false;
     std::array<char, 65536> buffer{};
     for (;;) {
         const ssize_t count = ::read(file.get(), buffer.data(), buffer.size());
         if (count < 0 && errno == EINTR) continue;
-        if (count < 0) return std::nullopt;
-        if (count == 0) return content;
-        content.append(buffer.data(), static_cast<std::size_t>(count));
+        if (count <= 0) return count == 0;
+        take({buffer.data(), static_cast<std::size_t>(count)});
     }
 }
 

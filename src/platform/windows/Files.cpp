@@ -82,17 +82,16 @@ bool canOpenFile(const std::wstring& path) {
     return static_cast<bool>(openToRead(path));
 }
 
-std::optional<std::string> readFile(const std::wstring& path) {
+bool readFile(const std::wstring& path, const std::function<void(std::string_view piece)>& take) {
     const Handle file = openToRead(path);
-    if (!file) return std::nullopt;
-    std::string content;
+    if (!file) return false;
     std::array<char, 65536> buffer{};
     for (;;) {
         DWORD count = 0;
         if (ReadFile(file.get(), buffer.data(), static_cast<DWORD>(buffer.size()), &count, nullptr) == 0)
-            return std::nullopt;
-        if (count == 0) return content;
-        content.append(buffer.data(), count);
+            return false;
+        if (count == 0) return true;
+        take({buffer.data(), count});
     }
 }
 
