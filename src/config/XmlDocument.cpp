@@ -73,9 +73,8 @@ void XmlDocument::create() {
 
 ResultCode XmlDocument::load(const std::wstring& path) {
     if (!m_document) return kNoDocument;
-    std::string content;
-    const bool isRead = platform::readFile(path, [&](std::string_view piece) { content += piece; });
-    return isRead ? parse(content) : kFailure;
+    const auto content = platform::readFile(path);
+    return content ? parse(*content) : kFailure;
 }
 
 ResultCode XmlDocument::parse(const std::string& content) {

@@ -6,6 +6,7 @@
 #include <optional>
 #include <string>
 #include <string_view>
+#include <utility>
 #include <vector>
 
 namespace vexa::platform {
@@ -20,6 +21,12 @@ bool canOpenFile(const std::wstring& path);
 /// Gives the whole content, piece by piece. False if it can't be opened or read: then what was given is worth
 /// nothing.
 bool readFile(const std::wstring& path, const std::function<void(std::string_view piece)>& take);
+/// All at once; nothing if it can't be opened or read.
+inline std::optional<std::string> readFile(const std::wstring& path) {
+    std::string content;
+    const bool isRead = readFile(path, [&](std::string_view piece) { content += piece; });
+    return isRead ? std::optional(std::move(content)) : std::nullopt;
+}
 
 /// True also if the folder exists.
 bool createFolder(const std::wstring& path);
