@@ -36,7 +36,12 @@ public:
 
     /// The lock of the file, which is taken behind the network list lock and ends with its holder. Empty: it
     /// was not to be had, and what is changed stays in memory until the next save that succeeds.
-    using FileLock = std::optional<platform::FolderLock>;
+    struct FileLock {
+        std::optional<platform::FolderLock> lock;
+        bool isRead = false;  // since it was taken: nobody else has changed the file
+
+        explicit operator bool() const { return lock.has_value(); }
+    };
     [[nodiscard]] FileLock lockFile() const REQUIRES(g_hs20Lock);
 
     /// Locks the file, and brings into memory what others have changed in it since it was last read or saved.

@@ -26,7 +26,8 @@ ResultCode Config::saveConfig(const FileLock& held) {
     ResultCode result = kFailure;
     bool isSaved = false;
     const bool isWithinMemory = withinMemory([&]() NO_THREAD_SAFETY_ANALYSIS {
-        const auto stored = held ? readFile(result) : std::nullopt;
+        if (!held) return;
+        const auto stored = held.isRead ? StoredContent::unchanged(m_content) : readFile(result);
         if (stored) result = saveInto(*stored, isSaved);
     });
     if (!isWithinMemory) result = kFailure;

@@ -28,7 +28,7 @@ const Credential* find(const std::unordered_map<std::int32_t, const Credential*>
 
 // A holder that hangs must not hang the others with it.
 Config::FileLock Config::lockFile() const {
-    return platform::FolderLock::take(m_baseDir, kLockPatience);
+    return {.lock = platform::FolderLock::take(m_baseDir, kLockPatience)};
 }
 
 Config::FileLock Config::beginChange() {
@@ -37,7 +37,9 @@ Config::FileLock Config::beginChange() {
     m_renamed.clear();
     ResultCode result = kFailure;
     const auto stored = readFile(result);
-    if (!stored || stored->isKnown()) return held;
+    if (!stored) return held;
+    held.isRead = stored->isKnown();
+    if (held.isRead) return held;
     std::string content = stored->text();
     if (openDocument(content) != kSuccess) return held;
     CredentialTable table;
@@ -46,6 +48,7 @@ Config::FileLock Config::beginChange() {
     takeOver(reading);
     m_content = std::move(content);
     m_frame.reset();
+    held.isRead = true;
     return held;
 }
 

@@ -13,6 +13,13 @@ public:
     /// The known content must outlive this, or its last use.
     explicit StoredContent(std::string_view known) : m_known(known) {}
 
+    /// Of a file that is known to be as it was.
+    static StoredContent unchanged(std::string_view known) {
+        StoredContent content(known);
+        content.m_length = known.size();
+        return content;
+    }
+
     void take(std::string_view piece) {
         if (m_isKnown && m_known.substr(m_length).starts_with(piece)) {
             m_length += piece.size();

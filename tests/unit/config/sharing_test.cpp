@@ -374,7 +374,7 @@ TEST(Sharing, WithoutTheLockNothingIsWrittenAndNothingIsLost) {
     auto other = store.config().lockFile();
     EXPECT_EQ(store.add(L"b"), kFailure);
     EXPECT_EQ(store.file(), before);
-    other.reset();
+    other.lock.reset();
     EXPECT_EQ(store.add(L"c"), kSuccess);
     EXPECT_EQ(entries(store.file()), "11:c 10:b 1:a");
 }
