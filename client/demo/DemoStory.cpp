@@ -10,6 +10,7 @@
 #include "client/machine/MachineRegistry.h"
 #include "client/port/EventLines.h"
 #include "client/port/JsonLine.h"
+#include "client/terminal/Terminal.h"
 #include "client/terminal/TerminalScreen.h"
 #include "client/terminal/Text.h"
 #include "contract/Ports.h"
@@ -174,7 +175,7 @@ std::vector<std::string> DemoStory::lines(const Room& room) const {
     if (room.screenRows >= kScreenRowsForCredentials) append(all, credentialLines(room.columns - 1));
     append(all, networkTable(m_narrator.networks()));
     for (std::string& line : all)
-        line = cutToColumns(line, room.columns - 1, TerminalScreen::ellipsis());
+        line = cutToColumns(line, room.columns - 1, ellipsis());
     all.emplace_back();
     const int left = std::max(kFewestStoryRows, room.rows - static_cast<int>(all.size()));
     const std::size_t shown = std::min(m_lines.size(), static_cast<std::size_t>(left));
@@ -184,7 +185,7 @@ std::vector<std::string> DemoStory::lines(const Room& room) const {
 }
 
 std::string DemoStory::paint(const Line& line, const Room& room) const {
-    const std::string text = cutToColumns(line.text, room.columns - 1, TerminalScreen::ellipsis());
+    const std::string text = cutToColumns(line.text, room.columns - 1, ellipsis());
     const std::string colour = kColours[static_cast<std::size_t>(line.speaker)];
     return room.colour && !colour.empty() ? colour + text + kReset : text;
 }

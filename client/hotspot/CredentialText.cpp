@@ -1,7 +1,7 @@
 #include "client/hotspot/CredentialText.h"
 
 #include "client/terminal/LineFit.h"
-#include "client/terminal/TerminalScreen.h"
+#include "client/terminal/Terminal.h"
 #include "client/terminal/Text.h"
 
 namespace vexa::client {
@@ -42,7 +42,7 @@ std::vector<std::string> credentialTable(const CredentialList& list, Passwords p
                         credential.autoConnect ? "yes" : "no", credential.creator, identity(credential)});
         if (passwords == Passwords::Shown) rows.back().push_back(credential.password);
     }
-    if (columns) fitToColumns(rows, cut, *columns, TerminalScreen::ellipsis());
+    if (columns) fitToColumns(rows, cut, *columns, ellipsis());
     return alignedLines(rows);
 }
 

@@ -8,6 +8,7 @@
 #include "client/port/JsonLine.h"
 #include "client/spectrum/SpectralPicture.h"
 #include "client/spectrum/SpectralText.h"
+#include "client/terminal/Terminal.h"
 #include "client/terminal/Text.h"
 
 namespace vexa::client {
@@ -124,8 +125,7 @@ std::vector<std::string> SpectrumOutput::picture(const SpectralView& view) const
     auto lines =
         drawSpectrum(view, {m_screen->columns(), TerminalScreen::wantsColour(), TerminalScreen::isUtf8()});
     if (!m_note.empty())
-        lines.insert(lines.begin() + 1,
-                     cutToColumns(m_note, m_screen->columns() - 1, TerminalScreen::ellipsis()));
+        lines.insert(lines.begin() + 1, cutToColumns(m_note, m_screen->columns() - 1, ellipsis()));
     if (m_side == nullptr) return lines;
     const int left = m_screen->rows() - static_cast<int>(lines.size());
     const auto below =

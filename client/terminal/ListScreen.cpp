@@ -4,6 +4,7 @@
 #include <iterator>
 #include <utility>
 
+#include "client/terminal/Terminal.h"
 #include "client/terminal/Text.h"
 
 namespace vexa::client {
@@ -26,10 +27,9 @@ void ListScreen::resized() {
 
 void ListScreen::draw() {
     std::vector<std::string> lines;
-    std::transform(m_lines.begin(), m_lines.end(), std::back_inserter(lines),
-                   [this](const std::string& line) {
-                       return cutToColumns(line, m_screen.columns(), TerminalScreen::ellipsis());
-                   });
+    std::transform(
+        m_lines.begin(), m_lines.end(), std::back_inserter(lines),
+        [this](const std::string& line) { return cutToColumns(line, m_screen.columns(), ellipsis()); });
     m_screen.draw(std::move(lines), m_heading);
 }
 

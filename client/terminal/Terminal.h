@@ -19,6 +19,11 @@ bool canPlaceCursor();
 /// It shows more than ASCII.
 bool showsUtf8();
 
+/// What stands there for the rest of a line that is too long.
+inline const char* ellipsis() {
+    return showsUtf8() ? "…" : "...";
+}
+
 struct TerminalSize {
     int columns;
     int rows;

@@ -33,10 +33,6 @@ bool TerminalScreen::isUtf8() {
     return showsUtf8();
 }
 
-const char* TerminalScreen::ellipsis() {
-    return isUtf8() ? "…" : "...";
-}
-
 TerminalScreen::TerminalScreen() {
     enter();
 }

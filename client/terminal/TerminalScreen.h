@@ -21,9 +21,6 @@ public:
     /// The terminal shows more than ASCII.
     static bool isUtf8();
 
-    /// What stands for the rest of a line that is too long.
-    static const char* ellipsis();
-
     TerminalScreen();
     ~TerminalScreen() override;
 
