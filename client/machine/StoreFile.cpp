@@ -9,23 +9,23 @@ namespace vexa::client {
 
 namespace {
 
-/// The element that is missing of those in which the service keeps credentials; it makes none, and then
-/// writes the rest.
-std::string missingPlace(std::string xml) {
-    const std::size_t begin = xml.find("<users");
+/// The element that a file lacks of those in which the service keeps credentials; it makes none, and then
+/// writes the rest. None, too, of what is no text.
+std::string missingPlace(const std::string& content) {
+    auto xml = xmlText(content);
+    if (!xml) return "";
+    const std::size_t begin = xml->find("<users");
     if (begin == std::string::npos) return "users";
-    const std::size_t end = xml.find("</users>", begin);
-    if (end != std::string::npos) xml.erase(begin, end - begin);  // users have elements of the same name
-    return xml.find("<credentials") == std::string::npos ? "credentials" : "";
+    const std::size_t end = xml->find("</users>", begin);
+    if (end != std::string::npos) xml->erase(begin, end - begin);  // users have elements of the same name
+    return xml->find("<credentials") == std::string::npos ? "credentials" : "";
 }
 
 }  // namespace
 
 bool StoreFile::isWritten() const {
     const auto now = state();
-    if (!now || now == m_seen) return false;
-    const auto xml = xmlText(now->content);
-    return !xml || missingPlace(*xml).empty();
+    return now && now != m_seen && missingPlace(now->content).empty();
 }
 
 std::optional<std::string> StoreFile::objection() const {
@@ -38,8 +38,7 @@ std::optional<std::string> StoreFile::objection() const {
 std::string StoreFile::whyNotWritten() const {
     if (const auto objectionToAll = objection()) return *objectionToAll;
     const auto now = state();
-    const auto xml = now ? xmlText(now->content) : std::nullopt;
-    const std::string missing = xml ? missingPlace(*xml) : "";
+    const std::string missing = now ? missingPlace(now->content) : "";
     return m_path.string() + (missing.empty() ? " could not be written" : " lacks an element " + missing);
 }
 

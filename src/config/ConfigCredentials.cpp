@@ -103,9 +103,7 @@ bool Config::repairIds(const Reading& reading) {
         if (reading.trace == Trace::Yes)
             Log(6, "ERROR: Found duplicate credential id=%d, new id=%d", credential->m_id, next);
         if (reading.foreignIds.contains(credential->m_id)) m_renamed[credential->m_id] = next;
-        Credential renumbered = *credential;
-        renumbered.m_id = next;
-        reading.table.replace(*credential, std::move(renumbered));
+        CredentialTable::setId(*credential, next);
         next = followingId(next);
         isChanged = true;
     }

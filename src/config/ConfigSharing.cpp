@@ -112,9 +112,7 @@ void Config::giveNewId(const Credential& credential) {
     if (m_nextCredId == followingId(m_nextCredId)) return;
     Log(6, "ERROR: Found duplicate credential id=%d, new id=%d", credential.m_id, m_nextCredId);
     m_renamed[credential.m_id] = m_nextCredId;
-    Credential renumbered = credential;
-    renumbered.m_id = m_nextCredId;
-    m_credentials.replace(credential, std::move(renumbered));
+    CredentialTable::setId(credential, m_nextCredId);
     advanceNextCredId();
 }
 

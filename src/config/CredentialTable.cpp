@@ -237,6 +237,11 @@ void CredentialTable::replace(const Credential& stored, Credential by) {
     own(stored) = std::move(by);
 }
 
+void CredentialTable::setId(const Credential& stored, std::int32_t id) {
+    own(stored).m_id = id;
+    own(stored).m_edition = nextEdition();
+}
+
 void CredentialTable::setPriority(const Credential& stored, std::int32_t priority) {
     own(stored).m_priority = priority;
 }

@@ -43,6 +43,8 @@ public:
 
     /// `stored`, which is of this table, becomes `by`, but keeps its place and its address.
     void replace(const Credential& stored, Credential by) REQUIRES(g_hs20Lock);
+    static void setId(const Credential& stored, std::int32_t id) REQUIRES(g_hs20Lock);
+
     std::size_t size() const REQUIRES(g_hs20Lock) { return m_list.size(); }
 
     // Steps of reading the file.
